@@ -1,0 +1,72 @@
+# How every target of the tree is built: one set of flags, one function for each kind of target.
+include(GNUInstallDirs)
+
+set(CMAKE_CXX_STANDARD 20)
+set(CMAKE_CXX_STANDARD_REQUIRED ON)
+set(CMAKE_CXX_EXTENSIONS OFF)
+set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+set(CMAKE_CXX_VISIBILITY_PRESET hidden)
+set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
+set(CMAKE_EXPORT_COMPILE_COMMANDS ON)
+set(THREADS_PREFER_PTHREAD_FLAG ON)
+
+# Results are defined to the byte: a fused multiply-add rounds once where the definition rounds
+# twice. No errno and no traps lets the compiler vectorise roots and conversions; values stay.
+add_compile_options(-ffp-contract=off -fno-math-errno -fno-trapping-math -Wall -Wextra)
+
+# A sanitizer that only prints would let a test pass.
+if(PELORIN_SANITIZE)
+  add_compile_options(-fsanitize=${PELORIN_SANITIZE} -fno-omit-frame-pointer
+                      -fno-sanitize-recover=all)
+  add_link_options(-fsanitize=${PELORIN_SANITIZE})
+endif()
+
+# pelorin_library(<name> SOURCES ... [DEPENDS ...]): the library pelorin_<name> of one folder.
+function(pelorin_library name)
+  cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "SOURCES;DEPENDS")
+  set(target pelorin_${name})
+  add_library(${target} STATIC ${arg_SOURCES})
+  target_include_directories(
+    ${target} PUBLIC $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}>
+                     $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}/quenby>)
+  target_compile_features(${target} PUBLIC cxx_std_20)
+  target_link_libraries(${target} PUBLIC ${arg_DEPENDS})
+endfunction()
+
+# pelorin_test(<name> [SOURCES ...] DEPENDS ...): the tests in <name>.cpp, run by ctest one by one.
+function(pelorin_test name)
+  cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "SOURCES;DEPENDS")
+  if(NOT arg_SOURCES)
+    set(arg_SOURCES ${name}.cpp)
+  endif()
+  add_executable(${name} ${arg_SOURCES})
+  target_link_libraries(${name} PRIVATE ${arg_DEPENDS} pelorin_test_support GTest::gmock_main)
+  gtest_discover_tests(${name} DISCOVERY_MODE PRE_TEST DISCOVERY_TIMEOUT 60
+                       PROPERTIES TIMEOUT 600)
+endfunction()
+
+# pelorin_bench(<name> DEPENDS ...): the benchmarks in <name>.cpp.
+function(pelorin_bench name)
+  cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "DEPENDS")
+  add_executable(${name} ${name}.cpp)
+  target_link_libraries(${name} PRIVATE ${arg_DEPENDS} pelorin_test_support
+                                        benchmark::benchmark_main)
+  set_property(GLOBAL APPEND PROPERTY PELORIN_BENCHES ${name})
+endfunction()
+
+# pelorin_fuzz(<name> DEPENDS ...): the fuzz target in <name>.cpp. With clang it is a libFuzzer
+# binary; with any other compiler it replays files and runs seeded random inputs, so that a short
+# run belongs to the tests everywhere.
+function(pelorin_fuzz name)
+  cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "DEPENDS")
+  add_executable(${name} ${PROJECT_SOURCE_DIR}/fuzz/${name}.cpp)
+  target_link_libraries(${name} PRIVATE ${arg_DEPENDS})
+  if(CMAKE_CXX_COMPILER_ID MATCHES Clang)
+    target_compile_options(${name} PRIVATE -fsanitize=fuzzer)
+    target_link_options(${name} PRIVATE -fsanitize=fuzzer)
+    add_test(NAME ${name} COMMAND ${name} -runs=2000 -seed=1 -max_len=4096)
+  else()
+    target_sources(${name} PRIVATE ${PROJECT_SOURCE_DIR}/fuzz/replay_main.cpp)
+    add_test(NAME ${name} COMMAND ${name} --random 2000 --seed 1 --max-length 4096)
+  endif()
+endfunction()

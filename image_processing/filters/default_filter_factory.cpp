@@ -1,0 +1,26 @@
+#include "image_processing/filters/default_filter_factory.h"
+
+#include <mutex>
+
+#include "image_processing/filters/pass_through.h"
+
+namespace pelorin::image_processing {
+
+DefaultFilterFactory::DefaultFilterFactory() {
+  static ConcreteDescription<PassThrough> passThrough(
+      "PassThrough", "Original", "Pass through filter, no changes are made to the image");
+
+  for (FilterDescription* description : std::initializer_list<FilterDescription*>{&passThrough}) {
+    addFilterDescription(description);
+  }
+}
+
+std::shared_ptr<FilterFactory> DefaultFilterFactory::filterFactory() {
+  static std::shared_ptr<FilterFactory> ptr;
+  static std::mutex instanceLock;
+  const std::lock_guard lock(instanceLock);
+  if (ptr == nullptr) ptr = std::make_shared<DefaultFilterFactory>();
+  return ptr;
+}
+
+}  // namespace pelorin::image_processing
