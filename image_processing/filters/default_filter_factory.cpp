@@ -2,15 +2,21 @@
 
 #include <mutex>
 
+#include "image_processing/autoenhance/auto_enhance_filter.h"
 #include "image_processing/filters/pass_through.h"
 
 namespace pelorin::image_processing {
 
 DefaultFilterFactory::DefaultFilterFactory() {
+  static ConcreteDescription<AEFilter8bit> ae8bit("AE08bit", "Auto",
+                                                  "Auto-enhance with 8-bit masks.");
+  static ConcreteDescription<AEFilter> ae(
+      "AE0", "Auto", "Original auto-enhance. Parameters: \"slider=0.4;\" sets slider to 0.4");
   static ConcreteDescription<PassThrough> passThrough(
       "PassThrough", "Original", "Pass through filter, no changes are made to the image");
 
-  for (FilterDescription* description : std::initializer_list<FilterDescription*>{&passThrough}) {
+  for (FilterDescription* description :
+       std::initializer_list<FilterDescription*>{&ae8bit, &ae, &passThrough}) {
     addFilterDescription(description);
   }
 }

@@ -1,0 +1,59 @@
+#include "image_processing/autoenhance/auto_enhance_filter.h"
+
+#include <algorithm>
+#include <stdexcept>
+
+#include "image_processing/autoenhance/lab_tone_pass.h"
+#include "image_processing/core/parameter_strings.h"
+
+namespace pelorin::image_processing {
+namespace {
+
+template <typename T>
+std::shared_ptr<Image<float>> asFloats(const Image<T>& mask) {
+  auto floats = makeSharedImage<float>(mask.width, mask.height);
+  std::copy_n(mask.data.get(), mask.pixelCount(), floats->data.get());
+  return floats;
+}
+
+}  // namespace
+
+template <typename TB, typename TL>
+void AEFilterT<TB, TL>::init(const std::string& params) {
+  const Image<RGBA8Pixel>& photo = *state->image;
+  analyzeImage(photo, state->metadata, statistics_);
+  const FilterParams options(params);
+  if (!options.readBool("gtmOnly")) {
+    computeImageMasks(photo, state->metadata, state->config, masks_);
+  } else if (options.readBool("gtmExtraMemory")) {
+    masks_.ltmMask = makeSharedImage<TL>(photo.width, photo.height);
+    masks_.bilateralMask = makeSharedImage<TB>(photo.width, photo.height);
+  }
+}
+
+template <typename TB, typename TL>
+void AEFilterT<TB, TL>::applyConfig(const std::string& params, const FilterConfig& config,
+                                    Image<RGBA8Pixel>& output) {
+  const FilterParams options(params);
+  FilterConfig adjusted = config;
+  updateFilterConfigForSliderValue(options.readFloat("slider"), &adjusted);
+  if (options.readBool("gtmOnly")) adjusted.detailGainHigh = 0.0f;
+  apply(*state->image, statistics_, adjusted, masks_, output);
+}
+
+template <typename TB, typename TL>
+std::shared_ptr<Image<float>> AEFilterT<TB, TL>::getBilateralMask() const {
+  if (!masks_.computed) throw std::logic_error("the bilateral mask was never computed");
+  return asFloats(*masks_.bilateralMask);
+}
+
+template <typename TB, typename TL>
+std::shared_ptr<Image<float>> AEFilterT<TB, TL>::getLtmMask() const {
+  if (!masks_.computed) throw std::logic_error("the LTM mask was never computed");
+  return asFloats(*masks_.ltmMask);
+}
+
+template class AEFilterT<float, float>;
+template class AEFilterT<QuantizedFloat<unsigned char>, QuantizedFloat<unsigned char>>;
+
+}  // namespace pelorin::image_processing

@@ -1,0 +1,26 @@
+#pragma once
+
+#include "image_processing/core/image.h"
+
+namespace pelorin::image_processing {
+
+/// Smooths a lightness image and keeps its edges, through a coarse grid over y, x and lightness
+/// that is blurred and read back by trilinear interpolation.
+/// @param lightness   values in [0, 1] (Lab lightness / 100).
+/// @param sigmaRange  lightness difference that counts as an edge, in (0, 1]; below 1/32 the range
+///                    kernel is empty and the output is all 0.
+/// @param spatial     cell size in pixels, truncated; meant from 1 to the shorter side. Outside of
+///                    that, the cell is one pixel or the grid one node along the side.
+/// @param smoothed    written; of the size of `lightness`. Images are shared, so writing into the
+/// copy
+///                    fills the caller's; its own buffer.
+/// @throws std::bad_alloc when the grid of columns x rows x 32 nodes does not fit.
+///
+/// Keeps no state; calls with different outputs may run at once. After Chen, Paris and Durand,
+/// "Real-time Edge-Aware Image Processing with the Bilateral Grid" (2007), with a piecewise cubic
+/// in place of the Gaussian. For T = float and QuantizedFloat<unsigned char>.
+template <typename T>
+void bilateralFilterGridApproximation(Image<float> lightness, float sigmaRange, float spatial,
+                                      Image<T> smoothed);
+
+}  // namespace pelorin::image_processing
