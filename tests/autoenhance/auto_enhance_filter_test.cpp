@@ -1,0 +1,165 @@
+#include "image_processing/autoenhance/auto_enhance_filter.h"
+
+#include <gtest/gtest.h>
+
+#include <boost/lexical_cast.hpp>
+#include <cmath>
+#include <cstring>
+#include <stdexcept>
+#include <utility>
+
+#include "tests/support/fingerprint.h"
+#include "tests/support/pictures.h"
+
+namespace pelorin::image_processing {
+namespace {
+
+using test_support::fingerprint;
+using test_support::flatPicture;
+using test_support::noisePicture;
+using test_support::photoLikePicture;
+
+std::shared_ptr<FilteredImageState> stateOf(const Image<RGBA8Pixel>& image) {
+  return std::make_shared<FilteredImageState>(FilteredImageState{
+      std::make_shared<Image<RGBA8Pixel>>(image), {}, "", defaultFilterConfigValue});
+}
+
+template <typename Filter>
+class AutoEnhance : public testing::Test {
+ protected:
+  static Image<RGBA8Pixel> enhanced(const Image<RGBA8Pixel>& photo, const std::string& initParams,
+                                    const std::string& params) {
+    Filter filter(stateOf(photo));
+    filter.init(initParams);
+    Image<RGBA8Pixel> output(photo.width, photo.height);
+    filter.applyConfig(params, defaultFilterConfigValue, output);
+    return output;
+  }
+};
+using BothFilters = testing::Types<AEFilter, AEFilter8bit>;
+TYPED_TEST_SUITE(AutoEnhance, BothFilters);
+
+TYPED_TEST(AutoEnhance, GivesTheSourceUpToTheLabConversionAtSliderZero) {
+  const auto photo = photoLikePicture(60, 45, 1);
+  const auto output = this->enhanced(photo, "slider=0;", "slider=0;");
+  long sum = 0;
+  for (std::size_t i = 0; i < photo.pixelCount(); ++i) {
+    sum += std::abs(photo.data.get()[i].g - output.data.get()[i].g);
+  }
+  EXPECT_LT(static_cast<double>(sum) / photo.pixelCount(), 2.0);
+  EXPECT_NE(fingerprint(this->enhanced(photo, "slider=0.8;", "slider=0.8;")), fingerprint(output));
+}
+
+TYPED_TEST(AutoEnhance, TakesTheMaskFreeBranchWhenGlobalOnly) {
+  const auto photo = photoLikePicture(60, 45, 2);
+  const std::string params = "slider=0.5;gtmOnly=true;";
+  TypeParam filter(stateOf(photo));
+  filter.init(params);
+  EXPECT_THROW(filter.getBilateralMask(), std::logic_error);
+  EXPECT_THROW(filter.getLtmMask(), std::logic_error);
+  Image<RGBA8Pixel> output(60, 45);
+  filter.applyConfig(params, defaultFilterConfigValue, output);
+  // The same as with masks computed and switched off for this application.
+  EXPECT_EQ(fingerprint(output), fingerprint(this->enhanced(photo, "slider=0.5;", params)));
+  EXPECT_NE(fingerprint(output), fingerprint(this->enhanced(photo, "", "slider=0.5;")));
+}
+
+TYPED_TEST(AutoEnhance, NeverReadsMasksThatWereAllocatedButNotComputed) {
+  const auto photo = photoLikePicture(60, 45, 3);
+  const std::string expected =
+      fingerprint(this->enhanced(photo, "gtmOnly=true;", "slider=0.5;gtmOnly=true;"));
+  EXPECT_EQ(fingerprint(this->enhanced(photo, "gtmOnly=true;", "slider=0.5;")), expected);
+  EXPECT_EQ(fingerprint(this->enhanced(photo, "gtmOnly=true;gtmExtraMemory=true;", "slider=0.5;")),
+            expected);
+  TypeParam filter(stateOf(photo));
+  filter.init("gtmOnly=true;gtmExtraMemory=true;");
+  EXPECT_THROW(filter.getBilateralMask(), std::logic_error);
+}
+
+TYPED_TEST(AutoEnhance, FailsWithoutASliderAndLeavesTheOutput) {
+  const auto photo = photoLikePicture(20, 20, 4);
+  TypeParam filter(stateOf(photo));
+  filter.init("");
+  Image<RGBA8Pixel> output = flatPicture(20, 20, {1, 2, 3, 4});
+  const std::string before = fingerprint(output);
+  for (const char* params : {"", "Slider=0.4;", "gtmOnly=true;", ";;;", "=0.4"}) {
+    EXPECT_THROW(filter.applyConfig(params, defaultFilterConfigValue, output), std::out_of_range)
+        << params;
+  }
+  for (const char* params : {"slider=;", "slider=abc;", "slider=0.4abc;", "slider= 0.4;"}) {
+    EXPECT_THROW(filter.applyConfig(params, defaultFilterConfigValue, output),
+                 boost::bad_lexical_cast)
+        << params;
+  }
+  EXPECT_EQ(fingerprint(output), before);
+}
+
+TYPED_TEST(AutoEnhance, GivesEqualOutputsToEqualCalls) {
+  const auto photo = photoLikePicture(50, 40, 5);
+  const std::string source = fingerprint(photo);
+  TypeParam filter(stateOf(photo));
+  filter.init("slider=0.4;");
+  Image<RGBA8Pixel> first(50, 40), between(50, 40), second(50, 40);
+  filter.applyConfig("slider=0.4;", defaultFilterConfigValue, first);
+  filter.applyConfig("slider=0.9;", defaultFilterConfigValue, between);
+  filter.applyConfig("slider=0.4", defaultFilterConfigValue, second);
+  EXPECT_EQ(fingerprint(first), fingerprint(second));
+  EXPECT_NE(fingerprint(first), fingerprint(between));
+  EXPECT_EQ(fingerprint(photo), source);
+}
+
+TYPED_TEST(AutoEnhance, ReadsOnlyTheWordTrueForItsOptions) {
+  const auto photo = photoLikePicture(40, 30, 6);
+  EXPECT_EQ(fingerprint(this->enhanced(photo, "gtmOnly=1;", "slider=0.5;gtmOnly=1;")),
+            fingerprint(this->enhanced(photo, "", "slider=0.5;")));
+}
+
+TYPED_TEST(AutoEnhance, HandsOutCopiesOfItsMasks) {
+  const auto photo = photoLikePicture(40, 30, 7);
+  TypeParam filter(stateOf(photo));
+  filter.init("");
+  const auto bilateral = filter.getBilateralMask();
+  const std::string before = fingerprint(*bilateral);
+  EXPECT_EQ(bilateral->width, 40u);
+  EXPECT_EQ(bilateral->height, 30u);
+  bilateral->set(0.0f);
+  EXPECT_EQ(fingerprint(*filter.getBilateralMask()), before);
+  EXPECT_NE(fingerprint(*filter.getLtmMask()), before);
+}
+
+TYPED_TEST(AutoEnhance, TakesEverySize) {
+  for (const auto& [width, height] :
+       {std::pair{0u, 0u}, {0u, 9u}, {1u, 1u}, {1u, 2u}, {3u, 1u}, {65500u, 1u}, {1u, 3000u}}) {
+    const auto photo = noisePicture(width, height, 8);
+    const auto output = this->enhanced(photo, "", "slider=0.7;");
+    EXPECT_EQ(output.pixelCount(), photo.pixelCount());
+    for (std::size_t i = 0; i < photo.pixelCount(); ++i) {
+      ASSERT_EQ(output.data.get()[i].a, photo.data.get()[i].a);  // every pixel was written
+    }
+  }
+}
+
+TYPED_TEST(AutoEnhance, GivesDefinedBytesForAnySlider) {
+  const auto photo = photoLikePicture(30, 20, 9);
+  for (const char* slider : {"nan", "inf", "-inf", "1e30", "-1e30", "-0.3", "17"}) {
+    const std::string params = std::string("slider=") + slider + ";";
+    EXPECT_EQ(fingerprint(this->enhanced(photo, "", params)),
+              fingerprint(this->enhanced(photo, params, params)))
+        << slider;
+  }
+}
+
+TEST(AutoEnhance8bit, ReadsItsMasksAsByteOver255) {
+  const auto photo = photoLikePicture(40, 30, 10);
+  AEFilter8bit filter(stateOf(photo));
+  filter.init("");
+  for (const auto& mask : {filter.getBilateralMask(), filter.getLtmMask()}) {
+    for (std::size_t i = 0; i < mask->pixelCount(); ++i) {
+      const float byte = std::round(mask->data.get()[i] * 255.0f);
+      ASSERT_EQ(mask->data.get()[i], byte / 255.0f);
+    }
+  }
+}
+
+}  // namespace
+}  // namespace pelorin::image_processing

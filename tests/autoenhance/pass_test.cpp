@@ -1,0 +1,238 @@
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <cstdlib>
+#include <limits>
+
+#include "image_processing/autoenhance/lab.h"
+#include "image_processing/autoenhance/lab_tone_pass.h"
+#include "image_processing/autoenhance/tone_curve.h"
+#include "image_processing/autoenhance/vibrance.h"
+#include "tests/support/fingerprint.h"
+#include "tests/support/pictures.h"
+
+namespace pelorin::image_processing {
+namespace {
+
+using test_support::fingerprint;
+using test_support::flatPicture;
+using test_support::noisePicture;
+using test_support::photoLikePicture;
+
+RGBA8Pixel vibrant(float amount, RGBA8Pixel p) {
+  vibranceInRGB(amount, p.r, p.g, p.b);
+  return p;
+}
+
+std::vector<float> identityCurve() {
+  std::vector<float> curve(51);
+  for (int i = 0; i < 51; ++i) curve[i] = static_cast<float>(i) / 50.0f;
+  return curve;
+}
+
+FilterConfig withoutMasks() {
+  FilterConfig config = defaultFilterConfigValue;
+  config.detailGainHigh = 0.0f;
+  return config;
+}
+
+TEST(Vibrance, LeavesGreyPixelsAlone) {
+  for (int grey = 0; grey < 256; ++grey) {
+    const auto code = static_cast<std::uint8_t>(grey);
+    const RGBA8Pixel p{code, code, code, 7};
+    for (const float amount : {0.0f, 0.5f, 1.0f, 1.8f, -3.0f, 1e30f, std::nanf("")}) {
+      ASSERT_EQ(vibrant(amount, p), p);
+    }
+  }
+}
+
+TEST(Vibrance, BelowOneDesaturatesByExactlyThatFactorWithoutRedProtection) {
+  for (const RGBA8Pixel& p :
+       {RGBA8Pixel{200, 40, 90, 0}, {10, 250, 30, 0}, {3, 4, 200, 0}, {90, 90, 91, 0}}) {
+    const float amount = 0.6f;
+    const float grey = 0.7f * p.g + 0.2f * p.r + 0.1f * p.b;
+    const RGBA8Pixel out = vibrant(amount, p);
+    EXPECT_EQ(out.r, static_cast<int>(grey + amount * (p.r - grey)));
+    EXPECT_EQ(out.g, static_cast<int>(grey + amount * (p.g - grey)));
+    EXPECT_EQ(out.b, static_cast<int>(grey + amount * (p.b - grey)));
+  }
+}
+
+TEST(Vibrance, AboveOneLeavesRedderPixelsAlone) {
+  const RGBA8Pixel p{200, 140, 120, 0};
+  const RGBA8Pixel out = vibrant(1.8f, p);
+  EXPECT_NEAR(out.r, p.r, 1);
+  EXPECT_NEAR(out.g, p.g, 1);
+  EXPECT_NEAR(out.b, p.b, 1);
+}
+
+TEST(Vibrance, FadesRedProtectionOutOverFiveCodes) {
+  int before = 0;
+  for (int lead = 0; lead <= 6; ++lead) {  // how far green leads red
+    const auto green = static_cast<std::uint8_t>(120 + lead);
+    const RGBA8Pixel out = vibrant(1.8f, {120, green, 60, 0});
+    const int gained = 60 - out.b;
+    EXPECT_GE(gained, before);
+    EXPECT_TRUE(lead > 0 || gained <= 1);
+    before = gained;
+  }
+  EXPECT_GT(before, 30);
+}
+
+TEST(Vibrance, GoesNoFurtherThanTheFirstChannelAtAnEnd) {
+  const RGBA8Pixel out = vibrant(50.0f, {20, 100, 180, 0});
+  EXPECT_TRUE(out.r == 0 || out.b >= 254);
+  EXPECT_LT(out.g, 255);
+}
+
+TEST(Vibrance, WrapsOnlyForNegativeAmounts) {
+  const RGBA8Pixel p{0, 0, 255, 0};  // grey 25.5; at -1 blue falls to 0 and red rises to 51
+  EXPECT_EQ(vibrant(-1.0f, p), (RGBA8Pixel{51, 51, 0, 0}));
+  // Grey 25.5 and amount -20: red would be 535, of which the low 8 bits stay.
+  EXPECT_EQ(vibrant(-20.0f, p).r, 535 & 255);
+}
+
+TEST(Vibrance, GivesDefinedBytesForNaNAndInfinity) {
+  const RGBA8Pixel p{30, 90, 200, 0};
+  EXPECT_EQ(vibrant(std::nanf(""), p), (RGBA8Pixel{0, 0, 0, 0}));
+  const float infinity = std::numeric_limits<float>::infinity();
+  EXPECT_EQ(vibrant(infinity, p), vibrant(1e30f, p));
+  EXPECT_EQ(vibrant(-infinity, p), (RGBA8Pixel{255, 0, 0, 0}));
+}
+
+TEST(LabTonePass, ComesBackWithinTheTablesAtTheNeutralSetting) {
+  const auto photo = photoLikePicture(64, 64, 2);
+  Image<RGBA8Pixel> output(64, 64);
+  imageVibranceLabAndToneCurve(photo, output, withoutMasks(), identityCurve(), 100.0f,
+                               ImageMasks<float, float>{});
+  long sum = 0;
+  for (std::size_t i = 0; i < photo.pixelCount(); ++i) {
+    const RGBA8Pixel& in = photo.data.get()[i];
+    const RGBA8Pixel& out = output.data.get()[i];
+    ASSERT_LE(std::abs(in.g - out.g), 18);
+    sum += std::abs(in.r - out.r) + std::abs(in.g - out.g) + std::abs(in.b - out.b);
+  }
+  EXPECT_LT(static_cast<double>(sum) / (3 * photo.pixelCount()), 1.5);
+}
+
+TEST(LabTonePass, CopiesAlphaInEveryCase) {
+  const auto photo = noisePicture(40, 30, 3);
+  ImageMasks<float, float> masks;
+  computeImageMasks(photo, {}, defaultFilterConfigValue, masks);
+  for (const FilterConfig& config : {withoutMasks(), defaultFilterConfigValue}) {
+    Image<RGBA8Pixel> output(40, 30);
+    imageVibranceLabAndToneCurve(photo, output, config, identityCurve(), 100.0f, masks);
+    for (std::size_t i = 0; i < photo.pixelCount(); ++i) {
+      ASSERT_EQ(output.data.get()[i].a, photo.data.get()[i].a);
+    }
+  }
+}
+
+TEST(LabTonePass, ClampsLightnessOnlyWithMasks) {
+  // A huge detail gain drives L' far outside; clamped, a grey pixel ends black or white.
+  const auto photo = noisePicture(32, 32, 4);
+  ImageMasks<float, float> masks;
+  computeImageMasks(photo, {}, defaultFilterConfigValue, masks);
+  masks.ltmMask->set(0.0f);
+  FilterConfig config = defaultFilterConfigValue;
+  config.detailGain = 1e6f;
+  Image<RGBA8Pixel> output(32, 32);
+  imageVibranceLabAndToneCurve(photo, output, config, identityCurve(), 100.0f, masks);
+  for (std::size_t i = 0; i < photo.pixelCount(); ++i) {
+    const RGBA8Pixel& in = photo.data.get()[i];
+    const Lab lab = rgbToLab(in.r, in.g, in.b);
+    const float base = 100.0f * masks.bilateralMask->data.get()[i];
+    if (std::fabs(lab.L - base) < 1.0f) continue;
+    RGBA8Pixel expected = in;
+    labToRgb({lab.L > base ? 100.0f : 0.0f, lab.a, lab.b}, expected.r, expected.g, expected.b);
+    vibranceInRGB(config.vibrance, expected.r, expected.g, expected.b);
+    ASSERT_EQ(output.data.get()[i], expected);
+  }
+}
+
+TEST(LabTonePass, TreatsMasksThatWereNeverComputedAsOff) {
+  const auto photo = photoLikePicture(20, 20, 5);
+  Image<RGBA8Pixel> off(20, 20), empty(20, 20), allocated(20, 20);
+  const ImageMasks<float, float> none;
+  imageVibranceLabAndToneCurve(photo, off, withoutMasks(), identityCurve(), 100.0f, none);
+  imageVibranceLabAndToneCurve(photo, empty, defaultFilterConfigValue, identityCurve(), 100.0f,
+                               none);
+  ImageMasks<float, float> unwritten;
+  computeImageMasks(photo, {}, withoutMasks(), unwritten);
+  imageVibranceLabAndToneCurve(photo, allocated, defaultFilterConfigValue, identityCurve(), 100.0f,
+                               unwritten);
+  EXPECT_EQ(fingerprint(empty), fingerprint(off));
+  EXPECT_EQ(fingerprint(allocated), fingerprint(off));
+}
+
+TEST(LabTonePass, StopsWhereTheShorterImageEnds) {
+  const auto photo = photoLikePicture(10, 10, 6);
+  Image<RGBA8Pixel> larger = flatPicture(10, 12, {1, 2, 3, 4});
+  imageVibranceLabAndToneCurve(photo, larger, withoutMasks(), identityCurve(), 100.0f,
+                               ImageMasks<float, float>{});
+  EXPECT_EQ(larger.row(10)[0], (RGBA8Pixel{1, 2, 3, 4}));
+  Image<RGBA8Pixel> smaller(10, 3);  // a sanitizer watches its end
+  imageVibranceLabAndToneCurve(photo, smaller, withoutMasks(), identityCurve(), 100.0f,
+                               ImageMasks<float, float>{});
+  EXPECT_EQ(smaller.row(2)[9], larger.row(2)[9]);
+}
+
+TEST(LabTonePass, MayWorkInPlace) {
+  const auto photo = noisePicture(30, 20, 7);
+  Image<RGBA8Pixel> output(30, 20), inPlace(30, 20);
+  std::copy_n(photo.data.get(), photo.pixelCount(), inPlace.data.get());
+  ImageMasks<float, float> masks;
+  computeImageMasks(photo, {}, defaultFilterConfigValue, masks);
+  imageVibranceLabAndToneCurve(photo, output, defaultFilterConfigValue, identityCurve(), 100.0f,
+                               masks);
+  imageVibranceLabAndToneCurve(inPlace, inPlace, defaultFilterConfigValue, identityCurve(), 100.0f,
+                               masks);
+  EXPECT_EQ(fingerprint(inPlace), fingerprint(output));
+}
+
+TEST(LabTonePass, MovesTowardTheToneMappedBaseWhereTheMaskIsOne) {
+  const auto photo = photoLikePicture(48, 48, 8);
+  ImageMasks<float, float> masks;
+  computeImageMasks(photo, {}, defaultFilterConfigValue, masks);
+  masks.ltmMask->set(1.0f);
+  FilterConfig config = defaultFilterConfigValue;
+  config.ltmBlend = 1.0f;
+  config.vibrance = 1.0f;
+  Image<RGBA8Pixel> output(48, 48);
+  const std::vector<float> curve = identityCurve();
+  imageVibranceLabAndToneCurve(photo, output, config, curve, 100.0f, masks);
+  for (std::size_t i = 0; i < photo.pixelCount(); ++i) {
+    const RGBA8Pixel& in = photo.data.get()[i];
+    const Lab lab = rgbToLab(in.r, in.g, in.b);
+    RGBA8Pixel expected = in;
+    std::vector<float> scaled = curve;
+    for (float& sample : scaled) sample *= 100.0f;
+    const float base =
+        applyToneCurve(100.0f * masks.bilateralMask->data.get()[i], scaled, 50, 0.5f);
+    labToRgb({std::min(base, 100.0f), lab.a, lab.b}, expected.r, expected.g, expected.b);
+    vibranceInRGB(1.0f, expected.r, expected.g, expected.b);
+    ASSERT_EQ(output.data.get()[i], expected);
+  }
+}
+
+TEST(LabTonePass, GivesTheSameBytesForNaNEverywhere) {
+  const auto photo = photoLikePicture(24, 16, 9);
+  ImageMasks<float, float> masks;
+  computeImageMasks(photo, {}, defaultFilterConfigValue, masks);
+  FilterConfig config = defaultFilterConfigValue;
+  config.ltmBlend = config.detailGain = std::nanf("");
+  Image<RGBA8Pixel> output(24, 16);
+  imageVibranceLabAndToneCurve(photo, output, config, std::vector<float>(51, std::nanf("")), 100.0f,
+                               masks);
+  // NaN reads the first sample of every table.
+  RGBA8Pixel expected{0, 0, 0, 0};
+  labToRgb({std::nanf(""), 0.0f, 0.0f}, expected.r, expected.g, expected.b);
+  vibranceInRGB(1.0f, expected.r, expected.g, expected.b);
+  for (std::size_t i = 0; i < output.pixelCount(); ++i) {
+    expected.a = photo.data.get()[i].a;
+    ASSERT_EQ(output.data.get()[i], expected);
+  }
+}
+
+}  // namespace
+}  // namespace pelorin::image_processing

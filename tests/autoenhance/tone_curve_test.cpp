@@ -1,0 +1,139 @@
+#include "image_processing/autoenhance/tone_curve.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <limits>
+#include <numeric>
+
+#include "image_processing/autoenhance/build_tone_curve.h"
+#include "image_processing/autoenhance/cdf.h"
+#include "tests/support/pictures.h"
+
+namespace pelorin::image_processing {
+namespace {
+
+std::vector<float> identity(int samples) {
+  std::vector<float> curve(samples);
+  for (int i = 0; i < samples; ++i) curve[i] = static_cast<float>(i) / (samples - 1);
+  return curve;
+}
+
+/// A CDF whose mass lies at the dark end.
+std::vector<float> darkCurve(int samples) {
+  std::vector<float> curve = identity(samples);
+  for (float& y : curve) y = y * y;
+  return curve;
+}
+
+TEST(ToneCurve, ReturnsTheFirstSampleAtZeroAndTheLastAtTheTop) {
+  const std::vector<float> curve = {3.0f, 5.0f, 11.0f};
+  EXPECT_EQ(applyToneCurve(0.0f, curve, 2, 0.5f), 3.0f);
+  EXPECT_EQ(applyToneCurve(4.0f, curve, 2, 0.5f), 11.0f);
+}
+
+TEST(ToneCurve, InterpolatesBetweenSamples) {
+  const std::vector<float> curve = {3.0f, 5.0f, 11.0f};
+  EXPECT_EQ(applyToneCurve(1.0f, curve, 2, 0.5f), 4.0f);
+  EXPECT_EQ(applyToneCurve(3.0f, curve, 2, 0.5f), 8.0f);
+}
+
+TEST(ToneCurve, ReadsNoSampleOutsideItself) {
+  const std::vector<float> curve = {3.0f, 5.0f, 11.0f};  // a sanitizer watches the ends
+  EXPECT_NEAR(applyToneCurve(1e9f, curve, 2, 0.5f), 11.0f, 1e-5f);
+  EXPECT_NEAR(applyToneCurve(-77.5f, curve, 2, 0.5f), 3.0f, 1e-5f);
+  EXPECT_EQ(applyToneCurve(-1.0f, curve, 2, 0.5f), 2.0f);  // half a sample below 0
+  EXPECT_TRUE(std::isnan(applyToneCurve(std::nanf(""), curve, 2, 0.5f)));
+  for (const float x : {std::numeric_limits<float>::infinity(), 3.4e38f, -3.4e38f}) {
+    static_cast<void>(applyToneCurve(x, curve, 2, 0.5f));
+    static_cast<void>(applyToneCurve(-x, curve, 2, 0.5f));
+  }
+}
+
+TEST(BuildToneCurve, IsTheIdentityAtSliderZeroAndStaysItThroughTheMassage) {
+  ImageStatistics statistics;
+  statistics.cdf = darkCurve(51);
+  FilterConfig config = defaultFilterConfigValue;
+  updateFilterConfigForSliderValue(0.0f, &config);
+  const std::vector<float> curve = buildToneCurve(statistics, config);
+  for (int i = 0; i < 51; ++i) EXPECT_NEAR(curve[i], i / 50.0f, 2e-6f) << i;
+}
+
+TEST(BuildToneCurve, NeverDecreasesAndRunsFromZeroToOne) {
+  for (int seed = 0; seed < 4; ++seed) {
+    ImageStatistics statistics;
+    analyzeImage(test_support::photoLikePicture(80, 60, seed), {}, statistics);
+    for (const float slider : {0.0f, 0.2f, 0.5f, 1.0f}) {
+      FilterConfig config = defaultFilterConfigValue;
+      updateFilterConfigForSliderValue(slider, &config);
+      const std::vector<float> curve = buildToneCurve(statistics, config);
+      EXPECT_EQ(curve.front(), 0.0f);
+      EXPECT_NEAR(curve.back(), 1.0f, 1e-5f);
+      for (int i = 1; i < 51; ++i) EXPECT_GE(curve[i], curve[i - 1]);
+    }
+  }
+}
+
+TEST(UpdateCurveForFaces, ChangesNothingWithoutAFaceOrATarget) {
+  const std::vector<float> before = darkCurve(51);
+  std::vector<float> curve = before;
+  updateCurveForFaces(0.5f, -1, curve);
+  updateCurveForFaces(0.0f, 20, curve);
+  updateCurveForFaces(-1.0f, 20, curve);
+  updateCurveForFaces(std::nanf(""), 20, curve);
+  updateCurveForFaces(0.5f, 50, curve);  // no bin of the curve
+  EXPECT_EQ(curve, before);
+}
+
+TEST(UpdateCurveForFaces, ChangesNothingWhenTheTargetIsMet) {
+  const std::vector<float> before = darkCurve(51);
+  std::vector<float> curve = before;
+  updateCurveForFaces(0.15f, 20, curve);  // (20/50)² = 0.16
+  EXPECT_EQ(curve, before);
+}
+
+TEST(UpdateCurveForFaces, LiftsTheFaceMedianTowardTheTargetAndKeepsTheMass) {
+  std::vector<float> curve = darkCurve(51);
+  updateCurveForFaces(0.15f, 10, curve);  // (10/50)² = 0.04
+  EXPECT_GT(curve[10], 0.13f);
+  EXPECT_NEAR(curve[50], 1.0f, 1e-5f);
+  for (int i = 1; i < 51; ++i) EXPECT_GE(curve[i], curve[i - 1]);
+}
+
+TEST(UpdateCurveForFaces, MovesNothingIntoTheLastBin) {
+  std::vector<float> curve = darkCurve(51);
+  for (float& y : curve) y *= 0.1f;
+  const std::vector<float> before = curve;
+  updateCurveForFaces(0.15f, 49, curve);
+  for (int i = 0; i < 51; ++i) EXPECT_NEAR(curve[i], before[i], 1e-6f) << i;
+}
+
+TEST(CurveMassage, HoldsTheSlopeNearItsBounds) {
+  std::vector<float> curve(51, 1.0f);  // all mass in the first bin
+  curve[0] = 0.0f;
+  curveMassage(curve, 0.75f, 8.0f, 20);
+  std::vector<float> histogram;
+  computeHistogramFromCDF(curve, histogram);
+  EXPECT_NEAR(curve[50], 1.0f, 1e-5f);
+  for (const float share : histogram) {
+    EXPECT_GT(share, 0.7f / 50);
+    EXPECT_LT(share, 8.1f / 50);
+  }
+}
+
+TEST(CurveMassage, KeepsTheClampedHistogramFromRoundToRound) {
+  std::vector<float> once = darkCurve(51), twice = once;
+  curveMassage(once, 0.75f, 8.0f, 1);
+  curveMassage(twice, 0.75f, 8.0f, 2);
+  EXPECT_NE(once, twice);
+}
+
+TEST(CurveMassage, GivesDefinedNumbersForNaN) {
+  std::vector<float> curve(51, std::nanf(""));
+  curveMassage(curve, 0.75f, 8.0f, 20);
+  EXPECT_EQ(curve[0], 0.0f);
+  EXPECT_TRUE(std::isnan(curve[50]));
+}
+
+}  // namespace
+}  // namespace pelorin::image_processing

@@ -1,0 +1,172 @@
+#include "image_processing/filters/filtered_image.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <boost/lexical_cast.hpp>
+#include <cstring>
+#include <mutex>
+#include <stdexcept>
+#include <thread>
+#include <vector>
+
+#include "image_processing/filters/default_filter_factory.h"
+#include "tests/support/fingerprint.h"
+#include "tests/support/pictures.h"
+
+namespace pelorin::image_processing {
+namespace {
+
+using test_support::fingerprint;
+using test_support::flatPicture;
+using test_support::noisePicture;
+using test_support::photoLikePicture;
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+/// What the recording filters of all sessions were asked to do.
+struct Log {
+  std::vector<std::string> inits, applications;
+  int made = 0;
+  bool failInit = false;
+};
+Log* currentLog = nullptr;
+
+class RecordingFilter : public AbstractFilter {
+ public:
+  explicit RecordingFilter(std::shared_ptr<FilteredImageState> state)
+      : AbstractFilter(std::move(state)) {
+    ++currentLog->made;
+  }
+  void init(const std::string& params) override {
+    if (currentLog->failInit) throw std::out_of_range("map::at");
+    currentLog->inits.push_back(params);
+  }
+  void applyConfig(const std::string& params, const FilterConfig&,
+                   Image<RGBA8Pixel>& output) override {
+    currentLog->applications.push_back(params);
+    output.data.get()[0] = state->image->data.get()[0];
+  }
+};
+
+class FilteredImageTest : public testing::Test {
+ protected:
+  FilteredImageTest() {
+    currentLog = &log;
+    factory->addFilterDescription(&description);
+  }
+
+  Log log;
+  ConcreteDescription<RecordingFilter> description{"Recording", "", ""};
+  std::shared_ptr<FilterFactory> factory = std::make_shared<FilterFactory>();
+  std::shared_ptr<Image<RGBA8Pixel>> image =
+      std::make_shared<Image<RGBA8Pixel>>(noisePicture(8, 6, 1));
+};
+
+TEST_F(FilteredImageTest, InitialisesAFilterOnceAndThenOnlyAppliesIt) {
+  FilteredImage session(image, {}, "", defaultFilterConfigValue, factory);
+  Image<RGBA8Pixel> output(8, 6);
+  EXPECT_TRUE(session.applyFilterWithParams("Recording", "slider=0.4;", {}, output));
+  EXPECT_TRUE(session.applyFilterWithParams("Recording", "slider=0.9;", {}, output));
+  EXPECT_EQ(log.made, 1);
+  EXPECT_THAT(log.inits, ElementsAre("slider=0.4;"));
+  EXPECT_THAT(log.applications, ElementsAre("slider=0.4;", "slider=0.9;"));
+}
+
+TEST_F(FilteredImageTest, LeavesTheOutputUntouchedForAnUnknownName) {
+  FilteredImage session(image, {}, "", defaultFilterConfigValue, factory);
+  Image<RGBA8Pixel> output = flatPicture(8, 6, {1, 2, 3, 4});
+  const std::string before = fingerprint(output);
+  EXPECT_FALSE(session.applyFilterWithParams("NoSuchFilter", "slider=0.4;", {}, output));
+  EXPECT_EQ(fingerprint(output), before);
+  EXPECT_EQ(session.setupFilter("NoSuchFilter", ""), nullptr);
+  // An unknown name is not remembered: registered later, it is found.
+  ConcreteDescription<RecordingFilter> late("NoSuchFilter", "", "");
+  factory->addFilterDescription(&late);
+  EXPECT_TRUE(session.applyFilterWithParams("NoSuchFilter", "", {}, output));
+}
+
+TEST_F(FilteredImageTest, TriesAgainAfterAnInitThatThrew) {
+  FilteredImage session(image, {}, "", defaultFilterConfigValue, factory);
+  Image<RGBA8Pixel> output(8, 6);
+  log.failInit = true;
+  EXPECT_THROW(session.applyFilterWithParams("Recording", "a", {}, output), std::out_of_range);
+  log.failInit = false;
+  EXPECT_TRUE(session.applyFilterWithParams("Recording", "b", {}, output));
+  EXPECT_EQ(log.made, 2);
+  EXPECT_THAT(log.inits, ElementsAre("b"));
+}
+
+TEST_F(FilteredImageTest, LeavesAFilterUsableThatOutlivesIt) {
+  auto session = std::make_unique<FilteredImage>(image, ImageMetadata{}, "",
+                                                 defaultFilterConfigValue, factory);
+  const auto filter = session->setupFilter("Recording", "");
+  session.reset();
+  Image<RGBA8Pixel> output(8, 6);
+  filter->applyConfig("late", {}, output);
+  EXPECT_EQ(output.data.get()[0], image->data.get()[0]);
+}
+
+TEST_F(FilteredImageTest, SharesTheSourceImageAndTheFactory) {
+  const FilteredImage session(image, {}, "", defaultFilterConfigValue, factory);
+  EXPECT_EQ(image.use_count(), 2);
+  EXPECT_EQ(factory.use_count(), 2);
+}
+
+TEST_F(FilteredImageTest, MakesAtLeastOneFilterAndCachesOneWhenThreadsMissTogether) {
+  // PassThrough keeps no record, so this also runs clean under a thread sanitizer.
+  FilteredImage session(image, {}, "", defaultFilterConfigValue,
+                        DefaultFilterFactory::filterFactory());
+  std::vector<Image<RGBA8Pixel>> outputs;
+  for (int i = 0; i < 8; ++i) outputs.emplace_back(8, 6);
+  std::vector<std::thread> threads;
+  for (auto& output : outputs) {
+    threads.emplace_back([&session, &output] {
+      for (int i = 0; i < 20; ++i) session.applyFilterWithParams("PassThrough", "", {}, output);
+    });
+  }
+  for (std::thread& thread : threads) thread.join();
+  for (const auto& output : outputs) EXPECT_EQ(fingerprint(output), fingerprint(*image));
+  EXPECT_EQ(session.setupFilter("PassThrough", ""), session.setupFilter("PassThrough", ""));
+}
+
+TEST(FilteredImage, PassThroughGivesACopyOfTheSource) {
+  auto image = std::make_shared<Image<RGBA8Pixel>>(noisePicture(31, 17, 5));
+  FilteredImage session(image, {}, "", defaultFilterConfigValue,
+                        DefaultFilterFactory::filterFactory());
+  Image<RGBA8Pixel> output(31, 17);
+  EXPECT_TRUE(session.applyFilterWithParams("PassThrough", "", defaultFilterConfigValue, output));
+  EXPECT_EQ(fingerprint(output), fingerprint(*image));
+}
+
+TEST(FilteredImage, ServesSeveralThreadsWithTheSameBytesAsOne) {
+  auto image = std::make_shared<Image<RGBA8Pixel>>(photoLikePicture(120, 90, 7));
+  const std::vector<std::string> filters = {"AE0", "AE08bit", "PassThrough"};
+  const std::vector<std::string> params = {"slider=0.2;", "slider=0.9;"};
+  const auto applied = [&](FilteredImage& session, std::size_t i) {
+    Image<RGBA8Pixel> output(120, 90);
+    session.applyFilterWithParams(filters[i % 3], params[i % 2], defaultFilterConfigValue, output);
+    return fingerprint(output);
+  };
+  std::vector<std::string> expected;
+  {
+    FilteredImage alone(image, {}, "", defaultFilterConfigValue,
+                        DefaultFilterFactory::filterFactory());
+    for (std::size_t i = 0; i < 6; ++i) expected.push_back(applied(alone, i));
+  }
+  FilteredImage shared(image, {}, "", defaultFilterConfigValue,
+                       DefaultFilterFactory::filterFactory());
+  std::vector<std::string> results(24);
+  std::vector<std::thread> threads;
+  for (std::size_t t = 0; t < 4; ++t) {
+    threads.emplace_back([&, t] {
+      for (std::size_t i = t; i < results.size(); i += 4) results[i] = applied(shared, i);
+    });
+  }
+  for (std::thread& thread : threads) thread.join();
+  for (std::size_t i = 0; i < results.size(); ++i) EXPECT_EQ(results[i], expected[i % 6]) << i;
+}
+
+}  // namespace
+}  // namespace pelorin::image_processing
