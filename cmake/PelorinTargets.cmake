@@ -33,16 +33,22 @@ function(pelorin_library name)
   target_link_libraries(${target} PUBLIC ${arg_DEPENDS})
 endfunction()
 
-# pelorin_test(<name> [SOURCES ...] DEPENDS ...): the tests in <name>.cpp, run by ctest one by one.
+# pelorin_test(<name> [THREADS] [SOURCES ...] DEPENDS ...): the tests in <name>.cpp, run by ctest one
+# by one. THREADS marks tests that start threads: the thread sanitizer's run builds and runs those.
 function(pelorin_test name)
-  cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "SOURCES;DEPENDS")
+  cmake_parse_arguments(PARSE_ARGV 1 arg "THREADS" "" "SOURCES;DEPENDS")
   if(NOT arg_SOURCES)
     set(arg_SOURCES ${name}.cpp)
   endif()
   add_executable(${name} ${arg_SOURCES})
   target_link_libraries(${name} PRIVATE ${arg_DEPENDS} pelorin_test_support GTest::gmock_main)
+  set(labels "")
+  if(arg_THREADS)
+    set(labels LABELS threads)
+    add_dependencies(thread_tests ${name})
+  endif()
   gtest_discover_tests(${name} DISCOVERY_MODE PRE_TEST DISCOVERY_TIMEOUT 60
-                       PROPERTIES TIMEOUT 600)
+                       PROPERTIES TIMEOUT 600 ${labels})
 endfunction()
 
 # pelorin_bench(<name> DEPENDS ...): the benchmarks in <name>.cpp.

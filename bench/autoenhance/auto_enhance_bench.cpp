@@ -1,0 +1,68 @@
+// What a user waits for: preparing a photo once, then one application a slider position.
+#include <benchmark/benchmark.h>
+
+#include "bench/support/per_pixel.h"
+#include "image_processing/autoenhance/auto_enhance_filter.h"
+#include "tests/support/pictures.h"
+
+namespace pelorin::bench {
+namespace {
+
+using namespace image_processing;
+
+/// Half, one, two and twelve megapixels.
+const Image<RGBA8Pixel>& photoOf(std::int64_t megapixelsTimesTwo) {
+  static const Image<RGBA8Pixel> half = test_support::photoLikePicture(816, 612, 1);
+  static const Image<RGBA8Pixel> one = test_support::photoLikePicture(1152, 864, 1);
+  static const Image<RGBA8Pixel> two = test_support::photoLikePicture(1632, 1224, 1);
+  switch (megapixelsTimesTwo) {
+    case 1:
+      return half;
+    case 2:
+      return one;
+    case 4:
+      return two;
+    default:
+      return twelveMegapixels();
+  }
+}
+
+std::shared_ptr<FilteredImageState> stateOf(const Image<RGBA8Pixel>& photo) {
+  return std::make_shared<FilteredImageState>(FilteredImageState{
+      std::make_shared<Image<RGBA8Pixel>>(photo), {}, "", defaultFilterConfigValue});
+}
+
+template <typename Filter>
+void init(benchmark::State& state) {
+  const Image<RGBA8Pixel>& photo = photoOf(state.range(0));
+  const auto shared = stateOf(photo);
+  for (auto _ : state) {
+    Filter filter(shared);
+    filter.init("");
+    benchmark::ClobberMemory();
+  }
+  reportPerPixel(state, photo.pixelCount());
+}
+
+template <typename Filter>
+void applyConfig(benchmark::State& state) {
+  const Image<RGBA8Pixel>& photo = photoOf(state.range(0));
+  Filter filter(stateOf(photo));
+  filter.init("");
+  Image<RGBA8Pixel> output(photo.width, photo.height);
+  for (auto _ : state) {
+    filter.applyConfig("slider=0.4;", defaultFilterConfigValue, output);
+    benchmark::ClobberMemory();
+  }
+  reportPerPixel(state, photo.pixelCount());
+}
+
+#define AT_EVERY_SIZE \
+  ArgName("MPx2")->Arg(1)->Arg(2)->Arg(4)->Arg(24)->Unit(benchmark::kMillisecond)
+BENCHMARK(init<AEFilter>)->AT_EVERY_SIZE;
+BENCHMARK(init<AEFilter8bit>)->AT_EVERY_SIZE;
+BENCHMARK(applyConfig<AEFilter>)->AT_EVERY_SIZE;
+BENCHMARK(applyConfig<AEFilter8bit>)->AT_EVERY_SIZE;
+
+}  // namespace
+}  // namespace pelorin::bench
