@@ -1,5 +1,6 @@
 #pragma once
 
+#include <algorithm>
 #include <array>
 #include <cstdint>
 
@@ -23,6 +24,13 @@ class Uint8_Gamma_sRGB_Table {
     if (index < 0) return 0;
     if (index > static_cast<std::int32_t>(maxIndex)) return 255;
     return codes_[index];
+  }
+
+  /// The codes by step, each in a word of its own.
+  std::array<std::int32_t, 1024> widened() const {
+    std::array<std::int32_t, 1024> words;
+    std::copy(codes_.begin(), codes_.end(), words.begin());
+    return words;
   }
 
  private:
