@@ -39,7 +39,7 @@ Ggd fitGgd(const BlockSums& sums, float count) {
   const float g = leftDeviation / rightDeviation;
   const float g2 = g * g;
   const float g3 = g2 * g;
-  const float g4 = g3 * g;
+  const float g4 = g2 * g2;
   const float mean = sums.absolute / count;
   const float ratio =
       mean * mean / (sums.squares / count) * (((g4 + g3) + g) + 1.0f) / ((g4 + (g2 + g2)) + 1.0f);
