@@ -3,7 +3,9 @@
 #include <mutex>
 
 #include "image_processing/autoenhance/auto_enhance_filter.h"
+#include "image_processing/filters/low_dim_rgb_curve_filter.h"
 #include "image_processing/filters/pass_through.h"
+#include "image_processing/filters/preset_looks.h"
 
 namespace pelorin::image_processing {
 
@@ -12,11 +14,28 @@ DefaultFilterFactory::DefaultFilterFactory() {
                                                   "Auto-enhance with 8-bit masks.");
   static ConcreteDescription<AEFilter> ae(
       "AE0", "Auto", "Original auto-enhance. Parameters: \"slider=0.4;\" sets slider to 0.4");
+  static ConcreteDescription<ZebraBWFilter> zebraBW(
+      "ZebraBW", "Snow", "Black-and-white filter with softlight radial vignette.");
+  static ConcreteDescription<SummerRGBFilter> summerRGB("SummerRGB", "Summer",
+                                                        "A light filter with hints of raspberry.");
+  static ConcreteDescription<SpringRGBFilter> springRGB("SpringRGB", "Spring",
+                                                        "Warm filter with radial vignette.");
+  static ConcreteDescription<FallRGBFilter> fallRGB("FallRGB", "Fall",
+                                                    "A bright and energetic filter.");
+  static ConcreteDescription<VintageRGBFilter> vintageRGB("VintageRGB", "Vintage",
+                                                          "Filter that gives a 'vintage' effect.");
+  static ConcreteDescription<WinterRGBFilter> winterRGB(
+      "WinterRGB", "Winter", "Cool filter with softlight radial vignette.");
+  static ConcreteDescription<LowDimRGBCurveFilter> lowDimRGBCurve(
+      "LowDimRGBCurve", "StarFish",
+      "RGB Curve filter with four parameters, s1, s2, s3, and s4. Each should be in range [0,1]. "
+      "Set all to 0.5 for the filter that makes minimal changes.");
   static ConcreteDescription<PassThrough> passThrough(
       "PassThrough", "Original", "Pass through filter, no changes are made to the image");
 
-  for (FilterDescription* description :
-       std::initializer_list<FilterDescription*>{&ae8bit, &ae, &passThrough}) {
+  for (FilterDescription* description : std::initializer_list<FilterDescription*>{
+           &ae8bit, &ae, &zebraBW, &summerRGB, &springRGB, &fallRGB, &vintageRGB, &winterRGB,
+           &lowDimRGBCurve, &passThrough}) {
     addFilterDescription(description);
   }
 }

@@ -1,0 +1,72 @@
+#include "image_processing/filters/default_filter_factory.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+#include "tests/support/looks.h"
+#include "tests/support/pictures.h"
+
+namespace pelorin::image_processing {
+namespace {
+
+struct Row {
+  const char *name, *displayName, *description;
+};
+
+constexpr Row lookRows[] = {
+    {"ZebraBW", "Snow", "Black-and-white filter with softlight radial vignette."},
+    {"SummerRGB", "Summer", "A light filter with hints of raspberry."},
+    {"SpringRGB", "Spring", "Warm filter with radial vignette."},
+    {"FallRGB", "Fall", "A bright and energetic filter."},
+    {"VintageRGB", "Vintage", "Filter that gives a 'vintage' effect."},
+    {"WinterRGB", "Winter", "Cool filter with softlight radial vignette."},
+    {"LowDimRGBCurve", "StarFish",
+     "RGB Curve filter with four parameters, s1, s2, s3, and s4. Each should be in range [0,1]. "
+     "Set all to 0.5 for the filter that makes minimal changes."},
+};
+
+TEST(DefaultFilterFactory, DescribesEveryLook) {
+  const auto factory = DefaultFilterFactory::filterFactory();
+  for (const Row& row : lookRows) {
+    const FilterDescription* description = factory->find(row.name);
+    ASSERT_NE(description, nullptr) << row.name;
+    EXPECT_EQ(description->name, row.name);
+    EXPECT_EQ(description->displayName, row.displayName);
+    EXPECT_EQ(description->description, row.description);
+  }
+}
+
+TEST(DefaultFilterFactory, MakesEveryLook) {
+  const Image<RGBA8Pixel> picture = test_support::photoLikePicture(20, 10, 1);
+  for (const Row& row : lookRows) {
+    auto state = test_support::stateOf(picture);
+    const auto filter = DefaultFilterFactory::filterFactory()->find(row.name)->makeFilter(state);
+    filter->init("");
+    const Image<RGBA8Pixel> output = test_support::applied(*filter, 20, 10, "");
+    EXPECT_EQ(output.row(9)[19].a, picture.row(9)[19].a) << row.name;
+  }
+}
+
+TEST(DefaultFilterFactory, HoldsExactlyTenFilters) {
+  std::vector<std::string> names = {"AE08bit", "AE0", "PassThrough"};
+  for (const Row& row : lookRows) names.push_back(row.name);
+  std::vector<std::string> held;
+  for (const auto& [name, description] : DefaultFilterFactory::filterFactory()->descriptions) {
+    EXPECT_EQ(description->name, name);
+    held.push_back(name);
+  }
+  EXPECT_EQ(held.size(), 10u);
+  EXPECT_THAT(held, testing::UnorderedElementsAreArray(names));
+}
+
+TEST(DefaultFilterFactory, DoesNotFindALookByItsDisplayName) {
+  for (const Row& row : lookRows) {
+    EXPECT_EQ(DefaultFilterFactory::filterFactory()->find(row.displayName), nullptr);
+  }
+}
+
+}  // namespace
+}  // namespace pelorin::image_processing
