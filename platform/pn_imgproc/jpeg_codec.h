@@ -6,8 +6,9 @@
 #include <memory>
 #include <span>
 #include <stdexcept>
-#include <string>
 #include <vector>
+
+#include "platform/pn_imgproc/file_io.h"  // IWYU pragma: export
 
 namespace pelorin::imgproc {
 
@@ -22,6 +23,7 @@ class JpegError : public std::runtime_error {
 };
 
 /// One APPn or COM segment: `marker` 0xE0 ... 0xEF or 0xFE, `payload` what follows its length.
+/// Metadata longer than a segment (large profiles, extended XMP) comes as several of them.
 struct MetadataSegment {
   std::uint8_t marker;
   std::vector<std::uint8_t> payload;
@@ -30,14 +32,19 @@ struct MetadataSegment {
 /// What a JPEG file says before its picture data.
 struct JpegHeader {
   std::uint32_t width, height;
-  int components;  ///< 1 grey, 3 colour, 4 CMYK or YCCK.
+  /// 1 grey, 3 colour, 4 CMYK or YCCK. An ICC profile among `metadata` (APP2 "ICC_PROFILE") is one
+  /// for that many channels: with 1 and 4 it does not describe decoded pixels and must not be
+  /// written with them.
+  int components;
   bool progressive;
-  std::vector<MetadataSegment> metadata;  ///< In file order; JFIF and Adobe segments left out.
+  /// In file order. Adobe segments are left out: they tell a decoder how this file is coded.
+  std::vector<MetadataSegment> metadata;
 };
 
+/// How much work a file may ask for; checked before anything of the picture's size is allocated.
 struct DecodeLimits {
-  std::uint64_t pixels = 268'435'456;  ///< Checked against the header before anything is allocated.
-  int progressiveScans = 100;
+  std::uint64_t pixels = 268'435'456;  ///< As the file stores them, before any scaling.
+  int scans = 100;                     ///< Of progressive and other files of several scans.
 };
 
 /// RGBA pixels, rows back to back, alpha 255; released with `free`.
@@ -52,36 +59,35 @@ struct DecodedPicture {
 /// @throws JpegError when the bytes are no JPEG file or end within the header.
 JpegHeader readJpegHeader(std::span<const std::uint8_t> file);
 
-/// Decodes to RGBA, grey and CMYK/YCCK included.
+/// Decodes to RGBA, grey and CMYK/YCCK included. CMYK becomes sRGB through the profile in the file
+/// where there is a usable one, otherwise each channel is the light that ink and black let through.
 /// @param scale  1 or less is full size, otherwise the divisor, rounded down to a power of two, at
-///               most 8.
-/// @throws JpegError when the file is damaged, truncated or beyond the limits: there is no
-///         half-grey picture.
+///               most 8; sizes are rounded up.
+/// @throws JpegError when the file is damaged, truncated, of an unsupported kind (lossless, more
+///         than 8 bits, two or five channels) or beyond the limits: there is no half-grey picture.
+///         What a file holds after its end mark is no concern, and neither are stray bytes between
+///         complete scans.
 DecodedPicture decodeJpeg(std::span<const std::uint8_t> file, int scale = 1,
                           const DecodeLimits& limits = {});
 
-/// Encodes RGBA pixels (alpha is ignored), 4:2:0 baseline with optimised tables, `metadata` written
-/// as it is.
-/// @param quality  1 ... 100.
-/// @throws JpegError when a side is 0 or above 65500 or a segment is over 65533 bytes.
+/// Encodes RGBA pixels (alpha is ignored) as a baseline file, 4:2:0 with the standard Huffman
+/// tables: tables of its own would save a few percent and more than double the time.
+/// @param quality   1 ... 100; what lies outside counts as the nearer end.
+/// @param metadata  written as it is, in this order. A JFIF segment is added in front when it has
+///                  neither a JFIF nor an Exif one.
+/// @throws JpegError when a side is 0 or above 65500, or a segment is over 65533 bytes or neither
+///         APPn nor COM.
 std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t width,
                                      std::uint32_t height, int quality,
                                      std::span<const MetadataSegment> metadata = {});
 
-/// Turns a JPEG file clockwise without decoding its blocks; partial edge blocks that cannot be
-/// moved are trimmed, metadata is kept as it is.
-/// @param degrees  a multiple of 90, taken modulo 360.
-/// @throws JpegError for other angles and for damaged files.
+/// Turns a JPEG file clockwise without decoding its blocks. Partial blocks that cannot be moved are
+/// trimmed from the edge; a progressive file stays one. Metadata is kept as it is, but for the size
+/// that Exif records, which follows the picture.
+/// @param degrees  a multiple of 90, taken modulo 360; 0 gives the bytes of `file`.
+/// @throws JpegError for other angles, for what decodeJpeg refuses, and for chroma subsampling
+///         other than 4:4:4, 4:2:2, 4:2:0, 4:4:0 and 4:1:1.
 std::vector<std::uint8_t> rotateJpeg(std::span<const std::uint8_t> file, int degrees,
                                      const DecodeLimits& limits = {});
-
-/// A whole file in memory.
-/// @throws std::system_error when it cannot be opened or read (a directory included).
-std::vector<std::uint8_t> readFile(const std::string& path);
-
-/// Replaces `path` in one step: writes a temporary in the same folder, then renames it. On failure
-/// the old file is untouched and nothing is left behind.
-/// @throws std::system_error when it cannot be written.
-void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes);
 
 }  // namespace pelorin::imgproc
