@@ -1,0 +1,14 @@
+#pragma once
+
+namespace pelorin::cli {
+
+/// What the command leaves to the shell.
+enum class ExitCode {
+  allDone = 0,
+  someFailed = 1,    ///< At least one file was not done; each has a line on stderr.
+  usage = 2,         ///< The command line was refused before any work.
+  nothingToDo = 3,   ///< No input, or every output exists already.
+  interrupted = 130  ///< Ctrl-C; finished files stand, nothing is half-written.
+};
+
+}  // namespace pelorin::cli

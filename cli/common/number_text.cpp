@@ -1,0 +1,37 @@
+#include "cli/common/number_text.h"
+
+#include <fmt/format.h>
+
+#include <charconv>
+#include <cmath>
+#include <cstdlib>
+
+#include "cli/common/errors.h"
+
+namespace pelorin::cli {
+
+float readFiniteNumber(const std::string& what, std::string_view text) {
+  float number = 0.0f;
+  const char* end = text.data() + text.size();
+  const std::from_chars_result result = std::from_chars(text.data(), end, number);
+  if (result.ec != std::errc() || result.ptr != end || !std::isfinite(number)) {
+    throw UsageError(what + ": '" + std::string(text) + "' is not a number");
+  }
+  return number;
+}
+
+std::uint32_t readPositiveInteger(const std::string& what, std::string_view text) {
+  std::uint32_t number = 0;
+  const char* end = text.data() + text.size();
+  const std::from_chars_result result = std::from_chars(text.data(), end, number);
+  if (result.ec != std::errc() || result.ptr != end || number == 0) {
+    throw UsageError(what + ": '" + std::string(text) + "' is not a whole number above 0");
+  }
+  return number;
+}
+
+double nineDigits(float value) {
+  return std::strtod(fmt::format("{:.9g}", value).c_str(), nullptr);
+}
+
+}  // namespace pelorin::cli

@@ -1,0 +1,68 @@
+#include "cli/common/photo.h"
+
+#include <span>
+#include <utility>
+
+#include "cli/common/errors.h"
+#include "cli/common/exif_orientation.h"
+#include "cli/common/file_bytes.h"
+#include "cli/common/interrupt.h"
+#include "cli/common/kept_metadata.h"
+#include "cli/common/turn.h"
+
+namespace pelorin::cli {
+namespace {
+
+using image_processing::Image;
+using image_processing::RGBA8Pixel;
+
+// The decoder's buffer becomes the image's: no second copy of the pixels exists.
+std::shared_ptr<Image<RGBA8Pixel>> imageOf(imgproc::DecodedPicture decoded) {
+  const std::shared_ptr<std::uint8_t> bytes = std::move(decoded.pixels);
+  return std::make_shared<Image<RGBA8Pixel>>(
+      decoded.width, decoded.height,
+      std::shared_ptr<RGBA8Pixel>(bytes, reinterpret_cast<RGBA8Pixel*>(bytes.get())));
+}
+
+}  // namespace
+
+JpegFacts readFacts(const imgproc::JpegHeader& header) {
+  JpegFacts facts = {header.width, header.height, header.components, header.progressive, 1, {}};
+  if (const imgproc::MetadataSegment* exif = firstExif(header.metadata)) {
+    facts.orientation = exifOrientation(exif->payload);
+    facts.captureTime = exifCaptureTime(exif->payload);
+  }
+  return facts;
+}
+
+Photo loadPhoto(const Input& input, const PhotoOptions& options) {
+  Photo photo;
+  Turn turn;
+  if (options.raw) {
+    photo.image = readRawPixels(input, *options.raw);
+  } else {
+    const std::vector<std::uint8_t> file = readInput(input);
+    stopIfInterrupted();
+    if (file.empty()) throw FileError("is empty, not a JPEG file");
+    imgproc::JpegHeader header = imgproc::readJpegHeader(file);
+    photo.facts = readFacts(header);
+    photo.metadata = keptMetadata(std::move(header));
+    photo.image = imageOf(imgproc::decodeJpeg(file, options.scale));
+    turn = uprightTurn(photo.facts->orientation);
+  }
+  stopIfInterrupted();
+  photo.image = turned(photo.image, turnedFurther(turn, options.rotate));
+  return photo;
+}
+
+void savePicture(const std::string& path, const Image<RGBA8Pixel>& picture, bool raw, int quality,
+                 const std::vector<imgproc::MetadataSegment>& metadata) {
+  const auto* pixels = reinterpret_cast<const std::uint8_t*>(picture.data.get());
+  if (raw) return writeOutput(path, {pixels, picture.byteSize()});
+  const std::vector<std::uint8_t> file =
+      imgproc::encodeJpeg(pixels, picture.width, picture.height, quality, metadata);
+  stopIfInterrupted();
+  writeOutput(path, file);
+}
+
+}  // namespace pelorin::cli

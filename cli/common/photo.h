@@ -1,0 +1,51 @@
+#pragma once
+
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <vector>
+
+#include "cli/common/capture_time.h"
+#include "cli/common/inputs.h"
+#include "cli/common/raw_pixels.h"
+#include "image_processing/core/image.h"
+#include "platform/pn_imgproc/jpeg_codec.h"
+
+namespace pelorin::cli {
+
+/// What a JPEG file says of itself; the size is the stored one, before scaling and turning.
+struct JpegFacts {
+  std::uint32_t width, height;
+  int components;
+  bool progressive;
+  int orientation;  ///< EXIF, 1 ... 8.
+  std::optional<CaptureTime> captureTime;
+};
+
+/// A decoded picture, upright.
+struct Photo {
+  std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> image;
+  std::optional<JpegFacts> facts;                  ///< None for raw pixels.
+  std::vector<imgproc::MetadataSegment> metadata;  ///< What a file made of it keeps.
+};
+
+struct PhotoOptions {
+  int scale = 1;               ///< 1, 2, 4 or 8: the decoder's divisor.
+  int rotate = 0;              ///< Degrees clockwise beyond upright, a multiple of 90.
+  std::optional<RawSize> raw;  ///< The input is raw pixels of this size.
+};
+
+/// Reads a photo, decodes it and turns it upright.
+/// @throws what reading and decoding throw, for `explain`; Interrupted on Ctrl-C.
+Photo loadPhoto(const Input& input, const PhotoOptions& options);
+
+/// What the header alone tells, without decoding.
+JpegFacts readFacts(const imgproc::JpegHeader& header);
+
+/// Writes a picture to a file or standard output, as JPEG or, with `raw`, as raw pixels.
+/// @throws what encoding and writing throw; an old file is then as it was.
+void savePicture(const std::string& path,
+                 const image_processing::Image<image_processing::RGBA8Pixel>& picture, bool raw,
+                 int quality, const std::vector<imgproc::MetadataSegment>& metadata);
+
+}  // namespace pelorin::cli

@@ -1,0 +1,9 @@
+#include "cli/verbs.h"
+
+int main(int argc, char** argv) {
+  using namespace pelorin::cli;
+  CommandLine commandLine;
+  addEnhance(commandLine);
+  addInfo(commandLine);
+  return static_cast<int>(commandLine.run(argc, argv));
+}
