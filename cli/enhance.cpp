@@ -40,7 +40,7 @@ ExitCode runEnhance(const EnhanceOptions& options) {
   const std::string params = verbatim ? options.params : builtParameters(options);
   const std::vector<std::string> warnings = checkParameters(options.filter, params);
   Talk talk("enhance", options.files.report.quiet, 0);
-  for (const std::string& warning : warnings) talk.note("--params: " + warning);
+  for (const std::string& warning : warnings) talk.note("note: --params: " + warning);
   return filterFiles("enhance", options.files,
                      {options.filter, params, {{"slider", verbatim ? "" : options.slider}}});
 }
@@ -59,16 +59,18 @@ void addEnhance(CommandLine& commandLine) {
       "quenby enhance - -o - < photo.jpg > better.jpg\n"
       "quenby enhance --raw 640x480 in.rgba -o out.rgba --filter AE08bit",
       [options] { return runEnhance(*options); });
-  verb->add_option("--filter", options->filter, "AE0 unless given; AE08bit needs less memory");
-  options->sliderGiven = verb->add_option("--slider", options->slider,
-                                          "Strength from 0 (none) to 1; 0.4 unless given");
+  verb->add_option("--filter", options->filter, "AE0 unless given; AE08bit needs less memory")
+      ->type_name("NAME");
+  options->sliderGiven =
+      verb->add_option("--slider", options->slider, "Strength from 0 (none) to 1; 0.4 unless given")
+          ->type_name("S");
   verb->add_flag("--global-only", options->globalOnly,
                  "One tone curve for the whole picture, without local masks");
   options->paramsGiven =
       verb->add_option("--params", options->params,
-                       "The filter's own parameter string in place of --slider and "
-                       "--global-only, for example \"slider=0.4;gtmOnly=true;\"");
-  addFilterFilesOptions(*verb, options->files);
+                       "The filter's own parameters in place of --slider and --global-only, "
+                       "for example \"slider=0.4;gtmOnly=true;\"");
+  addFilterFilesOptions(*verb, options->files, "{stem}, {filter} and {slider}");
 }
 
 }  // namespace pelorin::cli

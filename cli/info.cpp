@@ -103,10 +103,10 @@ void printFacts(const Info& info) {
 void printText(const Input& input, const Info& info, const std::string& slider) {
   fmt::print("{}\n", input.shownName());
   printFacts(info);
-  fmt::print("  median       lightness {:.0f} of 100\n",
+  fmt::print("  median       about lightness {:.0f} of 100\n",
              lightnessOf(medianBin(info.statistics.cdf)));
   if (info.statistics.faceMedianBin >= 0) {
-    fmt::print("  face median  lightness {:.0f} of 100\n",
+    fmt::print("  face median  about lightness {:.0f} of 100\n",
                lightnessOf(static_cast<std::size_t>(info.statistics.faceMedianBin)));
   }
   std::vector<float> histogram;
@@ -169,7 +169,8 @@ void addInfo(CommandLine& commandLine) {
       [options] { return runInfo(*options); });
   addInputOptions(*verb, options->inputs);
   verb->add_option("--slider", options->slider,
-                   "Strength, 0 to 1, whose tone curve is shown; 0.4 unless given");
+                   "Strength, 0 to 1, whose tone curve is shown; 0.4 unless given")
+      ->type_name("S");
   addFaceOption(*verb, options->faces);
   addRawOption(*verb, options->raw);
   addJobsOption(*verb, options->jobs);

@@ -28,7 +28,6 @@ CommandLine::CommandLine() : app_("Quenby makes photos better, one or a thousand
   app_.set_help_flag("-h,--help", "Print this help and leave");
   app_.require_subcommand(0, 1);
   app_.get_formatter()->label("SUBCOMMAND", "VERB");
-  app_.get_formatter()->label("Subcommands", "Verbs");
   app_.get_formatter()->column_width(30);
   app_.footer(
       "Examples:\n"
@@ -51,6 +50,7 @@ CLI::App* CommandLine::addVerb(const std::string& name, const std::string& summa
       "\nExit codes: 0 all done, 1 some files failed, 2 wrong usage, 3 nothing to do,\n"
       "130 interrupted.";
   verb->footer(footer);
+  verb->group("Verbs");
   verbs_.push_back({verb, std::move(work)});
   return verb;
 }
@@ -132,7 +132,8 @@ ExitCode CommandLine::run(int argc, char** argv) {
     std::fprintf(stderr, "quenby %s: %s\n", name.c_str(), explain(error).c_str());
     return ExitCode::someFailed;
   }
-  if (std::fflush(stdout) != 0 || std::ferror(stdout) != 0) {
+  const bool printed = std::fflush(stdout) == 0 && std::ferror(stdout) == 0;
+  if (!printed && code == ExitCode::allDone) {
     std::fprintf(stderr, "quenby %s: standard output cannot be written\n", name.c_str());
     return ExitCode::someFailed;
   }

@@ -10,6 +10,7 @@
 #include <memory>
 #include <system_error>
 
+#include "cli/common/errors.h"
 #include "cli/common/interrupt.h"
 #include "platform/pn_imgproc/jpeg_codec.h"
 
@@ -43,6 +44,14 @@ void writeStream(std::FILE* stream, std::span<const std::uint8_t> bytes) {
   if (std::fflush(stream) != 0) throwSystemError();
 }
 
+// Renaming a new file over a device would put an ordinary file in the place of it.
+void writeSpecialFile(const std::string& path, std::span<const std::uint8_t> bytes) {
+  const std::unique_ptr<std::FILE, int (*)(std::FILE*)> stream(std::fopen(path.c_str(), "wb"),
+                                                               std::fclose);
+  if (stream == nullptr) throwSystemError();
+  writeStream(stream.get(), bytes);
+}
+
 }  // namespace
 
 std::vector<std::uint8_t> readInput(const Input& input) {
@@ -50,17 +59,19 @@ std::vector<std::uint8_t> readInput(const Input& input) {
 }
 
 void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes) {
-  if (path == "-") return writeStream(stdout, bytes);
-  std::error_code ignored;
-  const fs::file_status status = fs::status(path, ignored);
-  // Renaming a new file over a device would put an ordinary file in the place of it.
-  if (fs::is_other(status)) {
-    const std::unique_ptr<std::FILE, int (*)(std::FILE*)> stream(std::fopen(path.c_str(), "wb"),
-                                                                 std::fclose);
-    if (stream == nullptr) throwSystemError();
-    return writeStream(stream.get(), bytes);
+  try {
+    std::error_code ignored;
+    if (path == "-") {
+      writeStream(stdout, bytes);
+    } else if (fs::is_other(fs::status(path, ignored))) {
+      writeSpecialFile(path, bytes);
+    } else {
+      imgproc::writeFileAtomically(path, bytes);
+    }
+  } catch (const std::system_error& error) {
+    throw FileError((path == "-" ? "standard output" : path) +
+                    " cannot be written: " + explain(error));
   }
-  imgproc::writeFileAtomically(path, bytes);
 }
 
 }  // namespace pelorin::cli

@@ -15,7 +15,7 @@ std::vector<std::uint8_t> readInput(const Input& input);
 
 /// Writes a file in one step, old or new and never half; "-" and special files (/dev/null, a named
 /// pipe) are written as they come.
-/// @throws std::system_error when it cannot be written; an old file is then as it was.
+/// @throws FileError, naming the file, when it cannot be written; an old file is then as it was.
 void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes);
 
 }  // namespace pelorin::cli

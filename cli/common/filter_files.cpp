@@ -83,16 +83,20 @@ ExitCode printPlan(const std::vector<PlannedFile>& plan, JsonOutput& json) {
 
 }  // namespace
 
-void addFilterFilesOptions(CLI::App& verb, FilterFilesOptions& options) {
+void addFilterFilesOptions(CLI::App& verb, FilterFilesOptions& options,
+                           const std::string& placeholders) {
   addInputOptions(verb, options.inputs);
-  addOutputOptions(verb, options.outputs, "{stem}_{filter}.jpg", "{stem} and {filter}");
+  addOutputOptions(verb, options.outputs, "{stem}_{filter}.jpg", placeholders);
   addFaceOption(verb, options.faces);
   verb.add_option("--rotate", options.rotate,
-                  "Turn further by so many degrees clockwise, a multiple of 90");
+                  "Turn further by so many degrees clockwise, a multiple of 90")
+      ->type_name("DEGREES");
   verb.add_option("--scale", options.scale, "Decode at 1/1, 1/2, 1/4 or 1/8 of the size")
-      ->check(CLI::IsMember({1, 2, 4, 8}));
+      ->check(CLI::IsMember({1, 2, 4, 8}).description(""))
+      ->type_name("1|2|4|8");
   verb.add_option("--quality", options.quality, "JPEG quality, 90 unless given")
-      ->check(CLI::Range(1, 100))
+      ->check(CLI::Range(1, 100).description(""))
+      ->type_name("1-100")
       ->group("Output");
   addRawOption(verb, options.raw);
   addJobsOption(verb, options.jobs);
@@ -158,7 +162,10 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
     talk.note(fmt::format("{} of {} photos done, {} failed, {} there already", done, plan.size(),
                           failed, skipped));
   }
-  if (!finished) return ExitCode::interrupted;
+  if (!finished) {
+    talk.note("interrupted; finished files stand");
+    return ExitCode::interrupted;
+  }
   if (done == 0 && failed == 0) return ExitCode::nothingToDo;
   return failed + skipped > 0 ? ExitCode::someFailed : ExitCode::allDone;
 }

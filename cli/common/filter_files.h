@@ -26,7 +26,9 @@ struct FilterFilesOptions {
 };
 
 /// Adds all of them to a verb. Results in a folder are called `{stem}_{filter}` by default.
-void addFilterFilesOptions(CLI::App& verb, FilterFilesOptions& options);
+/// @param placeholders  what `--name` may hold, for the help.
+void addFilterFilesOptions(CLI::App& verb, FilterFilesOptions& options,
+                           const std::string& placeholders = "{stem} and {filter}");
 
 /// What to do with every file.
 struct FilterToApply {

@@ -96,9 +96,9 @@ class Expansion {
 
 void addInputOptions(CLI::App& verb, InputOptions& options) {
   verb.add_option("IN", options.names,
-                  "Photos: JPEG files, folders (with -r), @LIST (a file with one name a line), "
-                  "- (standard input)")
+                  "JPEG files, folders (with -r), @LIST (one name a line), - (standard input)")
       ->required()
+      ->type_name("")
       ->group("Input");
   verb.add_flag("-r,--recursive", options.recursive,
                 "Take the .jpg, .jpeg and .jpe files below a folder, in sorted order")

@@ -9,7 +9,8 @@ namespace pelorin::cli {
 
 void addJobsOption(CLI::App& verb, int& atOnce) {
   verb.add_option("-j,--jobs", atOnce, "Files at once, each on one core; 0: as many as cores")
-      ->check(CLI::Range(0, 1024))
+      ->check(CLI::Range(0, 1024).description(""))
+      ->type_name("N")
       ->group("Reporting");
 }
 

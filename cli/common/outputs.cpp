@@ -89,13 +89,14 @@ void refuseClashes(const std::vector<PlannedFile>& plan, bool overwrite) {
 void addOutputOptions(CLI::App& verb, OutputOptions& options, const std::string& defaultName,
                       const std::string& placeholders) {
   verb.add_option("-o,--output", options.output,
-                  "A file, an existing folder, or - (standard output); without it results go "
-                  "beside their inputs under --name")
+                  "A file, an existing folder, or - (standard output); without it results stand "
+                  "beside their inputs, called by --name")
       ->type_name("FILE|DIR")
       ->group("Output");
   verb.add_option("--name", options.name,
                   "How results are called in a folder, from " + placeholders + "; " + defaultName +
                       " unless given")
+      ->type_name("PATTERN")
       ->group("Output");
   verb.add_flag("--overwrite", options.overwrite, "Replace files that are there already")
       ->group("Output");
