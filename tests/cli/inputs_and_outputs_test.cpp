@@ -1,0 +1,267 @@
+#include <gmock/gmock.h>
+
+#include <nlohmann/json.hpp>
+
+#include "tests/cli/jpeg_files.h"
+#include "tests/cli/quenby_process.h"
+
+namespace pelorin::test_support {
+namespace {
+
+using testing::ElementsAre;
+using testing::HasSubstr;
+using testing::IsEmpty;
+
+// Fast, and as good as any filter where only names matter.
+Finished enhance(std::vector<std::string> arguments, const Bytes& input = {}) {
+  arguments.insert(arguments.begin(), {"enhance", "--filter", "PassThrough"});
+  return quenby(arguments, input);
+}
+
+std::string text(const Bytes& bytes) {
+  return {bytes.begin(), bytes.end()};
+}
+
+TEST(Folders, AreTakenRecursivelyInSortedOrderWithPhotosOnly) {
+  const TemporaryFolder folder;
+  for (const char* name :
+       {"in/b.jpg", "in/a.JPEG", "in/sub/c.jpe", "in/z.Jpg", "in/deep/er/d.jpg"}) {
+    folder.write(name, smallJpeg());
+  }
+  folder.write("in/notes.txt", std::string("x"));
+  folder.write("in/raw.png", std::string("x"));
+  folder.makeFolder("in/folder.jpg");
+  const Finished plan = enhance({"-r", folder / "in", "--name", "{stem}_x.jpg", "-n"});
+  EXPECT_EQ(plan.exitCode, 0);
+  const std::string in = folder / "in/";
+  EXPECT_EQ(plan.output, in + "a.JPEG -> " + in + "a_x.jpg\n" +     //
+                             in + "b.jpg -> " + in + "b_x.jpg\n" +  //
+                             in + "deep/er/d.jpg -> " + in + "deep/er/d_x.jpg\n" + in +
+                             "sub/c.jpe -> " + in + "sub/c_x.jpg\n" + in + "z.Jpg -> " + in +
+                             "z_x.jpg\n");
+}
+
+TEST(Folders, KeepTheirSubFoldersInTheOutput) {
+  const TemporaryFolder folder;
+  folder.write("in/a.jpg", smallJpeg());
+  folder.write("in/sub/a.jpg", smallJpeg());
+  folder.write("in/bad/a.jpg", std::string("x"));
+  const Finished run = enhance({"-r", folder / "in", "-o", folder.makeFolder("out")});
+  EXPECT_EQ(run.exitCode, 1);
+  EXPECT_THAT(folder.content(), ElementsAre("in/", "in/a.jpg", "in/bad/", "in/bad/a.jpg", "in/sub/",
+                                            "in/sub/a.jpg", "out/", "out/a_PassThrough.jpg",
+                                            "out/sub/", "out/sub/a_PassThrough.jpg"));
+}
+
+TEST(Folders, NeedTheRecursiveOption) {
+  const TemporaryFolder folder;
+  const Finished run = enhance({folder.path(), "-o", folder / "b.jpg"});
+  EXPECT_EQ(run.exitCode, 2);
+  EXPECT_THAT(run.errors, HasSubstr(folder.path() + ": is a folder; add -r"));
+}
+
+TEST(Folders, WithoutPhotosAreNothingToDo) {
+  const TemporaryFolder folder;
+  EXPECT_EQ(enhance({"-r", folder.makeFolder("in"), "-o", folder.makeFolder("out")}).exitCode, 3);
+}
+
+TEST(Lists, NameOneFileALine) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("a.jpg", smallJpeg());
+  const std::string b = folder.write("b c.jpg", smallJpeg());
+  const std::string list = folder.write("list", a + "\r\n\n" + b);
+  const std::string out = folder.makeFolder("out");
+  EXPECT_EQ(enhance({"@" + list, "-o", out}).exitCode, 0);
+  EXPECT_TRUE(folder.has("out/a_PassThrough.jpg"));
+  EXPECT_TRUE(folder.has("out/b c_PassThrough.jpg"));
+}
+
+TEST(Lists, MayComeFromStandardInput) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("a.jpg", smallJpeg()) + "\n";
+  const std::string out = folder.makeFolder("out");
+  EXPECT_EQ(enhance({"@-", "-o", out}, Bytes(a.begin(), a.end())).exitCode, 0);
+  EXPECT_TRUE(folder.has("out/a_PassThrough.jpg"));
+  EXPECT_EQ(enhance({"@-", "-", "-o", out}).exitCode, 2);
+}
+
+TEST(Lists, ThatCannotBeReadAreRefused) {
+  const TemporaryFolder folder;
+  const std::string at = "@";
+  for (const std::string& list : {folder / "none", folder.path()}) {
+    const Finished run = enhance({at + list, "-o", folder.path()});
+    EXPECT_EQ(run.exitCode, 2);
+    EXPECT_THAT(run.errors, HasSubstr(list + ": cannot be read as a list of files"));
+  }
+}
+
+TEST(Inputs, MayBeCalledAlmostAnything) {
+  const TemporaryFolder folder;
+  for (const std::string name : {"[a,b]", "ü ñ.jpg", "a\nb.jpg", "{x}.jpg", "%s.jpg"}) {
+    const std::string in = folder.write(name, smallJpeg());
+    EXPECT_EQ(enhance({in, "-o", folder / "out.jpg", "--overwrite"}).exitCode, 0) << name;
+  }
+  const Finished run = shell("cd '" + folder.path() +
+                             "' && \"$QUENBY\" enhance '[a,b]' -o x.jpg && \"$QUENBY\" info "
+                             "'[a,b]' --jsonl && cp x.jpg ./-x.jpg && \"$QUENBY\" info ./-x.jpg");
+  EXPECT_EQ(run.exitCode, 0) << run.errors;
+}
+
+TEST(Names, AreMadeFromPlaceholders) {
+  const TemporaryFolder folder;
+  const std::string in = folder.write("my.photo.jpg", smallJpeg());
+  const Finished run = quenby({"enhance", in, "-o", folder.path(), "--slider", "0.25", "--name",
+                               "{filter}-{slider}-{stem}-{stem}.jpeg"});
+  EXPECT_EQ(run.exitCode, 0) << run.errors;
+  EXPECT_TRUE(folder.has("AE0-0.25-my.photo-my.photo.jpeg"));
+}
+
+TEST(Names, ThatMeanNothingAreRefused) {
+  const TemporaryFolder folder;
+  const std::string in = folder.write("a.jpg", smallJpeg());
+  for (const char* name : {"{stm}.jpg", "{stem", "sub/{stem}.jpg", "..", "{}"}) {
+    const Finished run = enhance({in, "-o", folder.path(), "--name", name});
+    EXPECT_EQ(run.exitCode, 2) << name;
+    EXPECT_THAT(run.errors, HasSubstr("--name")) << name;
+  }
+  EXPECT_THAT(enhance({in, "-o", folder.path(), "--name", "{stm}.jpg"}).errors,
+              HasSubstr("did you mean 'stem'?"));
+  EXPECT_THAT(folder.content(), ElementsAre("a.jpg"));
+}
+
+TEST(Outputs, NeedAPlace) {
+  const TemporaryFolder folder;
+  const Finished run = enhance({folder.write("a.jpg", smallJpeg())});
+  EXPECT_EQ(run.exitCode, 2);
+  EXPECT_THAT(run.errors, HasSubstr("-o FILE"));
+}
+
+TEST(Outputs, OfSeveralInputsNeedAFolder) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("a.jpg", smallJpeg());
+  const std::string b = folder.write("b.jpg", smallJpeg());
+  EXPECT_EQ(enhance({a, b, "-o", folder / "c.jpg"}).exitCode, 2);
+  EXPECT_EQ(enhance({a, b, "-o", "-"}).exitCode, 2);
+  EXPECT_EQ(enhance({a, "-o", folder / "new/"}).exitCode, 2);
+  EXPECT_THAT(folder.content(), ElementsAre("a.jpg", "b.jpg"));
+}
+
+TEST(Outputs, ThatAreThereAlreadyStay) {
+  const TemporaryFolder folder;
+  const std::string in = folder.write("a.jpg", smallJpeg());
+  const std::string out = folder.write("b.jpg", std::string("old"));
+  const Finished run = enhance({in, "-o", out});
+  EXPECT_EQ(run.exitCode, 3);
+  EXPECT_THAT(run.errors, HasSubstr(out + ": exists already; add --overwrite"));
+  EXPECT_EQ(text(folder.read("b.jpg")), "old");
+  EXPECT_EQ(enhance({in, "-o", out, "--overwrite"}).exitCode, 0);
+  EXPECT_EQ(decoded(folder.read("b.jpg")).width, 48u);
+}
+
+TEST(Outputs, ThatAreThereAlreadyDoNotStopTheOthers) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("a.jpg", smallJpeg());
+  const std::string b = folder.write("b.jpg", smallJpeg());
+  folder.write("out/a_PassThrough.jpg", std::string("old"));
+  EXPECT_EQ(enhance({a, b, "-o", folder / "out"}).exitCode, 1);
+  EXPECT_EQ(text(folder.read("out/a_PassThrough.jpg")), "old");
+  EXPECT_TRUE(folder.has("out/b_PassThrough.jpg"));
+}
+
+TEST(Outputs, OfTwoInputsAreTwoFiles) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("x/a.jpg", smallJpeg());
+  const std::string b = folder.write("y/a.jpg", smallJpeg());
+  const Finished run = enhance({a, b, "-o", folder.makeFolder("out")});
+  EXPECT_EQ(run.exitCode, 2);
+  EXPECT_THAT(run.errors, HasSubstr("both " + a + " and " + b));
+  EXPECT_TRUE(std::filesystem::is_empty(folder / "out"));
+}
+
+TEST(Outputs, MayReplaceTheirOwnInputOnlyOnRequest) {
+  const TemporaryFolder folder;
+  const Bytes file = smallJpeg();
+  const std::string in = folder.write("a.jpg", file);
+  std::filesystem::create_symlink(folder.path(), folder / "link");
+  for (const std::string& out : {in, folder / "./a.jpg", folder / "link/a.jpg"}) {
+    const Finished run = enhance({in, "-o", out});
+    EXPECT_EQ(run.exitCode, 2);
+    EXPECT_THAT(run.errors, HasSubstr("is the input itself; add --overwrite"));
+  }
+  EXPECT_EQ(folder.read("a.jpg"), file);
+  EXPECT_EQ(enhance({in, "-o", in, "--overwrite"}).exitCode, 0);
+  EXPECT_EQ(folder.read("a.jpg"), jpegOf(decoded(file)));
+}
+
+TEST(Outputs, NeverReplaceAnotherInput) {
+  const TemporaryFolder folder;
+  const Bytes file = smallJpeg();
+  const std::string a = folder.write("a.jpg", file);
+  const std::string b = folder.write("a_x.jpg", file);
+  const Finished run = enhance({a, b, "--name", "{stem}_x.jpg", "--overwrite"});
+  EXPECT_EQ(run.exitCode, 2);
+  EXPECT_THAT(run.errors, HasSubstr(b + ": is itself an input"));
+  EXPECT_EQ(folder.read("a_x.jpg"), file);
+}
+
+TEST(Outputs, ThatAreSpecialFilesStaySpecial) {
+  const TemporaryFolder folder;
+  const std::string in = folder.write("a.jpg", smallJpeg());
+  EXPECT_EQ(enhance({in, "-o", "/dev/null"}).exitCode, 0);
+  EXPECT_TRUE(std::filesystem::is_character_file("/dev/null"));
+}
+
+TEST(Plan, IsPrintedAndNothingIsDone) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("in/a.jpg", smallJpeg());
+  const std::string b = folder.write("in/sub/b.jpg", smallJpeg());
+  folder.write("out/a_PassThrough.jpg", std::string("old"));
+  const auto before = folder.content();
+  const Finished run = enhance({"-r", folder / "in", "-o", folder / "out", "-n"});
+  EXPECT_EQ(run.exitCode, 0);
+  EXPECT_EQ(run.output, a + " -> " + folder / "out/a_PassThrough.jpg" +
+                            " (exists: skipped without --overwrite)\n" + b + " -> " +
+                            folder / "out/sub/b_PassThrough.jpg" + "\n");
+  const Finished json = enhance({"-r", folder / "in", "-o", folder / "out", "-n", "--json"});
+  const nlohmann::json plan = nlohmann::json::parse(json.output);
+  EXPECT_EQ(plan[0]["status"], "exists");
+  EXPECT_EQ(plan[1]["status"], "planned");
+  EXPECT_EQ(folder.content(), before);
+}
+
+TEST(Plan, WithNothingLeftIsNothingToDo) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("a.jpg", smallJpeg());
+  EXPECT_EQ(enhance({a, "-o", folder.write("b.jpg", smallJpeg()), "-n"}).exitCode, 3);
+}
+
+// `script` gives the command a terminal.
+TEST(ProgressBar, AppearsOnATerminalOnly) {
+  const TemporaryFolder folder;
+  folder.write("in/a.jpg", smallJpeg());
+  folder.write("in/b.jpg", smallJpeg());
+  const std::string command =
+      "$QUENBY enhance -r " + folder / "in" + " --overwrite -o " + folder.makeFolder("out");
+  const auto onTerminal = [](const std::string& line) {
+    return shell("export QUENBY; script -qec '" + line + "' /dev/null");
+  };
+  const Finished seen = onTerminal(command);
+  EXPECT_EQ(seen.exitCode, 0) << seen.output;
+  EXPECT_THAT(seen.output, HasSubstr("1/2"));
+  EXPECT_THAT(seen.output, HasSubstr("[########################################] 2/2"));
+  EXPECT_THAT(onTerminal(command + " -q").output, IsEmpty());
+  EXPECT_THAT(shell(command).errors, testing::Not(HasSubstr("1/2")));
+}
+
+TEST(Quiet, SaysErrorsOnly) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("a.jpg", smallJpeg());
+  const std::string b = folder.write("b.jpg", smallJpeg());
+  const std::string out = folder.makeFolder("out");
+  EXPECT_THAT(enhance({a, b, "-o", out, "--quiet"}).errors, IsEmpty());
+  EXPECT_THAT(enhance({a, b, "-o", out, "--overwrite"}).errors, HasSubstr("2 of 2 photos done"));
+  EXPECT_THAT(enhance({a, b, "-o", out, "-q"}).errors, HasSubstr("exists already"));
+}
+
+}  // namespace
+}  // namespace pelorin::test_support

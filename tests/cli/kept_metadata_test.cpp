@@ -1,0 +1,119 @@
+#include <gmock/gmock.h>
+
+#include "tests/cli/jpeg_files.h"
+#include "tests/cli/quenby_process.h"
+#include "tests/support/pictures.h"
+
+namespace pelorin::test_support {
+namespace {
+
+using imgproc::MetadataSegment;
+
+Bytes bytesOf(const std::string& text) {
+  return Bytes(text.begin(), text.end());
+}
+
+Bytes colourProfile() {
+  Bytes payload = bytesOf(std::string("ICC_PROFILE\0\1\1", 14));
+  payload.resize(500, 0x5A);
+  return payload;
+}
+
+std::vector<MetadataSegment> cameraSegments(int orientation, bool littleEndian) {
+  return {{0xE1, exifPayload({orientation, "2024:05:01 12:30:45", "25", "+02:00"}, littleEndian)},
+          {0xE1, bytesOf(std::string("http://ns.adobe.com/xap/1.0/\0<xmp/>", 35))},
+          {0xE2, colourProfile()},
+          {0xED, bytesOf("Photoshop 3.0")},
+          {0xFE, bytesOf("a comment")}};
+}
+
+bool operator==(const MetadataSegment& a, const MetadataSegment& b) {
+  return a.marker == b.marker && a.payload == b.payload;
+}
+
+void expectSegments(const Bytes& file, const std::vector<MetadataSegment>& expected) {
+  const std::vector<MetadataSegment> found = imgproc::readJpegHeader(file).metadata;
+  ASSERT_EQ(found.size(), expected.size());
+  for (std::size_t i = 0; i < found.size(); ++i) EXPECT_TRUE(found[i] == expected[i]) << i;
+}
+
+TEST(KeptMetadata, IsTheSameByteForByteButForTheOrientation) {
+  const TemporaryFolder folder;
+  for (const bool littleEndian : {false, true}) {
+    const std::string in =
+        folder.write("a.jpg", jpegOf(photoLikePicture(48, 32, 1), cameraSegments(6, littleEndian)));
+    const Finished run = quenby({"enhance", in, "-o", folder / "b.jpg", "--overwrite"});
+    EXPECT_EQ(run.exitCode, 0) << run.errors;
+    expectSegments(folder.read("b.jpg"), cameraSegments(1, littleEndian));
+  }
+}
+
+TEST(KeptMetadata, OfACmykFileHasNoColourProfile) {
+  const TemporaryFolder folder;
+  std::vector<MetadataSegment> segments = cameraSegments(1, true);
+  const std::string in = folder.write("a.jpg", cmykJpeg(40, 30, segments));
+  const Finished run = quenby({"enhance", in, "-o", folder / "b.jpg"});
+  EXPECT_EQ(run.exitCode, 0) << run.errors;
+  segments.erase(segments.begin() + 2);
+  expectSegments(folder.read("b.jpg"), segments);
+}
+
+TEST(KeptMetadata, SurvivesADamagedExifSegment) {
+  const TemporaryFolder folder;
+  Bytes exif = exifPayload({6, "", "", ""}, true);
+  exif[10] = 0xFF;  // the first directory lies far away
+  exif[11] = 0xFF;
+  const std::string in = folder.write("a.jpg", jpegOf(photoLikePicture(48, 32, 1), {{0xE1, exif}}));
+  EXPECT_EQ(quenby({"enhance", in, "-o", folder / "b.jpg"}).exitCode, 0);
+  expectSegments(folder.read("b.jpg"), {{0xE1, exif}});
+  EXPECT_EQ(decoded(folder.read("b.jpg")).width, 48u);
+}
+
+TEST(Upright, IsEveryOneOfTheEightOrientations) {
+  const TemporaryFolder folder;
+  for (int orientation = 1; orientation <= 8; ++orientation) {
+    const std::vector<MetadataSegment> segments = cameraSegments(orientation, true);
+    const Bytes file = jpegOf(photoLikePicture(48, 32, 1), segments);
+    const std::string in = folder.write("a.jpg", file);
+    const Finished run =
+        quenby({"enhance", in, "-o", folder / "b.jpg", "--overwrite", "--filter", "PassThrough"});
+    EXPECT_EQ(run.exitCode, 0) << run.errors;
+
+    const Image<RGBA8Pixel> stored = decoded(file);
+    const bool sideways = orientation >= 5;
+    Image<RGBA8Pixel> upright(sideways ? stored.height : stored.width,
+                              sideways ? stored.width : stored.height);
+    const std::uint32_t right = stored.width - 1, bottom = stored.height - 1;
+    for (std::uint32_t y = 0; y < upright.height; ++y) {
+      for (std::uint32_t x = 0; x < upright.width; ++x) {
+        const std::uint32_t column[] = {x, right - x, right - x, x, y, y, right - y, right - y};
+        const std::uint32_t row[] = {y, y, bottom - y, bottom - y, x, bottom - x, bottom - x, x};
+        upright.row(y)[x] = stored.row(row[orientation - 1])[column[orientation - 1]];
+      }
+    }
+    EXPECT_EQ(folder.read("b.jpg"), jpegOf(upright, cameraSegments(1, true))) << orientation;
+  }
+}
+
+TEST(Upright, IsWhatFacesReferTo) {
+  const TemporaryFolder folder;
+  // The dark left half as stored is the upper half of the upright picture.
+  Image<RGBA8Pixel> halves(64, 32);
+  for (std::uint32_t y = 0; y < 32; ++y) {
+    for (std::uint32_t x = 0; x < 64; ++x) {
+      const std::uint8_t grey = x < 32 ? 40 : 200;
+      halves.row(y)[x] = {grey, grey, grey, 255};
+    }
+  }
+  const std::string in =
+      folder.write("a.jpg", jpegOf(halves, {{0xE1, exifPayload({6, "", "", ""}, true)}}));
+  const auto faceMedian = [&](const std::string& face) {
+    const std::string output = quenby({"info", in, "--jsonl", "--face", face}).output;
+    return std::stoi(output.substr(output.find("\"faceMedianBin\":") + 16));
+  };
+  EXPECT_LT(faceMedian("0.1,0.1,0.9,0.4"), 15);
+  EXPECT_GT(faceMedian("0.1,0.6,0.9,0.9"), 35);
+}
+
+}  // namespace
+}  // namespace pelorin::test_support
