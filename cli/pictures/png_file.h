@@ -1,0 +1,32 @@
+#pragma once
+
+#include <cstdint>
+#include <span>
+#include <stdexcept>
+#include <vector>
+
+#include "image_processing/core/image.h"
+
+namespace pelorin::cli {
+
+/// Why a PNG file could not be read or made; `what()` is one clause for a user, without the file's
+/// name.
+class PngError : public std::runtime_error {
+ public:
+  using std::runtime_error::runtime_error;
+};
+
+/// The bytes of a PNG file with exactly these pixels, alpha included and not multiplied in.
+/// @throws PngError when a side is 0 or the pixels are more than 2 GB, and std::bad_alloc.
+std::vector<std::uint8_t> encodePng(
+    const image_processing::Image<image_processing::RGBA8Pixel>& picture);
+
+/// The same for a grey picture, one byte a pixel.
+std::vector<std::uint8_t> encodePng(const image_processing::Image<unsigned char>& grey);
+
+/// The pixels of a PNG file of any kind, as 8-bit RGBA.
+/// @throws PngError when the bytes are no PNG file or are damaged or more than 2 GB of pixels, and
+///         std::bad_alloc.
+image_processing::Image<image_processing::RGBA8Pixel> decodePng(std::span<const std::uint8_t> file);
+
+}  // namespace pelorin::cli
