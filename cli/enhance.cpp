@@ -24,10 +24,7 @@ std::string builtParameters(const EnhanceOptions& options) {
     if (options.sliderGiven->count() == 0 && !options.globalOnly) return "";
     throw UsageError("--filter: " + options.filter + " has no slider; use --params");
   }
-  const float slider = readFiniteNumber("--slider", options.slider);
-  if (slider < 0.0f || slider > 1.0f) {
-    throw UsageError("--slider: " + options.slider + " is not between 0 and 1");
-  }
+  readSlider("--slider", options.slider);  // refuses what is none
   return "slider=" + options.slider + ";" + (options.globalOnly ? "gtmOnly=true;" : "");
 }
 

@@ -5,7 +5,6 @@
 #include <string>
 #include <vector>
 
-#include "cli/common/errors.h"
 #include "cli/common/faces.h"
 #include "cli/common/histogram_chart.h"
 #include "cli/common/inputs.h"
@@ -120,10 +119,7 @@ void printText(const Input& input, const Info& info, const std::string& slider) 
 }
 
 ExitCode runInfo(const InfoOptions& options) {
-  const float slider = readFiniteNumber("--slider", options.slider);
-  if (slider < 0.0f || slider > 1.0f) {
-    throw UsageError("--slider: " + options.slider + " is not between 0 and 1");
-  }
+  const float slider = readSlider("--slider", options.slider);
   const std::vector<FaceFractions> faces = readFaces(options.faces);
   PhotoOptions photo;
   if (!options.raw.empty()) photo.raw = readRawSize(options.raw);

@@ -5,5 +5,8 @@ int main(int argc, char** argv) {
   CommandLine commandLine;
   addEnhance(commandLine);
   addInfo(commandLine);
+  addCurve(commandLine);
+  addMasks(commandLine);
+  addSheet(commandLine);
   return static_cast<int>(commandLine.run(argc, argv));
 }

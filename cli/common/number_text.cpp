@@ -20,6 +20,14 @@ float readFiniteNumber(const std::string& what, std::string_view text) {
   return number;
 }
 
+float readSlider(const std::string& what, const std::string& text) {
+  const float slider = readFiniteNumber(what, text);
+  if (slider < 0.0f || slider > 1.0f) {
+    throw UsageError(what + ": " + text + " is not between 0 and 1");
+  }
+  return slider;
+}
+
 std::uint32_t readPositiveInteger(const std::string& what, std::string_view text) {
   std::uint32_t number = 0;
   const char* end = text.data() + text.size();

@@ -11,6 +11,10 @@ namespace pelorin::cli {
 /// @throws UsageError for anything else, NaN and infinity included.
 float readFiniteNumber(const std::string& what, std::string_view text);
 
+/// A strength in 0 ... 1.
+/// @throws UsageError for anything else.
+float readSlider(const std::string& what, const std::string& text);
+
 /// A decimal number of digits only, 1 or more.
 /// @throws UsageError for anything else and above 2^32 - 1.
 std::uint32_t readPositiveInteger(const std::string& what, std::string_view text);
