@@ -1,0 +1,48 @@
+#include <algorithm>
+#include <cstddef>
+#include <cstdint>
+
+#include "image_processing/dupe/green_cdf.h"
+
+namespace pelorin::image_processing {
+namespace {
+
+// A counter just written is read back only after some cycles. Neighbouring pixels are mostly alike,
+// so each of them counts in a histogram of its own.
+constexpr std::size_t ways = 8;
+using Counts = std::array<std::array<std::uint32_t, 256>, ways>;
+
+// No counter overflows within one block.
+constexpr std::size_t pixelsPerBlock = std::size_t{1} << 31;
+
+void count(const RGBA8Pixel* pixels, std::size_t pixelCount, Counts& counts) {
+  std::size_t i = 0;
+  for (; i + ways <= pixelCount; i += ways) {
+    for (std::size_t way = 0; way < ways; ++way) ++counts[way][pixels[i + way].g];
+  }
+  for (; i < pixelCount; ++i) ++counts[0][pixels[i].g];
+}
+
+// Where a float counter stops: adding 1 to 2^24 gives 2^24.
+float asFloatCounter(std::uint64_t count) {
+  return static_cast<float>(std::min<std::uint64_t>(count, std::uint64_t{1} << 24));
+}
+
+}  // namespace
+
+void computeGreenCDF(const Image<RGBA8Pixel>& image, GreenCDF& cdf) {
+  std::array<std::uint64_t, 256> total{};
+  const std::size_t pixelCount = image.pixelCount();
+  for (std::size_t first = 0; first < pixelCount; first += pixelsPerBlock) {
+    Counts counts{};
+    count(image.data.get() + first, std::min(pixelsPerBlock, pixelCount - first), counts);
+    for (const std::array<std::uint32_t, 256>& way : counts) {
+      for (std::size_t i = 0; i < total.size(); ++i) total[i] += way[i];
+    }
+  }
+  std::array<float, 256> histogram;
+  std::transform(total.begin(), total.end(), histogram.begin(), asFloatCounter);
+  computeCDFFromCounts(histogram, asFloatCounter(pixelCount), cdf);
+}
+
+}  // namespace pelorin::image_processing
