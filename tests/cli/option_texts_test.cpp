@@ -100,6 +100,15 @@ TEST(FilterParameters, ThatReadOtherwiseThanTheyLookAreWarnedOf) {
   EXPECT_TRUE(checkParameters("PassThrough", "").empty());
 }
 
+TEST(FilterParameters, OfALookAreItsCurvesAndItsMask) {
+  EXPECT_TRUE(checkParameters("WinterRGB", "").empty());
+  EXPECT_TRUE(checkParameters("WinterRGB", "r=0,0.5,1,;applyMask=0;").empty());
+  EXPECT_TRUE(checkParameters("LowDimRGBCurve", "s1=0.3;s4=1;").empty());
+  EXPECT_EQ(checkParameters("LowDimRGBCurve", "s1=0.3").size(), 1u);  // ends without a ';'
+  EXPECT_THROW(checkParameters("WinterRGB", "s1=0.3;"), UsageError);
+  EXPECT_THROW(checkParameters("WinterRGB", "slider=0.3;"), UsageError);
+}
+
 TEST(Filters, AreFoundByTheirExactNameOnly) {
   EXPECT_NO_THROW(requireFilter("AE0"));
   for (const char* name : {"ae0", "Auto", "Original", "", "AE0 "}) {
