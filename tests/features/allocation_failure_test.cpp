@@ -3,7 +3,9 @@
 #include <gtest/gtest.h>
 
 #include <limits>
+#include <new>
 
+#include "image_processing/features/brief.h"
 #include "image_processing/features/fast.h"
 #include "tests/features/fast_variants.h"
 
@@ -105,6 +107,16 @@ TEST(AllocationFailure, MakesSuppressionReturnNullAndLeavesNothingBehind) {
     return nonmax_suppression(corners.data(), scores.data(), static_cast<int>(corners.size()),
                               count);
   });
+}
+
+TEST(AllocationFailure, MakesDescriptorsThrowAndLeavesNothingBehind) {
+  allocationsUntilFailure = 1;
+  blocksInUse = 0;
+  EXPECT_THROW(image_processing::computeBriefDescriptors(crowdedImage(), 20), std::bad_alloc);
+  allocationsUntilFailure = std::numeric_limits<int>::max();
+  EXPECT_EQ(blocksInUse, 0);
+  EXPECT_FALSE(image_processing::computeBriefDescriptors(crowdedImage(), 20).empty());
+  EXPECT_EQ(blocksInUse, 0);
 }
 
 }  // namespace
