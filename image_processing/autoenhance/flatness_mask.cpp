@@ -14,8 +14,8 @@ namespace pelorin::image_processing {
 // one fixed order, and at large sizes its rounding shows in the mask: a sliding window or double
 // sums would give other photos. Only the rows that a window spans are kept.
 template <typename TB, typename TL>
-void computeFlatnessMask(const Image<float>& lightness, const Image<TB>& smoothed, int radius,
-                         Image<TL>& mask) {
+void computeFlatnessMaskScalar(const Image<float>& lightness, const Image<TB>& smoothed, int radius,
+                               Image<TL>& mask) {
   if (lightness.pixelCount() == 0) return;
   if (radius < 0) {
     TL none;
@@ -70,8 +70,10 @@ void computeFlatnessMask(const Image<float>& lightness, const Image<TB>& smoothe
   }
 }
 
-template void computeFlatnessMask(const Image<float>&, const Image<float>&, int, Image<float>&);
-template void computeFlatnessMask(const Image<float>&, const Image<QuantizedFloat<unsigned char>>&,
-                                  int, Image<QuantizedFloat<unsigned char>>&);
+template void computeFlatnessMaskScalar(const Image<float>&, const Image<float>&, int,
+                                        Image<float>&);
+template void computeFlatnessMaskScalar(const Image<float>&,
+                                        const Image<QuantizedFloat<unsigned char>>&, int,
+                                        Image<QuantizedFloat<unsigned char>>&);
 
 }  // namespace pelorin::image_processing

@@ -13,11 +13,16 @@ namespace pelorin::image_processing {
 /// is 0.
 ///                   The window is centred one pixel right of and below the mask pixel.
 /// @param mask       written; of the size of `lightness`. Its own buffer.
-/// @throws std::bad_alloc when 2 · radius + 2 rows of sums do not fit.
+/// @throws std::bad_alloc when about 2 · radius rows of sums do not fit.
 ///
 /// Keeps no state. For (float, float) and (QuantizedFloat<unsigned char>, the same).
 template <typename TB, typename TL>
 void computeFlatnessMask(const Image<float>& lightness, const Image<TB>& smoothed, int radius,
                          Image<TL>& mask);
+
+/// The definition of `computeFlatnessMask`.
+template <typename TB, typename TL>
+void computeFlatnessMaskScalar(const Image<float>& lightness, const Image<TB>& smoothed, int radius,
+                               Image<TL>& mask);
 
 }  // namespace pelorin::image_processing

@@ -19,12 +19,10 @@ class GaussianApproximation<float> {
   float operator()(float x) const {
     const float t = -1.0f + (x - x0_) * scale_;
     const float a = std::fabs(t);
-    float g = 0.0f;
-    if (a < 0.5f) {
-      g = a0_ + a * (a * (a2_ + a * a3_));
-    } else if (a < 1.0f) {
-      g = b0_ + a * (b1_ + a * (b2_ + a * b3_));
-    }  // beyond, or NaN as in an empty support: 0
+    const float inner = a0_ + a * (a * (a2_ + a * a3_));
+    const float outer = b0_ + a * (b1_ + a * (b2_ + a * b3_));
+    // Selected, not branched to, so that loops become vectors. NaN, as in an empty support, is 0.
+    const float g = a < 0.5f ? inner : (a < 1.0f ? outer : 0.0f);
     return baseline_ + g * span_;
   }
 

@@ -1,12 +1,13 @@
 #include "image_processing/autoenhance/image_masks.h"
 
 #include <algorithm>
+#include <vector>
 
 #include "image_processing/autoenhance/bilateral_filter.h"
 #include "image_processing/autoenhance/bilateral_grid.h"
+#include "image_processing/autoenhance/companding_steps.h"
 #include "image_processing/autoenhance/face_blend.h"
 #include "image_processing/autoenhance/flatness_mask.h"
-#include "image_processing/autoenhance/lab.h"
 
 namespace pelorin::image_processing {
 namespace {
@@ -15,11 +16,12 @@ using Quantized = QuantizedFloat<unsigned char>;
 
 Image<float> lightnessImage(const Image<RGBA8Pixel>& photo) {
   Image<float> lightness(photo.width, photo.height);
-  const ColourTables& tables = colourTables();
-  const RGBA8Pixel* const pixels = photo.data.get();
-  float* const out = lightness.data.get();
-  for (std::size_t i = 0; i < photo.pixelCount(); ++i) {
-    out[i] = lightnessOf(tables, pixels[i].r, pixels[i].g, pixels[i].b) / 100.0f;
+  const auto& ofSteps = unitLightnessOfSteps();
+  std::vector<std::uint16_t> steps(photo.width);
+  for (std::uint32_t y = 0; y < photo.height; ++y) {
+    compandingSteps(photo.row(y), steps.data(), photo.width);
+    float* const row = lightness.row(y);
+    for (std::uint32_t x = 0; x < photo.width; ++x) row[x] = ofSteps[steps[x]];
   }
   return lightness;
 }

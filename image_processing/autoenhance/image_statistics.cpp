@@ -1,9 +1,10 @@
 #include "image_processing/autoenhance/image_statistics.h"
 
 #include <algorithm>
+#include <array>
 
 #include "image_processing/autoenhance/cdf.h"
-#include "image_processing/autoenhance/lab.h"
+#include "image_processing/autoenhance/companding_steps.h"
 
 namespace pelorin::image_processing {
 namespace {
@@ -15,18 +16,25 @@ float asFloatCount(std::uint64_t count) {
 
 class LightnessHistogram {
  public:
-  LightnessHistogram(int bins, float scale)
-      : counts_(bins), lastBin_(static_cast<float>(bins - 1)), scale_(scale) {}
-
-  /// Counts the pixels of columns `begin` ... `end` - 1 of a row.
-  void addRow(const RGBA8Pixel* row, std::uint32_t begin, std::uint32_t end) {
-    const std::int32_t last = static_cast<std::int32_t>(counts_.size()) - 1;
-    for (std::uint32_t x = begin; x < end; ++x) {
-      const float L = lightnessOf(tables_, row[x].r, row[x].g, row[x].b);
-      const std::int32_t bin = truncateTo<std::int32_t>(lastBin_ * L / scale_);
-      ++counts_[std::clamp(bin, 0, last)];
+  LightnessHistogram(int bins, float scale, std::uint32_t longestRow)
+      : binOfStep_(compandingStepCount), steps_(longestRow) {
+    const float lastBin = static_cast<float>(bins - 1);
+    for (std::size_t step = 0; step < compandingStepCount; ++step) {
+      const float bin = lastBin * lightnessOfSteps()[step] / scale;
+      binOfStep_[step] = std::clamp(truncateTo<std::int32_t>(bin), 0, bins - 1);
     }
-    total_ += end - begin;
+    for (auto& counts : counts_) counts.resize(bins);
+  }
+
+  /// Counts `count` pixels, at most the longest row's.
+  void add(const RGBA8Pixel* pixels, std::uint32_t count) {
+    compandingSteps(pixels, steps_.data(), count);
+    std::uint32_t x = 0;
+    for (; x + 4 <= count; x += 4) {
+      for (std::uint32_t i = 0; i < 4; ++i) ++counts_[i][binOfStep_[steps_[x + i]]];
+    }
+    for (; x < count; ++x) ++counts_[0][binOfStep_[steps_[x]]];
+    total_ += count;
   }
 
   bool empty() const { return total_ == 0; }
@@ -34,18 +42,21 @@ class LightnessHistogram {
   std::vector<float> normalised() const {
     const float total = asFloatCount(total_);
     const float share = total == 0.0f ? 1.0f : 1.0f / total;
-    std::vector<float> histogram(counts_.size());
-    std::transform(counts_.begin(), counts_.end(), histogram.begin(),
-                   [share](std::uint64_t count) { return asFloatCount(count) * share; });
+    std::vector<float> histogram(counts_[0].size());
+    for (std::size_t bin = 0; bin < histogram.size(); ++bin) {
+      histogram[bin] =
+          asFloatCount(counts_[0][bin] + counts_[1][bin] + counts_[2][bin] + counts_[3][bin]) *
+          share;
+    }
     return histogram;
   }
 
  private:
-  const ColourTables& tables_ = colourTables();
-  std::vector<std::uint64_t> counts_;
+  std::vector<std::int32_t> binOfStep_;
+  std::vector<std::uint16_t> steps_;
+  // Neighbours mostly fall into one bin: in four histograms they need not wait for each other.
+  std::array<std::vector<std::uint64_t>, 4> counts_;
   std::uint64_t total_ = 0;
-  float lastBin_;
-  float scale_;
 };
 
 void addBox(const Image<RGBA8Pixel>& image, const BoundingBox& box, LightnessHistogram& histogram) {
@@ -55,8 +66,8 @@ void addBox(const Image<RGBA8Pixel>& image, const BoundingBox& box, LightnessHis
   const std::int64_t bottom = std::min<std::int64_t>(box.bottom, std::int64_t{image.height} - 1);
   if (left > right) return;
   for (std::int64_t y = top; y <= bottom; ++y) {
-    histogram.addRow(image.row(static_cast<std::uint32_t>(y)), static_cast<std::uint32_t>(left),
-                     static_cast<std::uint32_t>(right + 1));
+    histogram.add(image.row(static_cast<std::uint32_t>(y)) + left,
+                  static_cast<std::uint32_t>(right + 1 - left));
   }
 }
 
@@ -87,11 +98,11 @@ void computeImageStatistics(const Image<RGBA8Pixel>& image, const ImageMetadata&
 
 void computeHistograms(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata, int bins,
                        float scale, std::vector<float>& histogram, std::int32_t& faceMedian) {
-  LightnessHistogram all(bins, scale);
-  for (std::uint32_t y = 0; y < image.height; ++y) all.addRow(image.row(y), 0, image.width);
+  LightnessHistogram all(bins, scale, image.width);
+  for (std::uint32_t y = 0; y < image.height; ++y) all.add(image.row(y), image.width);
   histogram = all.normalised();
 
-  LightnessHistogram faces(bins, scale);
+  LightnessHistogram faces(bins, scale, image.width);
   for (const auto& box : metadata.faces) addBox(image, *box, faces);
   faceMedian = faces.empty() ? -1 : medianBin(faces.normalised());
 }

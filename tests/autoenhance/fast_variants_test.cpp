@@ -1,0 +1,152 @@
+// Every fast variant of the preparation beside its definition, byte for byte.
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <cstring>
+#include <limits>
+#include <utility>
+#include <vector>
+
+#include "image_processing/autoenhance/companding_steps.h"
+#include "image_processing/autoenhance/flatness_mask.h"
+#include "image_processing/autoenhance/grid_blur.h"
+#include "image_processing/autoenhance/grid_slice.h"
+#include "image_processing/autoenhance/grid_splat.h"
+#include "image_processing/autoenhance/lab.h"
+#include "tests/support/fingerprint.h"
+#include "tests/support/instruction_sets.h"
+#include "tests/support/pictures.h"
+
+namespace pelorin::image_processing {
+namespace {
+
+using Quantized = QuantizedFloat<unsigned char>;
+using test_support::fingerprint;
+using test_support::onEveryInstructionSet;
+using test_support::photoLikePicture;
+using test_support::Random;
+using test_support::randomPixels;
+
+TEST(CompandingSteps, MatchTheirDefinitionAtEveryTailLength) {
+  for (std::size_t count = 0; count <= 70; ++count) {
+    const auto pixels = randomPixels(count, count);
+    std::vector<std::uint16_t> expected(count + 1, 0xABCD);
+    compandingStepsScalar(pixels.data(), expected.data(), count);
+    onEveryInstructionSet([&] {
+      std::vector<std::uint16_t> actual(count + 1, 0xABCD);
+      compandingSteps(pixels.data(), actual.data(), count);
+      ASSERT_EQ(actual, expected) << count;
+    });
+  }
+}
+
+TEST(CompandingSteps, MatchTheirDefinitionForMillionsOfColours) {
+  const std::size_t count = sizeof(void*) == 8 ? 1 << 22 : 1 << 16;
+  const auto pixels = randomPixels(count, 1);
+  std::vector<std::uint16_t> expected(count), actual(count);
+  compandingStepsScalar(pixels.data(), expected.data(), count);
+  onEveryInstructionSet([&] {
+    compandingSteps(pixels.data(), actual.data(), count);
+    ASSERT_EQ(actual, expected);
+  });
+}
+
+TEST(CompandingSteps, DetermineLightness) {
+  for (const RGBA8Pixel& p : randomPixels(5000, 2)) {
+    std::uint16_t step;
+    compandingStepsScalar(&p, &step, 1);
+    const float L = rgbToLab(p.r, p.g, p.b).L;
+    ASSERT_EQ(lightnessOfSteps()[step], L);
+    ASSERT_EQ(unitLightnessOfSteps()[step], L / 100.0f);
+  }
+}
+
+struct Geometry {
+  std::uint32_t width, height;
+  float cellSize;
+};
+
+const std::vector<Geometry> geometries = {{1, 1, 1},   {1, 9, 1},     {9, 1, 1},     {2, 2, 1},
+                                          {5, 4, 2},   {7, 5, 9},     {23, 20, 5},   {64, 48, 3},
+                                          {97, 61, 7}, {160, 90, 4},  {131, 77, 77}, {300, 7, 7},
+                                          {7, 300, 3}, {200, 150, 1}, {640, 3, 3},   {65500, 1, 1}};
+
+/// Smooth, rough or odd lightness.
+Image<float> lightnessOf(const Geometry& g, std::uint64_t seed) {
+  Image<float> image(g.width, g.height);
+  Random random(seed);
+  const auto photo = photoLikePicture(g.width, g.height, seed);
+  for (std::size_t i = 0; i < image.pixelCount(); ++i) {
+    const float smooth = photo.data.get()[i].g / 255.0f;
+    image.data.get()[i] = seed % 3 == 0 ? 0.5f : seed % 3 == 1 ? smooth : random.nextFloat();
+  }
+  if (seed == 5) {
+    for (const float value : {-0.1f, 1.2f, 1e9f, -1e9f, 1.0f, 0.0f, std::nanf(""),
+                              std::numeric_limits<float>::infinity()}) {
+      image.data.get()[random.below(static_cast<std::uint32_t>(image.pixelCount()))] = value;
+    }
+  }
+  return image;
+}
+
+Grid gridFor(const Geometry& g) {
+  const auto cell = static_cast<std::uint32_t>(g.cellSize);
+  return Grid(std::max(g.width / cell, 1u), std::max(g.height / cell, 1u));
+}
+
+TEST(GridSplat, MatchesItsDefinition) {
+  for (const Geometry& g : geometries) {
+    for (std::uint64_t seed = 0; seed < 6; ++seed) {
+      const Image<float> lightness = lightnessOf(g, seed);
+      Grid expected = gridFor(g), actual = gridFor(g);
+      splatScalar(lightness, g.cellSize, expected);
+      splat(lightness, g.cellSize, actual);
+      ASSERT_EQ(fingerprint(actual.cells.data(), actual.cells.size() * sizeof(GridCell)),
+                fingerprint(expected.cells.data(), expected.cells.size() * sizeof(GridCell)))
+          << g.width << " x " << g.height << ", seed " << seed;
+    }
+  }
+}
+
+template <typename T>
+class FastVariants : public testing::Test {};
+using MaskTypes = testing::Types<float, Quantized>;
+TYPED_TEST_SUITE(FastVariants, MaskTypes);
+
+TYPED_TEST(FastVariants, OfTheGridSliceMatchItsDefinition) {
+  for (const Geometry& g : geometries) {
+    for (std::uint64_t seed = 0; seed < 5; ++seed) {
+      const Image<float> lightness = lightnessOf(g, seed);
+      Grid grid = gridFor(g);
+      splatScalar(lightness, g.cellSize, grid);
+      if (seed != 4) blur(grid, seed == 3 ? 0.0f : 0.7f);  // empty nodes stay without the blur
+      Image<TypeParam> expected(g.width, g.height), actual(g.width, g.height);
+      sliceScalar(grid, lightness, g.cellSize, expected);
+      slice(grid, lightness, g.cellSize, actual);
+      ASSERT_EQ(fingerprint(actual), fingerprint(expected))
+          << g.width << " x " << g.height << ", seed " << seed;
+    }
+  }
+}
+
+TYPED_TEST(FastVariants, OfTheFlatnessMaskMatchItsDefinition) {
+  for (const Geometry& g : geometries) {
+    for (const int radius : {-1, 0, 1, 2, 3, 8, 40}) {
+      const Image<float> lightness = lightnessOf(g, 1);
+      Image<TypeParam> smoothed(g.width, g.height);
+      Random random(radius + 2);
+      for (std::size_t i = 0; i < smoothed.pixelCount(); ++i) {
+        smoothed.data.get()[i] =
+            std::min(lightness.data.get()[i] + 0.1f * (random.nextFloat() - 0.5f), 1.0f);
+      }
+      Image<TypeParam> expected(g.width, g.height), actual(g.width, g.height);
+      computeFlatnessMaskScalar(lightness, smoothed, radius, expected);
+      computeFlatnessMask(lightness, smoothed, radius, actual);
+      ASSERT_EQ(fingerprint(actual), fingerprint(expected))
+          << g.width << " x " << g.height << ", radius " << radius;
+    }
+  }
+}
+
+}  // namespace
+}  // namespace pelorin::image_processing
