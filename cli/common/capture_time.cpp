@@ -77,6 +77,7 @@ std::optional<CaptureTime> readTime(const std::string& text, const std::string& 
   }
   const std::optional<int> offset = readOffset(offsetText);
   time.hasZone = offset.has_value();
+  time.zoneSeconds = offset.value_or(0);
   if (offset) {
     time.seconds -= *offset;
     time.text += offsetText;

@@ -12,6 +12,7 @@ struct CaptureTime {
   std::string text;  ///< "2024-05-01T12:30:45.25+02:00", without the parts that are not known.
   double seconds;    ///< Since 1970-01-01T00:00:00 in the camera's zone; in UTC if hasZone.
   bool hasZone;      ///< Whether the offset from UTC was stated.
+  int zoneSeconds;   ///< That offset, east positive; 0 where it was not.
 };
 
 /// The capture time in an Exif segment (an APP1 payload, any bytes are safe): the original's, with

@@ -11,20 +11,16 @@
 #include "cli/common/turn.h"
 
 namespace pelorin::cli {
-namespace {
 
 using image_processing::Image;
 using image_processing::RGBA8Pixel;
 
-// The decoder's buffer becomes the image's: no second copy of the pixels exists.
 std::shared_ptr<Image<RGBA8Pixel>> imageOf(imgproc::DecodedPicture decoded) {
   const std::shared_ptr<std::uint8_t> bytes = std::move(decoded.pixels);
   return std::make_shared<Image<RGBA8Pixel>>(
       decoded.width, decoded.height,
       std::shared_ptr<RGBA8Pixel>(bytes, reinterpret_cast<RGBA8Pixel*>(bytes.get())));
 }
-
-}  // namespace
 
 JpegFacts readFacts(const imgproc::JpegHeader& header) {
   JpegFacts facts = {header.width, header.height, header.components, header.progressive, 1, {}};

@@ -39,6 +39,10 @@ struct PhotoOptions {
 /// @throws what reading and decoding throw, for `explain`; Interrupted on Ctrl-C.
 Photo loadPhoto(const Input& input, const PhotoOptions& options);
 
+/// The decoder's buffer as an image: no second copy of the pixels exists.
+std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> imageOf(
+    imgproc::DecodedPicture decoded);
+
 /// What the header alone tells, without decoding.
 JpegFacts readFacts(const imgproc::JpegHeader& header);
 

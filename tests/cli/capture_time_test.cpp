@@ -37,6 +37,7 @@ TEST(CaptureTime, CountsSubSecondsAsAFraction) {
 TEST(CaptureTime, IsInUtcWhenTheOffsetIsStated) {
   const auto time = timeOf("2024:05:01 12:30:45", "", "+02:00");
   EXPECT_TRUE(time->hasZone);
+  EXPECT_EQ(time->zoneSeconds, 7200);
   EXPECT_EQ(time->seconds, 1714566645.0 - 7200);
   EXPECT_EQ(time->text, "2024-05-01T12:30:45+02:00");
   EXPECT_EQ(timeOf("2024:05:01 12:30:45", "", "-03:30")->seconds, 1714566645.0 + 12600);
