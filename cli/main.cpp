@@ -8,5 +8,7 @@ int main(int argc, char** argv) {
   addCurve(commandLine);
   addMasks(commandLine);
   addSheet(commandLine);
+  addDupes(commandLine);
+  addCompare(commandLine);
   return static_cast<int>(commandLine.run(argc, argv));
 }

@@ -5,7 +5,9 @@
 namespace pelorin::cli {
 
 // Each is defined in the file of its verb.
+void addCompare(CommandLine& commandLine);
 void addCurve(CommandLine& commandLine);
+void addDupes(CommandLine& commandLine);
 void addEnhance(CommandLine& commandLine);
 void addInfo(CommandLine& commandLine);
 void addMasks(CommandLine& commandLine);

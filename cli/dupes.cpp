@@ -1,0 +1,228 @@
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <filesystem>
+#include <memory>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "cli/common/errors.h"
+#include "cli/common/file_bytes.h"
+#include "cli/common/jobs.h"
+#include "cli/common/number_text.h"
+#include "cli/common/talk.h"
+#include "cli/dupes/html_report.h"
+#include "cli/dupes/pair_search.h"
+#include "cli/dupes/photo_library.h"
+#include "cli/dupes/report.h"
+#include "cli/dupes/thumbnail.h"
+#include "cli/verbs.h"
+
+namespace pelorin::cli {
+namespace {
+
+struct DupesOptions {
+  InputOptions inputs;
+  ReportOptions report;
+  std::string threshold = "0";
+  std::string scale = "auto";
+  std::string cache;
+  std::string keep;
+  std::string html;
+  bool assumeFileTime = false;
+  bool overwrite = false;
+  int jobs = 1;
+};
+
+constexpr const char* verbName = "dupes";
+
+// A few hundred pieces: enough to share among cores and to show how far the search is.
+bool searchPairs(const std::vector<Shot>& shots, float threshold, const DupesOptions& options,
+                 std::vector<ShotPair>& pairs) {
+  const PairSearch search(shots, threshold);
+  const std::size_t pieces = std::min<std::size_t>(search.stepCount(), 400);
+  Talk talk(verbName, options.report.quiet, pieces);
+  std::vector<std::vector<ShotPair>> found(pieces);
+  const bool finished = runJobs(
+      pieces, options.jobs,
+      [&](std::size_t piece) {
+        // Every so-manieth step: neighbours in time are equally dense, so pieces are equally long.
+        for (std::size_t step = piece; step < search.stepCount(); step += pieces) {
+          stopIfInterrupted();
+          search.run(step, found[piece]);
+        }
+      },
+      [&](std::size_t piece) {
+        pairs.insert(pairs.end(), found[piece].begin(), found[piece].end());
+        found[piece] = {};
+        talk.fileDone();
+      });
+  sortPairs(pairs);
+  return finished;
+}
+
+// Reads the photos of all groups once more, for their pictures.
+bool writeHtml(const DupesOptions& options, DupeReport& report) {
+  std::vector<std::size_t> shown;
+  for (const DupeGroup& group : report.groups) {
+    for (const std::size_t photo : group.photos) {
+      if (!report.photos[photo].input.isStandardInput()) shown.push_back(photo);
+    }
+  }
+  std::vector<std::vector<std::uint8_t>> thumbnails(report.photos.size());
+  using Thumbnail = std::vector<std::uint8_t>;
+  {
+    Talk talk(verbName, options.report.quiet, shown.size());
+    const bool finished = attemptJobs<Thumbnail>(
+        shown.size(), options.jobs,
+        [&](std::size_t job) { return thumbnailOf(report.photos[shown[job]]); },
+        [&](std::size_t job, const Attempt<Thumbnail>& attempt) {
+          if (attempt.result) {
+            thumbnails[shown[job]] = *attempt.result;
+          } else {
+            const Input& input = report.photos[shown[job]].input;
+            report.failed.push_back({input, "no picture of it: " + attempt.error});
+            talk.error(input.shownName(), report.failed.back().reason);
+          }
+          talk.fileDone();
+        });
+    if (!finished) return false;
+  }
+  const std::string html = htmlReport(report, thumbnails);
+  writeOutput(options.html, {reinterpret_cast<const std::uint8_t*>(html.data()), html.size()});
+  return true;
+}
+
+void printReport(const DupesOptions& options, const DupeReport& report) {
+  if (options.report.json) {
+    Json document = {{"threshold", nineDigits(report.threshold)},
+                     {"photos", report.photos.size()},
+                     {"groups", Json::array()},
+                     {"failed", Json::array()}};
+    for (const DupeGroup& group : report.groups) {
+      document["groups"].push_back(groupAsJson(report, group));
+    }
+    for (const FailedPhoto& failed : report.failed) {
+      document["failed"].push_back(failureAsJson(failed));
+    }
+    JsonOutput(options.report, /*singleFile=*/true).add(document);
+  } else if (options.report.jsonLines) {
+    JsonOutput json(options.report, /*singleFile=*/false);
+    for (const DupeGroup& group : report.groups) json.add(groupAsJson(report, group));
+    for (const FailedPhoto& failed : report.failed) json.add(failureAsJson(failed));
+  } else if (options.html != "-") {
+    std::size_t number = 0;
+    for (const DupeGroup& group : report.groups) {
+      fmt::print("{}", groupAsText(report, group, ++number));
+    }
+  }
+}
+
+void checkHtml(const DupesOptions& options) {
+  if (options.html == "-" && (options.report.json || options.report.jsonLines)) {
+    throw UsageError("--html -: standard output takes the page or --json, not both");
+  }
+  std::error_code ignored;
+  if (!options.overwrite && std::filesystem::is_regular_file(options.html, ignored)) {
+    throw UsageError("--html: " + options.html + " exists; add --overwrite to replace it");
+  }
+}
+
+// Time tells more than light: without it, photos that are only a little alike reach threshold 0.
+void noteUntimed(const DupeReport& report, Talk& talk) {
+  const auto untimed =
+      std::count_if(report.photos.begin(), report.photos.end(),
+                    [](const ScannedPhoto& photo) { return photo.timeSource == TimeSource::none; });
+  if (untimed == 0) return;
+  talk.note(
+      fmt::format("{} of {} photos tell no time and were compared as if taken with every "
+                  "other; if that joins too much, try --assume-mtime or --threshold 2",
+                  untimed, report.photos.size()));
+}
+
+ExitCode runDupes(const DupesOptions& options) {
+  const float threshold = readFiniteNumber("--threshold", options.threshold);
+  checkHtml(options);
+  const std::vector<Input> inputs = withoutRepetitions(expandInputs(options.inputs));
+  if (inputs.empty()) {
+    Talk(verbName, options.report.quiet, 0).note("no photos found");
+    return ExitCode::nothingToDo;
+  }
+  std::unique_ptr<PhotoCache> cache;
+  if (!options.cache.empty()) cache = std::make_unique<PhotoCache>(options.cache);
+
+  PhotoLibrary library;
+  {
+    Talk talk(verbName, options.report.quiet, inputs.size());
+    library = scanPhotos(
+        inputs,
+        {options.scale == "auto" ? automaticScale : std::stoi(options.scale), options.jobs,
+         options.assumeFileTime, cache.get()},
+        [&](const FailedPhoto& failed) { talk.error(failed.input.shownName(), failed.reason); },
+        [&] { talk.fileDone(); });
+  }
+  if (library.interrupted) return ExitCode::interrupted;
+  std::vector<ShotPair> pairs;
+  if (!searchPairs(library.shots, threshold, options, pairs)) return ExitCode::interrupted;
+
+  DupeReport report = {
+      threshold, std::move(library.photos), {}, std::move(library.failed), !options.keep.empty()};
+  report.groups = groupPairs(report.photos.size(), pairs);
+  if (!options.html.empty() && !writeHtml(options, report)) return ExitCode::interrupted;
+  printReport(options, report);
+
+  Talk talk(verbName, options.report.quiet, 0);
+  noteUntimed(report, talk);
+  talk.note(summaryOf(report));
+  if (!library.cacheTrouble.empty()) {
+    fmt::print(stderr, "quenby {}: {}\n", verbName, library.cacheTrouble);
+  }
+  const bool trouble = !report.failed.empty() || !library.cacheTrouble.empty();
+  return trouble ? ExitCode::someFailed : ExitCode::allDone;
+}
+
+}  // namespace
+
+void addDupes(CommandLine& commandLine) {
+  const auto options = std::make_shared<DupesOptions>();
+  CLI::App* verb = commandLine.addVerb(
+      verbName, "Find near-duplicates among photos: the same scene, a moment apart",
+      "quenby dupes -r holiday\n"
+      "quenby dupes -r photos -j 0 --cache photos.cache --html report.html\n"
+      "quenby dupes *.jpg --threshold 1.5 --keep best\n"
+      "quenby dupes -r photos --keep best --jsonl | jq -r '.ranking[]? | select(.keep | not).file'",
+      [options] { return runDupes(*options); });
+  addInputOptions(*verb, options->inputs);
+  verb->add_option("--threshold", options->threshold,
+                   "Smallest score of a pair; 0 unless given, larger is stricter, the same photo "
+                   "twice scores about 3.6")
+      ->type_name("SCORE");
+  verb->add_option("--scale", options->scale,
+                   "Decode photos at 1/1, 1/2, 1/4 or 1/8 of their size; auto, unless given, is "
+                   "1/8 from 4 megapixels on and less for smaller photos")
+      ->type_name("N")
+      ->check(CLI::IsMember({"auto", "1", "2", "4", "8"}));
+  verb->add_flag("--assume-mtime", options->assumeFileTime,
+                 "Photos without a capture time take that of their file; otherwise they are "
+                 "compared with every photo, the time apart taken as 0");
+  verb->add_option("--cache", options->cache,
+                   "Keep what was read in this file, so that the next run reads only new and "
+                   "changed photos")
+      ->type_name("FILE");
+  verb->add_option("--keep", options->keep,
+                   "best: say in each group which photo to keep, by resolution, then by the size "
+                   "of the file; nothing is ever deleted")
+      ->type_name("WHICH")
+      ->check(CLI::IsMember({"best"}));
+  verb->add_option("--html", options->html,
+                   "Write a page with the groups' pictures side by side; reads those photos again")
+      ->type_name("FILE")
+      ->group("Output");
+  verb->add_flag("--overwrite", options->overwrite, "Replace an --html file that exists")
+      ->group("Output");
+  addJobsOption(*verb, options->jobs);
+  addReportOptions(*verb, options->report);
+}
+
+}  // namespace pelorin::cli
