@@ -22,11 +22,8 @@ std::string sliderParams(float slider) {
 
 /// The display name, with the registry name behind it when another filter shows the same.
 std::string labelOf(const FilterDescription& look) {
-  const auto registry = image_processing::DefaultFilterFactory::filterFactory();
-  const auto sharing = std::count_if(
-      registry->descriptions.begin(), registry->descriptions.end(),
-      [&](const auto& entry) { return entry.second->displayName == look.displayName; });
-  return sharing > 1 ? look.displayName + " (" + look.name + ")" : look.displayName;
+  const bool unique = othersShownAs(look).empty();
+  return unique ? look.displayName : look.displayName + " (" + look.name + ")";
 }
 
 }  // namespace

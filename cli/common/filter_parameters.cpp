@@ -1,11 +1,14 @@
 #include "cli/common/filter_parameters.h"
 
+#include <fmt/format.h>
+
 #include <algorithm>
 #include <boost/lexical_cast/bad_lexical_cast.hpp>
 #include <cmath>
 
 #include "cli/common/errors.h"
 #include "cli/common/nearest_name.h"
+#include "cli/common/number_text.h"
 #include "image_processing/core/parameter_strings.h"
 #include "image_processing/filters/default_filter_factory.h"
 
@@ -14,13 +17,13 @@ namespace {
 
 using image_processing::DefaultFilterFactory;
 using image_processing::FilterParams;
+using image_processing::splitStringAt;
 
-std::vector<std::string> parameterNames(const std::string& filter) {
-  if (isAutoEnhance(filter)) return {"slider", "gtmOnly", "gtmExtraMemory"};
-  if (filter == "PassThrough") return {};
-  std::vector<std::string> names = {"maskRadius", "maskAlpha", "applyMask", "r", "g", "b"};
-  if (filter == "LowDimRGBCurve") names.insert(names.end(), {"s1", "s2", "s3", "s4"});
-  return names;
+void requireKnown(const std::string& filter, const std::string& key) {
+  const std::vector<std::string> known = parameterNames(filter);
+  if (std::find(known.begin(), known.end(), key) != known.end()) return;
+  throw UsageError("--params: " + (known.empty() ? filter + " takes no parameters"
+                                                 : unknownName("parameter", key, known)));
 }
 
 void checkAutoEnhance(const FilterParams& params, std::vector<std::string>& warnings) {
@@ -44,6 +47,52 @@ void checkAutoEnhance(const FilterParams& params, std::vector<std::string>& warn
   }
 }
 
+void checkNumber(const std::string& key, const std::string& text, bool inUnit,
+                 std::vector<std::string>& warnings) {
+  const double number = image_processing::readNumber(text);
+  try {
+    readFiniteNumber(key, text);
+  } catch (const UsageError&) {
+    warnings.push_back(fmt::format("{}: '{}' counts as {:g}", key, text, number));
+    return;
+  }
+  if (inUnit && (number < 0.0 || number > 1.0)) {
+    warnings.push_back(key + ": " + text + " is not between 0 and 1");
+  }
+}
+
+void checkCurve(const std::string& key, const std::string& text,
+                std::vector<std::string>& warnings) {
+  const std::vector<std::string> numbers = splitStringAt(text, ",");
+  const std::size_t before = warnings.size();
+  for (const std::string& number : numbers) {
+    if (warnings.size() == before) checkNumber(key, number, true, warnings);
+  }
+  const std::string rest = text.substr(text.rfind(',') + 1);
+  if (!rest.empty()) warnings.push_back(key + ": '" + rest + "' is ignored without a ',' after it");
+  if (numbers.size() < 2) {
+    warnings.push_back(key + ": a curve of fewer than 2 numbers is ignored");
+  }
+}
+
+void checkLook(const std::string& filter, const std::string& params,
+               std::vector<std::string>& warnings) {
+  for (const std::string& item : splitStringAt(params, ";")) {
+    if (item.empty()) continue;
+    const std::vector<std::string> keyAndValue = image_processing::splitStringOnceAt(item, "=");
+    const std::string &key = keyAndValue[0], &value = keyAndValue[1];
+    requireKnown(filter, key);
+    if (key == "r" || key == "g" || key == "b") {
+      checkCurve(key, value, warnings);
+    } else {
+      checkNumber(key, value, key != "maskRadius" && key != "applyMask", warnings);
+    }
+  }
+  if (!params.empty() && params.back() != ';') {
+    warnings.push_back("what follows the last ';' is ignored: end every parameter with one");
+  }
+}
+
 }  // namespace
 
 void requireFilter(const std::string& name) {
@@ -58,19 +107,22 @@ bool isAutoEnhance(const std::string& filter) {
   return filter == "AE0" || filter == "AE08bit";
 }
 
+std::vector<std::string> parameterNames(const std::string& filter) {
+  if (isAutoEnhance(filter)) return {"slider", "gtmOnly", "gtmExtraMemory"};
+  if (filter == "PassThrough") return {};
+  std::vector<std::string> names = {"maskRadius", "maskAlpha", "applyMask", "r", "g", "b"};
+  if (filter == "LowDimRGBCurve") names.insert(names.end(), {"s1", "s2", "s3", "s4"});
+  return names;
+}
+
 std::vector<std::string> checkParameters(const std::string& filter, const std::string& params) {
   std::vector<std::string> warnings;
-  const std::vector<std::string> known = parameterNames(filter);
   const FilterParams read(params);
-  for (const auto& [key, value] : read.items()) {
-    if (std::find(known.begin(), known.end(), key) != known.end()) continue;
-    throw UsageError("--params: " + (known.empty() ? filter + " takes no parameters"
-                                                   : unknownName("parameter", key, known)));
-  }
+  for (const auto& [key, value] : read.items()) requireKnown(filter, key);
   if (isAutoEnhance(filter)) {
     checkAutoEnhance(read, warnings);
-  } else if (!params.empty() && params.back() != ';') {
-    warnings.push_back("what follows the last ';' is ignored: end every parameter with one");
+  } else {
+    checkLook(filter, params, warnings);
   }
   return warnings;
 }

@@ -2,14 +2,12 @@
 
 #include <algorithm>
 #include <cctype>
-#include <vector>
 
 #include "cli/common/errors.h"
 #include "cli/common/nearest_name.h"
 #include "image_processing/filters/default_filter_factory.h"
 
 namespace pelorin::cli {
-namespace {
 
 using image_processing::FilterDescription;
 
@@ -19,8 +17,6 @@ bool equalInAnyCase(const std::string& one, const std::string& other) {
            std::tolower(static_cast<unsigned char>(b));
   });
 }
-
-}  // namespace
 
 const FilterDescription& lookNamed(const std::string& name) {
   const auto registry = image_processing::DefaultFilterFactory::filterFactory();
@@ -34,6 +30,15 @@ const FilterDescription& lookNamed(const std::string& name) {
   }
   if (shownSo != nullptr) return *shownSo;
   throw UsageError(unknownName("look", name, names));
+}
+
+std::vector<std::string> othersShownAs(const FilterDescription& look) {
+  const auto registry = image_processing::DefaultFilterFactory::filterFactory();
+  std::vector<std::string> others;
+  for (const auto& [key, description] : registry->descriptions) {
+    if (key != look.name && description->displayName == look.displayName) others.push_back(key);
+  }
+  return others;
 }
 
 }  // namespace pelorin::cli

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <string>
+#include <vector>
 
 #include "image_processing/filters/filter_description.h"
 
@@ -10,5 +11,11 @@ namespace pelorin::cli {
 /// that show one name the first.
 /// @throws UsageError that names the nearest one.
 const image_processing::FilterDescription& lookNamed(const std::string& name);
+
+/// The registry names of the other filters with the display name of this one.
+std::vector<std::string> othersShownAs(const image_processing::FilterDescription& look);
+
+/// Whether two names differ at most in upper and lower case.
+bool equalInAnyCase(const std::string& one, const std::string& other);
 
 }  // namespace pelorin::cli

@@ -109,6 +109,26 @@ TEST(FilterParameters, OfALookAreItsCurvesAndItsMask) {
   EXPECT_THROW(checkParameters("WinterRGB", "slider=0.3;"), UsageError);
 }
 
+TEST(FilterParameters, OfALookThatReadOtherwiseThanTheyLookAreWarnedOf) {
+  const std::vector<std::pair<const char*, std::string>> cases = {
+      {"applyMask=true;", "applyMask: 'true' counts as 0"},
+      {"maskAlpha=0.4abc;", "maskAlpha: '0.4abc' counts as 0.4"},
+      {"maskRadius=nan;", "maskRadius: 'nan' counts as nan"},
+      {"maskAlpha;", "maskAlpha: '' counts as 0"},
+      {"s1=1.5;", "s1: 1.5 is not between 0 and 1"},
+      {"r=0,128,255,;", "r: 128 is not between 0 and 1"},
+      {"g=0,x,;", "g: 'x' counts as 0"},
+      {"b=0,0.5,1;", "b: '1' is ignored without a ',' after it"},
+      {"r=0.5,;r=0,1,;", "r: a curve of fewer than 2 numbers is ignored"},
+      {"g=;", "g: a curve of fewer than 2 numbers is ignored"},
+      {"s1=0.3;b=0", "what follows the last ';' is ignored: end every parameter with one"},
+  };
+  for (const auto& [params, warning] : cases) {
+    EXPECT_EQ(checkParameters("LowDimRGBCurve", params), std::vector{warning}) << params;
+  }
+  EXPECT_TRUE(checkParameters("LowDimRGBCurve", "maskRadius=2.5;applyMask=2;;").empty());
+}
+
 TEST(Filters, AreFoundByTheirExactNameOnly) {
   EXPECT_NO_THROW(requireFilter("AE0"));
   for (const char* name : {"ae0", "Auto", "Original", "", "AE0 "}) {

@@ -128,6 +128,16 @@ TEST_F(SheetVerb, HasAColumnForEveryLookButTheUntouchedOne) {
   EXPECT_EQ(sheet().width, width(3));
 }
 
+TEST_F(SheetVerb, KnowsLooksByBothNamesInAnyCase) {
+  const std::string input = folder.write("a.jpg", smallJpeg());
+  ASSERT_EQ(run({input}, {"--looks", "ZebraBW,LowDimRGBCurve,WinterRGB"}).exitCode, 0);
+  const Bytes expected = folder.read("sheet.jpg");
+  for (const char* looks : {"snow,STARFISH,Winter", "zebrabw,starFish,WINTERRGB"}) {
+    ASSERT_EQ(run({input}, {"--looks", looks, "--overwrite"}).exitCode, 0);
+    EXPECT_EQ(folder.read("sheet.jpg"), expected) << looks;
+  }
+}
+
 TEST_F(SheetVerb, ReadsRawPixelsAndStandardInput) {
   const auto picture = photoLikePicture(120, 90, 8);
   const Bytes pixels(&picture.data.get()->r, &picture.data.get()->r + picture.byteSize());
