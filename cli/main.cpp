@@ -4,6 +4,8 @@ int main(int argc, char** argv) {
   using namespace pelorin::cli;
   CommandLine commandLine;
   addEnhance(commandLine);
+  addLook(commandLine);
+  addLooks(commandLine);
   addInfo(commandLine);
   addCurve(commandLine);
   addMasks(commandLine);

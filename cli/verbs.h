@@ -10,6 +10,8 @@ void addCurve(CommandLine& commandLine);
 void addDupes(CommandLine& commandLine);
 void addEnhance(CommandLine& commandLine);
 void addInfo(CommandLine& commandLine);
+void addLook(CommandLine& commandLine);
+void addLooks(CommandLine& commandLine);
 void addMasks(CommandLine& commandLine);
 void addSheet(CommandLine& commandLine);
 

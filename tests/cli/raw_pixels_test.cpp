@@ -1,7 +1,6 @@
 #include <gmock/gmock.h>
 
-#include "image_processing/filters/default_filter_factory.h"
-#include "image_processing/filters/filtered_image.h"
+#include "tests/cli/filtered_directly.h"
 #include "tests/cli/jpeg_files.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/support/pictures.h"
@@ -10,26 +9,8 @@ namespace pelorin::test_support {
 namespace {
 
 using image_processing::BoundingBox;
-using image_processing::defaultFilterConfigValue;
-using image_processing::DefaultFilterFactory;
-using image_processing::FilteredImage;
 using image_processing::ImageMetadata;
 using testing::HasSubstr;
-
-Bytes rawBytes(const Image<RGBA8Pixel>& image) {
-  const auto* first = reinterpret_cast<const std::uint8_t*>(image.data.get());
-  return Bytes(first, first + image.byteSize());
-}
-
-Bytes filteredDirectly(const Image<RGBA8Pixel>& source, const std::string& filter,
-                       const std::string& params, const ImageMetadata& faces = {}) {
-  auto image = std::make_shared<Image<RGBA8Pixel>>(source);
-  Image<RGBA8Pixel> result(source.width, source.height);
-  FilteredImage session(image, faces, "", defaultFilterConfigValue,
-                        DefaultFilterFactory::filterFactory());
-  EXPECT_TRUE(session.applyFilterWithParams(filter, params, defaultFilterConfigValue, result));
-  return rawBytes(result);
-}
 
 TEST(RawPixels, PipedThroughEqualTheEnginesByteForByte) {
   const Image<RGBA8Pixel> source = photoLikePicture(160, 120, 4);
