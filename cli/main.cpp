@@ -9,6 +9,7 @@ int main(int argc, char** argv) {
   addInfo(commandLine);
   addCurve(commandLine);
   addMasks(commandLine);
+  addScore(commandLine);
   addSheet(commandLine);
   addDupes(commandLine);
   addCompare(commandLine);

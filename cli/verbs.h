@@ -13,6 +13,7 @@ void addInfo(CommandLine& commandLine);
 void addLook(CommandLine& commandLine);
 void addLooks(CommandLine& commandLine);
 void addMasks(CommandLine& commandLine);
+void addScore(CommandLine& commandLine);
 void addSheet(CommandLine& commandLine);
 
 }  // namespace pelorin::cli
