@@ -8,6 +8,7 @@ int main(int argc, char** argv) {
   addLooks(commandLine);
   addInfo(commandLine);
   addCurve(commandLine);
+  addKeypoints(commandLine);
   addMasks(commandLine);
   addScore(commandLine);
   addSheet(commandLine);

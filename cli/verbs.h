@@ -12,6 +12,7 @@ void addEnhance(CommandLine& commandLine);
 void addInfo(CommandLine& commandLine);
 void addLook(CommandLine& commandLine);
 void addLooks(CommandLine& commandLine);
+void addKeypoints(CommandLine& commandLine);
 void addMasks(CommandLine& commandLine);
 void addScore(CommandLine& commandLine);
 void addSheet(CommandLine& commandLine);
