@@ -16,12 +16,21 @@ using test_support::flatPicture;
 constexpr float nan = std::numeric_limits<float>::quiet_NaN();
 constexpr RGBA8Pixel grey{128, 128, 128, 255};
 
-/// The picture's pixel that shows the point (x, y) of the photo.
-RGBA8Pixel shownAt(const Image<RGBA8Pixel>& picture, const Image<RGBA8Pixel>& photo, double x,
-                   double y) {
-  const AnnotatedPhoto::Point at = AnnotatedPhoto(photo, "", "").at(x, y);
-  return picture.row(static_cast<std::uint32_t>(at.y))[static_cast<std::uint32_t>(at.x)];
-}
+/// Finds the pixels of a picture that show points of the photo.
+class Finder {
+ public:
+  Finder(const Image<RGBA8Pixel>& picture, const Image<RGBA8Pixel>& photo)
+      : picture_(picture), layout_(photo, "", "") {}
+
+  RGBA8Pixel operator()(double x, double y) const {
+    const AnnotatedPhoto::Point at = layout_.at(x, y);
+    return picture_.row(static_cast<std::uint32_t>(at.y))[static_cast<std::uint32_t>(at.x)];
+  }
+
+ private:
+  Image<RGBA8Pixel> picture_;
+  AnnotatedPhoto layout_;
+};
 
 Image<RGBA8Pixel> heatMapOf(const Image<RGBA8Pixel>& photo, const BlockValues& blocks) {
   return drawHeatMap(photo, blocks, "Title", "Subtitle", "Label");
@@ -31,9 +40,9 @@ TEST(HeatMap, TintsEachBlockByItsValue) {
   // Shown enlarged, as it is, and smaller.
   for (const std::uint32_t size : {10u, 500u, 2100u}) {
     const auto photo = flatPicture(3 * size + size / 2, 2 * size + size / 2, grey);
-    const auto picture = heatMapOf(photo, {size, 3, 2, {1, 5, 9, 9, 1, nan}});
+    const Finder shownAt(heatMapOf(photo, {size, 3, 2, {1, 5, 9, 9, 1, nan}}), photo);
     const auto block = [&](double column, double row) {
-      return shownAt(picture, photo, (column + 0.5) * size, (row + 0.5) * size);
+      return shownAt((column + 0.5) * size, (row + 0.5) * size);
     };
     EXPECT_GT(block(0, 0).b, block(0, 0).r + 40) << size;
     EXPECT_GT(block(1, 0).g, block(1, 0).b + 40) << size;
@@ -50,20 +59,20 @@ TEST(HeatMap, LetsThePhotoShineThrough) {
   auto photo = flatPicture(800, 400, {0, 0, 0, 255});
   for (std::uint32_t y = 0; y < 400; ++y)
     std::fill_n(photo.row(y) + 400, 400, RGBA8Pixel{255, 255, 255, 255});
-  const auto picture = heatMapOf(photo, {400, 2, 1, {4, 4}});
-  EXPECT_GT(shownAt(picture, photo, 600, 200).g, shownAt(picture, photo, 200, 200).g + 60);
+  const Finder shownAt(heatMapOf(photo, {400, 2, 1, {4, 4}}), photo);
+  EXPECT_GT(shownAt(600, 200).g, shownAt(200, 200).g + 60);
 }
 
 TEST(HeatMap, HasNoSeamsBetweenBlocksOfOneValue) {
   const auto photo = flatPicture(2500, 700, grey);  // shown at 4/5
-  const auto picture = heatMapOf(photo, {96, 26, 7, std::vector<float>(26 * 7, 3.0f)});
-  const RGBA8Pixel expected = shownAt(picture, photo, 10, 10);
+  const Finder shownAt(heatMapOf(photo, {96, 26, 7, std::vector<float>(26 * 7, 3.0f)}), photo);
+  const RGBA8Pixel expected = shownAt(10, 10);
   EXPECT_NE(expected, grey);
   for (double x = 1; x < 26 * 96 - 2; ++x) {
-    ASSERT_EQ(shownAt(picture, photo, x, 300), expected) << x;
+    ASSERT_EQ(shownAt(x, 300), expected) << x;
   }
   for (double y = 1; y < 7 * 96 - 2; ++y) {
-    ASSERT_EQ(shownAt(picture, photo, 300, y), expected) << y;
+    ASSERT_EQ(shownAt(300, y), expected) << y;
   }
 }
 
