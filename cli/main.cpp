@@ -6,13 +6,13 @@ int main(int argc, char** argv) {
   addEnhance(commandLine);
   addLook(commandLine);
   addLooks(commandLine);
+  addSheet(commandLine);
   addInfo(commandLine);
   addCurve(commandLine);
-  addKeypoints(commandLine);
   addMasks(commandLine);
-  addScore(commandLine);
-  addSheet(commandLine);
   addDupes(commandLine);
   addCompare(commandLine);
+  addScore(commandLine);
+  addKeypoints(commandLine);
   return static_cast<int>(commandLine.run(argc, argv));
 }
