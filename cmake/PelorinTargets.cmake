@@ -33,6 +33,13 @@ function(pelorin_library name)
   target_link_libraries(${target} PUBLIC ${arg_DEPENDS})
 endfunction()
 
+# The shared libraries of a product stand in one folder and find each other there, wherever it goes.
+function(pelorin_place_beside_each_other target)
+  set_target_properties(
+    ${target} PROPERTIES LIBRARY_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/lib
+                         BUILD_RPATH_USE_ORIGIN ON BUILD_RPATH $ORIGIN INSTALL_RPATH $ORIGIN)
+endfunction()
+
 # pelorin_test(<name> [THREADS] [SOURCES ...] DEPENDS ...): the tests in <name>.cpp, run by ctest one
 # by one. THREADS marks tests that start threads: the thread sanitizer's run builds and runs those.
 function(pelorin_test name)

@@ -18,7 +18,12 @@ class LibjpegWriter {
  public:
   LibjpegWriter() {
     codec_.err = errors_.manager();
-    run([this] { jpeg_create_compress(&codec_); });
+    try {
+      run([this] { jpeg_create_compress(&codec_); });
+    } catch (...) {
+      jpeg_destroy_compress(&codec_);  // half of it may be there
+      throw;
+    }
   }
   ~LibjpegWriter() { jpeg_destroy_compress(&codec_); }
   LibjpegWriter(const LibjpegWriter&) = delete;

@@ -6,7 +6,12 @@ namespace pelorin::imgproc {
 
 LibjpegReader::LibjpegReader(std::span<const std::uint8_t> file) : file_(file) {
   codec_.err = errors_.manager();
-  run([this] { jpeg_create_decompress(&codec_); });
+  try {
+    run([this] { jpeg_create_decompress(&codec_); });
+  } catch (...) {
+    jpeg_destroy_decompress(&codec_);  // half of it may be there
+    throw;
+  }
 }
 
 void LibjpegReader::keepSegments(int marker) {
