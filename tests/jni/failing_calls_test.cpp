@@ -1,0 +1,108 @@
+#include <gtest/gtest.h>
+
+#include <functional>
+
+#include "jni/session_table.h"
+#include "tests/jni/support/natives_fixture.h"
+#include "tests/jni/support/whole_run.h"
+
+namespace pelorin::test_support {
+namespace {
+
+// Every call into Java or the bitmap library that can fail does so once in each native, with and
+// without an exception. The fixture checks that nobody calls on while one is pending, and that
+// references, characters and locks are given back.
+class FailingCalls : public NativesTest {
+ protected:
+  FailingCalls() {
+    handle = natives.init(run.photo.reference());
+    natives.preprocess(run.faces, handle);
+  }
+  ~FailingCalls() override { natives.release(handle); }
+
+  /// Runs `native` once for each of its calls and way of failing, with `check` after each.
+  void failEachCall(const std::function<void()>& native, int expectedCalls) {
+    using Failure = FakeEnvironment::Failure;
+    env.failCall(0);
+    native();
+    const int calls = env.fallibleCalls();
+    EXPECT_EQ(calls, expectedCalls);
+    for (int call = 1; call <= calls; ++call) {
+      for (const Failure failure : {Failure::withException, Failure::withoutException}) {
+        const std::size_t sessions = quenby::openSessions().size();
+        env.failCall(call, failure);
+        native();
+        EXPECT_TRUE(env.failed());
+        env.failCall(0);
+        const std::string exception = env.takeException();
+        if (failure == Failure::withException) {
+          EXPECT_EQ(exception.find("test/Injected: "), 0u) << exception;
+        }
+        EXPECT_EQ(env.violations(), "") << call;
+        EXPECT_EQ(run.photo.locks + run.output.locks + run.padded.locks, 0) << call;
+        EXPECT_EQ(quenby::openSessions().size(), sessions) << call;
+        ++faults;
+      }
+    }
+    EXPECT_EQ(run.results(), before) << "a run after the failures differs";
+    takeLogLines();
+    printf("%d failing calls\n", faults);
+  }
+
+  WholeRun run{natives};
+  const std::vector<std::uint8_t> before = run.results();
+  jlong handle = 0;
+  int faults = 0;
+};
+
+TEST_F(FailingCalls, OfInit) {
+  failEachCall(
+      [&] {
+        const jlong opened = natives.init(run.photo.reference());
+        EXPECT_EQ(opened == 0, env.failed());
+        if (opened != 0) natives.release(opened);
+      },
+      2);
+}
+
+TEST_F(FailingCalls, OfPreprocess) {
+  failEachCall([&] { natives.preprocess(run.faces, handle); }, 2);
+}
+
+TEST_F(FailingCalls, OfApplyAutoEnhanceFilter) {
+  failEachCall([&] { natives.apply(handle, run.output.reference(), run.filter, run.params); }, 4);
+}
+
+TEST_F(FailingCalls, OfApplyAutoEnhanceFilterToJpegFile) {
+  failEachCall(
+      [&] { natives.applyToFile(run.input, run.file, 90, run.faces, 1, run.filter, run.params); },
+      // Both paths for the rotation, one more for its messages, the copy's path, two names, two
+      // faces, the output's path.
+      3 + 1 + 2 + 2 + 1);
+}
+
+TEST_F(FailingCalls, OfSimilarityScore) {
+  failEachCall(
+      [&] {
+        const float score =
+            natives.similarity(run.photo.reference(), 1, 1, run.padded.reference(), 2, 2);
+        EXPECT_EQ(score == -2222.0f, env.failed());
+      },
+      4);
+}
+
+TEST_F(FailingCalls, OfTheExceptionItself) {
+  using Failure = FakeEnvironment::Failure;
+  FakeString none("");
+  for (int call = 3; call <= 4; ++call) {  // after the two names: find the class, throw
+    for (const Failure failure : {Failure::withException, Failure::withoutException}) {
+      env.failCall(call, failure);
+      natives.apply(handle, run.output.reference(), run.filter, none);
+      EXPECT_TRUE(env.failed());
+      EXPECT_EQ(env.takeException().empty(), failure == Failure::withoutException);
+    }
+  }
+}
+
+}  // namespace
+}  // namespace pelorin::test_support

@@ -1,0 +1,155 @@
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include "platform/pn_imgproc/jpeg_codec.h"
+#include "tests/jni/support/natives_fixture.h"
+#include "tests/jni/support/picture_files.h"
+#include "tests/support/pictures.h"
+
+namespace pelorin::test_support {
+namespace {
+
+using testing::ElementsAre;
+using testing::HasSubstr;
+using testing::IsEmpty;
+using testing::StartsWith;
+
+class JpegFileNative : public NativesTest {
+ protected:
+  JpegFileNative() { writePicture(input.text, picture); }
+
+  /// What the file at `path` should be after `filter` on `source`, a file's bytes.
+  static std::vector<std::uint8_t> expected(const std::vector<std::uint8_t>& source, int scale,
+                                            const std::string& filter, const std::string& params) {
+    const imgproc::DecodedPicture decoded = imgproc::decodeJpeg(source, scale);
+    Image<RGBA8Pixel> photo(decoded.width, decoded.height);
+    std::copy_n(decoded.pixels.get(), photo.byteSize(), &photo.data.get()->r);
+    const std::vector<std::uint8_t> pixels = engineResult(photo, filter, params);
+    return imgproc::encodeJpeg(pixels.data(), photo.width, photo.height, 90);
+  }
+
+  TemporaryFolder folder;
+  FakeString input{folder.file("in.jpg")}, output{folder.file("out.jpg")};
+  FakeString ae{"AE0"}, passThrough{"PassThrough"}, slider{"slider=0.4;"}, empty{""};
+  FakeFaces noFaces{};
+  const Image<RGBA8Pixel> picture = photoLikePicture(48, 32, 2);
+};
+
+TEST_F(JpegFileNative, WritesTheFilteredPictureAtQualityNinety) {
+  EXPECT_TRUE(natives.applyToFile(input, output, 0, noFaces, 1, ae, slider));
+  EXPECT_EQ(contentOf(output.text), expected(contentOf(input.text), 1, "AE0", "slider=0.4;"));
+  EXPECT_THAT(takeLogLines(), ElementsAre("3 QuenbyLib: applyToJpegFile: " + input.text +
+                                          " [48x32:0] AE0 slider=0.4;"));
+  EXPECT_THAT(folder.names(), ElementsAre("in.jpg", "out.jpg"));
+}
+
+TEST_F(JpegFileNative, NeverOpensTheInputForWritingWithoutRotation) {
+  ASSERT_EQ(chmod(input.text.c_str(), 0444), 0);
+  struct stat before, after;
+  ASSERT_EQ(stat(input.text.c_str(), &before), 0);
+  EXPECT_TRUE(natives.applyToFile(input, output, 0, noFaces, 1, passThrough, empty));
+  ASSERT_EQ(stat(input.text.c_str(), &after), 0);
+  EXPECT_EQ(before.st_ino, after.st_ino);
+  EXPECT_EQ(before.st_mtim.tv_nsec, after.st_mtim.tv_nsec);
+}
+
+TEST_F(JpegFileNative, MayWriteOverItsInput) {
+  for (const int rotation : {0, 90}) {
+    const std::vector<std::uint8_t> before = contentOf(input.text);
+    const std::vector<std::uint8_t> turned = imgproc::rotateJpeg(before, rotation);
+    EXPECT_TRUE(natives.applyToFile(input, input, rotation, noFaces, 1, ae, slider));
+    EXPECT_EQ(contentOf(input.text), expected(turned, 1, "AE0", "slider=0.4;"));
+  }
+}
+
+TEST_F(JpegFileNative, TurnsFirstAndFiltersTheTurnedPicture) {
+  for (const int rotation : {90, 180, 270, 360, -90}) {
+    EXPECT_TRUE(natives.applyToFile(input, output, rotation, noFaces, 1, passThrough, empty));
+    const std::vector<std::uint8_t> turned = imgproc::rotateJpeg(contentOf(input.text), rotation);
+    EXPECT_EQ(contentOf(output.text), expected(turned, 1, "PassThrough", "")) << rotation;
+  }
+  EXPECT_THAT(takeLogLines()[0], HasSubstr(output.text + " [32x48:90] PassThrough"));
+}
+
+TEST_F(JpegFileNative, ScalesFacesByTheDecodedSize) {
+  FakeFaces faces{{0.25f, 0.5f, 0.75f, 1}};
+  EXPECT_TRUE(natives.applyToFile(input, output, 90, faces, 2, passThrough, empty));
+  EXPECT_THAT(takeLogLines(),
+              ElementsAre(HasSubstr("[16x24:90]"), "3 QuenbyLib: face bb: [4 12 24 12]"));
+}
+
+TEST_F(JpegFileNative, IsFalseWithALineForAMissingInput) {
+  FakeString missing(folder.file("missing.jpg"));
+  const std::string line = "6 QuenbyLib: image decoding/scaling failed for " + missing.text;
+  EXPECT_FALSE(natives.applyToFile(missing, output, 0, noFaces, 1, ae, slider));
+  EXPECT_THAT(takeLogLines(), testing::Contains(line));
+  EXPECT_FALSE(natives.applyToFile(missing, output, 90, noFaces, 1, ae, slider));
+  EXPECT_THAT(env.takeException(), StartsWith("java/io/IOException"));
+  EXPECT_THAT(takeLogLines(), testing::Contains(line));
+  EXPECT_THAT(folder.names(), ElementsAre("in.jpg"));
+}
+
+TEST_F(JpegFileNative, IsFalseForADamagedFileAndKeepsTheOldOutput) {
+  std::vector<std::uint8_t> damaged = contentOf(input.text);
+  const std::vector<std::uint8_t> old = {1, 2, 3};
+  imgproc::writeFileAtomically(output.text, old);
+  for (const std::size_t size :
+       {damaged.size() - 1, damaged.size() / 2, std::size_t{9}, std::size_t{0}}) {
+    imgproc::writeFileAtomically(input.text, std::span(damaged).first(size));
+    EXPECT_FALSE(natives.applyToFile(input, output, 0, noFaces, 1, ae, slider)) << size;
+    EXPECT_THAT(takeLogLines(),
+                testing::Contains("6 QuenbyLib: image decoding/scaling failed for " + input.text));
+    EXPECT_FALSE(natives.applyToFile(input, output, 90, noFaces, 1, ae, slider)) << size;
+    EXPECT_THAT(env.takeException(), StartsWith("java/lang/RuntimeException: ")) << size;
+    EXPECT_EQ(contentOf(output.text), old);
+  }
+}
+
+TEST_F(JpegFileNative, RaisesForAnAngleThatIsNoQuarterTurn) {
+  EXPECT_FALSE(natives.applyToFile(input, output, 45, noFaces, 1, ae, slider));
+  EXPECT_THAT(env.takeException(), StartsWith("java/lang/RuntimeException: "));
+  EXPECT_THAT(folder.names(), ElementsAre("in.jpg"));
+}
+
+TEST_F(JpegFileNative, RaisesAnIOExceptionForAnOutputThatCannotBeWritten) {
+  FakeString nowhere(folder.file("no such folder/out.jpg"));
+  for (const int rotation : {0, 90}) {
+    EXPECT_FALSE(natives.applyToFile(input, nowhere, rotation, noFaces, 1, ae, slider));
+    EXPECT_THAT(env.takeException(), StartsWith("java/io/IOException: "));
+  }
+  EXPECT_THAT(folder.names(), ElementsAre("in.jpg"));
+}
+
+TEST_F(JpegFileNative, LeavesTheRotatedCopyWhenAFilterFails) {
+  EXPECT_FALSE(natives.applyToFile(input, output, 90, noFaces, 1, ae, empty));
+  EXPECT_EQ(env.takeException(), "java/lang/IllegalArgumentException: map::at");
+  EXPECT_EQ(contentOf(output.text), imgproc::rotateJpeg(contentOf(input.text), 90));
+}
+
+TEST_F(JpegFileNative, RaisesIllegalArgumentForANullPath) {
+  EXPECT_FALSE(natives.applyToFile(nullptr, output, 0, noFaces, 1, ae, slider));
+  EXPECT_EQ(env.takeException(), "java/lang/IllegalArgumentException: inputPath is null");
+  EXPECT_FALSE(natives.applyToFile(input, nullptr, 90, noFaces, 1, ae, slider));
+  EXPECT_EQ(env.takeException(), "java/lang/IllegalArgumentException: outputPath is null");
+  EXPECT_THAT(takeLogLines(), IsEmpty());
+}
+
+TEST_F(JpegFileNative, CopiesThePictureForAnUnknownOrNullFilter) {
+  FakeString unknown("NoSuchFilter");
+  for (const jstring filter : {static_cast<jstring>(unknown), static_cast<jstring>(nullptr)}) {
+    EXPECT_TRUE(natives.applyToFile(input, output, 0, nullptr, 1, filter, nullptr));
+    EXPECT_EQ(contentOf(output.text), expected(contentOf(input.text), 1, "PassThrough", ""));
+  }
+}
+
+TEST_F(JpegFileNative, OpensFilesWhoseNamesAreBeyondTheBasicPlane) {
+  const std::string camera = "\xF0\x9F\x93\xB7";
+  writePicture(folder.file(camera), picture);
+  FakeString javaName(folder.file("\xED\xA0\xBD\xED\xB3\xB7"));  // as the virtual machine spells it
+  EXPECT_TRUE(natives.applyToFile(javaName, output, 0, noFaces, 1, passThrough, empty));
+}
+
+}  // namespace
+}  // namespace pelorin::test_support

@@ -1,0 +1,193 @@
+#include <gtest/gtest.h>
+
+#include <functional>
+
+#include "jni/session_table.h"
+#include "tests/jni/support/allocation_faults.h"
+#include "tests/jni/support/natives_fixture.h"
+#include "tests/jni/support/whole_run.h"
+
+namespace pelorin::test_support {
+namespace {
+
+using Later = AllocationFaults::Later;
+
+// Every allocation of every native fails once, alone and with all later ones.
+class OutOfMemory : public NativesTest {
+ protected:
+  OutOfMemory() {
+    handle = natives.init(run.photo.reference());
+    natives.preprocess(run.faces, handle);
+    // Fill what lives as long as the process: tables, the places of released sessions, streams.
+    for (int i = 0; i < 300; ++i) natives.release(natives.init(run.photo.reference()));
+    run.results();
+    takeLogLines();
+  }
+  ~OutOfMemory() override {
+    natives.release(handle);
+    takeLogLines();
+  }
+
+  /// @param native   the call under faults; returns what the caller sees of it.
+  /// @param message  of the OutOfMemoryError that must follow each fault that is noticed.
+  template <typename Result>
+  void failEachAllocation(const std::function<Result()>& native,
+                          const std::function<void(Result, bool failed)>& check,
+                          const std::string& message) {
+    long faults = 0, unnoticed = 0;
+    for (const Later later : {Later::succeed, Later::fail}) {
+      for (long failing = 1;; ++failing) {
+        const long blocks = blocksInUse();
+        Result result;
+        long count;
+        {
+          const AllocationFaults fault(failing, later);
+          result = native();
+          count = fault.count();
+        }
+        const bool reached = count >= failing, failed = env.pending();
+        if (failed) {
+          EXPECT_EQ(env.takeException(), "java/lang/OutOfMemoryError: " + message) << failing;
+        }
+        check(result, failed);
+        takeLogLines();
+        EXPECT_EQ(blocksInUse(), blocks) << "leaked at allocation " << failing;
+        if (!reached) {
+          EXPECT_FALSE(failed);
+          break;
+        }
+        ++faults;
+        unnoticed += failed ? 0 : 1;
+        EXPECT_EQ(env.violations(), "") << failing;
+        EXPECT_EQ(run.photo.locks + run.output.locks + run.padded.locks, 0) << failing;
+        if (faults % 16 == 1) {
+          EXPECT_EQ(run.results(), before) << "after allocation " << failing;
+        }
+        if (HasFailure()) return;
+      }
+    }
+    EXPECT_GT(faults, 0);
+    EXPECT_LT(unnoticed, faults);
+    EXPECT_EQ(run.results(), before);
+    printf("%ld injected faults, %ld of them made up for\n", faults, unnoticed);
+  }
+
+  void failEachAllocationOfTheFileCall(int rotation) {
+    const auto call = [&] {
+      return natives.applyToFile(run.input, run.file, rotation, run.faces, 1, run.filter,
+                                 run.params);
+    };
+    EXPECT_TRUE(call());
+    const std::vector<std::uint8_t> expected = contentOf(run.file.text);
+    bool decodingCanFail = false;
+    failEachAllocation<bool>(
+        call,
+        [&](bool result, bool failed) {
+          decodingCanFail |= failed && !result;  // until the picture is decoded
+          if (!failed) {
+            EXPECT_TRUE(result);
+          }
+        },
+        "QuenbyLib JPEG filtering ran out of memory");
+    EXPECT_TRUE(decodingCanFail);
+    EXPECT_TRUE(call());
+    EXPECT_EQ(contentOf(run.file.text), expected);
+    EXPECT_EQ(run.folder.names(), (std::vector<std::string>{"in.jpg", "out.jpg"}));
+  }
+
+  WholeRun run{natives};
+  const std::vector<std::uint8_t> before = run.results();
+  jlong handle = 0;
+};
+
+TEST_F(OutOfMemory, InInit) {
+  failEachAllocation<jlong>([&] { return natives.init(run.photo.reference()); },
+                            [&](jlong opened, bool failed) {
+                              EXPECT_EQ(opened == 0, failed);
+                              natives.release(opened);
+                              EXPECT_EQ(quenby::openSessions().size(), 1u);
+                            },
+                            "QuenbyLib init ran out of memory");
+}
+
+TEST_F(OutOfMemory, InPreprocessKeepsThePreviousFilters) {
+  const auto session = quenby::openSessions().find(handle);
+  const auto* previous = session->filteredImage().get();
+  failEachAllocation<int>(
+      [&] {
+        natives.preprocess(run.faces, handle);
+        return 0;
+      },
+      [&](int, bool failed) {
+        EXPECT_EQ(session->filteredImage().get() == previous, failed);
+        previous = session->filteredImage().get();
+      },
+      "QuenbyLib preprocess ran out of memory");
+}
+
+TEST_F(OutOfMemory, InApplyAutoEnhanceFilterWithAnyFilter) {
+  for (const std::string& name : filterNames()) {
+    FakeString filter(name);
+    natives.preprocess(run.faces, handle);
+    natives.apply(handle, run.output.reference(), filter, run.params);
+    const std::vector<std::uint8_t> expected = run.output.packed();
+    natives.preprocess(run.faces, handle);
+    failEachAllocation<int>(
+        [&] {
+          natives.apply(handle, run.output.reference(), filter, run.params);
+          return 0;
+        },
+        [&](int, bool failed) {
+          if (!failed) {
+            EXPECT_EQ(run.output.packed(), expected);
+          }
+          natives.preprocess(run.faces, handle);  // the next call prepares the filter again
+        },
+        "QuenbyLib real-time filtering ran out of memory");
+  }
+}
+
+TEST_F(OutOfMemory, InApplyAutoEnhanceFilterWithAPreparedFilter) {
+  natives.apply(handle, run.output.reference(), run.filter, run.params);
+  const std::vector<std::uint8_t> expected = run.output.packed();
+  failEachAllocation<int>(
+      [&] {
+        natives.apply(handle, run.output.reference(), run.filter, run.params);
+        return 0;
+      },
+      [&](int, bool failed) {
+        if (!failed) {
+          EXPECT_EQ(run.output.packed(), expected);
+        }
+      },
+      "QuenbyLib real-time filtering ran out of memory");
+}
+
+TEST_F(OutOfMemory, InApplyAutoEnhanceFilterToJpegFile) {
+  failEachAllocationOfTheFileCall(0);
+}
+
+// TurboJPEG loses blocks of its own when it cannot be set up, so turning runs with the tests'
+// codec.
+TEST_F(OutOfMemory, InApplyAutoEnhanceFilterToJpegFileTurned) {
+  failEachAllocationOfTheFileCall(90);
+}
+
+TEST_F(OutOfMemory, InSimilarityScore) {
+  const float expected =
+      natives.similarity(run.photo.reference(), 1, 2, run.padded.reference(), 3, 4);
+  failEachAllocation<float>(
+      [&] { return natives.similarity(run.photo.reference(), 1, 2, run.padded.reference(), 3, 4); },
+      [&](float score, bool failed) { EXPECT_EQ(score, failed ? 0 : expected); },
+      "out of native memory");
+}
+
+TEST_F(OutOfMemory, NeverInReleaseSession) {
+  const jlong opened = natives.init(run.photo.reference());
+  const AllocationFaults fault(1, Later::fail);
+  natives.release(opened);
+  EXPECT_EQ(fault.count(), 0);
+}
+
+}  // namespace
+}  // namespace pelorin::test_support

@@ -1,0 +1,101 @@
+#include "jni/registration.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include "jni/load_time_cache.h"
+#include "platform/pn/jni_lookup.h"
+#include "tests/jni/support/fake_environment.h"
+
+extern "C" jint JNI_OnLoad(JavaVM* vm, void* reserved);
+
+namespace pelorin::quenby {
+namespace {
+
+using test_support::FakeEnvironment;
+
+class Registration : public testing::Test {
+ protected:
+  ~Registration() override { EXPECT_EQ(env.violations(), ""); }
+
+  FakeEnvironment env;
+};
+
+TEST_F(Registration, NamesTheSixNatives) {
+  FakeEnvironment::registered().clear();
+  ASSERT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_VERSION_1_6);
+  std::vector<std::string> names;
+  for (const auto& [name, function] : FakeEnvironment::registered()) names.push_back(name);
+  EXPECT_THAT(names,
+              testing::ElementsAre(
+                  "applyAutoEnhanceFilter(JLandroid/graphics/Bitmap;Ljava/lang/String;"
+                  "Ljava/lang/String;)V",
+                  "applyAutoEnhanceFilterToJpegFile(Ljava/lang/String;Ljava/lang/String;I"
+                  "[Landroid/graphics/RectF;ILjava/lang/String;Ljava/lang/String;)Z",
+                  "init(Landroid/graphics/Bitmap;)J", "preprocess([Landroid/graphics/RectF;J)V",
+                  "releaseSession(J)V",
+                  "similarityScore(Landroid/graphics/Bitmap;DILandroid/graphics/Bitmap;DI)F"));
+}
+
+TEST_F(Registration, ReadsTheErrorValueOfTheJavaClass) {
+  FakeEnvironment::similarityError = -7.5f;
+  ASSERT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_VERSION_1_6);
+  EXPECT_EQ(loadTimeCache.similarityError, -7.5f);
+  FakeEnvironment::similarityError = -2222.0f;
+}
+
+TEST(LoadTimeCache, HasAnErrorValueBeforeJavaIsAsked) {
+  EXPECT_EQ(LoadTimeCache().similarityError, -2222.0f);
+}
+
+TEST_F(Registration, HoldsOneGlobalReferenceHoweverOftenItRuns) {
+  ASSERT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_VERSION_1_6);
+  env.globalReferences = 1;
+  ASSERT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_VERSION_1_6);
+  EXPECT_EQ(env.globalReferences, 1);
+}
+
+TEST_F(Registration, FailsForAMissingClassOrMember) {
+  const std::string package = "com/pelorin/photos/quenby/autoenhance/";
+  for (const std::string& missing :
+       {std::string("android/graphics/RectF"), std::string("android/graphics/RectF.left"),
+        std::string("android/graphics/RectF.top"), std::string("android/graphics/RectF.right"),
+        std::string("android/graphics/RectF.bottom"), package + "QuenbyEngine",
+        package + "ImageDupeDetector", package + "ImageDupeDetector.SIMILARITY_ERROR"}) {
+    env.missing = missing;
+    EXPECT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_ERR) << missing;
+    EXPECT_THAT(env.takeException(), testing::AnyOf(testing::StartsWith("java/lang/NoSuchField"),
+                                                    testing::StartsWith("java/lang/NoClassDef")))
+        << missing;
+  }
+}
+
+TEST_F(Registration, LetsTheErrorOfALookUpThrough) {
+  env.missing = "android/graphics/RectF";
+  EXPECT_THROW(registerQuenbyFilterNatives(), JniError);
+  env.takeException();
+  env.missing = "com/pelorin/photos/quenby/autoenhance/ImageDupeDetector";
+  EXPECT_THROW(registerImageDupeDetectorNatives(), JniError);
+  env.takeException();
+}
+
+TEST_F(Registration, FailsWithWhateverCallFails) {
+  using Failure = FakeEnvironment::Failure;
+  env.failCall(0);
+  ASSERT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_VERSION_1_6);
+  const int calls = env.fallibleCalls();
+  // RectF and its fields, a global reference, then find and register twice, then find and look up.
+  EXPECT_EQ(calls, 6 + 2 + 2 + 2);
+  for (int call = 1; call <= calls; ++call) {
+    for (const Failure failure : {Failure::withException, Failure::withoutException}) {
+      const int references = env.globalReferences;
+      env.failCall(call, failure);
+      EXPECT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_ERR) << call;
+      EXPECT_NE(env.takeException(), "") << call;
+      EXPECT_EQ(env.globalReferences, references) << call;
+    }
+  }
+}
+
+}  // namespace
+}  // namespace pelorin::quenby
