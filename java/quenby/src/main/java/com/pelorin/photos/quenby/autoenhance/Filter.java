@@ -1,0 +1,67 @@
+package com.pelorin.photos.quenby.autoenhance;
+
+/** The filters there are. */
+public enum Filter {
+    /** Automatic enhancement. Requires "slider=0.4;", of 0 to 1. */
+    AUTO("AE0", "Auto"),
+    /** Automatic enhancement in less memory. Requires "slider=0.4;", of 0 to 1. */
+    AUTO_8BIT("AE08bit", "Auto"),
+    /** Black and white with a vignette. */
+    SNOW("ZebraBW", "Snow"),
+    /** Light with hints of raspberry. */
+    SUMMER("SummerRGB", "Summer"),
+    /** Warm with a vignette. */
+    SPRING("SpringRGB", "Spring"),
+    /** Bright and energetic. */
+    FALL("FallRGB", "Fall"),
+    /** As from an old print. */
+    VINTAGE("VintageRGB", "Vintage"),
+    /** Cool with a vignette. */
+    WINTER("WinterRGB", "Winter"),
+    /** Curves by four parameters "s1" to "s4" of 0 to 1; 0.5 each changes least. */
+    STARFISH("LowDimRGBCurve", "StarFish"),
+    /** The photo as it is. */
+    ORIGINAL("PassThrough", "Original");
+
+    private final String key;
+    private final String displayName;
+
+    Filter(String key, String displayName) {
+        this.key = key;
+        this.displayName = displayName;
+    }
+
+    /**
+     * Tells the name by which the native library knows the filter.
+     *
+     * @return the name, such as "AE0"
+     */
+    public String key() {
+        return key;
+    }
+
+    /**
+     * Tells the name to show to users; several filters may share one.
+     *
+     * @return the name, such as "Auto"
+     */
+    public String displayName() {
+        return displayName;
+    }
+
+    /**
+     * Finds a filter by its key.
+     *
+     * @param key exactly as {@link #key} gives it
+     * @return the filter
+     * @throws UnknownFilterException when there is none
+     */
+    public static Filter of(String key) {
+        for (Filter filter : values()) {
+            if (filter.key.equals(key)) {
+                return filter;
+            }
+        }
+        throw new UnknownFilterException(key);
+    }
+}

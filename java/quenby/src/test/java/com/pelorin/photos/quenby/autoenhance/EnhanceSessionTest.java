@@ -1,0 +1,142 @@
+package com.pelorin.photos.quenby.autoenhance;
+
+import static org.junit.jupiter.api.Assertions.assertArrayEquals;
+import static org.junit.jupiter.api.Assertions.assertEquals;
+import static org.junit.jupiter.api.Assertions.assertThrows;
+import static org.junit.jupiter.api.Assertions.assertTrue;
+
+import android.graphics.Bitmap;
+import android.graphics.RectF;
+import java.util.Arrays;
+import java.util.List;
+import java.util.concurrent.CountDownLatch;
+import java.util.concurrent.TimeUnit;
+import java.util.logging.Handler;
+import java.util.logging.LogRecord;
+import java.util.logging.Logger;
+import org.junit.jupiter.api.Test;
+
+class EnhanceSessionTest {
+    private final Bitmap photo = Pictures.photo(50, 40, 2);
+    private final Bitmap output = Pictures.sameSize(photo);
+
+    @Test
+    void givesWhatTheNativesGive() {
+        QuenbyEngine engine = new QuenbyEngine();
+        RectF face = new RectF(0.2f, 0.2f, 0.6f, 0.6f);
+        long handle = engine.init(photo);
+        engine.preprocess(new RectF[] {face}, handle);
+        engine.applyAutoEnhanceFilter(handle, output, "AE0", "slider=0.3;");
+        engine.releaseSession(handle);
+        byte[] expected = Pictures.bytes(output);
+        try (EnhanceSession session = EnhanceSession.open(photo)) {
+            session.enhance(0.3f, output);
+            assertTrue(!Arrays.equals(expected, Pictures.bytes(output)));
+            session.setFaces(List.of(face));
+            session.enhance(0.3f, output);
+            assertArrayEquals(expected, Pictures.bytes(output));
+            session.apply("AE0", "slider=0.3;", output);
+            assertArrayEquals(expected, Pictures.bytes(output));
+            assertEquals(50, session.getWidth());
+            assertEquals(40, session.getHeight());
+        }
+    }
+
+    @Test
+    void mayWriteIntoThePhotoItself() {
+        byte[] before = Pictures.bytes(photo);
+        try (EnhanceSession session = EnhanceSession.open(photo)) {
+            session.enhance(0.5f, photo);
+            session.apply(Filter.ORIGINAL, null, photo);
+        }
+        assertArrayEquals(before, Pictures.bytes(photo));
+    }
+
+    @Test
+    void refusesBitmapsThatCannotBeRead() {
+        assertThrows(UnsuitableBitmapException.class, () -> EnhanceSession.open(null));
+        assertThrows(UnsuitableBitmapException.class,
+                () -> EnhanceSession.open(Bitmap.createBitmap(2, 2, Bitmap.Config.RGB_565)));
+        photo.recycle();
+        assertThrows(UnsuitableBitmapException.class, () -> EnhanceSession.open(photo));
+    }
+
+    @Test
+    void refusesOutputsOfAnotherKindOrSize() {
+        try (EnhanceSession session = EnhanceSession.open(photo)) {
+            for (Bitmap bitmap : new Bitmap[] {null, Pictures.photo(49, 40, 0),
+                Pictures.photo(50, 41, 0), Bitmap.createBitmap(50, 40, Bitmap.Config.ARGB_4444)}) {
+                assertThrows(UnsuitableBitmapException.class, () -> session.enhance(0.4f, bitmap));
+            }
+            output.recycle();
+            assertThrows(UnsuitableBitmapException.class, () -> session.enhance(0.4f, output));
+        }
+    }
+
+    @Test
+    void refusesUnknownFiltersAndBadParameters() {
+        try (EnhanceSession session = EnhanceSession.open(photo)) {
+            assertThrows(UnknownFilterException.class, () -> session.apply("Auto", "", output));
+            assertThrows(UnknownFilterException.class,
+                    () -> session.apply((String) null, "", output));
+            assertThrows(UnknownFilterException.class,
+                    () -> session.apply((Filter) null, "", output));
+            assertThrows(IllegalArgumentException.class,
+                    () -> session.apply(Filter.AUTO, "", output));
+            assertThrows(IllegalArgumentException.class,
+                    () -> session.enhance(Float.NaN, output));
+            assertThrows(IllegalArgumentException.class,
+                    () -> session.setFaces(Arrays.asList((RectF) null)));
+            assertThrows(IllegalArgumentException.class, () -> session.setFaces(
+                    List.of(new RectF(0, Float.POSITIVE_INFINITY, 1, 1))));
+        }
+    }
+
+    @Test
+    void refusesWorkAfterItsEnd() {
+        EnhanceSession session = EnhanceSession.open(photo);
+        session.close();
+        session.close();
+        assertThrows(SessionClosedException.class, () -> session.enhance(0.4f, output));
+        assertThrows(SessionClosedException.class, () -> session.setFaces(List.of()));
+    }
+
+    @Test
+    void isFreedAndLoggedWhenForgotten() throws InterruptedException {
+        CountDownLatch warned = new CountDownLatch(1);
+        Handler handler = new Handler() {
+            @Override
+            public void publish(LogRecord message) {
+                if (message.getMessage().contains("never closed")) {
+                    warned.countDown();
+                }
+            }
+
+            @Override
+            public void flush() {}
+
+            @Override
+            public void close() {}
+        };
+        Logger logger = Logger.getLogger(EnhanceSession.class.getName());
+        logger.addHandler(handler);
+        logger.setUseParentHandlers(false);
+        EnhanceSession.open(photo); // and nobody holds it
+        for (int i = 0; i < 100 && warned.getCount() > 0; ++i) {
+            System.gc();
+            warned.await(100, TimeUnit.MILLISECONDS);
+        }
+        logger.removeHandler(handler);
+        logger.setUseParentHandlers(true);
+        assertEquals(0, warned.getCount(), "no warning came");
+    }
+
+    @Test
+    void knowsItsFilters() {
+        for (Filter filter : Filter.values()) {
+            assertEquals(filter, Filter.of(filter.key()));
+        }
+        assertEquals("Auto", Filter.AUTO_8BIT.displayName());
+        assertThrows(UnknownFilterException.class, () -> Filter.of("AUTO"));
+    }
+}

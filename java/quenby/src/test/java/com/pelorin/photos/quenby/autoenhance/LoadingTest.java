@@ -1,0 +1,144 @@
+package com.pelorin.photos.quenby.autoenhance;
+
+import static org.junit.jupiter.api.Assertions.assertEquals;
+import static org.junit.jupiter.api.Assertions.assertNotEquals;
+import static org.junit.jupiter.api.Assertions.assertNotSame;
+import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assumptions.assumeTrue;
+
+import android.graphics.Bitmap;
+import java.io.File;
+import java.net.URL;
+import java.net.URLClassLoader;
+import java.nio.file.Files;
+import java.nio.file.Path;
+import java.util.ArrayList;
+import java.util.List;
+import java.util.stream.Collectors;
+import java.util.stream.Stream;
+import org.junit.jupiter.api.Test;
+import org.junit.jupiter.api.io.TempDir;
+
+class LoadingTest {
+    @TempDir Path folder;
+
+    /** Loads and says where from. */
+    static final class Load {
+        private Load() {}
+
+        public static void main(String[] arguments) throws Exception {
+            long handle = new QuenbyEngine().init(Pictures.photo(4, 4, 1));
+            String loaded = Files.readAllLines(Path.of("/proc/self/maps")).stream()
+                    .filter(line -> line.contains("libpn_quenby"))
+                    .map(line -> line.substring(line.indexOf('/'))).findFirst().orElse("nowhere");
+            System.out.println((handle != 0 ? "works from " : "fails from ") + loaded);
+        }
+    }
+
+    private static String builtLibraries() {
+        String built = System.getProperty("quenby.native.dir");
+        assumeTrue(built != null, "quenby.native.dir names no libraries");
+        return built;
+    }
+
+    private String load(String... options) throws Exception {
+        ChildJvm child = ChildJvm.run(List.of(options), Load.class);
+        return child.output.lines().filter(line -> line.startsWith("works from ")).findFirst()
+                .orElse(child.output);
+    }
+
+    @Test
+    void thePropertyNamesAFolderOrAFile() throws Exception {
+        String built = Path.of(builtLibraries()).toRealPath().toString();
+        String expected = "works from " + built + "/libpn_quenby.so";
+        assertEquals(expected, load("-Dquenby.library=" + built));
+        assertEquals(expected, load("-Dquenby.library=" + built + "/libpn_quenby.so"));
+    }
+
+    @Test
+    void aWrongPropertyIsAnErrorThatSaysSo() throws Exception {
+        String output = load("-Dquenby.library=/no/such/folder");
+        assertTrue(output.contains("UnsatisfiedLinkError"), output);
+        assertTrue(output.contains("property quenby.library, /no/such/folder"), output);
+    }
+
+    @Test
+    void theLibraryPathComesBeforeTheJar() throws Exception {
+        String built = Path.of(builtLibraries()).toRealPath().toString();
+        assertEquals("works from " + built + "/libpn_quenby.so",
+                load("-Djava.library.path=" + built));
+    }
+
+    @Test
+    void theJarIsCopiedOnceUnderANameOfItsContent() throws Exception {
+        String[] options = {"-Djava.io.tmpdir=" + folder};
+        String first = load(options);
+        assertTrue(first.matches("works from " + folder + "/quenby-[^/]*-[0-9a-f]{16}/libpn_quenby.so"),
+                first);
+        assertEquals(first, load(options));
+        try (Stream<Path> files = Files.list(folder)) {
+            assertEquals(1, files.count());
+        }
+    }
+
+    @Test
+    void aCopyThatWasChangedIsReplaced() throws Exception {
+        String[] options = {"-Djava.io.tmpdir=" + folder};
+        String first = load(options);
+        Path copy = Path.of(first.substring("works from ".length()));
+        Files.write(copy, new byte[] {1, 2, 3});
+        assertEquals(first, load(options));
+        assertNotEquals(3, Files.size(copy));
+    }
+
+    @Test
+    void anUnwritableFolderGivesWayToTheHomeFolder() throws Exception {
+        Path home = Files.createDirectory(folder.resolve("home"));
+        Files.createDirectory(home.resolve(".cache"));
+        String loaded = load("-Djava.io.tmpdir=/no/such/folder", "-Duser.home=" + home);
+        assertTrue(loaded.startsWith("works from " + home + "/.cache/quenby-"), loaded);
+    }
+
+    @Test
+    void whereNothingCanBeWrittenTheErrorListsWhatWasTried() throws Exception {
+        String output = load("-Djava.io.tmpdir=/no/such/folder", "-Duser.home=/no/such/home",
+                "-Djava.library.path=/no/such/path");
+        assertTrue(output.contains("UnsatisfiedLinkError"), output);
+        assertTrue(output.contains("java.library.path /no/such/path"), output);
+        assertTrue(output.contains("/no/such/folder/quenby-"), output);
+        assertTrue(output.contains("/no/such/home/.cache/quenby-"), output);
+    }
+
+    @Test
+    void aSecondClassLoaderWorksBesideTheFirst() throws Exception {
+        new QuenbyEngine();
+        List<URL> urls = new ArrayList<>();
+        for (String entry : ChildJvm.classPath().split(File.pathSeparator)) {
+            urls.add(Path.of(entry).toUri().toURL());
+        }
+        try (URLClassLoader loader = new URLClassLoader(urls.toArray(new URL[0]),
+                ClassLoader.getPlatformClassLoader())) {
+            Class<?> other = loader.loadClass(Session.class.getName());
+            assertNotSame(Session.class, other);
+            var run = other.getDeclaredMethod("run");
+            run.setAccessible(true);
+            assertEquals(Session.run(), run.invoke(null));
+        }
+    }
+
+    /** Something to do with the natives. */
+    static final class Session {
+        private Session() {}
+
+        static String run() {
+            Bitmap photo = Pictures.photo(30, 20, 4);
+            Bitmap output = Pictures.sameSize(photo);
+            try (EnhanceSession session = EnhanceSession.open(photo)) {
+                session.enhance(0.5f, output);
+            }
+            byte[] bytes = Pictures.bytes(output);
+            return Stream.of(bytes).map(java.util.Arrays::hashCode).map(String::valueOf)
+                    .collect(Collectors.joining());
+        }
+    }
+}
