@@ -33,7 +33,9 @@ foreach(line IN LISTS defined)
   endif()
 endforeach()
 foreach(wanted JNI_OnLoad pelorin::image_processing::imageMakeGrayscale
-               pelorin::image_processing::niqeMetric)
+               pelorin::image_processing::niqeMetric pelorin::image_processing::brief
+               pelorin::image_processing::computeBriefDescriptors fast9_detect_nonmax
+               fast12_detect_nonmax nonmax_suppression)
   if(NOT "${defined}" MATCHES " T ${wanted}")
     complain("not exported: ${wanted}")
   endif()
