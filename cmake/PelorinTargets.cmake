@@ -37,7 +37,7 @@ endfunction()
 function(pelorin_place_beside_each_other target)
   set_target_properties(
     ${target} PROPERTIES LIBRARY_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/lib
-                         BUILD_RPATH_USE_ORIGIN ON BUILD_RPATH $ORIGIN INSTALL_RPATH $ORIGIN)
+                         INSTALL_RPATH $ORIGIN BUILD_WITH_INSTALL_RPATH ON)
 endfunction()
 
 # pelorin_test(<name> [THREADS] [SOURCES ...] DEPENDS ...): the tests in <name>.cpp, run by ctest one

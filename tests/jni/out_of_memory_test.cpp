@@ -60,7 +60,7 @@ class OutOfMemory : public NativesTest {
         unnoticed += failed ? 0 : 1;
         EXPECT_EQ(env.violations(), "") << failing;
         EXPECT_EQ(run.photo.locks + run.output.locks + run.padded.locks, 0) << failing;
-        if (faults % 16 == 1) {
+        if (faults % 64 == 1) {
           EXPECT_EQ(run.results(), before) << "after allocation " << failing;
         }
         if (HasFailure()) return;
