@@ -33,7 +33,7 @@ function(pelorin_library name)
   target_link_libraries(${target} PUBLIC ${arg_DEPENDS})
 endfunction()
 
-# The shared libraries of a product stand in one folder and find each other there, wherever it goes.
+# The shared libraries stand in one folder and find each other there, wherever it goes.
 function(pelorin_place_beside_each_other target)
   set_target_properties(
     ${target} PROPERTIES LIBRARY_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/lib

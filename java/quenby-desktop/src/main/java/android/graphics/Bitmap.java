@@ -6,8 +6,8 @@ import java.nio.ByteBuffer;
 /**
  * A bitmap for machines that are no Android device, with the part of Android's interface that photo
  * code needs. Its pixels live outside the Java heap, where natives reach them without a copy; they
- * are freed some time after the bitmap is recycled or unreachable. Colours are packed as on Android,
- * {@code 0xAARRGGBB}, and are not premultiplied. Any thread may call; pixels are not locked.
+ * are freed some time after the bitmap is recycled or unreachable. Colours are packed as on
+ * Android, {@code 0xAARRGGBB}, not premultiplied. Any thread may call; pixels are not locked.
  */
 public final class Bitmap {
     /** How a pixel is stored. Only {@link #ARGB_8888} can be enhanced. */
@@ -71,12 +71,12 @@ public final class Bitmap {
      * @throws IllegalArgumentException for a negative side or over 2 GiB
      */
     public static Bitmap createBitmap(int width, int height, Config config) {
-        return new Bitmap(width, height, config,
-                (int) Math.min(Integer.MAX_VALUE, (long) Math.max(0, width) * config.bytesPerPixel));
+        long stride = (long) Math.max(0, width) * config.bytesPerPixel;
+        return new Bitmap(width, height, config, (int) Math.min(Integer.MAX_VALUE, stride));
     }
 
     /**
-     * Makes a transparent black bitmap with padded rows. Only here: on Android the platform chooses.
+     * Makes a transparent black bitmap with padded rows. Only here: Android chooses by itself.
      *
      * @param width  pixels in a row, 0 or more
      * @param height rows, 0 or more

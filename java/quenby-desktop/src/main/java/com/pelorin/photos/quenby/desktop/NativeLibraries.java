@@ -18,10 +18,10 @@ import java.util.Map;
 import java.util.Set;
 
 /**
- * Loads libpn_quenby.so with the libraries beside it. They are looked for in the folder or file that
- * the property {@value #PROPERTY} names, and only there if it is set; then on
- * {@code java.library.path}; then in this jar, from which they are copied into a folder of the user's
- * own below {@code java.io.tmpdir} or {@code ~/.cache}, named by their content.
+ * Loads libpn_quenby.so with the libraries beside it. They are looked for in the folder or file
+ * that the property {@value #PROPERTY} names, and only there if it is set; then on
+ * {@code java.library.path}; then in this jar, from which they are copied into a folder of the
+ * user's own below {@code java.io.tmpdir} or {@code ~/.cache}, named by their content.
  */
 public final class NativeLibraries {
     /** The property that names the folder or the file of libpn_quenby.so. */

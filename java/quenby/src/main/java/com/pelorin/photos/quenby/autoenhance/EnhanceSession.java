@@ -189,7 +189,7 @@ public final class EnhanceSession implements AutoCloseable {
         return height;
     }
 
-    /** Frees the session. Calls at work in other threads finish first; closing again does nothing. */
+    /** Frees the session once calls at work in other threads are done. Again does nothing. */
     @Override
     public void close() {
         handle.closed = true;

@@ -2,7 +2,7 @@ package com.pelorin.photos.quenby.autoenhance;
 
 import java.lang.reflect.InvocationTargetException;
 
-/** Loads libpn_quenby.so: on a device with the application's libraries, elsewhere as the desktop does. */
+/** Loads libpn_quenby.so: on a device as the application's, elsewhere as the desktop does. */
 final class NativeLibrary {
     private static final String DESKTOP = "com.pelorin.photos.quenby.desktop.NativeLibraries";
 

@@ -5,8 +5,8 @@ import android.graphics.RectF;
 import java.io.IOException;
 
 /**
- * The natives of the enhancement engine, as they are. {@link EnhanceSession} and {@link JpegJob} are
- * the comfortable way to them: they check what these take on trust and report what these only log.
+ * The natives of the enhancement engine, as they are. {@link EnhanceSession} and {@link JpegJob}
+ * are the comfortable way to them: they check what these take on trust, report what these log.
  * Any thread may call, several at once on one session too.
  */
 public class QuenbyEngine {
@@ -30,8 +30,8 @@ public class QuenbyEngine {
      * Tells a session the faces of its photo, which is needed once before filters are applied.
      * Filters prepared before are forgotten.
      *
-     * @param faces  in fractions of the photo's width and height; null elements are skipped, null is
-     *               none
+     * @param faces  in fractions of the photo's width and height; null elements are skipped,
+     *               null is none
      * @param handle from {@link #init}; nothing happens for a handle that is no session
      * @throws OutOfMemoryError when memory does not suffice; the session is then as before
      */
@@ -51,7 +51,7 @@ public class QuenbyEngine {
      *
      * @param handle     from {@link #init}
      * @param outBitmap  receives the photo in its upper left corner
-     * @param filterName a name such as "AE0", see {@link Filter}; the photo as it is for an unknown one
+     * @param filterName a name such as "AE0", see {@link Filter}; unknown ones give the photo
      * @param params     the filter's parameters, such as "slider=0.4;"; null is none
      * @throws IllegalArgumentException when a required parameter is missing or unreadable
      * @throws OutOfMemoryError         when memory does not suffice
@@ -60,8 +60,8 @@ public class QuenbyEngine {
             long handle, Bitmap outBitmap, String filterName, String params);
 
     /**
-     * Filters a JPEG file into another, which may be the same. A rotation leaves the rotated copy at
-     * {@code outputPath} when something fails after it.
+     * Filters a JPEG file into another, which may be the same. A rotation leaves the rotated copy
+     * at {@code outputPath} when something fails after it.
      *
      * @param inputPath   the file to read
      * @param outputPath  the file to write, in one step

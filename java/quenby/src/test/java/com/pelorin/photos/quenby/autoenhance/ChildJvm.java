@@ -19,7 +19,8 @@ final class ChildJvm {
     }
 
     static String classPath() {
-        return System.getProperty("surefire.test.class.path", System.getProperty("java.class.path"));
+        String own = System.getProperty("java.class.path");
+        return System.getProperty("surefire.test.class.path", own);
     }
 
     static ChildJvm run(List<String> options, Class<?> main, String... arguments)
@@ -30,7 +31,8 @@ final class ChildJvm {
     /** {@code shell} is run before the virtual machine takes its place: "ulimit -f 8;". */
     static ChildJvm run(String shell, List<String> options, Class<?> main, String... arguments)
             throws IOException, InterruptedException {
-        List<String> command = new ArrayList<>(List.of("bash", "-c", shell + " exec \"$@\"", "bash"));
+        List<String> command = new ArrayList<>();
+        command.addAll(List.of("bash", "-c", shell + " exec \"$@\"", "bash"));
         command.add(Path.of(System.getProperty("java.home"), "bin", "java").toString());
         command.addAll(List.of("-Xmx512m", "-XX:-UsePerfData", "-Djava.awt.headless=true"));
         for (String name : List.of("quenby.engine", "quenby.library", "java.io.tmpdir")) {

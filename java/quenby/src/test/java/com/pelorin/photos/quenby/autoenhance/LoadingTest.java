@@ -73,8 +73,8 @@ class LoadingTest {
     void theJarIsCopiedOnceUnderANameOfItsContent() throws Exception {
         String[] options = {"-Djava.io.tmpdir=" + folder};
         String first = load(options);
-        assertTrue(first.matches("works from " + folder + "/quenby-[^/]*-[0-9a-f]{16}/libpn_quenby.so"),
-                first);
+        String pattern = "/quenby-[^/]*-[0-9a-f]{16}/libpn_quenby.so";
+        assertTrue(first.matches("works from " + folder + pattern), first);
         assertEquals(first, load(options));
         try (Stream<Path> files = Files.list(folder)) {
             assertEquals(1, files.count());

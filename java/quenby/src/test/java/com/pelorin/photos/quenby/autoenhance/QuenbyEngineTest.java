@@ -134,7 +134,8 @@ class QuenbyEngineTest {
         engine.releaseSession(stale);
         byte[] before = Pictures.bytes(output);
         long unprepared = engine.init(photo);
-        for (long handle : new long[] {0, stale, -1, 1, Long.MIN_VALUE, Long.MAX_VALUE, unprepared}) {
+        for (long handle :
+                new long[] {0, stale, -1, 1, Long.MIN_VALUE, Long.MAX_VALUE, unprepared}) {
             if (handle != unprepared) {
                 engine.preprocess(new RectF[0], handle);
             }
@@ -187,7 +188,7 @@ class QuenbyEngineTest {
         }
         engine.preprocess(new RectF[0], handle); // prepared anew, by several threads at once
         ExecutorService threads = Executors.newFixedThreadPool(8);
-        List<Callable<Void>> work = IntStream.range(0, 8).mapToObj(thread -> (Callable<Void>) () -> {
+        List<Callable<Void>> work = IntStream.range(0, 8).<Callable<Void>>mapToObj(thread -> () -> {
             Bitmap own = Pictures.sameSize(photo);
             for (int i = 0; i < 10; ++i) {
                 Filter filter = Filter.values()[(thread + i) % Filter.values().length];
