@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <filesystem>
 #include <memory>
+#include <optional>
 #include <string>
 #include <utility>
 #include <vector>
@@ -15,6 +16,7 @@
 #include "cli/dupes/html_report.h"
 #include "cli/dupes/pair_search.h"
 #include "cli/dupes/photo_library.h"
+#include "cli/dupes/photo_score.h"
 #include "cli/dupes/report.h"
 #include "cli/dupes/thumbnail.h"
 #include "cli/verbs.h"
@@ -60,6 +62,43 @@ bool searchPairs(const std::vector<Shot>& shots, float threshold, const DupesOpt
       });
   sortPairs(pairs);
   return finished;
+}
+
+// Reads the photos whose score decides once more, unless the cache knows it.
+bool scorePhotos(const DupesOptions& options, PhotoCache* cache, std::string& cacheTrouble,
+                 DupeReport& report) {
+  struct Unscored {
+    std::size_t photo;
+    std::optional<FileStamp> stamp;  // taken before the file is read
+  };
+  std::vector<Unscored> unscored;
+  for (const std::size_t i : photosToScore(report.groups, report.photos)) {
+    ScannedPhoto& photo = report.photos[i];
+    if (photo.input.isStandardInput()) continue;  // cannot be read twice
+    const std::optional<FileStamp> stamp = stampOf(photo.input);
+    if (cache != nullptr && stamp) photo.niqe = cache->findScore(photo.input.path, *stamp);
+    if (!photo.niqe) unscored.push_back({i, stamp});
+  }
+  Talk talk(verbName, options.report.quiet, unscored.size());
+  return attemptJobs<float>(
+      unscored.size(), options.jobs,
+      [&](std::size_t job) { return scoreOf(report.photos[unscored[job].photo].input); },
+      [&](std::size_t job, const Attempt<float>& attempt) {
+        const auto& [i, stamp] = unscored[job];
+        const Input& input = report.photos[i].input;
+        report.photos[i].niqe = attempt.result;
+        if (!attempt.result) {
+          report.failed.push_back({input, "no score of it: " + attempt.error});
+          talk.error(input.shownName(), report.failed.back().reason);
+        } else if (cache != nullptr && stamp && cacheTrouble.empty()) {
+          try {
+            cache->storeScore(input.path, *stamp, *attempt.result);
+          } catch (const CacheError& error) {
+            cacheTrouble = error.what();
+          }
+        }
+        talk.fileDone();
+      });
 }
 
 // Reads the photos of all groups once more, for their pictures.
@@ -169,6 +208,9 @@ ExitCode runDupes(const DupesOptions& options) {
   DupeReport report = {
       threshold, std::move(library.photos), {}, std::move(library.failed), !options.keep.empty()};
   report.groups = groupPairs(report.photos.size(), pairs);
+  if (report.rank && !scorePhotos(options, cache.get(), library.cacheTrouble, report)) {
+    return ExitCode::interrupted;
+  }
   if (!options.html.empty() && !writeHtml(options, report)) return ExitCode::interrupted;
   printReport(options, report);
 
@@ -211,8 +253,9 @@ void addDupes(CommandLine& commandLine) {
                    "changed photos")
       ->type_name("FILE");
   verb->add_option("--keep", options->keep,
-                   "best: say in each group which photo to keep, by resolution, then by the size "
-                   "of the file; nothing is ever deleted")
+                   "best: say in each group which photo to keep, by resolution, then by how "
+                   "natural it looks (NIQE), then by the size of the file; photos of equal "
+                   "resolution are read again for that; nothing is ever deleted")
       ->type_name("WHICH")
       ->check(CLI::IsMember({"best"}));
   verb->add_option("--html", options->html,

@@ -18,10 +18,11 @@ class CacheError : public std::runtime_error {
   using std::runtime_error::runtime_error;
 };
 
-/// Photo records in a SQLite file, so that a second run reads no pixels. A record is found again
-/// while the file's path, size and time of change, the scale and the engine's version are the same.
+/// Photo records and scores in a SQLite file, so that a second run reads no pixels. They are found
+/// again while the file's path, size and time of change and the engine's version are the same, and
+/// for a record the scale, for a score the model it refers to.
 ///
-/// Every record stands as soon as it is stored, whatever happens to the process then. Several
+/// Each stands as soon as it is stored, whatever happens to the process then. Several
 /// processes may use one file; one object serves one thread.
 class PhotoCache {
  public:
@@ -38,6 +39,12 @@ class PhotoCache {
   /// Replaces what is known of that path at that scale.
   void store(const std::string& photo, const FileStamp& stamp, int scale,
              const PhotoRecord& record);
+
+  /// The NIQE score of the full-size picture; NaN when it is too small for one.
+  std::optional<float> findScore(const std::string& photo, const FileStamp& stamp);
+
+  /// Replaces the score of that path.
+  void storeScore(const std::string& photo, const FileStamp& stamp, float score);
 
  private:
   struct Close {
@@ -56,7 +63,7 @@ class PhotoCache {
 
   std::string file_;
   std::unique_ptr<sqlite3, Close> database_;
-  Statement find_, store_;
+  Statement find_, store_, findScore_, storeScore_;
 };
 
 }  // namespace pelorin::cli

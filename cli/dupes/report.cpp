@@ -87,8 +87,10 @@ Json groupAsJson(const DupeReport& report, const DupeGroup& group) {
   if (report.rank) {
     Json& ranking = object["ranking"] = Json::array();
     for (const Ranked& ranked : rankGroup(group, report.photos)) {
-      ranking.push_back({{"file", report.photos[ranked.photo].input.path},
+      const ScannedPhoto& photo = report.photos[ranked.photo];
+      ranking.push_back({{"file", photo.input.path},
                          {"keep", ranking.empty()},
+                         {"niqe", photo.isScored() ? Json(nineDigits(*photo.niqe)) : Json()},
                          {"reason", ranked.reason}});
     }
   }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cmath>
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -19,8 +20,12 @@ struct ScannedPhoto {
   std::optional<std::uint64_t> bytes;  ///< Size of the file; none for standard input.
   TimeSource timeSource;
   std::string time;  ///< For reading; empty where there is none.
+  /// How natural the full-size picture looks, lower is better; NaN when it is too small to tell and
+  /// none where it was not needed or could not be had.
+  std::optional<float> niqe = std::nullopt;
 
   std::uint64_t pixels() const { return std::uint64_t{width} * height; }
+  bool isScored() const { return niqe && !std::isnan(*niqe); }
 };
 
 /// A photo that could not be read.

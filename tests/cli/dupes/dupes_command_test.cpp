@@ -15,6 +15,7 @@
 #include "image_processing/dupe/dupe_score.h"
 #include "tests/cli/dupes/photo_library_files.h"
 #include "tests/cli/quenby_process.h"
+#include "tests/support/pictures.h"
 
 namespace pelorin::test_support {
 namespace {
@@ -87,6 +88,58 @@ Json pairOf(const Holiday& holiday, const Json& report, const std::string& a,
   return nullptr;
 }
 
+Json rankingOf(const Holiday& holiday, const Json& report, const std::string& name) {
+  for (const Json& group : report["groups"]) {
+    for (const Json& ranked : group["ranking"]) {
+      if (nameIn(holiday, ranked["file"]) == name) return group["ranking"];
+    }
+  }
+  return nullptr;
+}
+
+Image<RGBA8Pixel> copyOf(const Image<RGBA8Pixel>& picture) {
+  Image<RGBA8Pixel> copy(picture.width, picture.height);
+  std::copy_n(picture.row(0), std::size_t{picture.width} * picture.height, copy.row(0));
+  return copy;
+}
+
+// The mean of 5 x 5 pixels where they are there.
+Image<RGBA8Pixel> blurred(const Image<RGBA8Pixel>& picture) {
+  Image<RGBA8Pixel> result = copyOf(picture);
+  for (std::uint32_t y = 2; y + 2 < picture.height; ++y) {
+    for (std::uint32_t x = 2; x + 2 < picture.width; ++x) {
+      int r = 0, g = 0, b = 0;
+      for (std::uint32_t i = 0; i < 25; ++i) {
+        const RGBA8Pixel& p = picture.row(y + i / 5 - 2)[x + i % 5 - 2];
+        r += p.r;
+        g += p.g;
+        b += p.b;
+      }
+      const auto mean = [](int sum) { return static_cast<std::uint8_t>(sum / 25); };
+      result.row(y)[x] = {mean(r), mean(g), mean(b), 255};
+    }
+  }
+  return result;
+}
+
+Image<RGBA8Pixel> noisy(const Image<RGBA8Pixel>& picture) {
+  Image<RGBA8Pixel> result = copyOf(picture);
+  Random random(5);
+  const auto disturb = [&](std::uint8_t& value) {
+    const int sum = value + static_cast<int>(random.below(61)) - 30;
+    value = static_cast<std::uint8_t>(std::clamp(sum, 0, 255));
+  };
+  for (std::uint32_t y = 0; y < result.height; ++y) {
+    for (std::uint32_t x = 0; x < result.width; ++x) {
+      RGBA8Pixel& p = result.row(y)[x];
+      disturb(p.r);
+      disturb(p.g);
+      disturb(p.b);
+    }
+  }
+  return result;
+}
+
 // Bytes that are no photo, under the size and time of the file that was there.
 void replaceUnnoticed(const std::string& path) {
   const auto modified = fs::last_write_time(path);
@@ -95,13 +148,13 @@ void replaceUnnoticed(const std::string& path) {
   fs::last_write_time(path, modified);
 }
 
-int rowsIn(const std::string& cache) {
+int rowsIn(const std::string& cache, const std::string& table = "photos") {
   sqlite3* database = nullptr;
   sqlite3_stmt* statement = nullptr;
   int rows = 0;
   if (sqlite3_open_v2(cache.c_str(), &database, SQLITE_OPEN_READONLY, nullptr) == SQLITE_OK &&
-      sqlite3_prepare_v2(database, "SELECT count(*) FROM photos", -1, &statement, nullptr) ==
-          SQLITE_OK &&
+      sqlite3_prepare_v2(database, ("SELECT count(*) FROM " + table).c_str(), -1, &statement,
+                         nullptr) == SQLITE_OK &&
       sqlite3_step(statement) == SQLITE_ROW) {
     rows = sqlite3_column_int(statement, 0);
   }
@@ -223,6 +276,34 @@ TEST(DupesCommand, ReadsNoPixelsASecondTimeWithACache) {
   EXPECT_EQ(holiday.json({}, 1)["failed"].size(), 1u);  // without the cache the file is read
 }
 
+TEST(DupesCommand, ReadsNoPixelsForScoresASecondTimeWithACache) {
+  const Holiday holiday;
+  holiday.folder.write("small/1.jpg", sceneJpeg(1, 100, takenAt("19:00:00"), 80, 60));
+  holiday.folder.write("small/2.jpg", sceneJpeg(1, 100, takenAt("19:00:01"), 80, 60));
+  const TemporaryFolder elsewhere;
+  const std::string cache = elsewhere / "cache";
+  holiday.json({"--cache", cache});
+  EXPECT_EQ(rowsIn(cache, "scores"), 0);
+  const Json first = holiday.json({"--cache", cache, "--keep", "best"});
+  EXPECT_EQ(rowsIn(cache, "scores"), 12);
+  for (const char* name : {"burst/2.jpg", "small/1.jpg"}) replaceUnnoticed(holiday.folder / name);
+  EXPECT_EQ(holiday.json({"--cache", cache, "--keep", "best"}), first);
+}
+
+TEST(DupesCommand, NamesAFileThatCannotBeReadAgainForItsScore) {
+  const Holiday holiday;
+  const TemporaryFolder elsewhere;
+  holiday.json({"--cache", elsewhere / "cache"});
+  replaceUnnoticed(holiday.folder / "zones/a.jpg");
+  const Json report = holiday.json({"--cache", elsewhere / "cache", "--keep", "best"}, 1);
+  ASSERT_EQ(report["failed"].size(), 1u);
+  EXPECT_THAT(report["failed"][0]["error"], testing::StartsWith("no score of it: "));
+  const Json ranking = rankingOf(holiday, report, "zones/a.jpg");
+  EXPECT_EQ(nameIn(holiday, ranking[1]["file"]), "zones/a.jpg");
+  EXPECT_EQ(ranking[1]["niqe"], nullptr);
+  EXPECT_EQ(ranking[1]["reason"], "as many pixels, not scored");
+}
+
 TEST(DupesCommand, ReadsAFileAgainThatChanged) {
   const Holiday holiday;
   const TemporaryFolder elsewhere;
@@ -300,6 +381,42 @@ TEST(DupesCommand, SaysWhichToKeepAndWhyAndDeletesNothing) {
   EXPECT_THAT(text, HasSubstr("rather not "));
   EXPECT_THAT(holiday.dupes({}).output, Not(HasSubstr("keep")));
   EXPECT_EQ(holiday.folder.content(), before);
+}
+
+TEST(DupesCommand, KeepsNoBlurredOrNoisyCopyOfEqualSize) {
+  const TemporaryFolder folder;
+  const Image<RGBA8Pixel> picture = photoLikePicture(480, 384, 1);
+  const std::string blur = folder.write("blurred.jpg", jpegOf(blurred(picture), {}, 100));
+  const std::string noise = folder.write("noisy.jpg", jpegOf(noisy(picture), {}, 100));
+  const std::string sharp = folder.write("sharp.jpg", jpegOf(picture, {}, 80));
+  ASSERT_LT(fs::file_size(sharp), fs::file_size(noise));
+  for (const std::string& copy : {blur, noise}) {
+    const Finished run = quenby({"dupes", copy, sharp, "--keep", "best"});
+    EXPECT_THAT(run.output, HasSubstr("keep " + sharp + ": the most natural among those of"));
+    EXPECT_THAT(run.output, testing::ContainsRegex("rather not " + copy +
+                                                   ": as many pixels, less sharp or natural: "
+                                                   "NIQE [0-9.]+ against [0-9.]+"));
+  }
+}
+
+TEST(DupesCommand, RanksByTheScoreOfTheFullSizeUprightPicture) {
+  const Holiday holiday;
+  holiday.folder.write("burst/large.jpg", sceneJpeg(1, 90, takenAt("10:00:01"), 640, 480));
+  holiday.folder.write("small/1.jpg", sceneJpeg(1, 100, takenAt("19:00:00"), 80, 60));
+  holiday.folder.write("small/2.jpg", sceneJpeg(1, 100, takenAt("19:00:01"), 80, 60));
+  const Json report = holiday.json({"--keep", "best", "--scale", "4", "-j", "2"});
+  for (const char* name : {"burst/1.jpg", "held/turned.jpg", "zones/a.jpg"}) {
+    for (const Json& ranked : rankingOf(holiday, report, name)) {
+      const bool alone = nameIn(holiday, ranked["file"]) == "burst/large.jpg";
+      const Json score =
+          Json::parse(quenby({"score", ranked["file"].get<std::string>(), "--json"}).output);
+      EXPECT_EQ(ranked["niqe"], alone ? Json() : score["score"]) << ranked;
+    }
+  }
+  const Json small = rankingOf(holiday, report, "small/1.jpg");
+  ASSERT_EQ(small.size(), 2u);
+  EXPECT_EQ(small[1]["niqe"], nullptr);
+  EXPECT_THAT(small[1]["reason"].get<std::string>(), HasSubstr("too small to score"));
 }
 
 TEST(DupesCommand, PrintsOneGroupALineForJsonLines) {

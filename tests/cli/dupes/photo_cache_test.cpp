@@ -4,7 +4,9 @@
 #include <gtest/gtest.h>
 #include <sqlite3.h>
 
+#include <cmath>
 #include <filesystem>
+#include <limits>
 #include <thread>
 
 #include "tests/cli/temporary_folder.h"
@@ -36,6 +38,13 @@ void expectSame(const std::optional<PhotoRecord>& actual, const PhotoRecord& exp
   EXPECT_EQ(actual->captureTime->seconds, expected.captureTime->seconds);
   EXPECT_EQ(actual->captureTime->hasZone, expected.captureTime->hasZone);
   EXPECT_EQ(actual->captureTime->zoneSeconds, expected.captureTime->zoneSeconds);
+}
+
+void changeDatabase(const std::string& file, const std::string& sql) {
+  sqlite3* database = nullptr;
+  ASSERT_EQ(sqlite3_open(file.c_str(), &database), SQLITE_OK);
+  EXPECT_EQ(sqlite3_exec(database, sql.c_str(), nullptr, nullptr, nullptr), SQLITE_OK);
+  sqlite3_close(database);
 }
 
 std::string refusalOf(const std::string& file) {
@@ -81,6 +90,41 @@ TEST(PhotoCache, ForgetsAPhotoThatChangedOrIsReadAtAnotherScale) {
   EXPECT_FALSE(cache.find("a.jpg", stamp, 8));
 }
 
+TEST(PhotoCache, GivesBackScoresAndThatAPhotoIsTooSmallForOne) {
+  const TemporaryFolder folder;
+  {
+    PhotoCache cache(folder / "cache");
+    cache.storeScore("a.jpg", stamp, 4.1234567f);
+    cache.storeScore("small.jpg", stamp, std::numeric_limits<float>::quiet_NaN());
+    cache.store("unscored.jpg", stamp, 8, recordOf(1));
+  }
+  PhotoCache cache(folder / "cache");
+  EXPECT_EQ(cache.findScore("./folder/../a.jpg", stamp), 4.1234567f);
+  const std::optional<float> small = cache.findScore("small.jpg", stamp);
+  EXPECT_TRUE(small && std::isnan(*small));
+  EXPECT_FALSE(cache.findScore("unscored.jpg", stamp));
+  EXPECT_FALSE(cache.find("a.jpg", stamp, 8));
+}
+
+TEST(PhotoCache, ForgetsTheScoreOfAPhotoThatChanged) {
+  const TemporaryFolder folder;
+  PhotoCache cache(folder / "cache");
+  cache.storeScore("a.jpg", stamp, 4.0f);
+  EXPECT_FALSE(cache.findScore("a.jpg", {stamp.bytes + 1, stamp.modified}));
+  EXPECT_FALSE(cache.findScore("a.jpg", {stamp.bytes, stamp.modified + 1}));
+  cache.storeScore("a.jpg", {7, 8}, 5.0f);
+  EXPECT_EQ(cache.findScore("a.jpg", {7, 8}), 5.0f);
+  EXPECT_FALSE(cache.findScore("a.jpg", stamp));
+}
+
+TEST(PhotoCache, ForgetsAScoreUnderAnotherModel) {
+  const TemporaryFolder folder;
+  PhotoCache cache(folder / "cache");
+  cache.storeScore("a.jpg", stamp, 4.0f);
+  changeDatabase(folder / "cache", "UPDATE scores SET model = 'another'");
+  EXPECT_FALSE(cache.findScore("a.jpg", stamp));
+}
+
 TEST(PhotoCache, RefusesAFileOfAnotherKindAndLeavesItAsItWas) {
   const TemporaryFolder folder;
   for (const std::string& content :
@@ -95,10 +139,7 @@ TEST(PhotoCache, RefusesAFileOfAnotherKindAndLeavesItAsItWas) {
 
 TEST(PhotoCache, RefusesADatabaseOfAnotherProgramAndLeavesItAsItWas) {
   const TemporaryFolder folder;
-  sqlite3* database = nullptr;
-  ASSERT_EQ(sqlite3_open((folder / "other.db").c_str(), &database), SQLITE_OK);
-  sqlite3_exec(database, "CREATE TABLE photos (id INTEGER)", nullptr, nullptr, nullptr);
-  sqlite3_close(database);
+  changeDatabase(folder / "other.db", "CREATE TABLE photos (id INTEGER)");
   const Bytes before = folder.read("other.db");
   EXPECT_THAT(refusalOf(folder / "other.db"), HasSubstr("is not a cache of this command"));
   EXPECT_EQ(folder.read("other.db"), before);
@@ -107,11 +148,10 @@ TEST(PhotoCache, RefusesADatabaseOfAnotherProgramAndLeavesItAsItWas) {
 TEST(PhotoCache, RefusesACacheOfAnotherLayout) {
   const TemporaryFolder folder;
   { const PhotoCache cache(folder / "cache"); }
-  sqlite3* database = nullptr;
-  ASSERT_EQ(sqlite3_open((folder / "cache").c_str(), &database), SQLITE_OK);
-  sqlite3_exec(database, "PRAGMA user_version = 99", nullptr, nullptr, nullptr);
-  sqlite3_close(database);
-  EXPECT_THAT(refusalOf(folder / "cache"), HasSubstr("another version"));
+  for (const int layout : {1, 99}) {
+    changeDatabase(folder / "cache", "PRAGMA user_version = " + std::to_string(layout));
+    EXPECT_THAT(refusalOf(folder / "cache"), HasSubstr("another version"));
+  }
 }
 
 TEST(PhotoCache, ThatIsDamagedGivesAnErrorOrWhatWasStored) {
@@ -120,6 +160,7 @@ TEST(PhotoCache, ThatIsDamagedGivesAnErrorOrWhatWasStored) {
     PhotoCache cache(folder / "cache");
     for (int i = 0; i < 20; ++i) {
       cache.store("/photo " + std::to_string(i), stamp, 8, recordOf(i));
+      cache.storeScore("/photo " + std::to_string(i), stamp, 4.0f + i / 7.0f);
     }
   }
   const Bytes whole = folder.read("cache");
@@ -131,6 +172,8 @@ TEST(PhotoCache, ThatIsDamagedGivesAnErrorOrWhatWasStored) {
       for (int i = 0; i < 20; ++i) {
         const auto record = cache.find("/photo " + std::to_string(i), stamp, 8);
         if (record) expectSame(record, recordOf(i));
+        const auto score = cache.findScore("/photo " + std::to_string(i), stamp);
+        EXPECT_EQ(score.value_or(4.0f + i / 7.0f), 4.0f + i / 7.0f) << what;
       }
     } catch (const CacheError& error) {
       ++refused;
