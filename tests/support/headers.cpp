@@ -1,0 +1,2 @@
+// Only carries the precompiled headers of all tests.
+int main() {}
