@@ -1,8 +1,9 @@
 #pragma once
 
-#include <CLI/CLI.hpp>
 #include <string>
 #include <vector>
+
+#include "cli/common/cli_app.h"
 
 namespace pelorin::cli {
 

@@ -1,5 +1,6 @@
 #include "cli/common/faces.h"
 
+#include <CLI/CLI.hpp>
 #include <array>
 #include <memory>
 #include <string_view>

@@ -1,10 +1,10 @@
 #pragma once
 
-#include <CLI/CLI.hpp>
 #include <cstdint>
 #include <string>
 #include <vector>
 
+#include "cli/common/cli_app.h"
 #include "image_processing/core/image_metadata.h"
 
 namespace pelorin::cli {

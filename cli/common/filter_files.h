@@ -1,9 +1,9 @@
 #pragma once
 
-#include <CLI/CLI.hpp>
 #include <string>
 #include <vector>
 
+#include "cli/common/cli_app.h"
 #include "cli/common/exit_code.h"
 #include "cli/common/faces.h"
 #include "cli/common/inputs.h"

@@ -1,5 +1,6 @@
 #include "cli/common/inputs.h"
 
+#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <cctype>
 #include <fstream>

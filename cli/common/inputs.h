@@ -1,9 +1,10 @@
 #pragma once
 
-#include <CLI/CLI.hpp>
 #include <filesystem>
 #include <string>
 #include <vector>
+
+#include "cli/common/cli_app.h"
 
 namespace pelorin::cli {
 

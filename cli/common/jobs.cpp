@@ -1,5 +1,6 @@
 #include "cli/common/jobs.h"
 
+#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <condition_variable>
 #include <mutex>

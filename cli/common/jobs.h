@@ -1,6 +1,5 @@
 #pragma once
 
-#include <CLI/CLI.hpp>
 #include <cstddef>
 #include <exception>
 #include <functional>
@@ -8,6 +7,7 @@
 #include <string>
 #include <vector>
 
+#include "cli/common/cli_app.h"
 #include "cli/common/errors.h"
 #include "cli/common/interrupt.h"
 

@@ -1,11 +1,11 @@
 #pragma once
 
-#include <CLI/CLI.hpp>
 #include <functional>
 #include <optional>
 #include <string>
 #include <vector>
 
+#include "cli/common/cli_app.h"
 #include "cli/common/exit_code.h"
 #include "cli/common/inputs.h"
 #include "cli/common/json_output.h"

@@ -1,5 +1,6 @@
 #include "cli/common/outputs.h"
 
+#include <CLI/CLI.hpp>
 #include <system_error>
 
 #include "cli/common/errors.h"

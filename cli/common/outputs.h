@@ -1,11 +1,11 @@
 #pragma once
 
-#include <CLI/CLI.hpp>
 #include <filesystem>
 #include <map>
 #include <string>
 #include <vector>
 
+#include "cli/common/cli_app.h"
 #include "cli/common/inputs.h"
 
 namespace pelorin::cli {

@@ -1,10 +1,10 @@
 #pragma once
 
-#include <CLI/CLI.hpp>
 #include <cstdint>
 #include <memory>
 #include <string>
 
+#include "cli/common/cli_app.h"
 #include "cli/common/inputs.h"
 #include "image_processing/core/image.h"
 

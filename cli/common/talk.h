@@ -1,8 +1,9 @@
 #pragma once
 
-#include <CLI/CLI.hpp>
 #include <cstddef>
 #include <string>
+
+#include "cli/common/cli_app.h"
 
 namespace pelorin::cli {
 
