@@ -92,7 +92,8 @@ void computeFlatnessMask(const Image<float>& lightness, const Image<TB>& smoothe
   }
   const std::int64_t width = lightness.width, height = lightness.height, r = radius;
   const std::int64_t n = 2 * r + 1;
-  const float side = static_cast<float>(n * n);
+  const float side =
+      static_cast<float>(static_cast<std::uint64_t>(n) * static_cast<std::uint64_t>(n));
   const float noDetail = 20.0f / 255.0f;
   const GaussianApproximation<float> weight(-noDetail, noDetail, 0.0f, 1.0f / side);
 
