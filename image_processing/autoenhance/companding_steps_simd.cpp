@@ -37,7 +37,7 @@ void compandingSteps(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t
   HWY_ALIGN float luminance[lanes];
   std::size_t i = 0;
   for (; i + lanes <= count; i += lanes) {
-    // Plain loads: three gathers take longer on the machines this was measured on.
+    // Plain loads from small tables; gathers were not compared on this loop.
     for (std::size_t lane = 0; lane < lanes; ++lane) {
       const RGBA8Pixel p = pixels[i + lane];
       luminance[lane] = shares.red[p.r] + shares.green[p.g] + shares.blue[p.b];
