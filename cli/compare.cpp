@@ -102,32 +102,32 @@ ExitCode runCompare(const CompareOptions& options) {
 
 void addCompare(CommandLine& commandLine) {
   const auto options = std::make_shared<CompareOptions>();
-  CLI::App* verb =
+  Verb verb =
       commandLine.addVerb("compare", "Tell how likely two photos are near-duplicates, and why",
                           "quenby compare a.jpg b.jpg\n"
                           "quenby compare a.jpg b.jpg --dt 2.5 --same-orientation yes --json\n"
                           "quenby compare a.rgba b.rgba --raw 640x480 --raw2 480x640",
                           [options] { return runCompare(*options); });
-  verb->add_option("A", options->a, "A JPEG file, or - (standard input)")
-      ->type_name("FILE")
-      ->required()
-      ->group("Input");
-  verb->add_option("B", options->b, "Another")->type_name("FILE")->required()->group("Input");
-  verb->add_option("--dt", options->dt,
-                   "Seconds between the two; from the cameras' times unless given, 0 where those "
-                   "are not known")
-      ->type_name("SECONDS");
-  verb->add_option("--same-orientation", options->sameOrientation,
-                   "Whether the camera was held alike; from the photos unless given")
-      ->check(CLI::IsMember({"yes", "no"}));
-  verb->add_option("--scale", options->scale, "Decode at 1/1, 1/2, 1/4 or 1/8 of the size")
-      ->check(CLI::IsMember({1, 2, 4, 8}));
-  addRawOption(*verb, options->raw);
-  verb->add_option("--raw2", options->raw2,
-                   "Size of B's raw pixels where it is another than A's; alone, only B is raw")
-      ->type_name("WxH")
-      ->group("Raw pixels");
-  addReportOptions(*verb, options->report);
+  verb.option("A", options->a, "A JPEG file, or - (standard input)")
+      .type("FILE")
+      .required()
+      .group("Input");
+  verb.option("B", options->b, "Another").type("FILE").required().group("Input");
+  verb.option("--dt", options->dt,
+              "Seconds between the two; from the cameras' times unless given, 0 where those "
+              "are not known")
+      .type("SECONDS");
+  verb.option("--same-orientation", options->sameOrientation,
+              "Whether the camera was held alike; from the photos unless given")
+      .oneOf({"yes", "no"});
+  verb.option("--scale", options->scale, "Decode at 1/1, 1/2, 1/4 or 1/8 of the size")
+      .oneOf({"1", "2", "4", "8"});
+  addRawOption(verb, options->raw);
+  verb.option("--raw2", options->raw2,
+              "Size of B's raw pixels where it is another than A's; alone, only B is raw")
+      .type("WxH")
+      .group("Raw pixels");
+  addReportOptions(verb, options->report);
 }
 
 }  // namespace pelorin::cli

@@ -113,23 +113,23 @@ ExitCode runCurve(const CurveOptions& options) {
 
 void addCurve(CommandLine& commandLine) {
   const auto options = std::make_shared<CurveOptions>();
-  CLI::App* verb =
+  Verb verb =
       commandLine.addVerb("curve", "Plot or print the tone curve that auto-enhance gives a photo",
                           "quenby curve photo.jpg --slider 0.6 -o curve.png\n"
                           "quenby curve photo.jpg --slider 0.6 --text\n"
                           "quenby curve photo.jpg --json\n",
                           [options] { return runCurve(*options); });
-  verb->add_option("IN", options->input, "A photo: a JPEG file or - (standard input)")->required();
-  verb->add_option("--slider", options->slider, "Strength from 0 (none) to 1; 0.4 unless given")
-      ->type_name("NUMBER");
-  addFaceOption(*verb, options->faces);
-  verb->add_flag("--text", options->text,
-                 "Print the 51 samples, one a line, with nine significant digits");
-  addLoneOutputOptions(*verb, options->outputs, "FILE",
+  verb.option("IN", options->input, "A photo: a JPEG file or - (standard input)").required();
+  verb.option("--slider", options->slider, "Strength from 0 (none) to 1; 0.4 unless given")
+      .type("NUMBER");
+  addFaceOption(verb, options->faces);
+  verb.flag("--text", options->text,
+            "Print the 51 samples, one a line, with nine significant digits");
+  addLoneOutputOptions(verb, options->outputs, "FILE",
                        "The PNG file for the plot, or - (standard output)");
-  addRawOption(*verb, options->raw);
-  verb->get_option("--raw")->description("Read packed RGBA bytes of this size");
-  addReportOptions(*verb, options->report);
+  addRawOption(verb, options->raw);
+  verb.named("--raw").help("Read packed RGBA bytes of this size");
+  addReportOptions(verb, options->report);
 }
 
 }  // namespace pelorin::cli

@@ -228,44 +228,42 @@ ExitCode runDupes(const DupesOptions& options) {
 
 void addDupes(CommandLine& commandLine) {
   const auto options = std::make_shared<DupesOptions>();
-  CLI::App* verb = commandLine.addVerb(
+  Verb verb = commandLine.addVerb(
       verbName, "Find near-duplicates among photos: the same scene, a moment apart",
       "quenby dupes -r holiday\n"
       "quenby dupes -r photos -j 0 --cache photos.cache --html report.html\n"
       "quenby dupes *.jpg --threshold 1.5 --keep best\n"
       "quenby dupes -r photos --keep best --jsonl | jq -r '.ranking[]? | select(.keep | not).file'",
       [options] { return runDupes(*options); });
-  addInputOptions(*verb, options->inputs);
-  verb->add_option("--threshold", options->threshold,
-                   "Smallest score of a pair; 0 unless given, larger is stricter, the same photo "
-                   "twice scores about 3.6")
-      ->type_name("SCORE");
-  verb->add_option("--scale", options->scale,
-                   "Decode photos at 1/1, 1/2, 1/4 or 1/8 of their size; auto, unless given, is "
-                   "1/8 from 4 megapixels on and less for smaller photos")
-      ->type_name("N")
-      ->check(CLI::IsMember({"auto", "1", "2", "4", "8"}));
-  verb->add_flag("--assume-mtime", options->assumeFileTime,
-                 "Photos without a capture time take that of their file; otherwise they are "
-                 "compared with every photo, the time apart taken as 0");
-  verb->add_option("--cache", options->cache,
-                   "Keep what was read in this file, so that the next run reads only new and "
-                   "changed photos")
-      ->type_name("FILE");
-  verb->add_option("--keep", options->keep,
-                   "best: say in each group which photo to keep, by resolution, then by how "
-                   "natural it looks (NIQE), then by the size of the file; photos of equal "
-                   "resolution are read again for that; nothing is ever deleted")
-      ->type_name("WHICH")
-      ->check(CLI::IsMember({"best"}));
-  verb->add_option("--html", options->html,
-                   "Write a page with the groups' pictures side by side; reads those photos again")
-      ->type_name("FILE")
-      ->group("Output");
-  verb->add_flag("--overwrite", options->overwrite, "Replace an --html file that exists")
-      ->group("Output");
-  addJobsOption(*verb, options->jobs);
-  addReportOptions(*verb, options->report);
+  addInputOptions(verb, options->inputs);
+  verb.option("--threshold", options->threshold,
+              "Smallest score of a pair; 0 unless given, larger is stricter, the same photo "
+              "twice scores about 3.6")
+      .type("SCORE");
+  verb.option("--scale", options->scale,
+              "Decode photos at 1/1, 1/2, 1/4 or 1/8 of their size; auto, unless given, is "
+              "1/8 from 4 megapixels on and less for smaller photos")
+      .oneOf({"auto", "1", "2", "4", "8"});
+  verb.flag("--assume-mtime", options->assumeFileTime,
+            "Photos without a capture time take that of their file; otherwise they are "
+            "compared with every photo, the time apart taken as 0");
+  verb.option("--cache", options->cache,
+              "Keep what was read in this file, so that the next run reads only new and "
+              "changed photos")
+      .type("FILE");
+  verb.option("--keep", options->keep,
+              "best: say in each group which photo to keep, by resolution, then by how "
+              "natural it looks (NIQE), then by the size of the file; photos of equal "
+              "resolution are read again for that; nothing is ever deleted")
+      .oneOf({"best"});
+  verb.option("--html", options->html,
+              "Write a page with the groups' pictures side by side; reads those photos again")
+      .type("FILE")
+      .group("Output");
+  verb.flag("--overwrite", options->overwrite, "Replace an --html file that exists")
+      .group("Output");
+  addJobsOption(verb, options->jobs);
+  addReportOptions(verb, options->report);
 }
 
 }  // namespace pelorin::cli

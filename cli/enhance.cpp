@@ -16,12 +16,12 @@ struct EnhanceOptions {
   std::string slider = "0.4";
   std::string params;
   bool globalOnly = false;
-  CLI::Option *sliderGiven, *paramsGiven;
+  Option sliderGiven, paramsGiven;
 };
 
 std::string builtParameters(const EnhanceOptions& options) {
   if (!isAutoEnhance(options.filter)) {
-    if (options.sliderGiven->count() == 0 && !options.globalOnly) return "";
+    if (!options.sliderGiven.given() && !options.globalOnly) return "";
     throw UsageError("--filter: " + options.filter + " has no slider; use --params");
   }
   readSlider("--slider", options.slider);  // refuses what is none
@@ -30,8 +30,8 @@ std::string builtParameters(const EnhanceOptions& options) {
 
 ExitCode runEnhance(const EnhanceOptions& options) {
   requireFilter(options.filter);
-  const bool verbatim = options.paramsGiven->count() > 0;
-  if (verbatim && (options.sliderGiven->count() > 0 || options.globalOnly)) {
+  const bool verbatim = options.paramsGiven.given();
+  if (verbatim && (options.sliderGiven.given() || options.globalOnly)) {
     throw UsageError("--params: takes the place of --slider and --global-only; give it alone");
   }
   const std::string params = verbatim ? options.params : builtParameters(options);
@@ -46,7 +46,7 @@ ExitCode runEnhance(const EnhanceOptions& options) {
 
 void addEnhance(CommandLine& commandLine) {
   const auto options = std::make_shared<EnhanceOptions>();
-  CLI::App* verb = commandLine.addVerb(
+  Verb verb = commandLine.addVerb(
       "enhance", "Make photos better: tone, faces, detail and colour",
       "quenby enhance photo.jpg -o better.jpg\n"
       "quenby enhance photo.jpg -o better.jpg --slider 0.8 --face 0.4,0.1,0.6,0.4\n"
@@ -56,18 +56,18 @@ void addEnhance(CommandLine& commandLine) {
       "quenby enhance - -o - < photo.jpg > better.jpg\n"
       "quenby enhance --raw 640x480 in.rgba -o out.rgba --filter AE08bit",
       [options] { return runEnhance(*options); });
-  verb->add_option("--filter", options->filter, "AE0 unless given; AE08bit needs less memory")
-      ->type_name("NAME");
+  verb.option("--filter", options->filter, "AE0 unless given; AE08bit needs less memory")
+      .type("NAME");
   options->sliderGiven =
-      verb->add_option("--slider", options->slider, "Strength from 0 (none) to 1; 0.4 unless given")
-          ->type_name("S");
-  verb->add_flag("--global-only", options->globalOnly,
-                 "One tone curve for the whole picture, without local masks");
+      verb.option("--slider", options->slider, "Strength from 0 (none) to 1; 0.4 unless given")
+          .type("S");
+  verb.flag("--global-only", options->globalOnly,
+            "One tone curve for the whole picture, without local masks");
   options->paramsGiven =
-      verb->add_option("--params", options->params,
-                       "The filter's own parameters in place of --slider and --global-only, "
-                       "for example \"slider=0.4;gtmOnly=true;\"");
-  addFilterFilesOptions(*verb, options->files, "{stem}, {filter} and {slider}");
+      verb.option("--params", options->params,
+                  "The filter's own parameters in place of --slider and --global-only, "
+                  "for example \"slider=0.4;gtmOnly=true;\"");
+  addFilterFilesOptions(verb, options->files, "{stem}, {filter} and {slider}");
 }
 
 }  // namespace pelorin::cli

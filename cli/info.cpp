@@ -156,21 +156,21 @@ ExitCode runInfo(const InfoOptions& options) {
 
 void addInfo(CommandLine& commandLine) {
   const auto options = std::make_shared<InfoOptions>();
-  CLI::App* verb = commandLine.addVerb(
+  Verb verb = commandLine.addVerb(
       "info", "Tell a photo's size, orientation, time, lightness and tone curve",
       "quenby info photo.jpg\n"
       "quenby info --jsonl -r holiday\n"
       "quenby info photo.jpg --slider 0.8 --face 0.4,0.1,0.6,0.4\n"
       "quenby info --json --raw 640x480 - < in.rgba",
       [options] { return runInfo(*options); });
-  addInputOptions(*verb, options->inputs);
-  verb->add_option("--slider", options->slider,
-                   "Strength, 0 to 1, whose tone curve is shown; 0.4 unless given")
-      ->type_name("S");
-  addFaceOption(*verb, options->faces);
-  addRawOption(*verb, options->raw);
-  addJobsOption(*verb, options->jobs);
-  addReportOptions(*verb, options->report);
+  addInputOptions(verb, options->inputs);
+  verb.option("--slider", options->slider,
+              "Strength, 0 to 1, whose tone curve is shown; 0.4 unless given")
+      .type("S");
+  addFaceOption(verb, options->faces);
+  addRawOption(verb, options->raw);
+  addJobsOption(verb, options->jobs);
+  addReportOptions(verb, options->report);
 }
 
 }  // namespace pelorin::cli

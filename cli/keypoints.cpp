@@ -136,7 +136,7 @@ ExitCode runKeypoints(const KeypointsOptions& options) {
 
 void addKeypoints(CommandLine& commandLine) {
   const auto options = std::make_shared<KeypointsOptions>();
-  CLI::App* verb =
+  Verb verb =
       commandLine.addVerb("keypoints", "Find a photo's corners (FAST) and describe them (BRIEF)",
                           "quenby keypoints photo.jpg\n"
                           "quenby keypoints photo.jpg --text > corners.txt\n"
@@ -144,36 +144,34 @@ void addKeypoints(CommandLine& commandLine) {
                           "quenby keypoints photo.jpg --json --brief\n"
                           "quenby keypoints --text --raw 640x480 - < in.rgba",
                           [options] { return runKeypoints(*options); });
-  verb->add_option("IN", options->input, "A photo: a JPEG file or - (standard input)")->required();
-  verb->add_option("--n", options->search.arc,
-                   "How many neighbouring pixels of the 16 on a circle of radius 3 must all be "
-                   "brighter or all darker than its centre; 9 unless given")
-      ->check(CLI::Range(9, 12).description(""))
-      ->type_name("9-12");
-  verb->add_option("--threshold", options->search.threshold,
-                   "By more than how much, in green; 20 unless given")
-      ->check(CLI::Range(0, 255).description(""))
-      ->type_name("0-255");
-  verb->add_flag("--no-suppression", options->unsuppressed,
-                 "Keep corners beside a corner with the same or a higher score");
-  verb->add_flag("--brief", options->search.described,
-                 "Add descriptors, 64 hexadecimal digits, bit 255 first, to the corners that are "
-                 "more than 15 pixels from every border");
-  verb->add_option("--draw", options->drawing.output, "Draw the corners over the photo, as PNG")
-      ->type_name("FILE")
-      ->group("Output");
-  verb->add_flag("--overwrite", options->drawing.overwrite, "Replace a drawing that is there")
-      ->needs("--draw")
-      ->group("Output");
-  addRawOption(*verb, options->raw);
-  verb->get_option("--raw")->description("Read packed RGBA bytes of this size, not a JPEG file");
-  CLI::Option* text =
-      verb->add_flag("--text", options->text,
-                     "Print a line `x y score` for each corner, row by row, and its descriptor "
-                     "behind it")
-          ->group("Reporting");
-  addReportOptions(*verb, options->report);
-  text->excludes(verb->get_option("--json"))->excludes(verb->get_option("--jsonl"));
+  verb.option("IN", options->input, "A photo: a JPEG file or - (standard input)").required();
+  verb.option("--n", options->search.arc,
+              "How many neighbouring pixels of the 16 on a circle of radius 3 must all be "
+              "brighter or all darker than its centre; 9 unless given")
+      .between(9, 12);
+  verb.option("--threshold", options->search.threshold,
+              "By more than how much, in green; 20 unless given")
+      .between(0, 255);
+  verb.flag("--no-suppression", options->unsuppressed,
+            "Keep corners beside a corner with the same or a higher score");
+  verb.flag("--brief", options->search.described,
+            "Add descriptors, 64 hexadecimal digits, bit 255 first, to the corners that are "
+            "more than 15 pixels from every border");
+  verb.option("--draw", options->drawing.output, "Draw the corners over the photo, as PNG")
+      .type("FILE")
+      .group("Output");
+  verb.flag("--overwrite", options->drawing.overwrite, "Replace a drawing that is there")
+      .needs(verb.named("--draw"))
+      .group("Output");
+  addRawOption(verb, options->raw);
+  verb.named("--raw").help("Read packed RGBA bytes of this size, not a JPEG file");
+  Option text =
+      verb.flag("--text", options->text,
+                "Print a line `x y score` for each corner, row by row, and its descriptor "
+                "behind it")
+          .group("Reporting");
+  addReportOptions(verb, options->report);
+  text.excludes(verb.named("--json")).excludes(verb.named("--jsonl"));
 }
 
 }  // namespace pelorin::cli

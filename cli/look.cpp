@@ -23,7 +23,7 @@ using image_processing::FilterDescription;
 struct LookOptions {
   FilterFilesOptions files;
   std::string look, params;
-  const CLI::App* verb;
+  Verb verb;
 };
 
 std::string strength(const std::string& option, const std::string& text) {
@@ -83,43 +83,41 @@ constexpr Setting settings[] = {
      "Strength of AE0 and AE08bit, 0 (none) to 1; 0.4 unless given"},
 };
 
-void addSettings(CLI::App& verb) {
+void addSettings(Verb verb) {
   for (const Setting& setting : settings) {
     if (setting.type == nullptr) {
-      verb.add_flag_function(
-          setting.option, [](std::int64_t) {}, setting.description);
+      verb.flag(setting.option, setting.description);
     } else {
-      verb.add_option(setting.option, CLI::callback_t(), setting.description)
-          ->type_name(setting.type);
+      verb.option(setting.option, setting.description).type(setting.type);
     }
   }
   for (const char* vignette : {"--mask", "--mask-radius", "--mask-alpha"}) {
-    verb.get_option("--no-mask")->excludes(verb.get_option(vignette));
+    verb.named("--no-mask").excludes(verb.named(vignette));
   }
 }
 
-std::string builtParameters(const CLI::App& verb, const FilterDescription& look) {
+std::string builtParameters(Verb verb, const FilterDescription& look) {
   const std::vector<std::string> known = parameterNames(look.name);
-  const bool hasVignette = look.name != "LowDimRGBCurve" || verb.count("--mask") > 0;
+  const bool hasVignette = look.name != "LowDimRGBCurve" || verb.named("--mask").given();
   std::string params;
   for (const Setting& setting : settings) {
     const std::string name = setting.option;
-    if (verb.count(name) == 0) continue;
+    if (!verb.named(name).given()) continue;
     if (std::find(known.begin(), known.end(), setting.key) == known.end()) {
       throw UsageError(name + ": has no effect on " + look.name);
     }
     if (!hasVignette && (name == "--mask-radius" || name == "--mask-alpha")) {
       throw UsageError(name + ": " + look.name + " has no vignette; add --mask to give it one");
     }
-    const std::string text = verb.get_option(name)->as<std::string>();
+    const std::string text = verb.named(name).text();
     params += setting.key + ("=" + setting.valueOf(name, text)) + ";";
   }
   return params.empty() && isAutoEnhance(look.name) ? "slider=0.4;" : params;
 }
 
-void refuseSettingsBesideParams(const CLI::App& verb) {
+void refuseSettingsBesideParams(Verb verb) {
   for (const Setting& setting : settings) {
-    if (verb.count(setting.option) == 0) continue;
+    if (!verb.named(setting.option).given()) continue;
     throw UsageError(std::string("--params: takes the place of ") + setting.option +
                      "; give only one of them");
   }
@@ -130,9 +128,9 @@ ExitCode runLook(const LookOptions& options) {
   if (!options.files.faces.empty() && !isAutoEnhance(look.name)) {
     throw UsageError("--face: has no effect on " + look.name);
   }
-  const bool verbatim = options.verb->count("--params") > 0;
-  if (verbatim) refuseSettingsBesideParams(*options.verb);
-  const std::string params = verbatim ? options.params : builtParameters(*options.verb, look);
+  const bool verbatim = options.verb.named("--params").given();
+  if (verbatim) refuseSettingsBesideParams(options.verb);
+  const std::string params = verbatim ? options.params : builtParameters(options.verb, look);
   const std::vector<std::string> warnings = checkParameters(look.name, params);
 
   Talk talk("look", options.files.report.quiet, 0);
@@ -151,7 +149,7 @@ ExitCode runLook(const LookOptions& options) {
 
 void addLook(CommandLine& commandLine) {
   const auto options = std::make_shared<LookOptions>();
-  CLI::App* verb = commandLine.addVerb(
+  Verb verb = commandLine.addVerb(
       "look", "Give photos a look: a season, black and white, vintage, curves of your own",
       "quenby look winter photo.jpg -o winter.jpg\n"
       "quenby look Vintage -r holiday -o vintage/ -j 4 --name '{stem}_{look}.jpg'\n"
@@ -162,16 +160,16 @@ void addLook(CommandLine& commandLine) {
       "quenby look spring --raw 640x480 in.rgba -o out.rgba --params \"applyMask=0;\"",
       [options] { return runLook(*options); });
   options->verb = verb;
-  verb->add_option("LOOK", options->look,
-                   "A name or display name of `quenby looks`, in any case; Auto is AE0")
-      ->required()
-      ->type_name("")
-      ->group("Input");
-  addSettings(*verb);
-  verb->add_option("--params", options->params,
-                   "The look's own parameters in place of all these settings, "
-                   "for example \"applyMask=0;r=0,0.5,1,;\"");
-  addFilterFilesOptions(*verb, options->files, "{stem}, {filter} and {look}");
+  verb.option("LOOK", options->look,
+              "A name or display name of `quenby looks`, in any case; Auto is AE0")
+      .required()
+      .type("")
+      .group("Input");
+  addSettings(verb);
+  verb.option("--params", options->params,
+              "The look's own parameters in place of all these settings, "
+              "for example \"applyMask=0;r=0,0.5,1,;\"");
+  addFilterFilesOptions(verb, options->files, "{stem}, {filter} and {look}");
 }
 
 }  // namespace pelorin::cli

@@ -32,14 +32,12 @@ ExitCode runLooks(const ReportOptions& report) {
 
 void addLooks(CommandLine& commandLine) {
   const auto report = std::make_shared<ReportOptions>();
-  CLI::App* verb =
-      commandLine.addVerb("looks", "List the looks: name, display name and description",
-                          "quenby looks\n"
-                          "quenby looks --json",
-                          [report] { return runLooks(*report); });
-  CLI::Option* json = verb->add_flag("--json", report->json, "Print the list as a JSON array");
-  verb->add_flag("--jsonl", report->jsonLines, "Print the list as JSON, one look a line")
-      ->excludes(json);
+  Verb verb = commandLine.addVerb("looks", "List the looks: name, display name and description",
+                                  "quenby looks\n"
+                                  "quenby looks --json",
+                                  [report] { return runLooks(*report); });
+  Option json = verb.flag("--json", report->json, "Print the list as a JSON array");
+  verb.flag("--jsonl", report->jsonLines, "Print the list as JSON, one look a line").excludes(json);
 }
 
 }  // namespace pelorin::cli

@@ -105,26 +105,26 @@ ExitCode runMasks(const MasksOptions& options) {
 
 void addMasks(CommandLine& commandLine) {
   const auto options = std::make_shared<MasksOptions>();
-  CLI::App* verb = commandLine.addVerb(
+  Verb verb = commandLine.addVerb(
       "masks", "Write what auto-enhance sees of a photo: its two masks, as pictures",
       "quenby masks photo.jpg -o masks/\n"
       "quenby masks photo.jpg -o masks/ --face 0.4,0.1,0.6,0.4\n"
       "quenby masks pixels.rgba --raw 640x480 -o planes/\n",
       [options] { return runMasks(*options); });
-  verb->add_option("IN", options->input, "A photo: a JPEG file or - (standard input)")->required();
-  addLoneOutputOptions(*verb, options->outputs, "DIR",
+  verb.option("IN", options->input, "A photo: a JPEG file or - (standard input)").required();
+  addLoneOutputOptions(verb, options->outputs, "DIR",
                        "The folder for bilateral.png, the smoothed lightness, and ltm.png, the "
                        "flatness; with --raw bilateral.f32 and ltm.f32");
-  verb->get_option("--output")->required();
-  verb->add_option("--filter", options->filter, "AE0 (unless given) or AE08bit")->type_name("NAME");
-  addFaceOption(*verb, options->faces);
-  verb->add_flag("--exact", options->exact,
-                 "Smooth with the exact bilateral filter in place of the grid; slow");
-  addRawOption(*verb, options->raw);
-  verb->get_option("--raw")->description(
+  verb.named("--output").required();
+  verb.option("--filter", options->filter, "AE0 (unless given) or AE08bit").type("NAME");
+  addFaceOption(verb, options->faces);
+  verb.flag("--exact", options->exact,
+            "Smooth with the exact bilateral filter in place of the grid; slow");
+  addRawOption(verb, options->raw);
+  verb.named("--raw").help(
       "Read packed RGBA bytes of this size and write the masks as 32-bit floats of this "
       "machine's byte order, rows back to back");
-  addReportOptions(*verb, options->report);
+  addReportOptions(verb, options->report);
 }
 
 }  // namespace pelorin::cli

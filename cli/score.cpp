@@ -29,7 +29,7 @@ struct ScoreOptions {
   InputOptions inputs;
   ScoreFormat format;
   OutputOptions maps;
-  CLI::Option* mapGiven = nullptr;
+  Option mapGiven;
   std::optional<std::string> failAbove;
   std::string raw;
   int jobs = 1;
@@ -64,7 +64,7 @@ ScoredPhoto score(const Input& input, const PhotoOptions& options, const Planned
 }
 
 std::vector<PlannedFile> planMaps(const ScoreOptions& options, const std::vector<Input>& inputs) {
-  if (options.mapGiven->count() == 0) return {};
+  if (!options.mapGiven.given()) return {};
   const std::string& output = options.maps.output;
   if (output.empty() || output == "-") {
     throw UsageError("--map: name a file or an existing folder; standard output has the scores");
@@ -140,52 +140,51 @@ ExitCode runScore(const ScoreOptions& options) {
 
 void addScore(CommandLine& commandLine) {
   const auto options = std::make_shared<ScoreOptions>();
-  CLI::App* verb =
-      commandLine.addVerb("score", "Say how natural photos look (NIQE; lower is better)",
-                          "quenby score photo.jpg\n"
-                          "quenby score --csv -r holiday -j 0 > scores.csv\n"
-                          "quenby score --fail-above 6 *.jpg\n"
-                          "quenby score photo.jpg --map heat.png\n"
-                          "quenby score -r holiday --map heat/ --name '{stem}_heat.png'\n"
-                          "quenby score --features --raw 640x480 - < in.rgba",
-                          [options] { return runScore(*options); });
-  verb->footer(verb->get_footer() +
-               "\n4: every file was scored or too small, and a score is above --fail-above."
-               "\n1 comes before 4; 3 also says that every photo was too small.\n"
-               "\nScores are of the full-size upright picture and compare only under one model."
-               "\nThey change when a picture is scaled, so score pictures at one size."
-               "\nSides below 96 pixels are too small: a line on stderr, null in JSON, an empty"
-               "\nfield in CSV.");
-  addInputOptions(*verb, options->inputs);
-  CLI::Option* csv = verb->add_flag("--csv", options->format.csv,
-                                    "Print comma-separated values, with a line of names first")
-                         ->group("Reporting");
-  verb->add_flag("--features", options->format.features,
-                 "Print the 36 mean features, one a line (after a # line with the file's name "
-                 "when there are several); with --csv or --json beside the score")
-      ->group("Reporting");
-  verb->add_option("--fail-above", options->failAbove, "Exit with 4 when a score is above this")
-      ->type_name("X");
+  Verb verb = commandLine.addVerb("score", "Say how natural photos look (NIQE; lower is better)",
+                                  "quenby score photo.jpg\n"
+                                  "quenby score --csv -r holiday -j 0 > scores.csv\n"
+                                  "quenby score --fail-above 6 *.jpg\n"
+                                  "quenby score photo.jpg --map heat.png\n"
+                                  "quenby score -r holiday --map heat/ --name '{stem}_heat.png'\n"
+                                  "quenby score --features --raw 640x480 - < in.rgba",
+                                  [options] { return runScore(*options); });
+  verb.addToFooter(
+      "\n4: every file was scored or too small, and a score is above --fail-above."
+      "\n1 comes before 4; 3 also says that every photo was too small.\n"
+      "\nScores are of the full-size upright picture and compare only under one model."
+      "\nThey change when a picture is scaled, so score pictures at one size."
+      "\nSides below 96 pixels are too small: a line on stderr, null in JSON, an empty"
+      "\nfield in CSV.");
+  addInputOptions(verb, options->inputs);
+  Option csv = verb.flag("--csv", options->format.csv,
+                         "Print comma-separated values, with a line of names first")
+                   .group("Reporting");
+  verb.flag("--features", options->format.features,
+            "Print the 36 mean features, one a line (after a # line with the file's name "
+            "when there are several); with --csv or --json beside the score")
+      .group("Reporting");
+  verb.option("--fail-above", options->failAbove, "Exit with 4 when a score is above this")
+      .type("X");
   options->mapGiven =
-      verb->add_option("--map", options->maps.output,
-                       "Write each photo's heat map, the distances of its blocks over the photo, "
-                       "to this PNG file or into this folder")
-          ->type_name("FILE|DIR")
-          ->group("Output");
+      verb.option("--map", options->maps.output,
+                  "Write each photo's heat map, the distances of its blocks over the photo, "
+                  "to this PNG file or into this folder")
+          .type("FILE|DIR")
+          .group("Output");
   options->maps.name = "{stem}_niqe.png";
-  verb->add_option("--name", options->maps.name,
-                   "How maps are called in a folder; {stem}_niqe.png unless given")
-      ->type_name("PATTERN")
-      ->needs(options->mapGiven)
-      ->group("Output");
-  verb->add_flag("--overwrite", options->maps.overwrite, "Replace maps that are there already")
-      ->needs(options->mapGiven)
-      ->group("Output");
-  addRawOption(*verb, options->raw);
-  verb->get_option("--raw")->description("Read packed RGBA bytes of this size, not JPEG files");
-  addJobsOption(*verb, options->jobs);
-  addReportOptions(*verb, options->format.report);
-  csv->excludes(verb->get_option("--json"))->excludes(verb->get_option("--jsonl"));
+  verb.option("--name", options->maps.name,
+              "How maps are called in a folder; {stem}_niqe.png unless given")
+      .type("PATTERN")
+      .needs(options->mapGiven)
+      .group("Output");
+  verb.flag("--overwrite", options->maps.overwrite, "Replace maps that are there already")
+      .needs(options->mapGiven)
+      .group("Output");
+  addRawOption(verb, options->raw);
+  verb.named("--raw").help("Read packed RGBA bytes of this size, not JPEG files");
+  addJobsOption(verb, options->jobs);
+  addReportOptions(verb, options->format.report);
+  csv.excludes(verb.named("--json")).excludes(verb.named("--jsonl"));
 }
 
 }  // namespace pelorin::cli

@@ -171,34 +171,32 @@ ExitCode runSheet(const SheetOptions& options) {
 
 void addSheet(CommandLine& commandLine) {
   const auto options = std::make_shared<SheetOptions>();
-  CLI::App* verb =
+  Verb verb =
       commandLine.addVerb("sheet", "One labelled picture of photos beside their enhanced versions",
                           "quenby sheet *.jpg -o sheet.jpg\n"
                           "quenby sheet -r holiday -o sheet.jpg --looks Auto,Winter\n"
                           "quenby sheet photo.jpg -o sliders.jpg --sliders 0,0.3,0.6,1\n",
                           [options] { return runSheet(*options); });
-  addInputOptions(*verb, options->inputs);
-  addSheetColumnOptions(*verb, options->columns);
-  addFaceOption(*verb, options->faces);
-  addLoneOutputOptions(*verb, options->outputs, "FILE",
+  addInputOptions(verb, options->inputs);
+  addSheetColumnOptions(verb, options->columns);
+  addFaceOption(verb, options->faces);
+  addLoneOutputOptions(verb, options->outputs, "FILE",
                        "The JPEG file for the sheet, or - (standard output)");
-  verb->get_option("--output")->required();
-  verb->add_option("--title", options->title, "What stands above the sheet")
-      ->type_name("TEXT")
-      ->group("Output");
-  verb->add_option("--cell", options->cell,
-                   "Longest side of a small picture in pixels; 320 unless given")
-      ->check(CLI::Range(32, 4096).description(""))
-      ->type_name("32-4096")
-      ->group("Output");
-  verb->add_option("--quality", options->quality, "JPEG quality, 90 unless given")
-      ->check(CLI::Range(1, 100).description(""))
-      ->type_name("1-100")
-      ->group("Output");
-  addRawOption(*verb, options->raw);
-  verb->get_option("--raw")->description("Read packed RGBA bytes of this size");
-  addJobsOption(*verb, options->jobs);
-  addReportOptions(*verb, options->report);
+  verb.named("--output").required();
+  verb.option("--title", options->title, "What stands above the sheet")
+      .type("TEXT")
+      .group("Output");
+  verb.option("--cell", options->cell,
+              "Longest side of a small picture in pixels; 320 unless given")
+      .between(32, 4096)
+      .group("Output");
+  verb.option("--quality", options->quality, "JPEG quality, 90 unless given")
+      .between(1, 100)
+      .group("Output");
+  addRawOption(verb, options->raw);
+  verb.named("--raw").help("Read packed RGBA bytes of this size");
+  addJobsOption(verb, options->jobs);
+  addReportOptions(verb, options->report);
 }
 
 }  // namespace pelorin::cli

@@ -2,7 +2,6 @@
 
 #include <fmt/format.h>
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 
 #include "cli/common/look_name.h"
@@ -29,22 +28,20 @@ std::string labelOf(const FilterDescription& look) {
 
 }  // namespace
 
-void addSheetColumnOptions(CLI::App& verb, SheetColumnOptions& options) {
-  CLI::Option* all = verb.add_flag("--all-looks", options.allLooks,
-                                   "A column for every look; so it is when none is named");
-  verb.add_option("--looks", options.looks, "A column for each of these looks")
-      ->delimiter(',')
-      ->allow_extra_args(false)
-      ->type_name("NAME,...")
-      ->excludes(all);
-  verb.add_option("--sliders", options.sliders,
-                  "A column of the automatic enhancement at each of these sliders")
-      ->delimiter(',')
-      ->allow_extra_args(false)
-      ->type_name("NUMBER,...");
-  verb.add_option("--slider", options.slider,
-                  "Strength of the automatic enhancement among the looks; 0.4 unless given")
-      ->type_name("NUMBER");
+void addSheetColumnOptions(Verb verb, SheetColumnOptions& options) {
+  Option all = verb.flag("--all-looks", options.allLooks,
+                         "A column for every look; so it is when none is named");
+  verb.option("--looks", options.looks, "A column for each of these looks")
+      .separatedBy(',')
+      .type("NAME,...")
+      .excludes(all);
+  verb.option("--sliders", options.sliders,
+              "A column of the automatic enhancement at each of these sliders")
+      .separatedBy(',')
+      .type("NUMBER,...");
+  verb.option("--slider", options.slider,
+              "Strength of the automatic enhancement among the looks; 0.4 unless given")
+      .type("NUMBER");
 }
 
 std::vector<SheetColumn> sheetColumns(const SheetColumnOptions& options) {

@@ -3,7 +3,7 @@
 #include <string>
 #include <vector>
 
-#include "cli/common/cli_app.h"
+#include "cli/common/verb.h"
 
 namespace pelorin::cli {
 
@@ -16,7 +16,7 @@ struct SheetColumnOptions {
 };
 
 /// Adds `--all-looks`, `--looks`, `--sliders` and `--slider` to a verb.
-void addSheetColumnOptions(CLI::App& verb, SheetColumnOptions& options);
+void addSheetColumnOptions(Verb verb, SheetColumnOptions& options);
 
 /// One way of treating every photo.
 struct SheetColumn {

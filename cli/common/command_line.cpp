@@ -1,5 +1,6 @@
 #include "cli/common/command_line.h"
 
+#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <csignal>
 #include <cstdio>
@@ -22,14 +23,15 @@ std::vector<std::string> optionNames(const CLI::App& app) {
 
 }  // namespace
 
-CommandLine::CommandLine() : app_("Quenby makes photos better, one or a thousand at a time.") {
-  app_.name("quenby");
-  app_.set_version_flag("--version", "quenby " PELORIN_VERSION, "Print the version and leave");
-  app_.set_help_flag("-h,--help", "Print this help and leave");
-  app_.require_subcommand(0, 1);
-  app_.get_formatter()->label("SUBCOMMAND", "VERB");
-  app_.get_formatter()->column_width(30);
-  app_.footer(
+CommandLine::CommandLine()
+    : app_(std::make_unique<CLI::App>("Quenby makes photos better, one or a thousand at a time.")) {
+  app_->name("quenby");
+  app_->set_version_flag("--version", "quenby " PELORIN_VERSION, "Print the version and leave");
+  app_->set_help_flag("-h,--help", "Print this help and leave");
+  app_->require_subcommand(0, 1);
+  app_->get_formatter()->label("SUBCOMMAND", "VERB");
+  app_->get_formatter()->column_width(30);
+  app_->footer(
       "Examples:\n"
       "  quenby enhance photo.jpg -o better.jpg\n"
       "  quenby enhance -r holiday -o better/ -j 4\n"
@@ -37,9 +39,11 @@ CommandLine::CommandLine() : app_("Quenby makes photos better, one or a thousand
       "`quenby VERB --help` tells all about a verb.");
 }
 
-CLI::App* CommandLine::addVerb(const std::string& name, const std::string& summary,
-                               const std::string& examples, std::function<ExitCode()> work) {
-  CLI::App* verb = app_.add_subcommand(name, summary);
+CommandLine::~CommandLine() = default;
+
+Verb CommandLine::addVerb(const std::string& name, const std::string& summary,
+                          const std::string& examples, std::function<ExitCode()> work) {
+  CLI::App* verb = app_->add_subcommand(name, summary);
   std::string footer = "Examples:\n";
   for (std::size_t start = 0; start < examples.size();) {
     const std::size_t end = std::min(examples.find('\n', start), examples.size());
@@ -52,12 +56,12 @@ CLI::App* CommandLine::addVerb(const std::string& name, const std::string& summa
   verb->footer(footer);
   verb->group("Verbs");
   verbs_.push_back({verb, std::move(work)});
-  return verb;
+  return Verb(verb);
 }
 
 std::vector<std::string> CommandLine::verbNames() const {
   std::vector<std::string> names;
-  for (const Verb& verb : verbs_) names.push_back(verb.app->get_name());
+  for (const Work& work : verbs_) names.push_back(work.verb->get_name());
   return names;
 }
 
@@ -76,7 +80,7 @@ ExitCode CommandLine::run(int argc, char** argv) {
 
   std::vector<std::string> arguments(argv + 1, argv + argc);
   if (arguments.empty()) {
-    std::fputs(app_.help().c_str(), stderr);
+    std::fputs(app_->help().c_str(), stderr);
     return ExitCode::usage;
   }
   if (arguments[0] == "help") {
@@ -92,40 +96,38 @@ ExitCode CommandLine::run(int argc, char** argv) {
     if (argument.starts_with('[')) argument.insert(0, "./");
   }
 
-  const auto chosen = [this]() -> const Verb* {
-    for (const Verb& verb : verbs_) {
-      if (verb.app->parsed()) return &verb;
-    }
-    return nullptr;
+  const auto chosen = [this]() -> const Work* {
+    const auto named = std::ranges::find_if(verbs_, [](const Work& w) { return w.verb->parsed(); });
+    return named == verbs_.end() ? nullptr : &*named;
   };
   try {
     std::vector<std::string> reversed(arguments.rbegin(), arguments.rend());
-    app_.parse(std::move(reversed));
+    app_->parse(std::move(reversed));
   } catch (const CLI::Success& asked) {  // --help, --version
-    app_.exit(asked);
+    app_->exit(asked);
     return ExitCode::allDone;
   } catch (const CLI::ExtrasError& error) {
-    const CLI::App* verb = chosen() == nullptr ? nullptr : chosen()->app;
-    for (const CLI::App* app : {verb, static_cast<const CLI::App*>(&app_)}) {
+    const CLI::App* verb = chosen() == nullptr ? nullptr : chosen()->verb;
+    for (const CLI::App* app : {verb, static_cast<const CLI::App*>(app_.get())}) {
       if (app == nullptr) continue;
       for (const std::string& extra : app->remaining()) {
         if (extra.size() < 2 || extra[0] != '-') continue;
-        return refuse(unknownName("option", extra, optionNames(verb ? *verb : app_)), verb);
+        return refuse(unknownName("option", extra, optionNames(verb ? *verb : *app_)), verb);
       }
     }
     return refuse(error.what(), verb);
   } catch (const CLI::ParseError& error) {
-    return refuse(error.what(), chosen() == nullptr ? nullptr : chosen()->app);
+    return refuse(error.what(), chosen() == nullptr ? nullptr : chosen()->verb);
   }
 
-  const Verb* verb = chosen();
-  if (verb == nullptr) return refuse("no verb given", nullptr);
-  const std::string name = verb->app->get_name();
+  const Work* work = chosen();
+  if (work == nullptr) return refuse("no verb given", nullptr);
+  const std::string name = work->verb->get_name();
   ExitCode code;
   try {
-    code = verb->work();
+    code = work->run();
   } catch (const UsageError& error) {
-    return refuse(error.what(), verb->app);
+    return refuse(error.what(), work->verb);
   } catch (const Interrupted&) {
     return ExitCode::interrupted;
   } catch (const std::exception& error) {

@@ -1,6 +1,5 @@
 #include "cli/common/faces.h"
 
-#include <CLI/CLI.hpp>
 #include <array>
 #include <memory>
 #include <string_view>
@@ -32,12 +31,12 @@ FaceFractions readFace(const std::string& text) {
 
 }  // namespace
 
-void addFaceOption(CLI::App& verb, std::vector<std::string>& texts) {
-  verb.add_option("--face", texts,
-                  "A face as left,top,right,bottom in fractions of the upright picture, "
-                  "0,0 its top left corner; may be repeated")
-      ->allow_extra_args(false)
-      ->type_name("L,T,R,B");
+void addFaceOption(Verb verb, std::vector<std::string>& texts) {
+  verb.option("--face", texts,
+              "A face as left,top,right,bottom in fractions of the upright picture, "
+              "0,0 its top left corner; may be repeated")
+      .oneValueEach()
+      .type("L,T,R,B");
 }
 
 std::vector<FaceFractions> readFaces(const std::vector<std::string>& texts) {

@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "cli/common/cli_app.h"
+#include "cli/common/verb.h"
 #include "image_processing/core/image_metadata.h"
 
 namespace pelorin::cli {
@@ -15,7 +15,7 @@ struct FaceFractions {
 };
 
 /// Adds `--face l,t,r,b`, repeatable; `texts` is for `readFaces`.
-void addFaceOption(CLI::App& verb, std::vector<std::string>& texts);
+void addFaceOption(Verb verb, std::vector<std::string>& texts);
 
 /// @throws UsageError when a text is not four finite numbers.
 std::vector<FaceFractions> readFaces(const std::vector<std::string>& texts);

@@ -2,7 +2,6 @@
 
 #include <fmt/format.h>
 
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <optional>
 
@@ -84,21 +83,19 @@ ExitCode printPlan(const std::vector<PlannedFile>& plan, JsonOutput& json) {
 
 }  // namespace
 
-void addFilterFilesOptions(CLI::App& verb, FilterFilesOptions& options,
+void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
                            const std::string& placeholders) {
   addInputOptions(verb, options.inputs);
   addOutputOptions(verb, options.outputs, "{stem}_{filter}.jpg", placeholders);
   addFaceOption(verb, options.faces);
-  verb.add_option("--rotate", options.rotate,
-                  "Turn further by so many degrees clockwise, a multiple of 90")
-      ->type_name("DEGREES");
-  verb.add_option("--scale", options.scale, "Decode at 1/1, 1/2, 1/4 or 1/8 of the size")
-      ->check(CLI::IsMember({1, 2, 4, 8}).description(""))
-      ->type_name("1|2|4|8");
-  verb.add_option("--quality", options.quality, "JPEG quality, 90 unless given")
-      ->check(CLI::Range(1, 100).description(""))
-      ->type_name("1-100")
-      ->group("Output");
+  verb.option("--rotate", options.rotate,
+              "Turn further by so many degrees clockwise, a multiple of 90")
+      .type("DEGREES");
+  verb.option("--scale", options.scale, "Decode at 1/1, 1/2, 1/4 or 1/8 of the size")
+      .oneOf({"1", "2", "4", "8"});
+  verb.option("--quality", options.quality, "JPEG quality, 90 unless given")
+      .between(1, 100)
+      .group("Output");
   addRawOption(verb, options.raw);
   addJobsOption(verb, options.jobs);
   addReportOptions(verb, options.report);

@@ -3,12 +3,12 @@
 #include <string>
 #include <vector>
 
-#include "cli/common/cli_app.h"
 #include "cli/common/exit_code.h"
 #include "cli/common/faces.h"
 #include "cli/common/inputs.h"
 #include "cli/common/outputs.h"
 #include "cli/common/talk.h"
+#include "cli/common/verb.h"
 
 namespace pelorin::cli {
 
@@ -27,7 +27,7 @@ struct FilterFilesOptions {
 
 /// Adds all of them to a verb. Results in a folder are called `{stem}_{filter}` by default.
 /// @param placeholders  what `--name` may hold, for the help.
-void addFilterFilesOptions(CLI::App& verb, FilterFilesOptions& options,
+void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
                            const std::string& placeholders = "{stem} and {filter}");
 
 /// What to do with every file.

@@ -1,6 +1,5 @@
 #include "cli/common/inputs.h"
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <cctype>
 #include <fstream>
@@ -95,15 +94,15 @@ class Expansion {
 
 }  // namespace
 
-void addInputOptions(CLI::App& verb, InputOptions& options) {
-  verb.add_option("IN", options.names,
-                  "JPEG files, folders (with -r), @LIST (one name a line), - (standard input)")
-      ->required()
-      ->type_name("")
-      ->group("Input");
-  verb.add_flag("-r,--recursive", options.recursive,
-                "Take the .jpg, .jpeg and .jpe files below a folder, in sorted order")
-      ->group("Input");
+void addInputOptions(Verb verb, InputOptions& options) {
+  verb.option("IN", options.names,
+              "JPEG files, folders (with -r), @LIST (one name a line), - (standard input)")
+      .required()
+      .type("")
+      .group("Input");
+  verb.flag("-r,--recursive", options.recursive,
+            "Take the .jpg, .jpeg and .jpe files below a folder, in sorted order")
+      .group("Input");
 }
 
 std::vector<Input> expandInputs(const InputOptions& options) {

@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "cli/common/cli_app.h"
+#include "cli/common/verb.h"
 
 namespace pelorin::cli {
 
@@ -15,7 +15,7 @@ struct InputOptions {
 };
 
 /// Adds the positional IN... and `-r` to a verb.
-void addInputOptions(CLI::App& verb, InputOptions& options);
+void addInputOptions(Verb verb, InputOptions& options);
 
 /// One file to work on.
 struct Input {

@@ -1,6 +1,5 @@
 #include "cli/common/jobs.h"
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <condition_variable>
 #include <mutex>
@@ -8,11 +7,11 @@
 
 namespace pelorin::cli {
 
-void addJobsOption(CLI::App& verb, int& atOnce) {
-  verb.add_option("-j,--jobs", atOnce, "Files at once, each on one core; 0: as many as cores")
-      ->check(CLI::Range(0, 1024).description(""))
-      ->type_name("N")
-      ->group("Reporting");
+void addJobsOption(Verb verb, int& atOnce) {
+  verb.option("-j,--jobs", atOnce, "Files at once, each on one core; 0: as many as cores")
+      .between(0, 1024)
+      .type("N")
+      .group("Reporting");
 }
 
 bool runJobs(std::size_t count, int atOnce, const std::function<void(std::size_t)>& work,

@@ -7,14 +7,14 @@
 #include <string>
 #include <vector>
 
-#include "cli/common/cli_app.h"
 #include "cli/common/errors.h"
 #include "cli/common/interrupt.h"
+#include "cli/common/verb.h"
 
 namespace pelorin::cli {
 
 /// Adds `-j N` to a verb: 1 unless given, 0 for one a core.
-void addJobsOption(CLI::App& verb, int& atOnce);
+void addJobsOption(Verb verb, int& atOnce);
 
 /// Runs `work(0)` ... `work(count - 1)`, `atOnce` of them at the same time, each on one thread, and
 /// calls `report` on the calling thread in that order, as soon as the order allows. Ctrl-C starts

@@ -2,7 +2,6 @@
 
 #include <fmt/format.h>
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <cctype>
 #include <filesystem>
@@ -41,13 +40,13 @@ bool holdsAFile(const std::string& path) {
 
 }  // namespace
 
-void addLoneOutputOptions(CLI::App& verb, LoneOutputOptions& options, const std::string& typeName,
+void addLoneOutputOptions(Verb verb, LoneOutputOptions& options, const std::string& typeName,
                           const std::string& help) {
-  verb.add_option("-o,--output", options.output, help)->type_name(typeName)->group("Output");
-  verb.add_flag("--overwrite", options.overwrite, "Replace files that are there already")
-      ->group("Output");
-  verb.add_flag("-n,--dry-run", options.planOnly, "Print what would become what, and do nothing")
-      ->group("Output");
+  verb.option("-o,--output", options.output, help).type(typeName).group("Output");
+  verb.flag("--overwrite", options.overwrite, "Replace files that are there already")
+      .group("Output");
+  verb.flag("-n,--dry-run", options.planOnly, "Print what would become what, and do nothing")
+      .group("Output");
 }
 
 Input loneInput(const std::string& name) {

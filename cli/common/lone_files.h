@@ -5,11 +5,11 @@
 #include <string>
 #include <vector>
 
-#include "cli/common/cli_app.h"
 #include "cli/common/exit_code.h"
 #include "cli/common/inputs.h"
 #include "cli/common/json_output.h"
 #include "cli/common/talk.h"
+#include "cli/common/verb.h"
 
 namespace pelorin::cli {
 
@@ -23,7 +23,7 @@ struct LoneOutputOptions {
 };
 
 /// Adds `-o`, `--overwrite` and `-n` to a verb.
-void addLoneOutputOptions(CLI::App& verb, LoneOutputOptions& options, const std::string& typeName,
+void addLoneOutputOptions(Verb verb, LoneOutputOptions& options, const std::string& typeName,
                           const std::string& help);
 
 /// The photo that a verb's only positional names.

@@ -1,6 +1,5 @@
 #include "cli/common/outputs.h"
 
-#include <CLI/CLI.hpp>
 #include <system_error>
 
 #include "cli/common/errors.h"
@@ -87,22 +86,22 @@ void refuseClashes(const std::vector<PlannedFile>& plan, bool overwrite) {
 
 }  // namespace
 
-void addOutputOptions(CLI::App& verb, OutputOptions& options, const std::string& defaultName,
+void addOutputOptions(Verb verb, OutputOptions& options, const std::string& defaultName,
                       const std::string& placeholders) {
-  verb.add_option("-o,--output", options.output,
-                  "A file, an existing folder, or - (standard output); without it results stand "
-                  "beside their inputs, called by --name")
-      ->type_name("FILE|DIR")
-      ->group("Output");
-  verb.add_option("--name", options.name,
-                  "How results are called in a folder, from " + placeholders + "; " + defaultName +
-                      " unless given")
-      ->type_name("PATTERN")
-      ->group("Output");
-  verb.add_flag("--overwrite", options.overwrite, "Replace files that are there already")
-      ->group("Output");
-  verb.add_flag("-n,--dry-run", options.planOnly, "Print what would become what, and do nothing")
-      ->group("Output");
+  verb.option("-o,--output", options.output,
+              "A file, an existing folder, or - (standard output); without it results stand "
+              "beside their inputs, called by --name")
+      .type("FILE|DIR")
+      .group("Output");
+  verb.option("--name", options.name,
+              "How results are called in a folder, from " + placeholders + "; " + defaultName +
+                  " unless given")
+      .type("PATTERN")
+      .group("Output");
+  verb.flag("--overwrite", options.overwrite, "Replace files that are there already")
+      .group("Output");
+  verb.flag("-n,--dry-run", options.planOnly, "Print what would become what, and do nothing")
+      .group("Output");
 }
 
 std::vector<PlannedFile> planOutputs(const std::vector<Input>& inputs, const InputOptions& named,

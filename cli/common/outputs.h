@@ -5,8 +5,8 @@
 #include <string>
 #include <vector>
 
-#include "cli/common/cli_app.h"
 #include "cli/common/inputs.h"
+#include "cli/common/verb.h"
 
 namespace pelorin::cli {
 
@@ -21,7 +21,7 @@ struct OutputOptions {
 /// Adds `-o`, `--name`, `--overwrite` and `-n` to a verb.
 /// @param defaultName   used when `--name` is not given, for example "{stem}_{filter}.jpg".
 /// @param placeholders  what `--name` may hold in braces, for the help: "{stem}, {filter}".
-void addOutputOptions(CLI::App& verb, OutputOptions& options, const std::string& defaultName,
+void addOutputOptions(Verb verb, OutputOptions& options, const std::string& defaultName,
                       const std::string& placeholders);
 
 /// One input and the file it becomes.

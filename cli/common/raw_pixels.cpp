@@ -2,7 +2,6 @@
 
 #include <fmt/format.h>
 
-#include <CLI/CLI.hpp>
 #include <filesystem>
 #include <utility>
 #include <vector>
@@ -17,11 +16,10 @@ namespace pelorin::cli {
 using image_processing::Image;
 using image_processing::RGBA8Pixel;
 
-void addRawOption(CLI::App& verb, std::string& text) {
-  verb.add_option("--raw", text,
-                  "Read and write packed RGBA bytes of this size instead of JPEG files")
-      ->type_name("WxH")
-      ->group("Raw pixels");
+void addRawOption(Verb verb, std::string& text) {
+  verb.option("--raw", text, "Read and write packed RGBA bytes of this size instead of JPEG files")
+      .type("WxH")
+      .group("Raw pixels");
 }
 
 RawSize readRawSize(const std::string& text) {

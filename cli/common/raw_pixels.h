@@ -4,8 +4,8 @@
 #include <memory>
 #include <string>
 
-#include "cli/common/cli_app.h"
 #include "cli/common/inputs.h"
+#include "cli/common/verb.h"
 #include "image_processing/core/image.h"
 
 namespace pelorin::cli {
@@ -16,7 +16,7 @@ struct RawSize {
 };
 
 /// Adds `--raw WxH`; `text` is for `readRawSize`.
-void addRawOption(CLI::App& verb, std::string& text);
+void addRawOption(Verb verb, std::string& text);
 
 /// @throws UsageError when `text` is not like "640x480" with both sides above 0.
 RawSize readRawSize(const std::string& text);

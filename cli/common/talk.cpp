@@ -3,20 +3,19 @@
 #include <fmt/format.h>
 #include <unistd.h>
 
-#include <CLI/CLI.hpp>
 #include <cstdio>
 #include <utility>
 
 namespace pelorin::cli {
 
-void addReportOptions(CLI::App& verb, ReportOptions& options) {
-  CLI::Option* json = verb.add_flag("--json", options.json,
-                                    "Print data as JSON: an object for one file, else an array");
-  json->group("Reporting");
-  verb.add_flag("--jsonl", options.jsonLines, "Print data as JSON, one object a line and file")
-      ->excludes(json)
-      ->group("Reporting");
-  verb.add_flag("-q,--quiet", options.quiet, "Say nothing but errors")->group("Reporting");
+void addReportOptions(Verb verb, ReportOptions& options) {
+  Option json = verb.flag("--json", options.json,
+                          "Print data as JSON: an object for one file, else an array");
+  json.group("Reporting");
+  verb.flag("--jsonl", options.jsonLines, "Print data as JSON, one object a line and file")
+      .excludes(json)
+      .group("Reporting");
+  verb.flag("-q,--quiet", options.quiet, "Say nothing but errors").group("Reporting");
 }
 
 Talk::Talk(std::string verb, bool quiet, std::size_t files)

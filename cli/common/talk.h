@@ -3,7 +3,7 @@
 #include <cstddef>
 #include <string>
 
-#include "cli/common/cli_app.h"
+#include "cli/common/verb.h"
 
 namespace pelorin::cli {
 
@@ -15,7 +15,7 @@ struct ReportOptions {
 };
 
 /// Adds `--json`, `--jsonl` and `--quiet` to a verb.
-void addReportOptions(CLI::App& verb, ReportOptions& options);
+void addReportOptions(Verb verb, ReportOptions& options);
 
 /// Everything that is said to a person, on stderr: errors, notes, and one progress bar when stderr
 /// is a terminal and there are several files. Not for several threads.
