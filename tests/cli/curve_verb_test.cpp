@@ -1,7 +1,6 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <nlohmann/json.hpp>
 #include <sstream>
 
 #include "cli/common/faces.h"
@@ -10,6 +9,7 @@
 #include "image_processing/autoenhance/build_tone_curve.h"
 #include "image_processing/autoenhance/image_statistics.h"
 #include "tests/cli/jpeg_files.h"
+#include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/support/pictures.h"
 
@@ -81,7 +81,7 @@ TEST_F(CurveVerb, IsThatOfSlider04UnlessGiven) {
 
 TEST_F(CurveVerb, IsLiftedForFaces) {
   const std::vector<std::string> faces = {"0.1,0.1,0.4,0.5"};
-  const auto json = nlohmann::json::parse(run({"--face", faces[0], "--json"}).output);
+  const auto json = parsedJson(run({"--face", faces[0], "--json"}).output);
   const Expected expected = curveOf(picture, 0.4f, faces);
   EXPECT_GE(expected.statistics.faceMedianBin, 0);
   EXPECT_EQ(json.at("faceMedianBin"), expected.statistics.faceMedianBin);
@@ -89,7 +89,7 @@ TEST_F(CurveVerb, IsLiftedForFaces) {
 }
 
 TEST_F(CurveVerb, TellsEverythingAsJson) {
-  const auto json = nlohmann::json::parse(run({"--slider", "0.7", "--json"}).output);
+  const auto json = parsedJson(run({"--slider", "0.7", "--json"}).output);
   const Expected expected = curveOf(picture, 0.7f);
   EXPECT_EQ(json.at("file"), input);
   EXPECT_EQ(json.at("width"), 83);

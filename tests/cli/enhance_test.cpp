@@ -1,11 +1,11 @@
 #include <gmock/gmock.h>
 
 #include <cstring>
-#include <nlohmann/json.hpp>
 
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/filtered_image.h"
 #include "tests/cli/jpeg_files.h"
+#include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/support/pictures.h"
 
@@ -117,7 +117,7 @@ TEST(Enhance, ReportsAsJson) {
   const std::string out = folder.makeFolder("out");
   const Finished run = quenby({"enhance", good, bad, "-o", out, "--json"});
   EXPECT_EQ(run.exitCode, 1);
-  const nlohmann::json report = nlohmann::json::parse(run.output);
+  const nlohmann::json report = parsedJson(run.output);
   ASSERT_EQ(report.size(), 2u);
   EXPECT_EQ(report[0]["input"], good);
   EXPECT_EQ(report[0]["output"], out + "/a_AE0.jpg");
@@ -132,14 +132,14 @@ TEST(Enhance, ReportsAsOneJsonObjectForOneFileAndALineEachWithJsonl) {
   const TemporaryFolder folder;
   const std::string in = folder.write("a.jpg", smallJpeg());
   const Finished one = quenby({"enhance", in, "-o", folder / "b.jpg", "--json"});
-  EXPECT_EQ(nlohmann::json::parse(one.output)["status"], "done");
+  EXPECT_EQ(parsedJson(one.output)["status"], "done");
   const std::string out = folder.makeFolder("out");
   folder.write("in/a.jpg", smallJpeg());
   folder.write("in/b.jpg", smallJpeg());
   const Finished lines = quenby({"enhance", "-r", folder / "in", "-o", out, "--jsonl"});
   const std::size_t end = lines.output.find('\n');
-  EXPECT_EQ(nlohmann::json::parse(lines.output.substr(0, end))["input"], folder / "in/a.jpg");
-  EXPECT_EQ(nlohmann::json::parse(lines.output.substr(end))["input"], folder / "in/b.jpg");
+  EXPECT_EQ(parsedJson(lines.output.substr(0, end))["input"], folder / "in/a.jpg");
+  EXPECT_EQ(parsedJson(lines.output.substr(end))["input"], folder / "in/b.jpg");
 }
 
 TEST(Enhance, WarnsOfParametersThatReadOtherwiseThanTheyLook) {

@@ -1,10 +1,9 @@
 #include <gmock/gmock.h>
 
-#include <nlohmann/json.hpp>
-
 #include "cli/common/number_text.h"
 #include "image_processing/autoenhance/build_tone_curve.h"
 #include "tests/cli/jpeg_files.h"
+#include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/support/pictures.h"
 
@@ -41,7 +40,7 @@ TEST(Info, GivesTheEnginesNumbersToNineDigits) {
       {"info", "--json", "--raw", "200x100", "-", "--slider", "0.8", "--face", "0.25,0.2,0.75,0.8"},
       rawBytes(picture));
   ASSERT_EQ(run.exitCode, 0) << run.errors;
-  const nlohmann::json info = nlohmann::json::parse(run.output);
+  const nlohmann::json info = parsedJson(run.output);
   EXPECT_EQ(info["width"], 200);
   EXPECT_EQ(info["height"], 100);
   EXPECT_EQ(info["faceMedianBin"], statistics.faceMedianBin);
@@ -56,14 +55,14 @@ TEST(Info, GivesTheEnginesNumbersToNineDigits) {
 TEST(Info, HasNoFaceMedianWithoutFaces) {
   const TemporaryFolder folder;
   const Finished run = quenby({"info", "--json", folder.write("a.jpg", smallJpeg())});
-  EXPECT_EQ(nlohmann::json::parse(run.output)["faceMedianBin"], -1);
+  EXPECT_EQ(parsedJson(run.output)["faceMedianBin"], -1);
 }
 
 TEST(Info, TellsWhatTheFileSays) {
   const TemporaryFolder folder;
   const Bytes exif = exifPayload({6, "2024:05:01 12:30:45", "25", "+02:00"}, false);
   const std::string in = folder.write("a.jpg", jpegOf(photoLikePicture(48, 32, 1), {{0xE1, exif}}));
-  const nlohmann::json info = nlohmann::json::parse(quenby({"info", "--json", in}).output);
+  const nlohmann::json info = parsedJson(quenby({"info", "--json", in}).output);
   EXPECT_EQ(info["file"], in);
   EXPECT_EQ(info["storedWidth"], 48);
   EXPECT_EQ(info["storedHeight"], 32);
@@ -97,7 +96,7 @@ TEST(Info, TakesSeveralFilesAndFolders) {
   folder.write("in/c.jpg", smallJpeg(2));
   const Finished run = quenby({"info", "--json", "-r", folder / "in", "-j", "2"});
   EXPECT_EQ(run.exitCode, 1);
-  const nlohmann::json info = nlohmann::json::parse(run.output);
+  const nlohmann::json info = parsedJson(run.output);
   ASSERT_EQ(info.size(), 3u);
   EXPECT_EQ(info[0]["file"], folder / "in/a.jpg");
   EXPECT_TRUE(info[1].contains("error"));

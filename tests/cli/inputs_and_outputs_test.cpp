@@ -1,8 +1,7 @@
 #include <gmock/gmock.h>
 
-#include <nlohmann/json.hpp>
-
 #include "tests/cli/jpeg_files.h"
+#include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 
 namespace pelorin::test_support {
@@ -223,7 +222,7 @@ TEST(Plan, IsPrintedAndNothingIsDone) {
                             " (exists: skipped without --overwrite)\n" + b + " -> " +
                             folder / "out/sub/b_PassThrough.jpg" + "\n");
   const Finished json = enhance({"-r", folder / "in", "-o", folder / "out", "-n", "--json"});
-  const nlohmann::json plan = nlohmann::json::parse(json.output);
+  const nlohmann::json plan = parsedJson(json.output);
   EXPECT_EQ(plan[0]["status"], "exists");
   EXPECT_EQ(plan[1]["status"], "planned");
   EXPECT_EQ(folder.content(), before);

@@ -4,13 +4,13 @@
 #include <cstdlib>
 #include <functional>
 #include <memory>
-#include <nlohmann/json.hpp>
 
 #include "cli/common/turn.h"
 #include "cli/pictures/png_file.h"
 #include "image_processing/features/brief.h"
 #include "image_processing/features/fast.h"
 #include "tests/cli/jpeg_files.h"
+#include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/support/pictures.h"
 
@@ -143,7 +143,7 @@ TEST_F(Keypoints, HaveTheEnginesDescriptorsWhereTheyHaveOne) {
       picture, 9, 20, true, [&](const xy& corner) { return hexBehind(descriptors, corner); });
   EXPECT_EQ(onRaw(picture, {"--text", "--brief"}).output, expected);
 
-  const nlohmann::json json = nlohmann::json::parse(onRaw(picture, {"--json", "--brief"}).output);
+  const nlohmann::json json = parsedJson(onRaw(picture, {"--json", "--brief"}).output);
   std::string fromJson;
   std::size_t described = 0;
   for (const auto& corner : json["corners"]) {
@@ -176,7 +176,7 @@ TEST_F(Keypoints, AreDescribedForEveryKindOfCorner) {
 }
 
 TEST_F(Keypoints, SayAsJsonHowTheyWereFound) {
-  const nlohmann::json json = nlohmann::json::parse(
+  const nlohmann::json json = parsedJson(
       onRaw(picture, {"--json", "--n", "10", "--threshold", "7", "--no-suppression"}).output);
   EXPECT_EQ(json["file"], folder / "in.rgba");
   EXPECT_EQ(json["width"], 173);

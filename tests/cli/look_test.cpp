@@ -1,11 +1,11 @@
 #include <gmock/gmock.h>
 
 #include <algorithm>
-#include <nlohmann/json.hpp>
 
 #include "image_processing/filters/default_filter_factory.h"
 #include "tests/cli/filtered_directly.h"
 #include "tests/cli/jpeg_files.h"
+#include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/support/pictures.h"
 
@@ -118,7 +118,7 @@ TEST(LookVerb, PlansAndReports) {
   EXPECT_THAT(folder.content(), ElementsAre("a.jpg"));
   const Finished run = quenby(
       {"look", "snow", in, "-o", folder / "b.jpg", "--json", "--mask-radius", "2", "--r", "0,1"});
-  const auto report = nlohmann::json::parse(run.output);
+  const auto report = parsedJson(run.output);
   EXPECT_EQ(report.at("status"), "done");
   EXPECT_EQ(report.at("filter"), "ZebraBW");
   EXPECT_EQ(report.at("params"), "maskRadius=2;r=0,1,;");

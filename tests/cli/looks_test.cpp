@@ -1,9 +1,9 @@
 #include <gmock/gmock.h>
 
-#include <nlohmann/json.hpp>
 #include <sstream>
 
 #include "image_processing/filters/default_filter_factory.h"
+#include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 
 namespace pelorin::test_support {
@@ -31,7 +31,7 @@ TEST(LooksVerb, ListsEveryLookInALine) {
 }
 
 TEST(LooksVerb, ListsThemAsJson) {
-  const auto list = nlohmann::json::parse(quenby({"looks", "--json"}).output);
+  const auto list = parsedJson(quenby({"looks", "--json"}).output);
   ASSERT_EQ(list.size(), 10u);
   EXPECT_EQ(
       list[9],
@@ -42,7 +42,7 @@ TEST(LooksVerb, ListsThemAsJson) {
   for (const nlohmann::json& look : list) {
     std::string line;
     ASSERT_TRUE(std::getline(lines, line));
-    EXPECT_EQ(nlohmann::json::parse(line), look);
+    EXPECT_EQ(parsedJson(line), look);
   }
 }
 

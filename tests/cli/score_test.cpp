@@ -1,13 +1,13 @@
 #include <gmock/gmock.h>
 
 #include <cstdio>
-#include <nlohmann/json.hpp>
 
 #include "cli/common/number_text.h"
 #include "cli/common/turn.h"
 #include "cli/pictures/png_file.h"
 #include "image_processing/quality/niqe.h"
 #include "tests/cli/jpeg_files.h"
+#include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/support/pictures.h"
 
@@ -34,7 +34,7 @@ std::string nineDigitText(float value) {
 }
 
 nlohmann::json parsed(const Finished& run) {
-  return nlohmann::json::parse(run.output);
+  return parsedJson(run.output);
 }
 
 long linesIn(const std::string& text) {

@@ -1,12 +1,11 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <nlohmann/json.hpp>
-
 #include "cli/pictures/area_average.h"
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/filtered_image.h"
 #include "tests/cli/jpeg_files.h"
+#include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/support/pictures.h"
 
@@ -176,7 +175,7 @@ TEST_F(SheetVerb, ShowsAnEmptyRowForABadFileAndSaysSo) {
   EXPECT_THAT(finished.errors, HasSubstr("quenby sheet: " + inputs[0] + ": "));
   EXPECT_THAT(finished.errors, HasSubstr("quenby sheet: " + inputs[1] + ": "));
   EXPECT_EQ(std::count(finished.errors.begin(), finished.errors.end(), '\n'), 2);
-  const auto json = nlohmann::json::parse(finished.output);
+  const auto json = parsedJson(finished.output);
   EXPECT_EQ(json.at("photos").at(0).at("status"), "failed");
   EXPECT_EQ(json.at("photos").at(2).at("status"), "done");
   EXPECT_EQ(json.at("height"), sheet().height);
@@ -233,7 +232,7 @@ TEST_F(SheetVerb, KeepsAnOldSheetUnlessTold) {
 TEST_F(SheetVerb, IsOnlyPlannedOnRequest) {
   const std::string input = folder.write("a.jpg", smallJpeg());
   EXPECT_EQ(run({input}, {"-n"}).output, input + " -> " + (folder / "sheet.jpg") + "\n");
-  EXPECT_EQ(nlohmann::json::parse(run({input}, {"-n", "--json"}).output).at("status"), "planned");
+  EXPECT_EQ(parsedJson(run({input}, {"-n", "--json"}).output).at("status"), "planned");
   EXPECT_THAT(folder.content(), UnorderedElementsAre("a.jpg"));
 }
 

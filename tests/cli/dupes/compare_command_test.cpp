@@ -2,11 +2,10 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <nlohmann/json.hpp>
-
 #include "image_processing/dupe/cdf_distance.h"
 #include "image_processing/dupe/dupe_score.h"
 #include "tests/cli/dupes/photo_library_files.h"
+#include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 
 namespace pelorin::test_support {
@@ -35,7 +34,7 @@ Json compare(std::vector<std::string> arguments) {
   arguments.push_back("--json");
   const Finished run = quenby(arguments);
   EXPECT_EQ(run.exitCode, 0) << run.errors;
-  return Json::parse(run.output);
+  return parsedJson(run.output);
 }
 
 TEST(SceneShots, DifferBetweenScenesAndHardlyWithinOne) {

@@ -7,13 +7,13 @@
 #include <chrono>
 #include <filesystem>
 #include <fstream>
-#include <nlohmann/json.hpp>
 #include <sstream>
 #include <thread>
 
 #include "cli/dupes/photo_record.h"
 #include "image_processing/dupe/dupe_score.h"
 #include "tests/cli/dupes/photo_library_files.h"
+#include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/support/pictures.h"
 
@@ -57,7 +57,7 @@ class Holiday {
     arguments.push_back("--json");
     const Finished run = dupes(arguments);
     EXPECT_EQ(run.exitCode, exitCode) << run.errors;
-    return Json::parse(run.output);
+    return parsedJson(run.output);
   }
 
   TemporaryFolder folder;
@@ -409,7 +409,7 @@ TEST(DupesCommand, RanksByTheScoreOfTheFullSizeUprightPicture) {
     for (const Json& ranked : rankingOf(holiday, report, name)) {
       const bool alone = nameIn(holiday, ranked["file"]) == "burst/large.jpg";
       const Json score =
-          Json::parse(quenby({"score", ranked["file"].get<std::string>(), "--json"}).output);
+          parsedJson(quenby({"score", ranked["file"].get<std::string>(), "--json"}).output);
       EXPECT_EQ(ranked["niqe"], alone ? Json() : score["score"]) << ranked;
     }
   }
@@ -426,7 +426,7 @@ TEST(DupesCommand, PrintsOneGroupALineForJsonLines) {
   std::istringstream lines(run.output);
   int groups = 0, failed = 0;
   for (std::string line; std::getline(lines, line);) {
-    const Json object = Json::parse(line);
+    const Json object = parsedJson(line);
     groups += object.contains("photos");
     failed += object.contains("error");
   }
@@ -478,7 +478,7 @@ TEST(DupesCommand, TakesAPhotoFromStandardInput) {
   const Finished run = quenby({"dupes", "-", holiday.folder / "untimed/a.jpg", "--json"},
                               holiday.folder.read("untimed/b.jpg"));
   EXPECT_EQ(run.exitCode, 0) << run.errors;
-  EXPECT_EQ(Json::parse(run.output)["groups"].size(), 1u);
+  EXPECT_EQ(parsedJson(run.output)["groups"].size(), 1u);
 }
 
 TEST(DupesCommand, HasNothingToDoInAFolderWithoutPhotos) {
