@@ -1,80 +1,15 @@
-#include <jerror.h>
-
 #include <algorithm>
 #include <array>
-#include <new>
 #include <string>
 #include <string_view>
 
 #include "platform/pn_imgproc/jpeg_codec.h"
-#include "platform/pn_imgproc/libjpeg_errors.h"
+#include "platform/pn_imgproc/libjpeg_writer.h"
 
 namespace pelorin::imgproc {
 namespace {
 
 constexpr std::size_t longestPayload = 65533;
-
-class LibjpegWriter {
- public:
-  LibjpegWriter() {
-    codec_.err = errors_.manager();
-    try {
-      run([this] { jpeg_create_compress(&codec_); });
-    } catch (...) {
-      jpeg_destroy_compress(&codec_);  // half of it may be there
-      throw;
-    }
-  }
-  ~LibjpegWriter() { jpeg_destroy_compress(&codec_); }
-  LibjpegWriter(const LibjpegWriter&) = delete;
-  LibjpegWriter& operator=(const LibjpegWriter&) = delete;
-
-  jpeg_compress_struct& codec() { return codec_; }
-
-  template <typename Body>
-  void run(const Body& body) {
-    errors_.run(body);
-  }
-
- private:
-  LibjpegErrors errors_;
-  jpeg_compress_struct codec_ = {};
-};
-
-// Lets libjpeg write into a vector that doubles when it is full.
-struct VectorDestination {
-  jpeg_destination_mgr base;  // first, so that libjpeg's pointer to it is one to the whole
-  std::vector<std::uint8_t>* bytes;
-  std::size_t firstSize;
-
-  static VectorDestination& of(j_compress_ptr codec) {
-    return *reinterpret_cast<VectorDestination*>(codec->dest);
-  }
-
-  bool grow() {
-    const std::size_t used = bytes->size();
-    try {
-      bytes->resize(std::max(firstSize, used * 2));
-    } catch (const std::exception&) {  // bad_alloc or length_error; neither may cross libjpeg
-      return false;
-    }
-    base.next_output_byte = bytes->data() + used;
-    base.free_in_buffer = bytes->size() - used;
-    return true;
-  }
-
-  static void begin(j_compress_ptr codec) {
-    if (!of(codec).grow()) ERREXIT1(codec, JERR_OUT_OF_MEMORY, 0);
-  }
-  static boolean makeRoom(j_compress_ptr codec) {
-    begin(codec);
-    return TRUE;
-  }
-  static void end(j_compress_ptr codec) {
-    VectorDestination& self = of(codec);
-    self.bytes->resize(self.bytes->size() - self.base.free_in_buffer);
-  }
-};
 
 bool startsWith(const MetadataSegment& segment, std::uint8_t marker, std::string_view name) {
   return segment.marker == marker && segment.payload.size() >= name.size() &&
@@ -120,17 +55,8 @@ std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t wid
   }
   for (const MetadataSegment& segment : metadata) checkSegment(segment);
 
-  std::vector<std::uint8_t> file;
-  LibjpegWriter writer;
+  LibjpegWriter writer(65536 + std::size_t{width} * height / 4);  // most photos fit at once
   jpeg_compress_struct& codec = writer.codec();
-  VectorDestination destination = {};
-  destination.base.init_destination = VectorDestination::begin;
-  destination.base.empty_output_buffer = VectorDestination::makeRoom;
-  destination.base.term_destination = VectorDestination::end;
-  destination.bytes = &file;
-  destination.firstSize = 65536 + std::size_t{width} * height / 4;  // most photos fit at once
-  codec.dest = &destination.base;
-
   writer.run([&] {
     codec.image_width = width;
     codec.image_height = height;
@@ -147,7 +73,7 @@ std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t wid
     writeRows(codec, rgba);
     jpeg_finish_compress(&codec);
   });
-  return file;
+  return writer.takeFile();
 }
 
 }  // namespace pelorin::imgproc

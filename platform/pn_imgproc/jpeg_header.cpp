@@ -16,8 +16,7 @@ bool isAdobe(const jpeg_marker_struct& segment) {
 
 JpegHeader readJpegHeader(std::span<const std::uint8_t> file) {
   LibjpegReader reader(file);
-  reader.keepSegments(JPEG_COM);
-  for (int n = 0; n < 16; ++n) reader.keepSegments(JPEG_APP0 + n);
+  reader.keepAllSegments();
   reader.readHeader();
 
   const jpeg_decompress_struct& codec = reader.codec();

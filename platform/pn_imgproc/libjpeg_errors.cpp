@@ -40,6 +40,9 @@ std::string explain(int code, std::string_view message) {
       return "unsupported: only 8 bits a sample can be read";
     case JERR_SOF_UNSUPPORTED:
       return "unsupported: neither a baseline nor a progressive JPEG file";
+    case JERR_BAD_MCU_SIZE:
+    case JERR_MISMATCHED_QUANT_TABLE:
+      return "unsupported: " + std::string(message);
     default:
       break;
   }

@@ -19,6 +19,11 @@ void LibjpegReader::keepSegments(int marker) {
   run([this, marker] { jpeg_save_markers(&codec_, marker, wholeSegment); });
 }
 
+void LibjpegReader::keepAllSegments() {
+  keepSegments(JPEG_COM);
+  for (int n = 0; n < 16; ++n) keepSegments(JPEG_APP0 + n);
+}
+
 void LibjpegReader::readHeader() {
   run([this] {
     jpeg_mem_src(&codec_, file_.data(), file_.size());

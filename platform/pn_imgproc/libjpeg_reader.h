@@ -27,6 +27,9 @@ class LibjpegReader {
   /// Keeps the segments of `marker` in the codec's `marker_list`; before readHeader.
   void keepSegments(int marker);
 
+  /// Keeps every APPn and COM segment; before readHeader.
+  void keepAllSegments();
+
   /// Reads up to the picture data.
   void readHeader();
 
