@@ -24,16 +24,16 @@ using image_processing::RGBA8Pixel;
 namespace {
 
 void copyToBitmap(JNIEnv* env, const Image<RGBA8Pixel>& image, jobject bitmap) {
+  const BitmapPixelsLock lock(env, bitmap);
+  if (lock.pixels() == nullptr) {
+    pn_printLog(logError, logTag, "AndroidBitmap_lockPixels failed");
+    return;
+  }
   AndroidBitmapInfo info;
   if (!queryBitmap(env, bitmap, info)) return;
   if (info.width < image.width || info.height < image.height) {
     pn_printLog(logError, logTag, "the output bitmap [%u, %u] is smaller than the photo [%u, %u]",
                 info.width, info.height, image.width, image.height);
-    return;
-  }
-  const BitmapPixelsLock lock(env, bitmap);
-  if (lock.pixels() == nullptr) {
-    pn_printLog(logError, logTag, "AndroidBitmap_lockPixels failed");
     return;
   }
   const std::size_t rowBytes = image.width * sizeof(RGBA8Pixel);

@@ -254,7 +254,12 @@ TEST_F(EnhancementNatives, WriteNothingIntoAnotherFormatOrALockedOutBitmap) {
   natives.apply(handle, output.reference(), passThrough, empty);
   EXPECT_THAT(takeLogLines(), ElementsAre("6 QuenbyLib: AndroidBitmap_lockPixels failed"));
   natives.apply(handle, nullptr, passThrough, empty);
-  EXPECT_THAT(takeLogLines(), ElementsAre("6 QuenbyLib: AndroidBitmap_getInfo failed: -1"));
+  EXPECT_THAT(takeLogLines(), ElementsAre("6 QuenbyLib: AndroidBitmap_lockPixels failed"));
+  output.lockResult = 0;
+  output.infoResult = -3;
+  natives.apply(handle, output.reference(), passThrough, empty);
+  EXPECT_THAT(takeLogLines(), ElementsAre("6 QuenbyLib: AndroidBitmap_getInfo failed: -3"));
+  EXPECT_EQ(output.locks, 0);
   EXPECT_EQ(output.bytes, FakeBitmap(64, 48).bytes);
   natives.release(handle);
 }

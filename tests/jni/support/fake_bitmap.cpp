@@ -53,6 +53,7 @@ int AndroidBitmap_lockPixels(JNIEnv* env, jobject bitmap, void** pixels) {
   environmentOf(env).checkNothingPending("AndroidBitmap_lockPixels");
   // A result that nobody may look at: the call fails.
   *pixels = reinterpret_cast<void*>(0xBAD);
+  if (bitmap == nullptr) return ANDROID_BITMAP_RESULT_BAD_PARAMETER;
   if (environmentOf(env).shouldFail("AndroidBitmap_lockPixels"))
     return ANDROID_BITMAP_RESULT_JNI_EXCEPTION;
   if (bitmapOf(bitmap)->lockResult != 0) return bitmapOf(bitmap)->lockResult;
