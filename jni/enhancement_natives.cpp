@@ -1,5 +1,6 @@
 #include <new>
 #include <string>
+#include <utility>
 
 #include "image_processing/filters/default_filter_factory.h"
 #include "jni/add_faceboxes.h"
@@ -85,11 +86,12 @@ void applyAutoEnhanceFilter(JNIEnv* env, jobject, jlong handle, jobject outBitma
   }
   try {
     const Image<RGBA8Pixel>& photo = *session->image;
-    Image<RGBA8Pixel> output(photo.width, photo.height);
+    Image<RGBA8Pixel> output = session->takeOutput();
     const std::string name = toString(env, filterName);
     const std::string parameters = toString(env, params);
     filterOrCopy(*filteredImage, photo, name, parameters, output);
     copyToBitmap(env, output, outBitmap);
+    session->giveOutputBack(std::move(output));
   } catch (const std::bad_alloc&) {
     throwOutOfMemoryError(env, "QuenbyLib real-time filtering ran out of memory");
   }

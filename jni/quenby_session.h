@@ -29,11 +29,29 @@ class QuenbySession {
     filteredImage_.swap(replacement);
   }
 
+  /// A picture of the photo's size with any content, the caller's own until it is given back.
+  /// @throws std::bad_alloc when there is no spare one and no memory for another.
+  image_processing::Image<image_processing::RGBA8Pixel> takeOutput() {
+    std::shared_ptr<image_processing::RGBA8Pixel> spare;
+    {
+      const std::lock_guard lock(mutex_);
+      spare.swap(spareOutput_);
+    }
+    return {image->width, image->height, std::move(spare)};
+  }
+
+  /// Keeps one picture for the next call: the pages of a new one cost more than a copy of it.
+  void giveOutputBack(image_processing::Image<image_processing::RGBA8Pixel> output) {
+    const std::lock_guard lock(mutex_);
+    spareOutput_.swap(output.data);
+  }
+
   std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> image;
 
  private:
   std::shared_ptr<image_processing::FilteredImage> filteredImage_;
-  mutable std::mutex mutex_;  // guards filteredImage_
+  std::shared_ptr<image_processing::RGBA8Pixel> spareOutput_;
+  mutable std::mutex mutex_;  // guards both
 };
 
 }  // namespace pelorin::quenby

@@ -1,10 +1,12 @@
 #include <benchmark/benchmark.h>
+#include <hwy/targets.h>
 #include <jni.h>
 
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
 #include <string>
+#include <vector>
 
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/filtered_image.h"
@@ -119,13 +121,18 @@ void oneCallDirect(benchmark::State& state) {
 }
 BENCHMARK(oneCallDirect)->Unit(benchmark::kMicrosecond);
 
+// One call after the other, each with the next of `parameters`.
 void applyLoop(benchmark::State& state, const JavaSide& java, const char* filter,
-               const char* parameters) {
-  const jstring name = java.env->NewStringUTF(filter), params = java.env->NewStringUTF(parameters);
+               const std::vector<const char*>& parameters) {
+  const jstring name = java.env->NewStringUTF(filter);
+  std::vector<jstring> params;
+  for (const char* text : parameters) params.push_back(java.env->NewStringUTF(text));
+  std::size_t next = 0;
   const jlong handle = java.open();
   java.env->CallVoidMethod(java.engine, java.preprocess, nullptr, handle);
   const auto call = [&] {
-    java.env->CallVoidMethod(java.engine, java.apply, handle, java.output, name, params);
+    java.env->CallVoidMethod(java.engine, java.apply, handle, java.output, name,
+                             params[next++ % params.size()]);
     java.check();
   };
   call();  // prepares the filter
@@ -134,7 +141,7 @@ void applyLoop(benchmark::State& state, const JavaSide& java, const char* filter
 }
 
 void oneCallThroughJava(benchmark::State& state) {
-  applyLoop(state, JavaSide(1, 1), "PassThrough", "");
+  applyLoop(state, JavaSide(1, 1), "PassThrough", {""});
 }
 BENCHMARK(oneCallThroughJava)->Unit(benchmark::kMicrosecond);
 
@@ -156,9 +163,26 @@ void init(benchmark::State& state) {
 BENCHMARK(init)->ArgName("megapixels")->Arg(2)->Arg(12)->Unit(benchmark::kMillisecond);
 
 void applyThroughJava(benchmark::State& state) {
-  applyLoop(state, JavaSide(sizeOf(state).width, sizeOf(state).height), "AE0", "slider=0.4;");
+  applyLoop(state, JavaSide(sizeOf(state).width, sizeOf(state).height), "AE0", {"slider=0.4;"});
 }
 BENCHMARK(applyThroughJava)->ArgName("megapixels")->Arg(2)->Arg(12)->Unit(benchmark::kMillisecond);
+
+// A slider on its way, in pictures a second; on request as on a machine without AVX-512.
+void sliderThroughJava(benchmark::State& state) {
+  const bool avx512 = state.range(1) != 0;
+  if (!avx512) hwy::SetSupportedTargetsForTest(hwy::SupportedTargets() & ~(HWY_AVX2 - 1));
+  applyLoop(state, JavaSide(sizeOf(state).width, sizeOf(state).height), "AE0",
+            {"slider=0.1;", "slider=0.2;", "slider=0.3;", "slider=0.4;", "slider=0.5;",
+             "slider=0.6;", "slider=0.7;", "slider=0.8;"});
+  hwy::SetSupportedTargetsForTest(0);
+  state.counters["pictures/s"] =
+      benchmark::Counter(1, benchmark::Counter::kIsIterationInvariantRate);
+}
+BENCHMARK(sliderThroughJava)
+    ->ArgNames({"megapixels", "avx512"})
+    ->ArgsProduct({{2, 12}, {0, 1}})
+    ->UseRealTime()
+    ->Unit(benchmark::kMillisecond);
 
 void applyDirect(benchmark::State& state) {
   const auto [width, height] = sizeOf(state);
@@ -166,8 +190,8 @@ void applyDirect(benchmark::State& state) {
       std::make_shared<Image<RGBA8Pixel>>(test_support::photoLikePicture(width, height, 1));
   FilteredImage session(photo, ImageMetadata{}, "", defaultFilterConfigValue,
                         DefaultFilterFactory::filterFactory());
+  Image<RGBA8Pixel> output(photo->width, photo->height);
   const auto call = [&] {
-    Image<RGBA8Pixel> output(photo->width, photo->height);
     session.applyFilterWithParams("AE0", "slider=0.4;", defaultFilterConfigValue, output);
     benchmark::DoNotOptimize(output.data.get());
   };

@@ -108,6 +108,28 @@ TEST_F(EnhancementNatives, GiveTheEnginesBytesForEveryFilter) {
   natives.release(handle);
 }
 
+TEST_F(EnhancementNatives, ReuseTheOutputOfTheLastCallWhateverIsInIt) {
+  const jlong handle = open(photo);
+  const auto session = quenby::openSessions().find(handle);
+  std::vector<std::string> names = filterNames();
+  names.push_back("NoSuchFilter");
+  for (const std::string& name : names) {
+    Image<RGBA8Pixel> spare(64, 48);
+    const RGBA8Pixel* const address = spare.data.get();
+    spare.set({0xAB, 0xAB, 0xAB, 0xAB});
+    session->giveOutputBack(std::move(spare));
+    FakeString filter(name), params("slider=0.7;s1=0.4;s2=0.6;s3=0.5;s4=0.55;");
+    natives.apply(handle, output.reference(), filter, params);
+    EXPECT_EQ(output.packed(),
+              name == "NoSuchFilter" ? bytesOf(picture) : engineResult(picture, name, params.text));
+    const Image<RGBA8Pixel> used = session->takeOutput();
+    EXPECT_EQ(used.data.get(), address) << name;
+    EXPECT_EQ(bytesOf(used), output.packed()) << name;
+    EXPECT_NE(session->takeOutput().data.get(), address) << "two callers share an output";
+  }
+  natives.release(handle);
+}
+
 TEST_F(EnhancementNatives, LogFaceBoxesInPixels) {
   FakeBitmap large(400, 300);
   const jlong handle = natives.init(large.reference());
