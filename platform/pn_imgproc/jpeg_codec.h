@@ -82,8 +82,8 @@ std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t wid
                                      std::span<const MetadataSegment> metadata = {});
 
 /// Turns a JPEG file clockwise without decoding its blocks. Partial blocks that cannot be moved are
-/// trimmed from the edge; a direction that has no whole block is not reversed. A progressive file
-/// stays one. APPn and COM segments are kept byte for byte.
+/// trimmed from the edge; where that would leave nothing, the picture is decoded and encoded again
+/// at quality 100. A progressive file stays one. APPn and COM segments are kept byte for byte.
 /// @param degrees  a multiple of 90, taken modulo 360; 0 gives the bytes of `file`.
 /// @throws JpegError for other angles and for what decodeJpeg refuses.
 std::vector<std::uint8_t> rotateJpeg(std::span<const std::uint8_t> file, int degrees,

@@ -1,23 +1,16 @@
 #include <algorithm>
 #include <array>
 #include <numeric>
-#include <span>
 #include <string>
-#include <utility>
 
 #include "platform/pn_imgproc/jpeg_codec.h"
 #include "platform/pn_imgproc/jpeg_limits.h"
+#include "platform/pn_imgproc/jpeg_turn.h"
 #include "platform/pn_imgproc/libjpeg_reader.h"
 #include "platform/pn_imgproc/libjpeg_writer.h"
 
 namespace pelorin::imgproc {
 namespace {
-
-/// What becomes of a picture: the order of its rows and of its columns is reversed, then they are
-/// exchanged.
-struct Turn {
-  bool reversesRows, reversesColumns, swapsAxes;
-};
 
 Turn turnBy(int degrees) {
   switch ((degrees % 360 + 360) % 360) {
@@ -61,48 +54,34 @@ struct BlockTurn {
   std::array<int, DCTSIZE2> source, sign;
 };
 
-std::span<jpeg_component_info> channelsOf(jpeg_compress_struct& codec) {
-  return {codec.comp_info, static_cast<std::size_t>(codec.num_components)};
-}
-
-// Only the ratio of sampling factors tells anything, and the smaller they are, the less is trimmed.
-void reduceSampling(jpeg_compress_struct& codec) {
-  int across = 0, down = 0;
-  for (const jpeg_component_info& channel : channelsOf(codec)) {
-    across = std::gcd(across, channel.h_samp_factor);
-    down = std::gcd(down, channel.v_samp_factor);
+/// Sampling factors of all channels: what they have in common, which tells nothing, and the largest
+/// without that, which is the size, in blocks, of a unit that is whole in every channel.
+struct Sampling {
+  explicit Sampling(const jpeg_decompress_struct& codec) {
+    for (int i = 0; i < codec.num_components; ++i) {
+      commonAcross = std::gcd(commonAcross, codec.comp_info[i].h_samp_factor);
+      commonDown = std::gcd(commonDown, codec.comp_info[i].v_samp_factor);
+    }
+    unitWidth = static_cast<JDIMENSION>(codec.max_h_samp_factor / commonAcross) * DCTSIZE;
+    unitHeight = static_cast<JDIMENSION>(codec.max_v_samp_factor / commonDown) * DCTSIZE;
   }
-  for (jpeg_component_info& channel : channelsOf(codec)) {
-    channel.h_samp_factor /= across;
-    channel.v_samp_factor /= down;
+
+  int commonAcross = 0, commonDown = 0;
+  JDIMENSION unitWidth, unitHeight;
+};
+
+// From the parameters of the picture as it was to those of the turned one. The last unit comes
+// first in a reversed direction, and there it has to be whole.
+void turnParameters(jpeg_compress_struct& codec, const Sampling& sampling, const Turn& turn) {
+  if (turn.reversesColumns) codec.image_width -= codec.image_width % sampling.unitWidth;
+  if (turn.reversesRows) codec.image_height -= codec.image_height % sampling.unitHeight;
+  if (turn.swapsAxes) std::swap(codec.image_width, codec.image_height);
+  for (int i = 0; i < codec.num_components; ++i) {
+    jpeg_component_info& channel = codec.comp_info[i];
+    channel.h_samp_factor /= sampling.commonAcross;
+    channel.v_samp_factor /= sampling.commonDown;
+    if (turn.swapsAxes) std::swap(channel.h_samp_factor, channel.v_samp_factor);
   }
-}
-
-// The last block comes first in a reversed direction, where it has to be whole in every channel.
-void trim(JDIMENSION& side, bool& reverses, int samplingFactor) {
-  const JDIMENSION unit = DCTSIZE * static_cast<JDIMENSION>(samplingFactor);
-  const JDIMENSION whole = side / unit * unit;
-  reverses = reverses && whole > 0;
-  if (reverses) side = whole;
-}
-
-// From the parameters of the picture as it was to those of the turned one.
-void turnParameters(jpeg_compress_struct& codec, Turn& turn) {
-  reduceSampling(codec);
-  int across = 1, down = 1;
-  for (const jpeg_component_info& channel : channelsOf(codec)) {
-    across = std::max(across, channel.h_samp_factor);
-    down = std::max(down, channel.v_samp_factor);
-  }
-  trim(codec.image_width, turn.reversesColumns, across);
-  trim(codec.image_height, turn.reversesRows, down);
-  if (!turn.swapsAxes) return;
-  std::swap(codec.image_width, codec.image_height);
-  for (jpeg_component_info& channel : channelsOf(codec))
-    std::swap(channel.h_samp_factor, channel.v_samp_factor);
-}
-
-void turnTables(jpeg_compress_struct& codec, const Turn& turn) {
   const BlockTurn turnBlock(turn);
   for (JQUANT_TBL* table : codec.quant_tbl_ptrs) {
     if (table != nullptr) turnBlock(*table);
@@ -138,11 +117,8 @@ void turnBlocks(jpeg_decompress_struct& source, jvirt_barray_ptr before,
   for (JDIMENSION y = 0; y < channel.height_in_blocks; ++y) {
     const JBLOCKROW turned = blockRow(target, after, y, true);
     for (JDIMENSION x = 0; x < channel.width_in_blocks; ++x) {
-      JDIMENSION row = y, column = x;
-      if (turn.swapsAxes) std::swap(row, column);
-      if (turn.reversesRows) row = rows - 1 - row;
-      if (turn.reversesColumns) column = columns - 1 - column;
-      turnBlock(blockRow(source, before, row, false)[column], turned[x]);
+      const Place from = turn.sourceOf({y, x}, rows, columns);
+      turnBlock(blockRow(source, before, from.row, false)[from.column], turned[x]);
     }
   }
 }
@@ -151,7 +127,7 @@ void turnBlocks(jpeg_decompress_struct& source, jvirt_barray_ptr before,
 
 std::vector<std::uint8_t> rotateJpeg(std::span<const std::uint8_t> file, int degrees,
                                      const DecodeLimits& limits) {
-  Turn turn = turnBy(degrees);
+  const Turn turn = turnBy(degrees);
   LibjpegReader reader(file);
   reader.keepAllSegments();
   reader.readHeader();
@@ -161,6 +137,10 @@ std::vector<std::uint8_t> rotateJpeg(std::span<const std::uint8_t> file, int deg
   reader.run([&] { before = jpeg_read_coefficients(&source); });
   reader.checkEveryChannelCame();
   if (degrees % 360 == 0) return {file.begin(), file.end()};
+  const Sampling sampling(source);
+  if ((turn.reversesColumns && source.image_width < sampling.unitWidth) ||
+      (turn.reversesRows && source.image_height < sampling.unitHeight))
+    return turnPixels(file, turn);
 
   LibjpegWriter writer(file.size());
   jpeg_compress_struct& target = writer.codec();
@@ -169,16 +149,13 @@ std::vector<std::uint8_t> rotateJpeg(std::span<const std::uint8_t> file, int deg
   reader.run([&] {
     writer.run([&] {
       jpeg_copy_critical_parameters(&source, &target);
-      turnParameters(target, turn);
-      turnTables(target, turn);
+      turnParameters(target, sampling, turn);
       for (int i = 0; i < target.num_components; ++i)
         after[i] = requestBlocks(target, target.comp_info[i], source.comp_info[i], turn);
       if (source.progressive_mode) jpeg_simple_progression(&target);
-      // They come with the other segments.
       target.write_JFIF_header = target.write_Adobe_marker = FALSE;
       jpeg_write_coefficients(&target, after.data());
-      for (auto segment = source.marker_list; segment != nullptr; segment = segment->next)
-        jpeg_write_marker(&target, segment->marker, segment->data, segment->data_length);
+      writer.copySegments(source);
       for (int i = 0; i < target.num_components; ++i)
         turnBlocks(source, before[i], target, after[i], target.comp_info[i], turn);
       jpeg_finish_compress(&target);

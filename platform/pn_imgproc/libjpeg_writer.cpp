@@ -21,6 +21,11 @@ LibjpegWriter::LibjpegWriter(std::size_t firstSize) : destination_{{}, {}, first
   codec_.dest = &destination_.base;
 }
 
+void LibjpegWriter::copySegments(const jpeg_decompress_struct& source) {
+  for (auto segment = source.marker_list; segment != nullptr; segment = segment->next)
+    jpeg_write_marker(&codec_, segment->marker, segment->data, segment->data_length);
+}
+
 bool LibjpegWriter::grow(Destination& destination) {
   const std::size_t used = destination.bytes.size();
   try {

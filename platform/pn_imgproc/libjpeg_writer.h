@@ -26,6 +26,10 @@ class LibjpegWriter {
     errors_.run(body);
   }
 
+  /// Writes the segments that a reader kept, JFIF and Adobe among them: libjpeg's own must be off.
+  /// Within `run`, before the picture data.
+  void copySegments(const jpeg_decompress_struct& source);
+
   /// What was written, once libjpeg has finished; empty afterwards.
   std::vector<std::uint8_t> takeFile() { return std::move(destination_.bytes); }
 

@@ -139,22 +139,41 @@ TEST(RotateJpeg, TrimsThePartialBlocksThatCannotMove) {
   EXPECT_EQ(sizeOf(rotateJpeg(file, 270)), (Size{21, 32}));
 }
 
-TEST(RotateJpeg, KeepsAPictureThatIsSmallerThanABlock) {
-  const Bytes file = makeJpeg({.width = 10, .height = 6});
-  EXPECT_EQ(sizeOf(rotateJpeg(file, 90)), (Size{6, 10}));
-  EXPECT_EQ(sizeOf(rotateJpeg(file, 180)), (Size{10, 6}));
-  EXPECT_EQ(sizeOf(rotateJpeg(makeJpeg({.width = 1, .height = 1}), 270)), (Size{1, 1}));
+TEST(RotateJpeg, CodesAPictureAnewOfWhichNothingCanBeMoved) {
+  for (JpegRecipe recipe : recipes()) {
+    for (const auto& [width, height] : {Size{10, 6}, {7, 90}, {90, 5}, {1, 1}}) {
+      recipe.width = width;
+      recipe.height = height;
+      const Bytes file = makeJpeg(recipe);
+      for (const int degrees : {90, 180, 270}) {
+        if (degrees == 90 ? height >= 8 : degrees == 270 && width >= 8) continue;
+        Pixels expected = upperLeftOf(decodeJpeg(file), {width, height});
+        for (int i = 0; i < degrees / 90; ++i) expected = turnedByQuarter(expected);
+        const DecodedPicture turned = decodeJpeg(rotateJpeg(file, degrees));
+        ASSERT_EQ((Size{turned.width, turned.height}), expected.size);
+        EXPECT_LT(test_support::meanDifference(turned.pixels.get(), expected.rgba.data(),
+                                               expected.rgba.size() / 4),
+                  1.0)
+            << width << " x " << height << ", " << degrees << " degrees";
+      }
+    }
+  }
 }
 
 TEST(RotateJpeg, KeepsMetadataByteForByte) {
   const std::vector<MetadataSegment> metadata = {
       {0xE1, {'x', 'm', 'p'}}, {0xED, Bytes(65533, 0xFF)}, {0xFE, {'c', 0}}};
-  const Bytes file = makeJpeg({.metadata = metadata, .profile = Bytes(100'000, 3)});
-  const JpegHeader before = readJpegHeader(file), after = readJpegHeader(rotateJpeg(file, 90));
-  ASSERT_EQ(after.metadata.size(), before.metadata.size());
-  for (std::size_t i = 0; i < after.metadata.size(); ++i) {
-    EXPECT_EQ(after.metadata[i].marker, before.metadata[i].marker);
-    EXPECT_EQ(after.metadata[i].payload, before.metadata[i].payload);
+  for (const Size& size : {Size{32, 24}, {5, 5}}) {
+    const Bytes file = makeJpeg({.width = size.first,
+                                 .height = size.second,
+                                 .metadata = metadata,
+                                 .profile = Bytes(100'000, 3)});
+    const JpegHeader before = readJpegHeader(file), after = readJpegHeader(rotateJpeg(file, 90));
+    ASSERT_EQ(after.metadata.size(), before.metadata.size());
+    for (std::size_t i = 0; i < after.metadata.size(); ++i) {
+      EXPECT_EQ(after.metadata[i].marker, before.metadata[i].marker);
+      EXPECT_EQ(after.metadata[i].payload, before.metadata[i].payload);
+    }
   }
 }
 
