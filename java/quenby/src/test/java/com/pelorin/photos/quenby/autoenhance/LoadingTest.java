@@ -14,6 +14,7 @@ import java.net.URLClassLoader;
 import java.nio.file.Files;
 import java.nio.file.Path;
 import java.util.ArrayList;
+import java.util.Arrays;
 import java.util.List;
 import java.util.stream.Collectors;
 import java.util.stream.Stream;
@@ -83,6 +84,19 @@ class LoadingTest {
     }
 
     @Test
+    void otherLibrariesInTheJarGetAFolderOfTheirOwn() throws Exception {
+        Path classes = folder.resolve("classes");
+        Path libraries = Files.createDirectories(classes.resolve(
+                "com/pelorin/photos/quenby/desktop/linux-" + System.getProperty("os.arch")));
+        byte[] library = Files.readAllBytes(Path.of(builtLibraries(), "libpn.so"));
+        Files.write(libraries.resolve("libpn.so"), Arrays.copyOf(library, library.length + 1));
+        String temporary = "-Djava.io.tmpdir=" + folder;
+        String other = load(temporary, "-cp", classes + File.pathSeparator + ChildJvm.classPath());
+        assertTrue(other.startsWith("works from " + folder), other);
+        assertNotEquals(load(temporary), other);
+    }
+
+    @Test
     void aCopyThatWasChangedIsReplaced() throws Exception {
         String[] options = {"-Djava.io.tmpdir=" + folder};
         String first = load(options);
@@ -112,19 +126,32 @@ class LoadingTest {
 
     @Test
     void aSecondClassLoaderWorksBesideTheFirst() throws Exception {
-        new QuenbyEngine();
-        List<URL> urls = new ArrayList<>();
-        for (String entry : ChildJvm.classPath().split(File.pathSeparator)) {
-            urls.add(Path.of(entry).toUri().toURL());
+        for (String option : List.of(
+                "-Djava.io.tmpdir=" + folder, "-Dquenby.library=" + builtLibraries())) {
+            ChildJvm child = ChildJvm.run(
+                    List.of(option, "-Duser.home=/no/such/home"), TwoLoaders.class);
+            assertEquals(0, child.exitCode, option + "\n" + child.output);
         }
-        try (URLClassLoader loader = new URLClassLoader(urls.toArray(new URL[0]),
-                ClassLoader.getPlatformClassLoader())) {
-            Class<?> other = loader.loadClass(Session.class.getName());
-            assertNotSame(Session.class, other);
-            var run = other.getDeclaredMethod("run");
-            run.setAccessible(true);
+    }
+
+    /** The natives in two class loaders, each with a RectF of its own. */
+    static final class TwoLoaders {
+        private TwoLoaders() {}
+
+        public static void main(String[] arguments) throws Exception {
+            List<URL> urls = new ArrayList<>();
+            for (String entry : ChildJvm.classPath().split(File.pathSeparator)) {
+                urls.add(Path.of(entry).toUri().toURL());
+            }
             String alone = Session.run();
-            assertEquals(alone, run.invoke(null));
+            try (URLClassLoader loader = new URLClassLoader(urls.toArray(new URL[0]),
+                    ClassLoader.getPlatformClassLoader())) {
+                Class<?> other = loader.loadClass(Session.class.getName());
+                assertNotSame(Session.class, other);
+                var run = other.getDeclaredMethod("run");
+                run.setAccessible(true);
+                assertEquals(alone, run.invoke(null));
+            }
             assertEquals(alone, Session.run());
         }
     }
