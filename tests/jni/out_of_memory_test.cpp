@@ -6,6 +6,7 @@
 #include "tests/jni/support/allocation_faults.h"
 #include "tests/jni/support/natives_fixture.h"
 #include "tests/jni/support/whole_run.h"
+#include "tests/support/pictures.h"
 
 namespace pelorin::test_support {
 namespace {
@@ -72,13 +73,13 @@ class OutOfMemory : public NativesTest {
     printf("%ld injected faults, %ld of them made up for\n", faults, unnoticed);
   }
 
-  void failEachAllocationOfTheFileCall(int rotation) {
+  void failEachAllocationOfTheFileCall(jstring input, int rotation) {
     const auto call = [&] {
-      return natives.applyToFile(run.input, run.file, rotation, run.faces, 1, run.filter,
-                                 run.params);
+      return natives.applyToFile(input, run.file, rotation, run.faces, 1, run.filter, run.params);
     };
     EXPECT_TRUE(call());
     const std::vector<std::uint8_t> expected = contentOf(run.file.text);
+    const std::vector<std::string> names = run.folder.names();
     bool decodingCanFail = false;
     failEachAllocation<bool>(
         call,
@@ -92,7 +93,7 @@ class OutOfMemory : public NativesTest {
     EXPECT_TRUE(decodingCanFail);
     EXPECT_TRUE(call());
     EXPECT_EQ(contentOf(run.file.text), expected);
-    EXPECT_EQ(run.folder.names(), (std::vector<std::string>{"in.jpg", "out.jpg"}));
+    EXPECT_EQ(run.folder.names(), names);
   }
 
   WholeRun run{natives};
@@ -176,11 +177,18 @@ TEST_F(OutOfMemory, InApplyAutoEnhanceFilterWithAPreparedFilter) {
 }
 
 TEST_F(OutOfMemory, InApplyAutoEnhanceFilterToJpegFile) {
-  failEachAllocationOfTheFileCall(0);
+  failEachAllocationOfTheFileCall(run.input, 0);
 }
 
 TEST_F(OutOfMemory, InApplyAutoEnhanceFilterToJpegFileTurned) {
-  failEachAllocationOfTheFileCall(90);
+  failEachAllocationOfTheFileCall(run.input, 90);
+}
+
+TEST_F(OutOfMemory, InApplyAutoEnhanceFilterToJpegFileTurnedByItsPixels) {
+  FakeString strip(run.folder.file("strip.jpg"));
+  writePicture(strip.text, photoLikePicture(40, 5, 3));
+  if (contentOf(strip.text)[0] == 'R') GTEST_SKIP() << "the tests' own codec knows no blocks";
+  failEachAllocationOfTheFileCall(strip, 90);
 }
 
 TEST_F(OutOfMemory, InSimilarityScore) {
