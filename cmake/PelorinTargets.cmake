@@ -43,6 +43,11 @@ function(pelorin_compile_quickly target)
   target_compile_options(${target} PRIVATE $<$<CONFIG:Release>:${level}>)
 endfunction()
 
+function(pelorin_compile_as_test target)
+  pelorin_compile_quickly(${target})
+  target_precompile_headers(${target} REUSE_FROM pelorin_test_headers)
+endfunction()
+
 # The shared libraries stand in one folder and find each other there, wherever it goes.
 function(pelorin_place_beside_each_other target)
   set_target_properties(
@@ -64,8 +69,7 @@ function(pelorin_test name)
   endif()
   add_executable(${name} ${arg_SOURCES})
   target_link_libraries(${name} PRIVATE ${arg_DEPENDS} pelorin_test_support GTest::gmock_main)
-  pelorin_compile_quickly(${name})
-  target_precompile_headers(${name} REUSE_FROM pelorin_test_headers)
+  pelorin_compile_as_test(${name})
   set(labels "")
   if(arg_THREADS)
     set(labels LABELS threads)
