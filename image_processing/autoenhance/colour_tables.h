@@ -16,10 +16,10 @@ struct ColourTables {
   Lab2xzTable labToXz{1000};
   Lab2yTable labToY{1000};
   Uint8_Gamma_sRGB_Table encode;
-  SuperQuadric skinA{-10.0f, 50.0f, 1024, 10.0f};           ///< How much a Lab a is a skin's.
-  SuperQuadric skinB{-10.0f, 60.0f, 1024, 10.0f};           ///< How much a Lab b is a skin's.
-  std::array<std::int32_t, 1024> codes = encode.widened();  ///< `encode`, as vectors gather it.
-  Power flatness{0.0f, 1.0f, 512, 1.5f};  ///< Shapes the share of flat neighbours.
+  SuperQuadric skinA{-10.0f, 50.0f, 1024, 10.0f};     ///< How much a Lab a is a skin's.
+  SuperQuadric skinB{-10.0f, 60.0f, 1024, 10.0f};     ///< How much a Lab b is a skin's.
+  std::array<float, 1024> codes = encode.asFloats();  ///< `encode`, as vectors gather it.
+  Power flatness{0.0f, 1.0f, 512, 1.5f};              ///< Shapes the share of flat neighbours.
 };
 
 /// The process's tables, built when the library is loaded and never written afterwards, so any

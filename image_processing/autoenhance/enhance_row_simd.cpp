@@ -5,172 +5,266 @@
 #include <hwy/foreach_target.h>  // compiles the rest of this file once per instruction set
 #include <hwy/highway.h>
 
+#include <algorithm>
+#include <bit>
+
 #include "image_processing/autoenhance/colour_tables.h"
+#include "image_processing/autoenhance/companding_steps.h"
+#include "image_processing/autoenhance/lab_simd.h"
+#include "image_processing/autoenhance/vibrance_simd.h"
+#include "image_processing/core/prefetch.h"
 #include "image_processing/core/simd.h"
+#include "image_processing/core/small_table.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace pelorin::image_processing::HWY_NAMESPACE {
 namespace {
 namespace hn = hwy::HWY_NAMESPACE;
-using Floats = hn::CappedTag<float, 16>;
+using lab::F;
+using lab::Floats;
+using lab::matrixRow;
+using lab::set;
+using simd::Divisor;
 using Ints = hn::RebindToSigned<Floats>;
-using F = hn::Vec<Floats>;
+using Words = hn::RebindToUnsigned<Floats>;
+using Bytes = hn::Rebind<std::uint8_t, Floats>;
 using I = hn::Vec<Ints>;
+using Quantized = QuantizedFloat<unsigned char>;
 
-HWY_INLINE F set(float value) {
-  return hn::Set(Floats(), value);
-}
 HWY_INLINE F toFloats(I ints) {
   return hn::ConvertTo(Floats(), ints);
 }
-
-/// Index of a table look-up: toward zero, held to the table. `place` is an ordinary number.
-HWY_INLINE I tableIndex(F place, float last) {
-  return hn::ConvertTo(Ints(), simd::clampTo(place, hn::Zero(Floats()), set(last)));
-}
-
 HWY_INLINE F lookUp(const float* table, I index) {
   return hn::GatherIndex(Floats(), table, index);
 }
 
-/// The flat arrays behind the process's tables.
-struct Tables {
-  const float* linear = colourTables().linear.data();
-  const float* xyzToLab = colourTables().xyzToLab.samples().data();
-  const float* labToXz = colourTables().labToXz.samples().data();
-  const float* labToY = colourTables().labToY.samples().data();
-  const std::int32_t* encode = colourTables().codes.data();
+// Pixels go through four stages in blocks. Each stage is short enough that a processor has several
+// vectors of it in flight, where the whole way would be one long chain; a function of its own
+// leaves each all registers for its constants. Stages ask for the memory they will meet two blocks
+// on.
+constexpr std::size_t blockPixels = 256;
+
+/// What the stages leave to each other of the pixels of one block.
+struct Block {
+  HWY_ALIGN std::int32_t xStep[blockPixels], yStep[blockPixels], zStep[blockPixels];
+  HWY_ALIGN float redness[blockPixels], yellowness[blockPixels];  // fx - fy, fy - fz by way of a, b
+  HWY_ALIGN float L[blockPixels];
+  HWY_ALIGN float r[blockPixels], g[blockPixels], b[blockPixels];
 };
 
-struct Colour {
-  F r, g, b;
-};
-
-HWY_INLINE F companded(const Tables& tables, const Colour& c, float r, float g, float b) {
-  F sum = hn::Mul(set(r), c.r);
-  sum = hn::Add(sum, hn::Mul(set(g), c.g));
-  sum = hn::Add(sum, hn::Mul(set(b), c.b));
-  return lookUp(tables.xyzToLab, tableIndex(hn::Mul(sum, set(9999.0f)), 9999.0f));
-}
-
-HWY_INLINE F encoded(const Tables& tables, F x, F y, F z, float fromX, float fromY, float fromZ) {
-  F sum = hn::Mul(set(fromX), x);
-  sum = hn::Add(sum, hn::Mul(set(fromY), y));
-  sum = hn::Add(sum, hn::Mul(set(fromZ), z));
-  const I index = tableIndex(hn::Mul(sum, set(1023.0f)), 1023.0f);
-  return toFloats(hn::GatherIndex(Ints(), tables.encode, index));
-}
-
-/// The tone curve; `place` (L times samples a unit) lies in [0, last + 1).
-HWY_INLINE F toneMapped(const TonePass& pass, F place) {
-  const I last = hn::Set(Ints(), static_cast<std::int32_t>(pass.curve.size() - 1));
-  const I lower = hn::ConvertTo(Ints(), place);
-  const I upper = hn::Min(hn::Add(lower, hn::Set(Ints(), 1)), last);
-  const F fraction = hn::Sub(place, toFloats(lower));
-  return hn::Add(hn::Mul(fraction, lookUp(pass.curve.data(), upper)),
-                 hn::Mul(hn::Sub(set(1.0f), fraction), lookUp(pass.curve.data(), lower)));
-}
-
-HWY_INLINE F loadMask(const float* mask) {
-  return hn::LoadU(Floats(), mask);
-}
-HWY_INLINE F loadMask(const QuantizedFloat<unsigned char>* mask) {
-  const hn::Rebind<std::uint8_t, Floats> bytes;
-  const auto stored = hn::LoadU(bytes, reinterpret_cast<const std::uint8_t*>(mask));
-  return simd::divide(toFloats(hn::PromoteTo(Ints(), stored)), set(255.0f));
-}
-
-/// `vibranceInRGB` for amounts from 0 on.
-HWY_INLINE void addVibrance(float amount, Colour& c) {
-  const F highest = hn::Max(hn::Max(c.r, c.g), c.b);
-  const F lowest = hn::Min(hn::Min(c.r, c.g), c.b);
-  F grey = hn::Mul(set(0.7f), c.g);
-  grey = hn::Add(grey, hn::Mul(set(0.2f), c.r));
-  grey = hn::Add(grey, hn::Mul(set(0.1f), c.b));
-  const F roomAbove = simd::divide(hn::Sub(set(255.0f), grey), hn::Sub(highest, grey));
-  const F roomBelow = simd::divide(hn::Neg(grey), hn::Sub(lowest, grey));
-  const F room = hn::Min(roomAbove, roomBelow);
-  F gain = hn::IfThenElse(hn::Lt(room, set(amount)), room, set(amount));
-  if (amount > 1.0f) {
-    const F lead = hn::Sub(hn::Max(c.g, c.b), c.r);
-    const F notRed = simd::clampTo(simd::divide(lead, set(5.0f)), hn::Zero(Floats()), set(1.0f));
-    gain = hn::Add(hn::Sub(set(1.0f), notRed), hn::Mul(notRed, gain));
+/// The steps of Lab's companding that a pixel's X, Y and Z fall on.
+HWY_NOINLINE void findSteps(const RGBA8Pixel* in, std::size_t count, Block& block) {
+  const float* const linear = colourTables().linear.data();
+  const auto byte = hn::Set(Words(), 0xFFu);
+  for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
+    prefetchAhead(in + i);
+    // Red in the low byte: every target is little-endian.
+    const auto pixels = hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(in + i));
+    const auto channel = [&](auto word) HWY_ATTR {
+      return lookUp(linear, hn::BitCast(Ints(), hn::And(word, byte)));
+    };
+    const F r = channel(pixels);
+    const F g = channel(hn::ShiftRight<8>(pixels));
+    const F b = channel(hn::ShiftRight<16>(pixels));
+    // No colour goes beyond white, which takes the last step.
+    const auto step = [](F value) HWY_ATTR {
+      return simd::truncate(hn::Mul(value, set(compandingStepCount - 1)));
+    };
+    hn::Store(step(matrixRow(r, g, b, 0.43394995f, 0.3762098f, 0.1898403f)), Ints(),
+              block.xStep + i);
+    hn::Store(step(matrixRow(r, g, b, 0.2126729f, 0.7151522f, 0.072175f)), Ints(), block.yStep + i);
+    hn::Store(step(matrixRow(r, g, b, 0.017756583f, 0.10946796f, 0.87277544f)), Ints(),
+              block.zStep + i);
   }
-  const auto coloured = hn::Ne(highest, lowest);  // a grey pixel's room is 0 / 0
-  const auto scaled = [&](F channel) HWY_ATTR {
-    return hn::IfThenElse(coloured, hn::Add(grey, hn::Mul(gain, hn::Sub(channel, grey))), channel);
+}
+
+/// A byte of a mask as the value it stands for.
+HWY_INLINE F valueOf(I byte) {
+  return simd::divide(toFloats(byte), Divisor(255.0f));
+}
+
+/// The tone curve, and its values where the argument is one of a few. Some 40 KB, for the stack.
+class ToneMap {
+ public:
+  explicit ToneMap(const TonePass& pass) : perUnit_(pass.samplesPerUnit) {
+    std::fill(std::copy(pass.curve.begin(), pass.curve.end(), samples_), std::end(samples_),
+              pass.curve.back());
+    const float* const fy = colourTables().xyzToLab.samples().data();
+    for (std::size_t i = 0; i < compandingStepCount; i += hn::Lanes(Floats())) {
+      hn::Store((*this)(lab::lightness(hn::LoadU(Floats(), fy + i))), Floats(), ofSteps_ + i);
+    }
+    for (std::size_t i = 0; i < 256; i += hn::Lanes(Floats())) {
+      const I byte = hn::Iota(Ints(), static_cast<std::int32_t>(i));
+      hn::Store((*this)(hn::Mul(set(pass.scale), valueOf(byte))), Floats(), ofBytes_ + i);
+    }
+  }
+
+  /// The curve at L from 0 on, less than one sample beyond the last.
+  HWY_INLINE F operator()(F L) const {
+    const F place = hn::Mul(L, set(perUnit_));
+    const I index = simd::truncate(place);
+    const F fraction = hn::Sub(place, toFloats(index));
+    const F upper = simd::SmallTable(samples_ + 1)(index);
+    const F lower = simd::SmallTable(samples_)(index);
+    return hn::Add(hn::Mul(fraction, upper), hn::Mul(hn::Sub(set(1.0f), fraction), lower));
+  }
+  /// The curve at the L of a step of Y.
+  HWY_INLINE F ofStep(I step) const { return lookUp(ofSteps_, step); }
+  /// The curve at the L that a byte of a mask stands for.
+  HWY_INLINE F ofByte(I byte) const { return lookUp(ofBytes_, byte); }
+
+ private:
+  static_assert(compandingStepCount % hn::MaxLanes(Floats()) == 0);
+  HWY_ALIGN float ofSteps_[compandingStepCount];
+  HWY_ALIGN float ofBytes_[256];
+  HWY_ALIGN float samples_[65];  // the last one repeated to the end
+  float perUnit_;
+};
+
+/// What recombination needs of one vector of the masks.
+struct MaskTerms {
+  F base, mappedBase, flat;
+};
+
+HWY_INLINE MaskTerms maskTerms(const TonePass& pass, const ToneMap& toneMap, const float* bilateral,
+                               const float* ltm) {
+  const F base = hn::Mul(set(pass.scale), hn::LoadU(Floats(), bilateral));
+  return {base, toneMap(base), hn::LoadU(Floats(), ltm)};
+}
+
+HWY_INLINE MaskTerms maskTerms(const TonePass& pass, const ToneMap& toneMap,
+                               const Quantized* bilateral, const Quantized* ltm) {
+  const auto bytes = [](const Quantized* mask) HWY_ATTR {
+    return hn::PromoteTo(Ints(), hn::LoadU(Bytes(), reinterpret_cast<const std::uint8_t*>(mask)));
   };
-  c = {scaled(c.r), scaled(c.g), scaled(c.b)};
+  const I base = bytes(bilateral);
+  return {hn::Mul(set(pass.scale), valueOf(base)), toneMap.ofByte(base), valueOf(bytes(ltm))};
+}
+
+/// Whether masks are in [0, 1] but for rounding, as our own are.
+HWY_INLINE bool areUsual(const float* bilateral, const float* ltm, std::size_t count) {
+  // As whole numbers, floats from 0 on are ordered alike; negative ones and NaN come last.
+  const auto bits = [](const float* mask) HWY_ATTR {
+    return hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(mask));
+  };
+  auto most = hn::Zero(Words());
+  for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
+    most = hn::Max(most, hn::Max(bits(bilateral + i), bits(ltm + i)));
+  }
+  const auto high = hn::Set(Words(), std::bit_cast<std::uint32_t>(1.01f));
+  return hn::AllFalse(Words(), hn::Gt(most, high));
+}
+HWY_INLINE bool areUsual(const Quantized*, const Quantized*, std::size_t) {
+  return true;
+}
+
+/// To Lab, with L tone-mapped and, with masks, recombined.
+template <bool masked, typename Mask>
+HWY_NOINLINE void mapTones(const TonePass& pass, const ToneMap& toneMap, const Mask* bilateral,
+                           const Mask* ltm, std::size_t count, Block& block) {
+  const float* const xyzToLab = colourTables().xyzToLab.samples().data();
+  for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
+    const I yStep = hn::Load(Ints(), block.yStep + i);
+    const F fx = lookUp(xyzToLab, hn::Load(Ints(), block.xStep + i));
+    const F fy = lookUp(xyzToLab, yStep);
+    const F fz = lookUp(xyzToLab, hn::Load(Ints(), block.zStep + i));
+    const F a = hn::Mul(set(500.0f), hn::Sub(fx, fy));
+    const F b = hn::Mul(set(200.0f), hn::Sub(fy, fz));
+    hn::Store(simd::divide(a, Divisor(500.0f)), Floats(), block.redness + i);
+    hn::Store(simd::divide(b, Divisor(200.0f)), Floats(), block.yellowness + i);
+
+    const F mapped = toneMap.ofStep(yStep);
+    F L = mapped;
+    if constexpr (masked) {
+      prefetchAhead(bilateral + i);
+      prefetchAhead(ltm + i);
+      const MaskTerms mask = maskTerms(pass, toneMap, bilateral + i, ltm + i);
+      const F detail = hn::Sub(lab::lightness(fy), mask.base);
+      const F blended = hn::Add(hn::Mul(set(pass.ltmBlend), mask.mappedBase),
+                                hn::Mul(set(1.0f - pass.ltmBlend), mapped));
+      const F detailed = hn::Add(mapped, hn::Mul(set(pass.detailGain), detail));
+      L = hn::Add(hn::Mul(mask.flat, blended), hn::Mul(hn::Sub(set(1.0f), mask.flat), detailed));
+      L = simd::clampTo(L, hn::Zero(Floats()), set(pass.scale));
+    }
+    hn::Store(L, Floats(), block.L + i);
+  }
+}
+
+/// From Lab to the codes of sRGB.
+HWY_NOINLINE void encode(std::size_t count, Block& block) {
+  const float* const codes = colourTables().codes.data();
+  for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
+    const F L = hn::Load(Floats(), block.L + i);
+    const F fy = simd::divide(hn::Add(L, set(16.0f)), Divisor(116.0f));
+    const F X = lab::labToXz(hn::Add(hn::Load(Floats(), block.redness + i), fy));
+    const F Y = lab::labToY(L);
+    const F Z = lab::labToXz(hn::Sub(fy, hn::Load(Floats(), block.yellowness + i)));
+    const auto encoded = [&](F value) HWY_ATTR {
+      const F place = simd::clampTo(hn::Mul(value, set(1023.0f)), hn::Zero(Floats()), set(1023.0f));
+      return lookUp(codes, simd::truncate(place));
+    };
+    hn::Store(encoded(matrixRow(X, Y, Z, 3.0799544f, -1.5371385f, -0.5428159f)), Floats(),
+              block.r + i);
+    hn::Store(encoded(matrixRow(X, Y, Z, -0.9212582f, 1.8760108f, 0.04524742f)), Floats(),
+              block.g + i);
+    hn::Store(encoded(matrixRow(X, Y, Z, 0.05288738f, -0.2040259f, 1.1511385f)), Floats(),
+              block.b + i);
+  }
+}
+
+/// Vibrance, and the pixels.
+HWY_NOINLINE void finish(float vibrance, const RGBA8Pixel* in, RGBA8Pixel* out, std::size_t count,
+                         const Block& block) {
+  for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
+    prefetchAhead(out + i);
+    F r = hn::Load(Floats(), block.r + i);
+    F g = hn::Load(Floats(), block.g + i);
+    F b = hn::Load(Floats(), block.b + i);
+    vibranceInRGB(vibrance, r, g, b);
+    const auto code = [](F channel)
+                          HWY_ATTR { return hn::BitCast(Words(), simd::truncate(channel)); };
+    const auto pixels = hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(in + i));
+    const auto alpha = hn::And(pixels, hn::Set(Words(), 0xFF000000u));
+    const auto red = code(r), green = hn::ShiftLeft<8>(code(g)), blue = hn::ShiftLeft<16>(code(b));
+    hn::StoreU(hn::Or(hn::Or(alpha, red), hn::Or(green, blue)), Words(),
+               reinterpret_cast<std::uint32_t*>(out + i));
+  }
+}
+
+template <bool masked, typename Mask>
+HWY_INLINE void enhanceBlocks(const TonePass& pass, const RGBA8Pixel* in, const Mask* bilateral,
+                              const Mask* ltm, RGBA8Pixel* out, std::size_t count) {
+  const ToneMap toneMap(pass);
+  Block block;
+  while (count >= hn::Lanes(Floats())) {
+    const std::size_t size = std::min(blockPixels, count - count % hn::Lanes(Floats()));
+    if (masked && !areUsual(bilateral, ltm, size)) {
+      enhanceRowScalar(pass, in, bilateral, ltm, out, size);
+    } else {
+      findSteps(in, size, block);
+      mapTones<masked>(pass, toneMap, bilateral, ltm, size, block);
+      encode(size, block);
+      finish(pass.vibrance, in, out, size, block);
+    }
+    in += size;
+    out += size;
+    count -= size;
+    if constexpr (masked) {
+      bilateral += size;
+      ltm += size;
+    }
+  }
+  enhanceRowScalar(pass, in, bilateral, ltm, out, count);
 }
 
 template <typename Mask>
 HWY_INLINE void enhanceRowVector(const TonePass& pass, const RGBA8Pixel* in, const Mask* bilateral,
                                  const Mask* ltm, RGBA8Pixel* out, std::size_t count) {
-  const Tables tables;
-  const hn::RebindToUnsigned<Floats> words;
-  const std::size_t lanes = hn::Lanes(Floats());
-  const F beyond = set(static_cast<float>(pass.curve.size()));
-  std::size_t i = 0;
-  for (; i + lanes <= count; i += lanes) {
-    // Red in the low byte: every target is little-endian.
-    const auto pixels = hn::LoadU(words, reinterpret_cast<const std::uint32_t*>(in + i));
-    const auto byte = hn::Set(words, 0xFFu);
-    const auto channel = [&](auto word) HWY_ATTR {
-      return lookUp(tables.linear, hn::BitCast(Ints(), hn::And(word, byte)));
-    };
-    const Colour linear{channel(pixels), channel(hn::ShiftRight<8>(pixels)),
-                        channel(hn::ShiftRight<16>(pixels))};
-    const F fx = companded(tables, linear, 0.43394995f, 0.3762098f, 0.1898403f);
-    const F fy = companded(tables, linear, 0.2126729f, 0.7151522f, 0.072175f);
-    const F fz = companded(tables, linear, 0.017756583f, 0.10946796f, 0.87277544f);
-    const F lightness = hn::Sub(hn::Mul(set(116.0f), fy), set(16.0f));
-    const F a = hn::Mul(set(500.0f), hn::Sub(fx, fy));
-    const F b = hn::Mul(set(200.0f), hn::Sub(fy, fz));
-
-    const F mapped = toneMapped(pass, hn::Mul(lightness, set(pass.samplesPerUnit)));
-    F L = mapped;
-    if (bilateral != nullptr) {
-      const F base = hn::Mul(set(pass.scale), loadMask(bilateral + i));
-      const F flat = loadMask(ltm + i);
-      const F basePlace = hn::Mul(base, set(pass.samplesPerUnit));
-      // Masks of our own lie well inside; anything else, NaN included, is the definition's.
-      const auto usual =
-          hn::And(hn::And(hn::Ge(basePlace, hn::Zero(Floats())), hn::Lt(basePlace, beyond)),
-                  hn::Lt(hn::Abs(flat), set(4.0f)));
-      if (HWY_UNLIKELY(!hn::AllTrue(Floats(), usual))) {
-        enhanceRowScalar(pass, in + i, bilateral + i, ltm + i, out + i, lanes);
-        continue;
-      }
-      const F detail = hn::Sub(lightness, base);
-      const F blended = hn::Add(hn::Mul(set(pass.ltmBlend), toneMapped(pass, basePlace)),
-                                hn::Mul(hn::Sub(set(1.0f), set(pass.ltmBlend)), mapped));
-      const F detailed = hn::Add(mapped, hn::Mul(set(pass.detailGain), detail));
-      const F recombined =
-          hn::Add(hn::Mul(flat, blended), hn::Mul(hn::Sub(set(1.0f), flat), detailed));
-      L = simd::clampTo(recombined, hn::Zero(Floats()), set(pass.scale));
-    }
-
-    const F newFy = simd::divide(hn::Add(L, set(16.0f)), set(116.0f));
-    const F xPlace = hn::Add(simd::divide(a, set(500.0f)), newFy);
-    const F zPlace = hn::Sub(newFy, simd::divide(b, set(200.0f)));
-    const F x = lookUp(tables.labToXz, tableIndex(hn::Mul(xPlace, set(999.0f)), 999.0f));
-    const F y = lookUp(tables.labToY, tableIndex(hn::Mul(L, set(999.0f / 100.0f)), 999.0f));
-    const F z = lookUp(tables.labToXz, tableIndex(hn::Mul(zPlace, set(999.0f)), 999.0f));
-    Colour colour{encoded(tables, x, y, z, 3.0799544f, -1.5371385f, -0.5428159f),
-                  encoded(tables, x, y, z, -0.9212582f, 1.8760108f, 0.04524742f),
-                  encoded(tables, x, y, z, 0.05288738f, -0.2040259f, 1.1511385f)};
-    addVibrance(pass.vibrance, colour);
-
-    const auto code = [&](F channel)
-                          HWY_ATTR { return hn::BitCast(words, hn::ConvertTo(Ints(), channel)); };
-    auto result = hn::And(pixels, hn::Set(words, 0xFF000000u));
-    result = hn::Or(result, code(colour.r));
-    result = hn::Or(result, hn::ShiftLeft<8>(code(colour.g)));
-    result = hn::Or(result, hn::ShiftLeft<16>(code(colour.b)));
-    hn::StoreU(result, words, reinterpret_cast<std::uint32_t*>(out + i));
+  if (bilateral != nullptr) {
+    enhanceBlocks<true>(pass, in, bilateral, ltm, out, count);
+  } else {
+    enhanceBlocks<false>(pass, in, bilateral, ltm, out, count);
   }
-  enhanceRowScalar(pass, in + i, bilateral == nullptr ? nullptr : bilateral + i,
-                   ltm == nullptr ? nullptr : ltm + i, out + i, count - i);
 }
 
 void enhanceRowFloat(const TonePass& pass, const RGBA8Pixel* in, const float* bilateral,
@@ -178,9 +272,8 @@ void enhanceRowFloat(const TonePass& pass, const RGBA8Pixel* in, const float* bi
   enhanceRowVector(pass, in, bilateral, ltm, out, count);
 }
 
-void enhanceRow8bit(const TonePass& pass, const RGBA8Pixel* in,
-                    const QuantizedFloat<unsigned char>* bilateral,
-                    const QuantizedFloat<unsigned char>* ltm, RGBA8Pixel* out, std::size_t count) {
+void enhanceRow8bit(const TonePass& pass, const RGBA8Pixel* in, const Quantized* bilateral,
+                    const Quantized* ltm, RGBA8Pixel* out, std::size_t count) {
   enhanceRowVector(pass, in, bilateral, ltm, out, count);
 }
 

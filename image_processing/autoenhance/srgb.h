@@ -26,11 +26,11 @@ class Uint8_Gamma_sRGB_Table {
     return codes_[index];
   }
 
-  /// The codes by step, each in a word of its own.
-  std::array<std::int32_t, 1024> widened() const {
-    std::array<std::int32_t, 1024> words;
-    std::copy(codes_.begin(), codes_.end(), words.begin());
-    return words;
+  /// The codes by step, 0 ... 255.
+  std::array<float, 1024> asFloats() const {
+    std::array<float, 1024> codes;
+    std::copy(codes_.begin(), codes_.end(), codes.begin());
+    return codes;
   }
 
  private:

@@ -29,6 +29,46 @@ HWY_INLINE V divide(V a, V b) {
 #endif
 }
 
+/// A constant to divide by. Its inverse is held in two floats: their sum is the inverse to some 48
+/// bits.
+struct Divisor {
+  explicit constexpr Divisor(float divisor)
+      : value(divisor),
+        inverse(1.0f / divisor),
+        rest(static_cast<float>(1.0 / static_cast<double>(divisor) -
+                                static_cast<double>(1.0f / divisor))) {}
+  float value, inverse, rest;
+};
+
+/// a / b rounded as IEEE asks, for a of 0 or from 2^-60 to 2^60 in size. Where vectors have a true
+/// fused multiply-add two operations do; that they round as the division would is a property of
+/// each divisor, proven for every one in use by DivideByAConstant.IsTheDivisionForEveryMantissa.
+template <class V>
+HWY_INLINE V divide(V a, const Divisor& b) {
+  const hn::DFromV<V> d;
+#if HWY_NATIVE_FMA
+  return hn::MulAdd(a, hn::Set(d, b.inverse), hn::Mul(a, hn::Set(d, b.rest)));
+#else
+  return divide(a, hn::Set(d, b.value));
+#endif
+}
+
+/// Toward zero, for floats that an `std::int32_t` can hold: `hn::ConvertTo` without the three
+/// instructions that saturate the others.
+template <class V, class D = hn::RebindToSigned<hn::DFromV<V>>>
+HWY_INLINE hn::Vec<D> truncate(V a) {
+#if HWY_TARGET <= HWY_AVX3
+  if constexpr (sizeof(a) == 64) return hn::Vec<D>{_mm512_cvttps_epi32(a.raw)};
+#endif
+#if HWY_TARGET <= HWY_AVX2
+  if constexpr (sizeof(a) == 32) return hn::Vec<D>{_mm256_cvttps_epi32(a.raw)};
+#endif
+#if HWY_TARGET <= HWY_SSSE3
+  if constexpr (sizeof(a) == 16) return hn::Vec<D>{_mm_cvttps_epi32(a.raw)};
+#endif
+  return hn::ConvertTo(D(), a);
+}
+
 /// The larger and smaller of ordinary numbers held to [low, high].
 template <class V>
 HWY_INLINE V clampTo(V value, V low, V high) {

@@ -3,7 +3,6 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
-#include <cstring>
 #include <limits>
 #include <vector>
 
@@ -108,43 +107,43 @@ TYPED_TEST(EnhanceRow, MatchesItsDefinitionForEveryCurve) {
 
 TEST(EnhanceRowOfFloats, MatchesItsDefinitionForMasksOutsideTheirRange) {
   const auto in = randomPixels(400, 7);
-  auto bilateral = randomMask<float>(400, 8);
-  auto ltm = randomMask<float>(400, 9);
+  const auto bilateral = randomMask<float>(400, 8);
+  const auto ltm = randomMask<float>(400, 9);
+  const TonePass pass(wavyCurve(51), 100.0f, 1.5f, 0.6f, 0.5f);
   const float infinity = std::numeric_limits<float>::infinity();
-  const std::vector<float> unusual = {-1e-6f,   1.00001f,  1.03f,         -7.0f, 300.0f,
-                                      infinity, -infinity, std::nanf(""), 1e30f};
-  for (std::size_t i = 0; i < unusual.size(); ++i) {
-    bilateral[7 + 23 * i] = unusual[i];
-    ltm[11 + 29 * i] = unusual[i];
+  for (const float unusual : {-0.0f, -1e-6f, 1.00001f, 1.03f, 5.0f, -7.0f, 300.0f, infinity,
+                              -infinity, std::nanf(""), 1e30f}) {
+    auto oddBilateral = bilateral, oddLtm = ltm;
+    oddBilateral[30] = oddLtm[31] = unusual;
+    expectTheDefinition<float>(pass, in, oddBilateral.data(), ltm.data());
+    expectTheDefinition<float>(pass, in, bilateral.data(), oddLtm.data());
   }
-  expectTheDefinition<float>(TonePass(wavyCurve(51), 100.0f, 1.5f, 0.6f, 0.5f), in,
-                             bilateral.data(), ltm.data());
 }
 
-// Every 61st block of colours on each instruction set, all 16,777,216 on the best one; not under
-// 32-bit emulation, which would need minutes.
-TEST(EnhanceRowOfFloats, MatchesItsDefinitionForEveryColour) {
-  const TonePass pass(wavyCurve(51), 100.0f, 1.4f, 0.55f, 0.4f);
-  std::vector<RGBA8Pixel> in(4096), expected(4096), actual(4096);
-  const auto bilateral = randomMask<float>(4096, 10);
-  const auto ltm = randomMask<float>(4096, 11);
-  const auto compare = [&](std::uint32_t block) {
-    for (std::uint32_t i = 0; i < 4096; ++i) {
-      const std::uint32_t colour = block * 4096 + i;
-      in[i] = {static_cast<std::uint8_t>(colour), static_cast<std::uint8_t>(colour >> 8),
-               static_cast<std::uint8_t>(colour >> 16), 255};
-    }
-    const bool masks = block % 2 == 0;
-    enhanceRowScalar<float>(pass, in.data(), masks ? bilateral.data() : nullptr,
-                            masks ? ltm.data() : nullptr, expected.data(), 4096);
-    enhanceRow<float>(pass, in.data(), masks ? bilateral.data() : nullptr,
-                      masks ? ltm.data() : nullptr, actual.data(), 4096);
-    ASSERT_EQ(std::memcmp(actual.data(), expected.data(), sizeof(RGBA8Pixel) * 4096), 0) << block;
-  };
-  onEveryInstructionSet([&] {
-    for (std::uint32_t block = 0; block < 4096; block += 61) compare(block);
-  });
-  for (std::uint32_t block = 0; sizeof(void*) == 8 && block < 4096; ++block) compare(block);
+/// The block of 4096 colours from `block` · 4096 on, red in the low byte.
+std::vector<RGBA8Pixel> coloursOfBlock(std::uint32_t block) {
+  std::vector<RGBA8Pixel> colours(4096);
+  for (std::uint32_t i = 0; i < 4096; ++i) {
+    const std::uint32_t colour = block * 4096 + i;
+    colours[i] = {static_cast<std::uint8_t>(colour), static_cast<std::uint8_t>(colour >> 8),
+                  static_cast<std::uint8_t>(colour >> 16), static_cast<std::uint8_t>(i)};
+  }
+  return colours;
+}
+
+// Every so many blocks of colours, of which there are 4096: black, white and a tour of the cube.
+TYPED_TEST(EnhanceRow, MatchesItsDefinitionForColoursOfEveryKind) {
+  const auto bilateral = randomMask<TypeParam>(4096, 10);
+  const auto ltm = randomMask<TypeParam>(4096, 11);
+  const TonePass gentle(wavyCurve(51), 100.0f, 0.8f, 0.2f, 0.1f);
+  const TonePass strong(wavyCurve(51), 100.0f, 1.4f, 0.55f, 0.4f);
+  const std::uint32_t stride = sizeof(void*) == 8 ? 63 : 1365;  // divide 4095: the last is white's
+  for (std::uint32_t block = 0; block < 4096; block += stride) {
+    const auto colours = coloursOfBlock(block);
+    expectTheDefinition<TypeParam>(gentle, colours, bilateral.data(), ltm.data());
+    expectTheDefinition<TypeParam>(strong, colours, bilateral.data(), ltm.data());
+    expectTheDefinition<TypeParam>(strong, colours, nullptr, nullptr);
+  }
 }
 
 }  // namespace

@@ -78,6 +78,13 @@ TEST(SRGBEncoder, TruncatesAndClips) {
   EXPECT_EQ(encode(std::nanf("")), 0);
 }
 
+TEST(SRGBEncoder, HasTheSameCodesInFloats) {
+  const ColourTables& tables = colourTables();
+  for (int step = 0; step < 1024; ++step) {
+    EXPECT_EQ(tables.codes[step], tables.encode((static_cast<float>(step) + 0.5f) / 1023.0f));
+  }
+}
+
 TEST(SRGBDecoding, RunsFromZeroToOne) {
   const auto& linear = colourTables().linear;
   EXPECT_EQ(linear[0], 0.0f);
