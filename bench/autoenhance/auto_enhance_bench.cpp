@@ -1,7 +1,10 @@
 // What a user waits for: preparing a photo once, then one application a slider position.
 #include <benchmark/benchmark.h>
 
+#include <string>
+
 #include "bench/support/per_pixel.h"
+#include "bench/support/side_by_side.h"
 #include "image_processing/autoenhance/auto_enhance_filter.h"
 #include "tests/support/pictures.h"
 
@@ -44,25 +47,26 @@ void init(benchmark::State& state) {
   reportPerPixel(state, photo.pixelCount());
 }
 
-template <typename Filter>
+/// One slider position, with each instruction set.
+template <typename Filter, bool withMasks>
 void applyConfig(benchmark::State& state) {
   const Image<RGBA8Pixel>& photo = photoOf(state.range(0));
   Filter filter(stateOf(photo));
   filter.init("");
+  const std::string params = withMasks ? "slider=0.4;" : "slider=0.4;gtmOnly=true;";
   Image<RGBA8Pixel> output(photo.width, photo.height);
-  for (auto _ : state) {
-    filter.applyConfig("slider=0.4;", defaultFilterConfigValue, output);
-    benchmark::ClobberMemory();
-  }
-  reportPerPixel(state, photo.pixelCount());
+  output.set({0, 0, 0, 0});
+  sideBySide(state, photo, {},
+             [&] { filter.applyConfig(params, defaultFilterConfigValue, output); });
 }
 
 #define AT_EVERY_SIZE \
   ArgName("MPx2")->Arg(1)->Arg(2)->Arg(4)->Arg(24)->Unit(benchmark::kMillisecond)
 BENCHMARK(init<AEFilter>)->AT_EVERY_SIZE;
 BENCHMARK(init<AEFilter8bit>)->AT_EVERY_SIZE;
-BENCHMARK(applyConfig<AEFilter>)->AT_EVERY_SIZE;
-BENCHMARK(applyConfig<AEFilter8bit>)->AT_EVERY_SIZE;
+BENCHMARK(applyConfig<AEFilter, true>)->AT_EVERY_SIZE->UseManualTime()->Iterations(turns);
+BENCHMARK(applyConfig<AEFilter8bit, true>)->AT_EVERY_SIZE->UseManualTime()->Iterations(turns);
+BENCHMARK(applyConfig<AEFilter, false>)->AT_EVERY_SIZE->UseManualTime()->Iterations(turns);
 
 }  // namespace
 }  // namespace pelorin::bench

@@ -4,13 +4,14 @@
 #include <cstring>
 
 #include "bench/support/per_pixel.h"
+#include "bench/support/side_by_side.h"
 #include "image_processing/autoenhance/bilateral_grid.h"
 #include "image_processing/autoenhance/build_tone_curve.h"
+#include "image_processing/autoenhance/enhance_row.h"
 #include "image_processing/autoenhance/flatness_mask.h"
 #include "image_processing/autoenhance/image_masks.h"
 #include "image_processing/autoenhance/image_statistics.h"
 #include "image_processing/autoenhance/lab.h"
-#include "image_processing/autoenhance/lab_tone_pass.h"
 
 namespace pelorin::bench {
 namespace {
@@ -82,6 +83,7 @@ void flatnessMask(benchmark::State& state) {
 BENCHMARK(flatnessMask<float>)->Unit(benchmark::kMillisecond);
 BENCHMARK(flatnessMask<Quantized>)->Unit(benchmark::kMillisecond);
 
+/// The pass over the pixels as one slider position asks for it.
 template <typename T, bool withMasks>
 void pixelPass(benchmark::State& state) {
   const Image<RGBA8Pixel>& photo = twelveMegapixels();
@@ -89,14 +91,22 @@ void pixelPass(benchmark::State& state) {
   analyzeImage(photo, {}, statistics);
   FilterConfig config = defaultFilterConfigValue;
   updateFilterConfigForSliderValue(0.4f, &config);
-  if (!withMasks) config.detailGainHigh = 0.0f;
+  const TonePass pass(buildToneCurve(statistics, config), 100.0f, config.vibrance, config.ltmBlend,
+                      config.detailGain);
+  const T* const bilateral = withMasks ? masks<T>().bilateralMask->data.get() : nullptr;
+  const T* const ltm = withMasks ? masks<T>().ltmMask->data.get() : nullptr;
   Image<RGBA8Pixel> output(photo.width, photo.height);
-  for (auto _ : state) apply(photo, statistics, config, masks<T>(), output);
-  reportPerPixel(state, photo.pixelCount());
+  output.set({0, 0, 0, 0});
+  const auto run = [&](auto enhance) {
+    return [&, enhance] {
+      enhance(pass, photo.data.get(), bilateral, ltm, output.data.get(), photo.pixelCount());
+    };
+  };
+  sideBySide(state, photo, run(enhanceRowScalar<T>), run(enhanceRow<T>));
 }
-BENCHMARK(pixelPass<float, true>)->Unit(benchmark::kMillisecond);
-BENCHMARK(pixelPass<Quantized, true>)->Unit(benchmark::kMillisecond);
-BENCHMARK(pixelPass<float, false>)->Unit(benchmark::kMillisecond);
+BENCHMARK(pixelPass<float, true>)->UseManualTime()->Iterations(turns);
+BENCHMARK(pixelPass<Quantized, true>)->UseManualTime()->Iterations(turns);
+BENCHMARK(pixelPass<float, false>)->UseManualTime()->Iterations(turns);
 
 }  // namespace
 }  // namespace pelorin::bench
