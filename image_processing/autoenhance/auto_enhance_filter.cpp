@@ -21,11 +21,13 @@ std::shared_ptr<Image<float>> asFloats(const Image<T>& mask) {
 template <typename TB, typename TL>
 void AEFilterT<TB, TL>::init(const std::string& params) {
   const Image<RGBA8Pixel>& photo = *state->image;
-  analyzeImage(photo, state->metadata, statistics_);
   const FilterParams options(params);
   if (!options.readBool("gtmOnly")) {
-    computeImageMasks(photo, state->metadata, state->config, masks_);
-  } else if (options.readBool("gtmExtraMemory")) {
+    prepareImage(photo, state->metadata, state->config, statistics_, masks_);
+    return;
+  }
+  analyzeImage(photo, state->metadata, statistics_);
+  if (options.readBool("gtmExtraMemory")) {
     masks_.ltmMask = makeSharedImage<TL>(photo.width, photo.height);
     masks_.bilateralMask = makeSharedImage<TB>(photo.width, photo.height);
   }

@@ -9,17 +9,24 @@
 
 namespace pelorin::image_processing {
 
+float gridCellSize(float spatial) {
+  return static_cast<float>(std::max(truncateTo<std::int32_t>(spatial), 1));
+}
+
+Grid makeGrid(std::uint32_t width, std::uint32_t height, float cellSize) {
+  const auto cell = static_cast<std::int64_t>(cellSize);
+  return Grid(std::max<std::int64_t>(width / cell, 1), std::max<std::int64_t>(height / cell, 1));
+}
+
 template <typename T>
 void bilateralFilterGridApproximation(Image<float> lightness, float sigmaRange, float spatial,
                                       Image<T> smoothed) {
   if (lightness.pixelCount() == 0) return;
-  const std::int64_t cellSize = std::max(truncateTo<std::int32_t>(spatial), 1);
-  const float size = static_cast<float>(cellSize);
-  Grid grid(std::max<std::int64_t>(lightness.width / cellSize, 1),
-            std::max<std::int64_t>(lightness.height / cellSize, 1));
-  splat(lightness, size, grid);
+  const float cellSize = gridCellSize(spatial);
+  Grid grid = makeGrid(lightness.width, lightness.height, cellSize);
+  splat(lightness, cellSize, grid);
   blur(grid, sigmaRange);
-  slice(grid, lightness, size, smoothed);
+  slice(grid, lightness, cellSize, smoothed);
 }
 
 template void bilateralFilterGridApproximation(Image<float>, float, float, Image<float>);

@@ -1,5 +1,8 @@
 #pragma once
 
+#include "image_processing/autoenhance/grid.h"
+#include "image_processing/autoenhance/grid_slice.h"
+#include "image_processing/autoenhance/image_rows.h"
 #include "image_processing/core/image.h"
 
 namespace pelorin::image_processing {
@@ -22,5 +25,40 @@ namespace pelorin::image_processing {
 template <typename T>
 void bilateralFilterGridApproximation(Image<float> lightness, float sigmaRange, float spatial,
                                       Image<T> smoothed);
+
+/// Side in pixels, a whole number, of the grid's cells for a smoothing extent.
+float gridCellSize(float spatial);
+
+/// An empty grid over a picture of at least one pixel. @throws std::bad_alloc.
+Grid makeGrid(std::uint32_t width, std::uint32_t height, float cellSize);
+
+/// The rows that a splat and blurred grid smooths a picture to, each made when one from it on is
+/// first asked for.
+template <typename T>
+class SmoothedRows : public RowSource<T> {
+ public:
+  /// Holds on to all but the cell size. @param smoothed  written row by row. @throws
+  /// std::bad_alloc.
+  SmoothedRows(const Grid& grid, float cellSize, RowSource<float>& lightness, Image<T>& smoothed)
+      : slicer_(grid, smoothed.width, cellSize), lightness_(lightness), smoothed_(smoothed) {}
+
+  const T* row(std::uint32_t y) override {
+    makeUpTo(y + 1);
+    return smoothed_.row(y);
+  }
+
+  /// Makes the first `end` rows.
+  void makeUpTo(std::uint32_t end) {
+    for (; made_ < end; ++made_) {
+      slicer_.sliceRow(made_, lightness_.row(made_), smoothed_.row(made_));
+    }
+  }
+
+ private:
+  GridSlicer slicer_;
+  RowSource<float>& lightness_;
+  Image<T>& smoothed_;
+  std::uint32_t made_ = 0;
+};
 
 }  // namespace pelorin::image_processing

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "image_processing/autoenhance/image_rows.h"
 #include "image_processing/core/image.h"
 
 namespace pelorin::image_processing {
@@ -18,6 +19,13 @@ namespace pelorin::image_processing {
 /// Keeps no state. For (float, float) and (QuantizedFloat<unsigned char>, the same).
 template <typename TB, typename TL>
 void computeFlatnessMask(const Image<float>& lightness, const Image<TB>& smoothed, int radius,
+                         Image<TL>& mask);
+
+/// The same from rows that are made when they are asked for. The rows are those of `mask`; each is
+/// asked for twice or less where `radius` is below its distance from the upper and lower border,
+/// first the one of `smoothed`, then the one of `lightness`.
+template <typename TB, typename TL>
+void computeFlatnessMask(RowSource<float>& lightness, RowSource<TB>& smoothed, int radius,
                          Image<TL>& mask);
 
 /// The definition of `computeFlatnessMask`.

@@ -17,24 +17,27 @@ class GaussianApproximation<float> {
   GaussianApproximation(float x0, float x1, float baseline, float peak);
 
   float operator()(float x) const {
-    const float t = -1.0f + (x - x0_) * scale_;
+    const float t = -1.0f + (x - terms_.x0) * terms_.scale;
     const float a = std::fabs(t);
-    const float inner = a0_ + a * (a * (a2_ + a * a3_));
-    const float outer = b0_ + a * (b1_ + a * (b2_ + a * b3_));
-    // Selected, not branched to, so that loops become vectors. NaN, as in an empty support, is 0.
+    const float inner = terms_.a0 + a * (a * (terms_.a2 + a * terms_.a3));
+    const float outer = terms_.b0 + a * (terms_.b1 + a * (terms_.b2 + a * terms_.b3));
+    // NaN, as in an empty support, is 0.
     const float g = a < 0.5f ? inner : (a < 1.0f ? outer : 0.0f);
-    return baseline_ + g * span_;
+    return terms_.baseline + g * terms_.span;
   }
 
+  /// What the bell is made of, for those who form it in vectors.
+  struct Terms {
+    float x0, baseline, scale, span;
+    // The inner cubic starts at 1 with slope 0, the outer one ends at 0 with slope 0; they meet at
+    // 1/2 with one value and slope.
+    float a0, a2, a3;
+    float b0, b1, b2, b3;
+  };
+  const Terms& terms() const { return terms_; }
+
  private:
-  float x0_;
-  float baseline_;
-  float scale_;
-  float span_;
-  // The inner cubic starts at 1 with slope 0, the outer one ends at 0 with slope 0; they meet at
-  // 1/2 with one value and slope.
-  float a0_, a2_, a3_;
-  float b0_, b1_, b2_, b3_;
+  Terms terms_;
 };
 
 }  // namespace pelorin::image_processing

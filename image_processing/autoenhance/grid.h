@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <array>
 #include <cstdint>
+#include <limits>
+#include <new>
 #include <vector>
 
 #include "image_processing/autoenhance/mirror.h"
@@ -26,15 +28,21 @@ using GridCell = std::array<GridNode, gridBins>;
 /// The bilateral grid: cells in one block, the top row first. Cell (row, column) stands for the
 /// pixel position (row, column) times the cell size.
 struct Grid {
-  /// All nodes 0. @throws std::bad_alloc.
+  /// All nodes 0. @throws std::bad_alloc, also when a row has 2^32 nodes.
   Grid(std::int64_t columns, std::int64_t rows)
-      : columns(columns), rows(rows), cells(checkedProduct(columns, std::uint64_t(rows))) {}
+      : columns(columns), rows(rows), cells(cellCount(columns, rows)) {}
 
   GridCell* row(std::int64_t y) { return &cells[y * columns]; }
   const GridCell* row(std::int64_t y) const { return &cells[y * columns]; }
 
   std::int64_t columns, rows;
   std::vector<GridCell> cells;
+
+ private:
+  static std::size_t cellCount(std::int64_t columns, std::int64_t rows) {
+    if (columns > std::numeric_limits<std::uint32_t>::max() / gridBins) throw std::bad_alloc();
+    return checkedProduct(columns, std::uint64_t(rows), sizeof(GridCell)) / sizeof(GridCell);
+  }
 };
 
 /// The node nearest to a pixel position, along an axis of `nodes`.

@@ -59,7 +59,7 @@ void blurLightness(Grid& grid, float sigmaRange) {
 
 }  // namespace
 
-void blur(Grid& grid, float sigmaRange) {
+void blurScalar(Grid& grid, float sigmaRange) {
   blurSpatially(grid);
   blurLightness(grid, sigmaRange);
 }

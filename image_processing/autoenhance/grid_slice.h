@@ -1,5 +1,8 @@
 #pragma once
 
+#include <cstdint>
+#include <vector>
+
 #include "image_processing/autoenhance/grid.h"
 #include "image_processing/core/image.h"
 
@@ -16,5 +19,37 @@ void slice(const Grid& grid, const Image<float>& lightness, float cellSize, Imag
 template <typename T>
 void sliceScalar(const Grid& grid, const Image<float>& lightness, float cellSize,
                  Image<T>& smoothed);
+
+/// Pixels of a row that lie between the same two columns of the grid.
+struct SliceRun {
+  std::uint32_t first, end;
+  std::int64_t before, after;
+};
+
+/// `slice` a row at a time.
+class GridSlicer {
+ public:
+  /// Holds on to `grid`. @throws std::bad_alloc.
+  GridSlicer(const Grid& grid, std::uint32_t width, float cellSize);
+
+  /// Row `y`. Uses the slicer's own memory, so one row at a time. Never throws.
+  template <typename T>
+  void sliceRow(std::uint32_t y, const float* lightness, T* smoothed);
+
+  /// Pixels that are sliced together; no run crosses a multiple of it.
+  static constexpr std::uint32_t blockSize = 512;
+  /// Floats behind the pixels that vectors may touch.
+  static constexpr std::uint32_t padding = 16;
+  /// Floats of a column of the grid, interpolated along y.
+  static constexpr std::int64_t columnFloats = 2 * gridBins + 2;
+
+ private:
+  const Grid& grid_;
+  std::uint32_t width_;
+  float cellSize_;
+  std::vector<SliceRun> runs_;
+  std::vector<float> fractions_;  // along x, by pixel
+  std::vector<float> columns_;    // the grid at the current row
+};
 
 }  // namespace pelorin::image_processing

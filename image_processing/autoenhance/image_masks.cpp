@@ -1,29 +1,97 @@
 #include "image_processing/autoenhance/image_masks.h"
 
 #include <algorithm>
-#include <vector>
 
 #include "image_processing/autoenhance/bilateral_filter.h"
 #include "image_processing/autoenhance/bilateral_grid.h"
-#include "image_processing/autoenhance/companding_steps.h"
 #include "image_processing/autoenhance/face_blend.h"
 #include "image_processing/autoenhance/flatness_mask.h"
+#include "image_processing/autoenhance/grid_blur.h"
+#include "image_processing/autoenhance/grid_splat.h"
+#include "image_processing/autoenhance/lightness_histogram.h"
+#include "image_processing/autoenhance/lightness_rows.h"
 
 namespace pelorin::image_processing {
 namespace {
 
 using Quantized = QuantizedFloat<unsigned char>;
 
-Image<float> lightnessImage(const Image<RGBA8Pixel>& photo) {
-  Image<float> lightness(photo.width, photo.height);
-  const auto& ofSteps = unitLightnessOfSteps();
-  std::vector<std::uint16_t> steps(photo.width);
+template <typename T>
+void fillWithZero(Image<T>& mask) {
+  T zero;
+  zero = 0.0f;
+  mask.set(zero);
+}
+
+float spatialExtent(const Image<RGBA8Pixel>& photo, const FilterConfig& config) {
+  const float shorterSide = static_cast<float>(std::min(photo.width, photo.height));
+  const float extent = shorterSide * config.bilateralSpatialFraction;
+  return extent > 1.0f ? extent : 1.0f;
+}
+
+template <typename T>
+void blendFacesIntoMask(const ImageMetadata& metadata, const Image<RGBA8Pixel>& photo,
+                        Image<T>& mask) {
+  for (const auto& face : metadata.faces) blendFaceIntoMask(*face, photo, mask);
+}
+
+/// Through the grid. Two passes over the photo: neither its lightness nor the table of sums ever
+/// exists as a whole.
+template <typename TB, typename TL>
+void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
+                        const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
+                        LightnessHistogram& histogram) {
+  if (photo.pixelCount() == 0) return;
+  LightnessRows lightness(photo);
+  const float cellSize = gridCellSize(spatialExtent(photo, config));
+  Grid grid = makeGrid(photo.width, photo.height, cellSize);
+  GridSplatter splatter(grid, photo.width, cellSize);
   for (std::uint32_t y = 0; y < photo.height; ++y) {
-    compandingSteps(photo.row(y), steps.data(), photo.width);
-    float* const row = lightness.row(y);
-    for (std::uint32_t x = 0; x < photo.width; ++x) row[x] = ofSteps[steps[x]];
+    splatter.addRow(y, lightness.row(y));
+    histogram.add(lightness.steps(), photo.width);
   }
-  return lightness;
+  blur(grid, config.bilateralRange);
+
+  SmoothedRows<TB> smoothed(grid, cellSize, lightness, bilateral);
+  if (config.ltmMaskAmount > 0.0f) {
+    computeFlatnessMask<TB, TL>(lightness, smoothed, config.ltmMaskRadius, ltm);
+  } else {
+    fillWithZero(ltm);
+  }
+  smoothed.makeUpTo(photo.height);
+  blendFacesIntoMask(metadata, photo, ltm);
+}
+
+/// Through the exact filter.
+template <typename TB, typename TL>
+void computeMasksExactly(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
+                         const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
+                         LightnessHistogram& histogram) {
+  Image<float> lightness(photo.width, photo.height);
+  LightnessRows rows(photo);
+  for (std::uint32_t y = 0; y < photo.height; ++y) {
+    std::copy_n(rows.row(y), photo.width, lightness.row(y));
+    histogram.add(rows.steps(), photo.width);
+  }
+  bilateralFilter(lightness, config.bilateralRange,
+                  truncateTo<std::int32_t>(spatialExtent(photo, config)), bilateral);
+  computeLtmMask(metadata, photo, lightness, bilateral, config.ltmMaskAmount, config.ltmMaskRadius,
+                 ltm);
+}
+
+/// Counts the pixels as well, when it computes masks at all.
+template <typename TB, typename TL>
+void computeMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
+                  const FilterConfig& config, ImageMasks<TB, TL>& masks,
+                  LightnessHistogram& histogram) {
+  masks.computed = false;
+  masks.ltmMask = makeSharedImage<TL>(photo.width, photo.height);
+  masks.bilateralMask = makeSharedImage<TB>(photo.width, photo.height);
+  if (config.detailGainHigh == 0.0f) return;
+  const auto compute =
+      config.useBilateralGrid != 0 ? computeMasksByGrid<TB, TL> : computeMasksExactly<TB, TL>;
+  compute(photo, metadata, config, *masks.bilateralMask, *masks.ltmMask, histogram);
+  masks.computed = true;
 }
 
 }  // namespace
@@ -31,25 +99,21 @@ Image<float> lightnessImage(const Image<RGBA8Pixel>& photo) {
 template <typename TB, typename TL>
 void computeImageMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                        const FilterConfig& config, ImageMasks<TB, TL>& masks) {
-  masks.computed = false;
-  masks.ltmMask = makeSharedImage<TL>(photo.width, photo.height);
-  masks.bilateralMask = makeSharedImage<TB>(photo.width, photo.height);
-  if (config.detailGainHigh == 0.0f) return;
+  LightnessHistogram unused(1, lightnessScale);
+  computeMasks(photo, metadata, config, masks, unused);
+}
 
-  const Image<float> lightness = lightnessImage(photo);
-  const float shorterSide = static_cast<float>(std::min(photo.width, photo.height));
-  float spatial = shorterSide * config.bilateralSpatialFraction;
-  if (!(spatial > 1.0f)) spatial = 1.0f;
-  if (config.useBilateralGrid != 0) {
-    bilateralFilterGridApproximation(lightness, config.bilateralRange, spatial,
-                                     *masks.bilateralMask);
+template <typename TB, typename TL>
+void prepareImage(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
+                  const FilterConfig& config, ImageStatistics& statistics,
+                  ImageMasks<TB, TL>& masks) {
+  LightnessHistogram histogram(lightnessBins, lightnessScale);
+  computeMasks(photo, metadata, config, masks, histogram);
+  if (histogram.empty()) {
+    analyzeImage(photo, metadata, statistics);
   } else {
-    bilateralFilter(lightness, config.bilateralRange, truncateTo<std::int32_t>(spatial),
-                    *masks.bilateralMask);
+    analyzeImage(histogram, photo, metadata, statistics);
   }
-  computeLtmMask(metadata, photo, lightness, *masks.bilateralMask, config.ltmMaskAmount,
-                 config.ltmMaskRadius, *masks.ltmMask);
-  masks.computed = true;
 }
 
 template <typename TB, typename TL>
@@ -59,17 +123,19 @@ void computeLtmMask(const ImageMetadata& metadata, const Image<RGBA8Pixel>& phot
   if (amount > 0.0f) {
     computeFlatnessMask(lightness, bilateral, radius, mask);
   } else {
-    TL zero;
-    zero = 0.0f;
-    mask.set(zero);
+    fillWithZero(mask);
   }
-  for (const auto& face : metadata.faces) blendFaceIntoMask(*face, photo, mask);
+  blendFacesIntoMask(metadata, photo, mask);
 }
 
 template void computeImageMasks(const Image<RGBA8Pixel>&, const ImageMetadata&, const FilterConfig&,
                                 ImageMasks<float, float>&);
 template void computeImageMasks(const Image<RGBA8Pixel>&, const ImageMetadata&, const FilterConfig&,
                                 ImageMasks<Quantized, Quantized>&);
+template void prepareImage(const Image<RGBA8Pixel>&, const ImageMetadata&, const FilterConfig&,
+                           ImageStatistics&, ImageMasks<float, float>&);
+template void prepareImage(const Image<RGBA8Pixel>&, const ImageMetadata&, const FilterConfig&,
+                           ImageStatistics&, ImageMasks<Quantized, Quantized>&);
 template void computeLtmMask(const ImageMetadata&, const Image<RGBA8Pixel>&, const Image<float>&,
                              const Image<float>&, float, int, Image<float>&);
 template void computeLtmMask(const ImageMetadata&, const Image<RGBA8Pixel>&, const Image<float>&,

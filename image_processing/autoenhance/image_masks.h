@@ -2,6 +2,7 @@
 
 #include <memory>
 
+#include "image_processing/autoenhance/image_statistics.h"
 #include "image_processing/core/image.h"
 #include "image_processing/core/image_metadata.h"
 #include "image_processing/filters/filter_config.h"
@@ -25,6 +26,12 @@ struct ImageMasks {
 template <typename TB, typename TL>
 void computeImageMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                        const FilterConfig& config, ImageMasks<TB, TL>& masks);
+
+/// `analyzeImage` and `computeImageMasks` in one: the photo's lightness is found once for both.
+template <typename TB, typename TL>
+void prepareImage(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
+                  const FilterConfig& config, ImageStatistics& statistics,
+                  ImageMasks<TB, TL>& masks);
 
 /// Fills the LTM mask: flatness when `amount` is above 0, else 0, then the faces one by one, each
 /// blending into what the one before left.

@@ -1,63 +1,13 @@
 #include "image_processing/autoenhance/image_statistics.h"
 
 #include <algorithm>
-#include <array>
 
 #include "image_processing/autoenhance/cdf.h"
 #include "image_processing/autoenhance/companding_steps.h"
+#include "image_processing/autoenhance/lightness_histogram.h"
 
 namespace pelorin::image_processing {
 namespace {
-
-// Counts as floats do that grow by 1: they stop at 2^24.
-float asFloatCount(std::uint64_t count) {
-  return static_cast<float>(std::min<std::uint64_t>(count, std::uint64_t{1} << 24));
-}
-
-class LightnessHistogram {
- public:
-  LightnessHistogram(int bins, float scale, std::uint32_t longestRow)
-      : binOfStep_(compandingStepCount), steps_(longestRow) {
-    const float lastBin = static_cast<float>(bins - 1);
-    for (std::size_t step = 0; step < compandingStepCount; ++step) {
-      const float bin = lastBin * lightnessOfSteps()[step] / scale;
-      binOfStep_[step] = std::clamp(truncateTo<std::int32_t>(bin), 0, bins - 1);
-    }
-    for (auto& counts : counts_) counts.resize(bins);
-  }
-
-  /// Counts `count` pixels, at most the longest row's.
-  void add(const RGBA8Pixel* pixels, std::uint32_t count) {
-    compandingSteps(pixels, steps_.data(), count);
-    std::uint32_t x = 0;
-    for (; x + 4 <= count; x += 4) {
-      for (std::uint32_t i = 0; i < 4; ++i) ++counts_[i][binOfStep_[steps_[x + i]]];
-    }
-    for (; x < count; ++x) ++counts_[0][binOfStep_[steps_[x]]];
-    total_ += count;
-  }
-
-  bool empty() const { return total_ == 0; }
-
-  std::vector<float> normalised() const {
-    const float total = asFloatCount(total_);
-    const float share = total == 0.0f ? 1.0f : 1.0f / total;
-    std::vector<float> histogram(counts_[0].size());
-    for (std::size_t bin = 0; bin < histogram.size(); ++bin) {
-      histogram[bin] =
-          asFloatCount(counts_[0][bin] + counts_[1][bin] + counts_[2][bin] + counts_[3][bin]) *
-          share;
-    }
-    return histogram;
-  }
-
- private:
-  std::vector<std::int32_t> binOfStep_;
-  std::vector<std::uint16_t> steps_;
-  // Neighbours mostly fall into one bin: in four histograms they need not wait for each other.
-  std::array<std::vector<std::uint64_t>, 4> counts_;
-  std::uint64_t total_ = 0;
-};
 
 void addBox(const Image<RGBA8Pixel>& image, const BoundingBox& box, LightnessHistogram& histogram) {
   const std::int64_t left = std::max<std::int64_t>(box.left, 0);
@@ -65,9 +15,10 @@ void addBox(const Image<RGBA8Pixel>& image, const BoundingBox& box, LightnessHis
   const std::int64_t top = std::max<std::int64_t>(box.top, 0);
   const std::int64_t bottom = std::min<std::int64_t>(box.bottom, std::int64_t{image.height} - 1);
   if (left > right) return;
+  std::vector<std::uint16_t> steps(right + 1 - left);
   for (std::int64_t y = top; y <= bottom; ++y) {
-    histogram.add(image.row(static_cast<std::uint32_t>(y)) + left,
-                  static_cast<std::uint32_t>(right + 1 - left));
+    compandingSteps(image.row(static_cast<std::uint32_t>(y)) + left, steps.data(), steps.size());
+    histogram.add(steps.data(), steps.size());
   }
 }
 
@@ -80,11 +31,25 @@ std::int32_t medianBin(const std::vector<float>& histogram) {
   return i == bins ? -1 : static_cast<std::int32_t>(i);
 }
 
+std::int32_t faceMedianBin(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata, int bins,
+                           float scale) {
+  if (metadata.faces.empty()) return -1;
+  LightnessHistogram faces(bins, scale);
+  for (const auto& box : metadata.faces) addBox(image, *box, faces);
+  return faces.empty() ? -1 : medianBin(faces.normalised());
+}
+
 }  // namespace
 
 void analyzeImage(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata,
                   ImageStatistics& statistics) {
-  computeImageStatistics(image, metadata, 50, 100.0f, statistics);
+  computeImageStatistics(image, metadata, lightnessBins, lightnessScale, statistics);
+}
+
+void analyzeImage(const LightnessHistogram& histogram, const Image<RGBA8Pixel>& image,
+                  const ImageMetadata& metadata, ImageStatistics& statistics) {
+  computeCDF(histogram.normalised(), statistics.cdf);
+  statistics.faceMedianBin = faceMedianBin(image, metadata, lightnessBins, lightnessScale);
 }
 
 void computeImageStatistics(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata, int bins,
@@ -98,13 +63,14 @@ void computeImageStatistics(const Image<RGBA8Pixel>& image, const ImageMetadata&
 
 void computeHistograms(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata, int bins,
                        float scale, std::vector<float>& histogram, std::int32_t& faceMedian) {
-  LightnessHistogram all(bins, scale, image.width);
-  for (std::uint32_t y = 0; y < image.height; ++y) all.add(image.row(y), image.width);
+  LightnessHistogram all(bins, scale);
+  std::vector<std::uint16_t> steps(image.width);
+  for (std::uint32_t y = 0; y < image.height; ++y) {
+    compandingSteps(image.row(y), steps.data(), steps.size());
+    all.add(steps.data(), steps.size());
+  }
   histogram = all.normalised();
-
-  LightnessHistogram faces(bins, scale, image.width);
-  for (const auto& box : metadata.faces) addBox(image, *box, faces);
-  faceMedian = faces.empty() ? -1 : medianBin(faces.normalised());
+  faceMedian = faceMedianBin(image, metadata, bins, scale);
 }
 
 }  // namespace pelorin::image_processing

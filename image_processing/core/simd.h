@@ -75,6 +75,59 @@ HWY_INLINE V clampTo(V value, V low, V high) {
   return hn::Min(hn::Max(value, low), high);
 }
 
+/// A byte's value in [0, 1], byte / 255 as IEEE rounds it: the reciprocal is split so that the
+/// first product is exact, and no byte comes out wrong.
+template <class V>
+HWY_INLINE V over255(V byte) {
+  const hn::DFromV<V> d;
+  constexpr float high = 257.0f / 65536.0f;
+  constexpr float low = static_cast<float>(1.0 / 255.0 - 257.0 / 65536.0);
+  return hn::Add(hn::Mul(byte, hn::Set(d, high)), hn::Mul(byte, hn::Set(d, low)));
+}
+
+#if HWY_TARGET != HWY_SCALAR  // where a vector has a single lane
+/// A vector of floats from groups of four: group g is read at `at(g)`.
+template <class D, class At>
+HWY_INLINE hn::Vec<D> loadFours(D d, At at) {
+  if constexpr (hn::MaxLanes(D()) <= 4) {
+    return hn::LoadU(d, at(0));
+  } else {
+    const hn::Half<D> half;
+    constexpr std::size_t groups = hn::MaxLanes(half) / 4;
+    return hn::Combine(d, loadFours(half, [&](std::size_t g) HWY_ATTR { return at(groups + g); }),
+                       loadFours(half, at));
+  }
+}
+
+/// Stores group g of four floats at `at(g)`.
+template <class D, class At>
+HWY_INLINE void storeFours(D d, hn::Vec<D> v, At at) {
+  if constexpr (hn::MaxLanes(D()) <= 4) {
+    hn::StoreU(v, d, at(0));
+  } else {
+    const hn::Half<D> half;
+    constexpr std::size_t groups = hn::MaxLanes(half) / 4;
+    storeFours(half, hn::LowerHalf(half, v), at);
+    storeFours(half, hn::UpperHalf(half, v),
+               [&](std::size_t g) HWY_ATTR { return at(groups + g); });
+  }
+}
+
+/// Transposes four vectors in place: afterwards lane 4 g + i of vector j is what lane 4 g + j of
+/// vector i was.
+template <class D>
+HWY_INLINE void transposeFours(D d, hn::Vec<D>* rows) {
+  const auto evenLow = hn::InterleaveLower(d, rows[0], rows[2]);
+  const auto oddLow = hn::InterleaveLower(d, rows[1], rows[3]);
+  const auto evenHigh = hn::InterleaveUpper(d, rows[0], rows[2]);
+  const auto oddHigh = hn::InterleaveUpper(d, rows[1], rows[3]);
+  rows[0] = hn::InterleaveLower(d, evenLow, oddLow);
+  rows[1] = hn::InterleaveUpper(d, evenLow, oddLow);
+  rows[2] = hn::InterleaveLower(d, evenHigh, oddHigh);
+  rows[3] = hn::InterleaveUpper(d, evenHigh, oddHigh);
+}
+#endif
+
 }  // namespace simd
 }  // namespace pelorin::image_processing::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();

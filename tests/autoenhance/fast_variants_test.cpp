@@ -94,16 +94,41 @@ Grid gridFor(const Geometry& g) {
   return Grid(std::max(g.width / cell, 1u), std::max(g.height / cell, 1u));
 }
 
+std::string fingerprint(const Grid& grid) {
+  return test_support::fingerprint(grid.cells.data(), grid.cells.size() * sizeof(GridCell));
+}
+
 TEST(GridSplat, MatchesItsDefinition) {
   for (const Geometry& g : geometries) {
     for (std::uint64_t seed = 0; seed < 6; ++seed) {
       const Image<float> lightness = lightnessOf(g, seed);
-      Grid expected = gridFor(g), actual = gridFor(g);
+      Grid expected = gridFor(g);
       splatScalar(lightness, g.cellSize, expected);
-      splat(lightness, g.cellSize, actual);
-      ASSERT_EQ(fingerprint(actual.cells.data(), actual.cells.size() * sizeof(GridCell)),
-                fingerprint(expected.cells.data(), expected.cells.size() * sizeof(GridCell)))
-          << g.width << " x " << g.height << ", seed " << seed;
+      onEveryInstructionSet([&] {
+        Grid actual = gridFor(g);
+        splat(lightness, g.cellSize, actual);
+        ASSERT_EQ(fingerprint(actual), fingerprint(expected))
+            << g.width << " x " << g.height << ", seed " << seed;
+      });
+    }
+  }
+}
+
+TEST(GridBlur, MatchesItsDefinition) {
+  for (const Geometry& g : geometries) {
+    const Image<float> lightness = lightnessOf(g, 1);
+    Grid splatted = gridFor(g);
+    splatScalar(lightness, g.cellSize, splatted);
+    for (const float range :
+         {0.7f, 0.0f, -1.0f, 0.03f, 1.0f / 32, 0.1f, 1.0f, 5.0f, 1e30f, std::nanf("")}) {
+      Grid expected = splatted;
+      blurScalar(expected, range);
+      onEveryInstructionSet([&] {
+        Grid actual = splatted;
+        blur(actual, range);
+        ASSERT_EQ(fingerprint(actual), fingerprint(expected))
+            << g.width << " x " << g.height << ", range " << range;
+      });
     }
   }
 }
@@ -119,12 +144,15 @@ TYPED_TEST(FastVariants, OfTheGridSliceMatchItsDefinition) {
       const Image<float> lightness = lightnessOf(g, seed);
       Grid grid = gridFor(g);
       splatScalar(lightness, g.cellSize, grid);
-      if (seed != 4) blur(grid, seed == 3 ? 0.0f : 0.7f);  // empty nodes stay without the blur
-      Image<TypeParam> expected(g.width, g.height), actual(g.width, g.height);
+      if (seed < 4) blurScalar(grid, seed == 3 ? 0.0f : 0.7f);  // without it nodes stay empty
+      Image<TypeParam> expected(g.width, g.height);
       sliceScalar(grid, lightness, g.cellSize, expected);
-      slice(grid, lightness, g.cellSize, actual);
-      ASSERT_EQ(fingerprint(actual), fingerprint(expected))
-          << g.width << " x " << g.height << ", seed " << seed;
+      onEveryInstructionSet([&] {
+        Image<TypeParam> actual(g.width, g.height);
+        slice(grid, lightness, g.cellSize, actual);
+        ASSERT_EQ(fingerprint(actual), fingerprint(expected))
+            << g.width << " x " << g.height << ", seed " << seed;
+      });
     }
   }
 }
@@ -139,11 +167,19 @@ TYPED_TEST(FastVariants, OfTheFlatnessMaskMatchItsDefinition) {
         smoothed.data.get()[i] =
             std::min(lightness.data.get()[i] + 0.1f * (random.nextFloat() - 0.5f), 1.0f);
       }
-      Image<TypeParam> expected(g.width, g.height), actual(g.width, g.height);
+      Image<TypeParam> expected(g.width, g.height);
       computeFlatnessMaskScalar(lightness, smoothed, radius, expected);
-      computeFlatnessMask(lightness, smoothed, radius, actual);
-      ASSERT_EQ(fingerprint(actual), fingerprint(expected))
-          << g.width << " x " << g.height << ", radius " << radius;
+      const auto compare = [&] {
+        Image<TypeParam> actual(g.width, g.height);
+        computeFlatnessMask(lightness, smoothed, radius, actual);
+        ASSERT_EQ(fingerprint(actual), fingerprint(expected))
+            << g.width << " x " << g.height << ", radius " << radius;
+      };
+      if (radius < 0) {
+        compare();  // without a kernel
+      } else {
+        onEveryInstructionSet(compare);
+      }
     }
   }
 }

@@ -1,0 +1,20 @@
+#include "image_processing/autoenhance/lightness_rows.h"
+
+#include "image_processing/autoenhance/companding_steps.h"
+
+namespace pelorin::image_processing {
+
+LightnessRows::LightnessRows(const Image<RGBA8Pixel>& photo)
+    : photo_(photo), steps_(photo.width), lightness_(photo.width) {}
+
+const float* LightnessRows::row(std::uint32_t y) {
+  if (y != current_) {
+    compandingSteps(photo_.row(y), steps_.data(), steps_.size());
+    const auto& ofSteps = unitLightnessOfSteps();
+    for (std::size_t x = 0; x < steps_.size(); ++x) lightness_[x] = ofSteps[steps_[x]];
+    current_ = y;
+  }
+  return lightness_.data();
+}
+
+}  // namespace pelorin::image_processing
