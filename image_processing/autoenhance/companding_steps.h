@@ -21,6 +21,9 @@ void compandingSteps(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t
 /// The definition of `compandingSteps`.
 void compandingStepsScalar(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t count);
 
+/// L / 100 of each of `count` steps. Never throws and keeps no state.
+void unitLightness(const std::uint16_t* steps, float* lightness, std::size_t count);
+
 /// L of each step.
 const std::array<float, compandingStepCount>& lightnessOfSteps();
 

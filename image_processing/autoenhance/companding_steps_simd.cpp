@@ -13,6 +13,8 @@ namespace {
 namespace hn = hwy::HWY_NAMESPACE;
 using Floats = hn::CappedTag<float, 16>;
 using Ints = hn::RebindToSigned<Floats>;
+using Words = hn::RebindToUnsigned<Floats>;
+constexpr std::size_t lanes = hn::MaxLanes(Floats());
 
 /// Linear light times its share of Y, by code: the product of a table entry and a constant is the
 /// same float whenever it is formed.
@@ -31,22 +33,33 @@ struct Shares {
 
 void compandingSteps(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t count) {
   static const Shares shares;
-  constexpr std::size_t lanes = hn::MaxLanes(Floats());
   const hn::Rebind<std::uint16_t, Floats> halves;
+  const auto byte = hn::Set(Words(), 0xFFu);
   const auto most = hn::Set(Floats(), 9999.0f);
-  HWY_ALIGN float luminance[lanes];
   std::size_t i = 0;
   for (; i + lanes <= count; i += lanes) {
-    // Plain loads from small tables; gathers were not compared on this loop.
-    for (std::size_t lane = 0; lane < lanes; ++lane) {
-      const RGBA8Pixel p = pixels[i + lane];
-      luminance[lane] = shares.red[p.r] + shares.green[p.g] + shares.blue[p.b];
-    }
-    const auto place = hn::Mul(hn::Load(Floats(), luminance), most);
-    const auto step = hn::ConvertTo(Ints(), hn::Min(place, most));
+    // Red in the low byte: every target is little-endian.
+    const auto p = hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(pixels + i));
+    const auto share = [&](const float* table, auto word) HWY_ATTR {
+      return hn::GatherIndex(Floats(), table, hn::BitCast(Ints(), hn::And(word, byte)));
+    };
+    auto luminance = hn::Add(share(shares.red, p), share(shares.green, hn::ShiftRight<8>(p)));
+    luminance = hn::Add(luminance, share(shares.blue, hn::ShiftRight<16>(p)));
+    const auto step = hn::ConvertTo(Ints(), hn::Min(hn::Mul(luminance, most), most));
     hn::StoreU(hn::DemoteTo(halves, step), halves, steps + i);
   }
   compandingStepsScalar(pixels + i, steps + i, count - i);
+}
+
+void unitLightness(const std::uint16_t* steps, float* lightness, std::size_t count) {
+  const float* const ofSteps = unitLightnessOfSteps().data();
+  const hn::Rebind<std::uint16_t, Floats> halves;
+  std::size_t i = 0;
+  for (; i + lanes <= count; i += lanes) {
+    const auto step = hn::PromoteTo(Ints(), hn::LoadU(halves, steps + i));
+    hn::StoreU(hn::GatherIndex(Floats(), ofSteps, step), Floats(), lightness + i);
+  }
+  for (; i < count; ++i) lightness[i] = ofSteps[steps[i]];
 }
 
 }  // namespace
@@ -58,6 +71,11 @@ namespace pelorin::image_processing {
 HWY_EXPORT(compandingSteps);
 void compandingSteps(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t count) {
   HWY_DYNAMIC_DISPATCH(compandingSteps)(pixels, steps, count);
+}
+
+HWY_EXPORT(unitLightness);
+void unitLightness(const std::uint16_t* steps, float* lightness, std::size_t count) {
+  HWY_DYNAMIC_DISPATCH(unitLightness)(steps, lightness, count);
 }
 }  // namespace pelorin::image_processing
 #endif

@@ -15,31 +15,35 @@ float asFloatCount(std::uint64_t count) {
 
 }  // namespace
 
-LightnessHistogram::LightnessHistogram(int bins, float scale) : binOfStep_(compandingStepCount) {
+LightnessHistogram::LightnessHistogram(int bins, float scale)
+    : bins_(bins), placeOfStep_(compandingStepCount) {
   const float lastBin = static_cast<float>(bins - 1);
   for (std::size_t step = 0; step < compandingStepCount; ++step) {
-    const float bin = lastBin * lightnessOfSteps()[step] / scale;
-    binOfStep_[step] = std::clamp(truncateTo<std::int32_t>(bin), 0, bins - 1);
+    const float place = lastBin * lightnessOfSteps()[step] / scale;
+    const std::int32_t bin = std::clamp(truncateTo<std::int32_t>(place), 0, bins - 1);
+    if (binOfPlace_.empty() || bin != binOfPlace_.back()) binOfPlace_.push_back(bin);
+    placeOfStep_[step] = static_cast<std::uint16_t>(binOfPlace_.size() - 1);
   }
-  for (auto& counts : counts_) counts.resize(bins);
+  for (auto& counts : counts_) counts.resize(binOfPlace_.size());
 }
 
 void LightnessHistogram::add(const std::uint16_t* steps, std::size_t count) {
   std::size_t x = 0;
   for (; x + 4 <= count; x += 4) {
-    for (std::size_t i = 0; i < 4; ++i) ++counts_[i][binOfStep_[steps[x + i]]];
+    for (std::size_t i = 0; i < 4; ++i) ++counts_[i][placeOfStep_[steps[x + i]]];
   }
-  for (; x < count; ++x) ++counts_[0][binOfStep_[steps[x]]];
+  for (; x < count; ++x) ++counts_[0][placeOfStep_[steps[x]]];
   total_ += count;
 }
 
 std::vector<float> LightnessHistogram::normalised() const {
   const float total = asFloatCount(total_);
   const float share = total == 0.0f ? 1.0f : 1.0f / total;
-  std::vector<float> histogram(counts_[0].size());
-  for (std::size_t bin = 0; bin < histogram.size(); ++bin) {
-    histogram[bin] =
-        asFloatCount(counts_[0][bin] + counts_[1][bin] + counts_[2][bin] + counts_[3][bin]) * share;
+  std::vector<float> histogram(bins_);
+  for (std::size_t place = 0; place < binOfPlace_.size(); ++place) {
+    std::uint64_t count = 0;
+    for (const auto& counts : counts_) count += counts[place];
+    histogram[binOfPlace_[place]] = asFloatCount(count) * share;
   }
   return histogram;
 }

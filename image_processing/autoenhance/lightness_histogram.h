@@ -23,7 +23,11 @@ class LightnessHistogram {
   std::vector<float> normalised() const;
 
  private:
-  std::vector<std::int32_t> binOfStep_;
+  std::size_t bins_;
+  // Only bins that some step falls into are counted: their places fit 16 bits however many bins
+  // there are, and the table into the nearest cache.
+  std::vector<std::uint16_t> placeOfStep_;
+  std::vector<std::int32_t> binOfPlace_;
   // Neighbours mostly fall into one bin: in four histograms they need not wait for each other.
   std::array<std::vector<std::uint64_t>, 4> counts_;
   std::uint64_t total_ = 0;

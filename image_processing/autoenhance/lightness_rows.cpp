@@ -10,8 +10,7 @@ LightnessRows::LightnessRows(const Image<RGBA8Pixel>& photo)
 const float* LightnessRows::row(std::uint32_t y) {
   if (y != current_) {
     compandingSteps(photo_.row(y), steps_.data(), steps_.size());
-    const auto& ofSteps = unitLightnessOfSteps();
-    for (std::size_t x = 0; x < steps_.size(); ++x) lightness_[x] = ofSteps[steps_[x]];
+    unitLightness(steps_.data(), lightness_.data(), steps_.size());
     current_ = y;
   }
   return lightness_.data();
