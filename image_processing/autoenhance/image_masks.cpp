@@ -8,7 +8,7 @@
 #include "image_processing/autoenhance/flatness_mask.h"
 #include "image_processing/autoenhance/grid_blur.h"
 #include "image_processing/autoenhance/grid_splat.h"
-#include "image_processing/autoenhance/lightness_histogram.h"
+#include "image_processing/autoenhance/lightness_counter.h"
 #include "image_processing/autoenhance/lightness_rows.h"
 
 namespace pelorin::image_processing {
@@ -35,20 +35,21 @@ void blendFacesIntoMask(const ImageMetadata& metadata, const Image<RGBA8Pixel>& 
   for (const auto& face : metadata.faces) blendFaceIntoMask(*face, photo, mask);
 }
 
-/// Through the grid. Two passes over the photo: neither its lightness nor the table of sums ever
-/// exists as a whole.
+/// Through the grid; counts the pixels on the way. Two passes over the photo: neither its lightness
+/// nor the table of sums ever exists as a whole.
 template <typename TB, typename TL>
 void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                         const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
-                        LightnessHistogram& histogram) {
+                        LightnessCounter& counter) {
   if (photo.pixelCount() == 0) return;
   LightnessRows lightness(photo);
   const float cellSize = gridCellSize(spatialExtent(photo, config));
   Grid grid = makeGrid(photo.width, photo.height, cellSize);
   GridSplatter splatter(grid, photo.width, cellSize);
   for (std::uint32_t y = 0; y < photo.height; ++y) {
-    splatter.addRow(y, lightness.row(y));
-    histogram.add(lightness.steps(), photo.width);
+    const float* const row = lightness.row(y);
+    splatter.addRow(y, row);
+    counter.add(row, photo.width);
   }
   blur(grid, config.bilateralRange);
 
@@ -65,13 +66,11 @@ void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& met
 /// Through the exact filter.
 template <typename TB, typename TL>
 void computeMasksExactly(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
-                         const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
-                         LightnessHistogram& histogram) {
+                         const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm) {
   Image<float> lightness(photo.width, photo.height);
   LightnessRows rows(photo);
   for (std::uint32_t y = 0; y < photo.height; ++y) {
     std::copy_n(rows.row(y), photo.width, lightness.row(y));
-    histogram.add(rows.steps(), photo.width);
   }
   bilateralFilter(lightness, config.bilateralRange,
                   truncateTo<std::int32_t>(spatialExtent(photo, config)), bilateral);
@@ -79,19 +78,23 @@ void computeMasksExactly(const Image<RGBA8Pixel>& photo, const ImageMetadata& me
                  ltm);
 }
 
-/// Counts the pixels as well, when it computes masks at all.
+/// @returns whether the pixels were counted on the way.
 template <typename TB, typename TL>
-void computeMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
+bool computeMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                   const FilterConfig& config, ImageMasks<TB, TL>& masks,
-                  LightnessHistogram& histogram) {
+                  LightnessCounter& counter) {
   masks.computed = false;
   masks.ltmMask = makeSharedImage<TL>(photo.width, photo.height);
   masks.bilateralMask = makeSharedImage<TB>(photo.width, photo.height);
-  if (config.detailGainHigh == 0.0f) return;
-  const auto compute =
-      config.useBilateralGrid != 0 ? computeMasksByGrid<TB, TL> : computeMasksExactly<TB, TL>;
-  compute(photo, metadata, config, *masks.bilateralMask, *masks.ltmMask, histogram);
+  if (config.detailGainHigh == 0.0f) return false;
+  const bool byGrid = config.useBilateralGrid != 0;
+  if (byGrid) {
+    computeMasksByGrid(photo, metadata, config, *masks.bilateralMask, *masks.ltmMask, counter);
+  } else {
+    computeMasksExactly(photo, metadata, config, *masks.bilateralMask, *masks.ltmMask);
+  }
   masks.computed = true;
+  return byGrid;
 }
 
 }  // namespace
@@ -99,7 +102,7 @@ void computeMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
 template <typename TB, typename TL>
 void computeImageMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                        const FilterConfig& config, ImageMasks<TB, TL>& masks) {
-  LightnessHistogram unused(1, lightnessScale);
+  LightnessCounter unused;
   computeMasks(photo, metadata, config, masks, unused);
 }
 
@@ -107,12 +110,11 @@ template <typename TB, typename TL>
 void prepareImage(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                   const FilterConfig& config, ImageStatistics& statistics,
                   ImageMasks<TB, TL>& masks) {
-  LightnessHistogram histogram(lightnessBins, lightnessScale);
-  computeMasks(photo, metadata, config, masks, histogram);
-  if (histogram.empty()) {
-    analyzeImage(photo, metadata, statistics);
+  LightnessCounter counter;
+  if (computeMasks(photo, metadata, config, masks, counter)) {
+    analyzeImage(counter, photo, metadata, statistics);
   } else {
-    analyzeImage(histogram, photo, metadata, statistics);
+    analyzeImage(photo, metadata, statistics);
   }
 }
 

@@ -5,6 +5,7 @@
 #include "image_processing/autoenhance/cdf.h"
 #include "image_processing/autoenhance/companding_steps.h"
 #include "image_processing/autoenhance/lightness_histogram.h"
+#include "image_processing/autoenhance/lightness_rows.h"
 
 namespace pelorin::image_processing {
 namespace {
@@ -43,12 +44,15 @@ std::int32_t faceMedianBin(const Image<RGBA8Pixel>& image, const ImageMetadata& 
 
 void analyzeImage(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata,
                   ImageStatistics& statistics) {
-  computeImageStatistics(image, metadata, lightnessBins, lightnessScale, statistics);
+  LightnessCounter counter;
+  LightnessRows lightness(image);
+  for (std::uint32_t y = 0; y < image.height; ++y) counter.add(lightness.row(y), image.width);
+  analyzeImage(counter, image, metadata, statistics);
 }
 
-void analyzeImage(const LightnessHistogram& histogram, const Image<RGBA8Pixel>& image,
+void analyzeImage(const LightnessCounter& counted, const Image<RGBA8Pixel>& image,
                   const ImageMetadata& metadata, ImageStatistics& statistics) {
-  computeCDF(histogram.normalised(), statistics.cdf);
+  computeCDF(normalised(counted.counts()), statistics.cdf);
   statistics.faceMedianBin = faceMedianBin(image, metadata, lightnessBins, lightnessScale);
 }
 

@@ -3,7 +3,7 @@
 #include <cstdint>
 #include <vector>
 
-#include "image_processing/autoenhance/lightness_histogram.h"
+#include "image_processing/autoenhance/lightness_counter.h"
 #include "image_processing/core/image.h"
 #include "image_processing/core/image_metadata.h"
 
@@ -19,16 +19,13 @@ struct ImageStatistics {
   std::int32_t faceMedianBin = -1;
 };
 
-/// Bins and range of the statistics that auto-enhance works with; the last bin holds L = 100 alone.
-inline constexpr int lightnessBins = 50;
-inline constexpr float lightnessScale = 100.0f;
-
-/// Statistics in 50 bins over L in [0, 100]. May throw std::bad_alloc; keeps no state.
+/// Statistics in 50 bins over L in [0, 100]; the last bin holds L = 100 alone. May throw
+/// std::bad_alloc; keeps no state.
 void analyzeImage(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata,
                   ImageStatistics& statistics);
 
-/// The same from a histogram of those bins that holds every pixel of `image`.
-void analyzeImage(const LightnessHistogram& histogram, const Image<RGBA8Pixel>& image,
+/// The same where every pixel of `image` has been counted.
+void analyzeImage(const LightnessCounter& counted, const Image<RGBA8Pixel>& image,
                   const ImageMetadata& metadata, ImageStatistics& statistics);
 
 /// Statistics in `bins` bins (at least 1) over L in [0, scale].

@@ -16,9 +16,6 @@ class LightnessRows : public RowSource<float> {
 
   const float* row(std::uint32_t y) override;
 
-  /// The companding steps of the row last asked for.
-  const std::uint16_t* steps() const { return steps_.data(); }
-
  private:
   const Image<RGBA8Pixel>& photo_;
   std::vector<std::uint16_t> steps_;

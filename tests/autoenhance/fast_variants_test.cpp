@@ -4,6 +4,7 @@
 #include <cmath>
 #include <cstring>
 #include <limits>
+#include <numeric>
 #include <utility>
 #include <vector>
 
@@ -13,6 +14,7 @@
 #include "image_processing/autoenhance/grid_slice.h"
 #include "image_processing/autoenhance/grid_splat.h"
 #include "image_processing/autoenhance/lab.h"
+#include "image_processing/autoenhance/lightness_counter.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/instruction_sets.h"
 #include "tests/support/pictures.h"
@@ -58,6 +60,43 @@ TEST(CompandingSteps, DetermineLightness) {
     const float L = rgbToLab(p.r, p.g, p.b).L;
     ASSERT_EQ(lightnessOfSteps()[step], L);
     ASSERT_EQ(unitLightnessOfSteps()[step], L / 100.0f);
+  }
+}
+
+TEST(LightnessCounter, FindsTheBinOfEveryStep) {
+  std::vector<std::uint16_t> steps(compandingStepCount);
+  std::iota(steps.begin(), steps.end(), std::uint16_t{0});
+  for (std::size_t step = 0; step < compandingStepCount; ++step) {
+    LightnessHistogram expected(lightnessBins, lightnessScale);
+    expected.add(&steps[step], 1);
+    LightnessCounter counter;
+    counter.add(&unitLightnessOfSteps()[step], 1);
+    ASSERT_EQ(normalised(counter.counts()), expected.normalised()) << step;
+  }
+  LightnessHistogram expected(lightnessBins, lightnessScale);
+  expected.add(steps.data(), steps.size());
+  onEveryInstructionSet([&] {
+    LightnessCounter counter;
+    counter.add(unitLightnessOfSteps().data(), compandingStepCount);
+    ASSERT_EQ(normalised(counter.counts()), expected.normalised());
+  });
+}
+
+TEST(LightnessCounter, MatchesTheHistogramAtEveryTailLength) {
+  Random random(3);
+  for (std::size_t count = 0; count <= 1100; count += count < 140 ? 1 : 37) {
+    std::vector<std::uint16_t> steps(count);
+    for (auto& step : steps) step = static_cast<std::uint16_t>(random.below(compandingStepCount));
+    std::vector<float> lightness(count);
+    unitLightness(steps.data(), lightness.data(), count);
+    LightnessHistogram expected(lightnessBins, lightnessScale);
+    expected.add(steps.data(), count);
+    onEveryInstructionSet([&] {
+      LightnessCounter counter;
+      counter.add(lightness.data(), count);
+      if (count == 0) unitLightness(nullptr, nullptr, 0);  // some kernel is to be called
+      ASSERT_EQ(normalised(counter.counts()), expected.normalised()) << count;
+    });
   }
 }
 
