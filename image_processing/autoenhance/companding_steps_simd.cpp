@@ -109,7 +109,8 @@ struct ShareTables {
   }
 };
 
-void compandingSteps(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t count) {
+/// Whole groups of 64 pixels. @returns how many pixels they are.
+std::size_t permutedSteps(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t count) {
   static const ShareTables tables;
   std::size_t i = 0;
   for (; i + 64 <= count; i += 64) {
@@ -130,13 +131,18 @@ void compandingSteps(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t
       storeSteps(shares[0][j], shares[1][j], shares[2][j], steps + i + 16 * j);
     }
   }
-  compandingStepsScalar(pixels + i, steps + i, count - i);
+  return i;
 }
 #else
+std::size_t permutedSteps(const RGBA8Pixel*, std::uint16_t*, std::size_t) {
+  return 0;
+}
+#endif
+
 void compandingSteps(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t count) {
   static const Shares shares;
   const auto byte = hn::Set(Words(), 0xFFu);
-  std::size_t i = 0;
+  std::size_t i = permutedSteps(pixels, steps, count);
   for (; i + lanes <= count; i += lanes) {
     if (i % 16 == 0) prefetchBeyond(pixels + i);
     // Red in the low byte: every target is little-endian.
@@ -149,7 +155,6 @@ void compandingSteps(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t
   }
   compandingStepsScalar(pixels + i, steps + i, count - i);
 }
-#endif
 
 void unitLightness(const std::uint16_t* steps, float* lightness, std::size_t count) {
   const float* const ofSteps = unitLightnessOfSteps().data();

@@ -2,7 +2,6 @@
 #include <cstddef>
 #include <vector>
 
-#include "image_processing/autoenhance/colour_tables.h"
 #include "image_processing/autoenhance/flatness_mask.h"
 #include "image_processing/autoenhance/flatness_rows.h"
 #include "image_processing/autoenhance/mirror.h"
@@ -50,10 +49,7 @@ void computeFlatnessMask(RowSource<float>& lightness, RowSource<TB>& smoothed, i
   const float noDetail = 20.0f / 255.0f;
   const GaussianApproximation<float> weight(-noDetail, noDetail, 0.0f, 1.0f / side);
 
-  // The shaping table as the mask stores it.
-  const std::vector<float>& samples = colourTables().flatness.samples();
-  std::vector<TL> shaped(samples.size());
-  std::copy(samples.begin(), samples.end(), shaped.begin());
+  const FlatnessShape shape;
 
   const std::int64_t tableWidth = width + n, tableHeight = height + n;
   SumRows table(tableWidth, n);
@@ -79,7 +75,7 @@ void computeFlatnessMask(RowSource<float>& lightness, RowSource<TB>& smoothed, i
     sumRows(above, table.row(i), table.stride(), tableWidth);
     above = table.row(i + sumRowsAtOnce - 1);
     for (std::int64_t y = std::max<std::int64_t>(i - n, 0); y < end - n; ++y) {
-      shapeRow(table.row(y), table.row(y + n), n, shaped, mask.row(static_cast<std::uint32_t>(y)),
+      shapeRow(table.row(y), table.row(y + n), n, shape, mask.row(static_cast<std::uint32_t>(y)),
                width);
     }
   }

@@ -60,37 +60,38 @@ void weighRow8bit(const GaussianApproximation<float>& weight, const float* light
   weigh(weight, lightness, smoothed, weights, count);
 }
 
+HWY_INLINE void store(const FlatnessShape& shape, hn::Vec<Ints> places, float* mask) {
+  hn::StoreU(hn::GatherIndex(Floats(), shape.samples.data(), places), Floats(), mask);
+}
+HWY_INLINE void store(const FlatnessShape& shape, hn::Vec<Ints> places,
+                      QuantizedFloat<unsigned char>* mask) {
+  const hn::Rebind<std::uint8_t, Floats> bytes;
+  hn::StoreU(hn::DemoteTo(bytes, hn::GatherIndex(Ints(), shape.codes.data(), places)), bytes,
+             reinterpret_cast<std::uint8_t*>(mask));
+}
+
 template <typename T>
-HWY_INLINE void shape(const float* top, const float* bottom, std::ptrdiff_t n,
-                      const std::vector<T>& shaped, T* mask, std::size_t count) {
-  // Indices go through memory: look-ups by plain loads are faster than gathers.
-  constexpr std::size_t blockSize = 256;
-  HWY_ALIGN std::int32_t indices[blockSize];
-  const T* const table = shaped.data();
-  const F last = set(static_cast<float>(shaped.size() - 1));
+HWY_INLINE void shapeWindows(const float* top, const float* bottom, std::ptrdiff_t n,
+                             const FlatnessShape& shape, T* mask, std::size_t count) {
+  const F last = set(static_cast<float>(shape.samples.size() - 1));
   std::size_t x = 0;
-  while (x + lanes <= count) {
-    const std::size_t size = std::min(blockSize, (count - x) / lanes * lanes);
-    for (std::size_t i = 0; i < size; i += lanes) {
-      const auto at = [&](const float* row) HWY_ATTR { return hn::LoadU(Floats(), row + x + i); };
-      const F share = hn::Sub(hn::Sub(hn::Add(at(top), at(bottom + n)), at(bottom)), at(top + n));
-      const F place = simd::clampTo(hn::Mul(share, last), hn::Zero(Floats()), last);
-      hn::Store(hn::ConvertTo(Ints(), place), Ints(), indices + i);
-    }
-    for (std::size_t i = 0; i < size; ++i) mask[x + i] = table[indices[i]];
-    x += size;
+  for (; x + lanes <= count; x += lanes) {
+    const auto at = [&](const float* row) HWY_ATTR { return hn::LoadU(Floats(), row + x); };
+    const F share = hn::Sub(hn::Sub(hn::Add(at(top), at(bottom + n)), at(bottom)), at(top + n));
+    const F place = simd::clampTo(hn::Mul(share, last), hn::Zero(Floats()), last);
+    store(shape, hn::ConvertTo(Ints(), place), mask + x);
   }
-  shapeRowScalar(top + x, bottom + x, n, shaped, mask + x, count - x);
+  shapeRowScalar(top + x, bottom + x, n, shape, mask + x, count - x);
 }
 
 void shapeRowFloat(const float* top, const float* bottom, std::ptrdiff_t n,
-                   const std::vector<float>& shaped, float* mask, std::size_t count) {
-  shape(top, bottom, n, shaped, mask, count);
+                   const FlatnessShape& shape, float* mask, std::size_t count) {
+  shapeWindows(top, bottom, n, shape, mask, count);
 }
 void shapeRow8bit(const float* top, const float* bottom, std::ptrdiff_t n,
-                  const std::vector<QuantizedFloat<unsigned char>>& shaped,
-                  QuantizedFloat<unsigned char>* mask, std::size_t count) {
-  shape(top, bottom, n, shaped, mask, count);
+                  const FlatnessShape& shape, QuantizedFloat<unsigned char>* mask,
+                  std::size_t count) {
+  shapeWindows(top, bottom, n, shape, mask, count);
 }
 
 }  // namespace
@@ -117,14 +118,14 @@ void weighRow(const GaussianApproximation<float>& weight, const float* lightness
   HWY_DYNAMIC_DISPATCH(weighRow8bit)(weight, lightness, smoothed, weights, count);
 }
 template <>
-void shapeRow(const float* top, const float* bottom, std::ptrdiff_t n,
-              const std::vector<float>& shaped, float* mask, std::size_t count) {
-  HWY_DYNAMIC_DISPATCH(shapeRowFloat)(top, bottom, n, shaped, mask, count);
+void shapeRow(const float* top, const float* bottom, std::ptrdiff_t n, const FlatnessShape& shape,
+              float* mask, std::size_t count) {
+  HWY_DYNAMIC_DISPATCH(shapeRowFloat)(top, bottom, n, shape, mask, count);
 }
 template <>
-void shapeRow(const float* top, const float* bottom, std::ptrdiff_t n,
-              const std::vector<Quantized>& shaped, Quantized* mask, std::size_t count) {
-  HWY_DYNAMIC_DISPATCH(shapeRow8bit)(top, bottom, n, shaped, mask, count);
+void shapeRow(const float* top, const float* bottom, std::ptrdiff_t n, const FlatnessShape& shape,
+              Quantized* mask, std::size_t count) {
+  HWY_DYNAMIC_DISPATCH(shapeRow8bit)(top, bottom, n, shape, mask, count);
 }
 
 }  // namespace pelorin::image_processing
