@@ -22,8 +22,8 @@ struct GridNode {
   float weight = 0.0f;
 };
 
-/// The nodes of one place, dark to light.
-using GridCell = std::array<GridNode, gridBins>;
+/// The nodes of one place, dark to light. Whole cache lines, so that no vector lies across two.
+struct alignas(64) GridCell : std::array<GridNode, gridBins> {};
 
 /// The bilateral grid: cells in one block, the top row first. Cell (row, column) stands for the
 /// pixel position (row, column) times the cell size.

@@ -26,6 +26,11 @@ struct SliceRun {
   std::int64_t before, after;
 };
 
+/// A column of the grid interpolated along y, laid out as the instruction set likes to read it.
+struct alignas(64) SliceColumn {
+  float nodes[2 * gridBins + 2];
+};
+
 /// `slice` a row at a time.
 class GridSlicer {
  public:
@@ -40,16 +45,14 @@ class GridSlicer {
   static constexpr std::uint32_t blockSize = 512;
   /// Floats behind the pixels that vectors may touch.
   static constexpr std::uint32_t padding = 16;
-  /// Floats of a column of the grid, interpolated along y.
-  static constexpr std::int64_t columnFloats = 2 * gridBins + 2;
 
  private:
   const Grid& grid_;
   std::uint32_t width_;
   float cellSize_;
   std::vector<SliceRun> runs_;
-  std::vector<float> fractions_;  // along x, by pixel
-  std::vector<float> columns_;    // the grid at the current row
+  std::vector<float> fractions_;      // along x, by pixel
+  std::vector<SliceColumn> columns_;  // the grid at the current row
 };
 
 }  // namespace pelorin::image_processing

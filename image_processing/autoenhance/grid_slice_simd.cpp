@@ -176,7 +176,7 @@ HWY_INLINE void divide(const Block& block, T* smoothed, std::size_t count) {
 
 template <typename T>
 HWY_INLINE void sliceRuns(const std::vector<SliceRun>& runs, const float* fractions,
-                          const float* columns, const float* lightness, T* smoothed,
+                          const SliceColumn* columns, const float* lightness, T* smoothed,
                           std::uint32_t width) {
   Block block;
   std::fill(std::begin(block.bins), std::end(block.bins), 0);
@@ -185,29 +185,29 @@ HWY_INLINE void sliceRuns(const std::vector<SliceRun>& runs, const float* fracti
     const std::uint32_t size = std::min(GridSlicer::blockSize, width - start);
     findBins(lightness + start, block, size);
     for (; run != runs.end() && run->first < start + size; ++run) {
-      interpolate(Column(columns + run->before * GridSlicer::columnFloats),
-                  Column(columns + run->after * GridSlicer::columnFloats), fractions + run->first,
-                  block, run->first - start, run->end - run->first);
+      interpolate(Column(columns[run->before].nodes), Column(columns[run->after].nodes),
+                  fractions + run->first, block, run->first - start, run->end - run->first);
     }
     divide(block, smoothed + start, size);
   }
 }
 
-void interpolateColumns(const Grid& grid, const GridNeighbours& rows, float* columns) {
+void interpolateColumns(const Grid& grid, const GridNeighbours& rows, SliceColumn* columns) {
   const F t = set(rows.fraction);
   for (std::int64_t x = 0; x < grid.columns; ++x) {
     Column::interpolate(t, &grid.row(rows.before)[x][0].value, &grid.row(rows.after)[x][0].value,
-                        columns + x * GridSlicer::columnFloats);
+                        columns[x].nodes);
   }
 }
 
-void sliceRunsFloat(const std::vector<SliceRun>& runs, const float* fractions, const float* columns,
-                    const float* lightness, float* smoothed, std::uint32_t width) {
+void sliceRunsFloat(const std::vector<SliceRun>& runs, const float* fractions,
+                    const SliceColumn* columns, const float* lightness, float* smoothed,
+                    std::uint32_t width) {
   sliceRuns(runs, fractions, columns, lightness, smoothed, width);
 }
-void sliceRuns8bit(const std::vector<SliceRun>& runs, const float* fractions, const float* columns,
-                   const float* lightness, QuantizedFloat<unsigned char>* smoothed,
-                   std::uint32_t width) {
+void sliceRuns8bit(const std::vector<SliceRun>& runs, const float* fractions,
+                   const SliceColumn* columns, const float* lightness,
+                   QuantizedFloat<unsigned char>* smoothed, std::uint32_t width) {
   sliceRuns(runs, fractions, columns, lightness, smoothed, width);
 }
 
@@ -228,7 +228,7 @@ GridSlicer::GridSlicer(const Grid& grid, std::uint32_t width, float cellSize)
       width_(width),
       cellSize_(cellSize),
       fractions_(std::size_t{width} + padding),
-      columns_(checkedProduct(grid.columns, std::uint64_t(columnFloats))) {
+      columns_(grid.columns) {
   for (std::uint32_t x = 0; x < width; ++x) {
     const GridNeighbours at(x, cellSize, grid.columns);
     fractions_[x] = at.fraction;
