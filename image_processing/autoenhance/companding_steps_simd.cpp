@@ -12,6 +12,7 @@
 #include <bit>
 
 #include "image_processing/autoenhance/colour_tables.h"
+#include "image_processing/core/simd.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace pelorin::image_processing::HWY_NAMESPACE {
@@ -49,7 +50,7 @@ HWY_INLINE void storeSteps(hn::Vec<Floats> red, hn::Vec<Floats> green, hn::Vec<F
   const hn::Rebind<std::uint16_t, Floats> halves;
   const auto most = hn::Set(Floats(), 9999.0f);
   const auto luminance = hn::Add(hn::Add(red, green), blue);
-  const auto step = hn::ConvertTo(Ints(), hn::Min(hn::Mul(luminance, most), most));
+  const auto step = simd::truncate(hn::Min(hn::Mul(luminance, most), most));
   hn::StoreU(hn::DemoteTo(halves, step), halves, steps);
 }
 

@@ -79,7 +79,7 @@ HWY_INLINE void shapeWindows(const float* top, const float* bottom, std::ptrdiff
     const auto at = [&](const float* row) HWY_ATTR { return hn::LoadU(Floats(), row + x); };
     const F share = hn::Sub(hn::Sub(hn::Add(at(top), at(bottom + n)), at(bottom)), at(top + n));
     const F place = simd::clampTo(hn::Mul(share, last), hn::Zero(Floats()), last);
-    store(shape, hn::ConvertTo(Ints(), place), mask + x);
+    store(shape, simd::truncate(place), mask + x);
   }
   shapeRowScalar(top + x, bottom + x, n, shape, mask + x, count - x);
 }

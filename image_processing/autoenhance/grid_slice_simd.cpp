@@ -115,7 +115,7 @@ void findBins(const float* lightness, Block& block, std::size_t count) {
     const F place = hn::Mul(hn::LoadU(Floats(), lightness + i), set(31.0f));
     // NaN is in bin 0.
     const F held = hn::Min(hn::IfThenElseZero(hn::Gt(place, set(0.0f)), place), set(31.0f));
-    const auto bin = hn::ConvertTo(Ints(), held);
+    const auto bin = simd::truncate(held);
     hn::Store(bin, Ints(), block.bins + i);
     hn::Store(hn::Sub(place, hn::ConvertTo(Floats(), bin)), Floats(), block.fractions + i);
   }
@@ -153,7 +153,7 @@ HWY_INLINE void store(F smoothed, QuantizedFloat<unsigned char>* out) {
   const F scaled = hn::Mul(smoothed, set(255.0f));
   const F beyond = hn::IfThenElseZero(hn::Ge(scaled, set(4294967296.0f)), set(255.0f));
   const F held = hn::IfThenElse(hn::Lt(scaled, set(2147483648.0f)), scaled, beyond);
-  const auto number = hn::ConvertTo(Ints(), hn::IfThenElseZero(hn::Gt(held, set(0.0f)), held));
+  const auto number = simd::truncate(hn::IfThenElseZero(hn::Gt(held, set(0.0f)), held));
   const hn::Rebind<std::uint8_t, Floats> bytes;
   hn::StoreU(hn::DemoteTo(bytes, hn::And(number, hn::Set(Ints(), 255))), bytes,
              reinterpret_cast<std::uint8_t*>(out));

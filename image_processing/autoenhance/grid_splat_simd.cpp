@@ -27,7 +27,7 @@ void findNodes(const float* lightness, const std::uint32_t* firstNodes, std::uin
         hn::Add(hn::Mul(hn::LoadU(Floats(), lightness + i), scale), hn::Set(Floats(), 0.5f));
     // NaN is in bin 0.
     const auto positive = hn::IfThenElseZero(hn::Gt(place, hn::Zero(Floats())), place);
-    const auto bin = hn::ConvertTo(Ints(), hn::Min(positive, scale));
+    const auto bin = simd::truncate(hn::Min(positive, scale));
     hn::StoreU(hn::Add(hn::LoadU(Words(), firstNodes + i), hn::BitCast(Words(), bin)), Words(),
                nodes + i);
   }

@@ -7,6 +7,8 @@
 
 #include <algorithm>
 
+#include "image_processing/core/simd.h"
+
 HWY_BEFORE_NAMESPACE();
 namespace pelorin::image_processing::HWY_NAMESPACE {
 namespace {
@@ -25,7 +27,7 @@ std::size_t findPlaces(const float* lightness, std::size_t count, std::uint16_t*
     const auto bins = [&](std::size_t at) HWY_ATTR {
       const auto place = hn::Mul(hn::LoadU(Floats(), lightness + at),
                                  hn::Set(Floats(), static_cast<float>(lightnessBins - 1)));
-      return hn::ConvertTo(Ints(), place);
+      return simd::truncate(place);
     };
     const auto place = hn::Add(bins(i), hn::ShiftLeft<6>(bins(i + lanes)));
     hn::StoreU(hn::DemoteTo(halves, place), halves, places + i / 2);
