@@ -67,6 +67,7 @@ HWY_INLINE void blurLightness(const float* bell, float* cell) {
     F sums[held];
     for (F& sum : sums) sum = hn::Zero(d);
     for (std::size_t source = 0; source < gridBins; ++source) {
+      if (before[source] == 0) continue;  // an empty node adds 0 as well
       const F node = hn::BitCast(d, hn::Set(nodes, before[source]));
       const float* const weights = bell + 2 * (gridBins - 1 - source) + first;
       for (std::size_t i = 0; i < held; ++i) {
