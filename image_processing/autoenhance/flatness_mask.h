@@ -21,9 +21,9 @@ template <typename TB, typename TL>
 void computeFlatnessMask(const Image<float>& lightness, const Image<TB>& smoothed, int radius,
                          Image<TL>& mask);
 
-/// The same from rows that are made when they are asked for. The rows are those of `mask`; each is
-/// asked for twice or less where `radius` is below its distance from the upper and lower border,
-/// first the one of `smoothed`, then the one of `lightness`.
+/// The same from rows that are made when they are asked for, about once each and from the top but
+/// near the borders. Of a row, the smoothing is asked for first. The picture has the size of
+/// `mask`.
 template <typename TB, typename TL>
 void computeFlatnessMask(RowSource<float>& lightness, RowSource<TB>& smoothed, int radius,
                          Image<TL>& mask);

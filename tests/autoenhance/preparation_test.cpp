@@ -116,7 +116,7 @@ TYPED_TEST(Preparation, IsItsDefinitionAtAnySize) {
                                       {160u, 129u},
                                       {515u, 40u},
                                       {1100u, 45u},
-                                      {641u, 480u}}) {
+                                      {321u, 241u}}) {
     SCOPED_TRACE(testing::Message() << width << " x " << height);
     for (const auto& photo : {test_support::photoLikePicture(width, height, 7),
                               test_support::noisePicture(width, height, 8)}) {
