@@ -7,11 +7,16 @@
 #include "bench/support/side_by_side.h"
 #include "image_processing/autoenhance/bilateral_grid.h"
 #include "image_processing/autoenhance/build_tone_curve.h"
+#include "image_processing/autoenhance/companding_steps.h"
 #include "image_processing/autoenhance/enhance_row.h"
 #include "image_processing/autoenhance/flatness_mask.h"
+#include "image_processing/autoenhance/grid_blur.h"
+#include "image_processing/autoenhance/grid_splat.h"
 #include "image_processing/autoenhance/image_masks.h"
 #include "image_processing/autoenhance/image_statistics.h"
 #include "image_processing/autoenhance/lab.h"
+#include "image_processing/autoenhance/lightness_histogram.h"
+#include "image_processing/autoenhance/lightness_rows.h"
 
 namespace pelorin::bench {
 namespace {
@@ -19,16 +24,17 @@ namespace {
 using namespace image_processing;
 using Quantized = QuantizedFloat<unsigned char>;
 
+Image<float> lightnessByDefinition(const Image<RGBA8Pixel>& photo) {
+  Image<float> lightness(photo.width, photo.height);
+  for (std::size_t i = 0; i < photo.pixelCount(); ++i) {
+    const RGBA8Pixel& p = photo.data.get()[i];
+    lightness.data.get()[i] = lightnessOf(colourTables(), p.r, p.g, p.b) / 100.0f;
+  }
+  return lightness;
+}
+
 const Image<float>& lightness() {
-  static const Image<float> plane = [] {
-    const Image<RGBA8Pixel>& photo = twelveMegapixels();
-    Image<float> lightness(photo.width, photo.height);
-    for (std::size_t i = 0; i < photo.pixelCount(); ++i) {
-      const RGBA8Pixel& p = photo.data.get()[i];
-      lightness.data.get()[i] = lightnessOf(colourTables(), p.r, p.g, p.b) / 100.0f;
-    }
-    return lightness;
-  }();
+  static const Image<float> plane = lightnessByDefinition(twelveMegapixels());
   return plane;
 }
 
@@ -53,35 +59,108 @@ void copyOfThePicture(benchmark::State& state) {
 }
 BENCHMARK(copyOfThePicture)->Unit(benchmark::kMillisecond);
 
-void statistics(benchmark::State& state) {
-  for (auto _ : state) {
-    ImageStatistics statistics;
-    analyzeImage(twelveMegapixels(), {}, statistics);
-    benchmark::DoNotOptimize(statistics.cdf.data());
-  }
-  reportPerPixel(state, twelveMegapixels().pixelCount());
+#define SIDE_BY_SIDE UseManualTime()->Iterations(turns)->Unit(benchmark::kMillisecond)
+
+void countByDefinition(const Image<RGBA8Pixel>& photo, LightnessHistogram& histogram) {
+  std::vector<std::uint16_t> steps(photo.pixelCount());
+  compandingStepsScalar(photo.data.get(), steps.data(), steps.size());
+  histogram.add(steps.data(), steps.size());
 }
-BENCHMARK(statistics)->Unit(benchmark::kMillisecond);
+
+void statistics(benchmark::State& state) {
+  const Image<RGBA8Pixel>& photo = twelveMegapixels();
+  LightnessHistogram histogram(lightnessBins, lightnessScale);
+  ImageStatistics statistics;
+  sideBySide(
+      state, photo, [&] { countByDefinition(photo, histogram); },
+      [&] { analyzeImage(photo, {}, statistics); });
+}
+BENCHMARK(statistics)->SIDE_BY_SIDE;
+
+void lightnessRows(benchmark::State& state) {
+  const Image<RGBA8Pixel>& photo = twelveMegapixels();
+  sideBySide(
+      state, photo, [&] { benchmark::DoNotOptimize(lightnessByDefinition(photo).data.get()); },
+      [&] {
+        LightnessRows rows(photo);
+        for (std::uint32_t y = 0; y < photo.height; ++y) benchmark::DoNotOptimize(rows.row(y));
+      });
+}
+BENCHMARK(lightnessRows)->SIDE_BY_SIDE;
+
+constexpr float cellSize = 75.0f;
+
+Grid splatted() {
+  Grid grid = makeGrid(lightness().width, lightness().height, cellSize);
+  splat(lightness(), cellSize, grid);
+  return grid;
+}
+
+void gridSplat(benchmark::State& state) {
+  Grid grid = makeGrid(lightness().width, lightness().height, cellSize);
+  sideBySide(
+      state, lightness(), [&] { splatScalar(lightness(), cellSize, grid); },
+      [&] { splat(lightness(), cellSize, grid); });
+}
+BENCHMARK(gridSplat)->SIDE_BY_SIDE;
+
+void gridBlur(benchmark::State& state) {
+  Grid grid = splatted();
+  sideBySide(
+      state, lightness(), [&] { blurScalar(grid, 0.7f); }, [&] { blur(grid, 0.7f); });
+}
+BENCHMARK(gridBlur)->SIDE_BY_SIDE;
 
 template <typename T>
-void bilateralGrid(benchmark::State& state) {
-  const Image<float>& plane = lightness();
-  Image<T> smoothed(plane.width, plane.height);
-  for (auto _ : state) bilateralFilterGridApproximation(plane, 0.7f, 75.0f, smoothed);
-  reportPerPixel(state, plane.pixelCount());
+void gridSlice(benchmark::State& state) {
+  Grid grid = splatted();
+  blur(grid, 0.7f);
+  Image<T> smoothed(lightness().width, lightness().height);
+  smoothed.set(T());
+  sideBySide(
+      state, lightness(), [&] { sliceScalar(grid, lightness(), cellSize, smoothed); },
+      [&] { slice(grid, lightness(), cellSize, smoothed); });
 }
-BENCHMARK(bilateralGrid<float>)->Unit(benchmark::kMillisecond);
-BENCHMARK(bilateralGrid<Quantized>)->Unit(benchmark::kMillisecond);
+BENCHMARK(gridSlice<float>)->SIDE_BY_SIDE;
+BENCHMARK(gridSlice<Quantized>)->SIDE_BY_SIDE;
 
 template <typename T>
 void flatnessMask(benchmark::State& state) {
-  const Image<float>& plane = lightness();
-  Image<T> mask(plane.width, plane.height);
-  for (auto _ : state) computeFlatnessMask(plane, *masks<T>().bilateralMask, 8, mask);
-  reportPerPixel(state, plane.pixelCount());
+  const Image<T>& smoothed = *masks<T>().bilateralMask;
+  Image<T> mask(smoothed.width, smoothed.height);
+  mask.set(T());
+  sideBySide(
+      state, lightness(), [&] { computeFlatnessMaskScalar(lightness(), smoothed, 8, mask); },
+      [&] { computeFlatnessMask(lightness(), smoothed, 8, mask); });
 }
-BENCHMARK(flatnessMask<float>)->Unit(benchmark::kMillisecond);
-BENCHMARK(flatnessMask<Quantized>)->Unit(benchmark::kMillisecond);
+BENCHMARK(flatnessMask<float>)->SIDE_BY_SIDE;
+BENCHMARK(flatnessMask<Quantized>)->SIDE_BY_SIDE;
+
+/// All of it, into masks that are there already; `init` in auto_enhance_bench makes new ones.
+template <typename T>
+void preparation(benchmark::State& state) {
+  const Image<RGBA8Pixel>& photo = twelveMegapixels();
+  Image<T> bilateral(photo.width, photo.height), ltm(photo.width, photo.height);
+  bilateral.set(T());
+  ltm.set(T());
+  LightnessHistogram histogram(lightnessBins, lightnessScale);
+  const auto byDefinition = [&] {
+    countByDefinition(photo, histogram);
+    const Image<float> plane = lightnessByDefinition(photo);
+    Grid grid = makeGrid(photo.width, photo.height, cellSize);
+    splatScalar(plane, cellSize, grid);
+    blurScalar(grid, 0.7f);
+    sliceScalar(grid, plane, cellSize, bilateral);
+    computeFlatnessMaskScalar(plane, bilateral, 8, ltm);
+  };
+  const auto fast = [&] {
+    LightnessCounter counter;
+    computeMasksByGrid(photo, {}, defaultFilterConfigValue, bilateral, ltm, counter);
+  };
+  sideBySide(state, photo, byDefinition, fast);
+}
+BENCHMARK(preparation<float>)->SIDE_BY_SIDE;
+BENCHMARK(preparation<Quantized>)->SIDE_BY_SIDE;
 
 /// The pass over the pixels as one slider position asks for it.
 template <typename T, bool withMasks>

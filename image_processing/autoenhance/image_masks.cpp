@@ -35,34 +35,6 @@ void blendFacesIntoMask(const ImageMetadata& metadata, const Image<RGBA8Pixel>& 
   for (const auto& face : metadata.faces) blendFaceIntoMask(*face, photo, mask);
 }
 
-/// Through the grid; counts the pixels on the way. Two passes over the photo: neither its lightness
-/// nor the table of sums ever exists as a whole.
-template <typename TB, typename TL>
-void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
-                        const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
-                        LightnessCounter& counter) {
-  if (photo.pixelCount() == 0) return;
-  LightnessRows lightness(photo);
-  const float cellSize = gridCellSize(spatialExtent(photo, config));
-  Grid grid = makeGrid(photo.width, photo.height, cellSize);
-  GridSplatter splatter(grid, photo.width, cellSize);
-  for (std::uint32_t y = 0; y < photo.height; ++y) {
-    const float* const row = lightness.row(y);
-    splatter.addRow(y, row);
-    counter.add(row, photo.width);
-  }
-  blur(grid, config.bilateralRange);
-
-  SmoothedRows<TB> smoothed(grid, cellSize, lightness, bilateral);
-  if (config.ltmMaskAmount > 0.0f) {
-    computeFlatnessMask<TB, TL>(lightness, smoothed, config.ltmMaskRadius, ltm);
-  } else {
-    fillWithZero(ltm);
-  }
-  smoothed.makeUpTo(photo.height);
-  blendFacesIntoMask(metadata, photo, ltm);
-}
-
 /// Through the exact filter.
 template <typename TB, typename TL>
 void computeMasksExactly(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
@@ -100,6 +72,32 @@ bool computeMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
 }  // namespace
 
 template <typename TB, typename TL>
+void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
+                        const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
+                        LightnessCounter& counter) {
+  if (photo.pixelCount() == 0) return;
+  LightnessRows lightness(photo);
+  const float cellSize = gridCellSize(spatialExtent(photo, config));
+  Grid grid = makeGrid(photo.width, photo.height, cellSize);
+  GridSplatter splatter(grid, photo.width, cellSize);
+  for (std::uint32_t y = 0; y < photo.height; ++y) {
+    const float* const row = lightness.row(y);
+    splatter.addRow(y, row);
+    counter.add(row, photo.width);
+  }
+  blur(grid, config.bilateralRange);
+
+  SmoothedRows<TB> smoothed(grid, cellSize, lightness, bilateral);
+  if (config.ltmMaskAmount > 0.0f) {
+    computeFlatnessMask<TB, TL>(lightness, smoothed, config.ltmMaskRadius, ltm);
+  } else {
+    fillWithZero(ltm);
+  }
+  smoothed.makeUpTo(photo.height);
+  blendFacesIntoMask(metadata, photo, ltm);
+}
+
+template <typename TB, typename TL>
 void computeImageMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                        const FilterConfig& config, ImageMasks<TB, TL>& masks) {
   LightnessCounter unused;
@@ -130,6 +128,12 @@ void computeLtmMask(const ImageMetadata& metadata, const Image<RGBA8Pixel>& phot
   blendFacesIntoMask(metadata, photo, mask);
 }
 
+template void computeMasksByGrid(const Image<RGBA8Pixel>&, const ImageMetadata&,
+                                 const FilterConfig&, Image<float>&, Image<float>&,
+                                 LightnessCounter&);
+template void computeMasksByGrid(const Image<RGBA8Pixel>&, const ImageMetadata&,
+                                 const FilterConfig&, Image<Quantized>&, Image<Quantized>&,
+                                 LightnessCounter&);
 template void computeImageMasks(const Image<RGBA8Pixel>&, const ImageMetadata&, const FilterConfig&,
                                 ImageMasks<float, float>&);
 template void computeImageMasks(const Image<RGBA8Pixel>&, const ImageMetadata&, const FilterConfig&,

@@ -33,6 +33,15 @@ void prepareImage(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                   const FilterConfig& config, ImageStatistics& statistics,
                   ImageMasks<TB, TL>& masks);
 
+/// Computes both masks through the grid and counts the photo's pixels on the way. Two passes over
+/// the photo: neither its lightness nor the table of sums ever exists as a whole.
+/// @param bilateral, ltm  written; of the photo's size.
+/// @throws std::bad_alloc.
+template <typename TB, typename TL>
+void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
+                        const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
+                        LightnessCounter& counter);
+
 /// Fills the LTM mask: flatness when `amount` is above 0, else 0, then the faces one by one, each
 /// blending into what the one before left.
 /// @param lightness  of the photo / 100; `bilateral` its smoothing; `mask` written. All of one
