@@ -54,7 +54,6 @@ inline std::int64_t nearestNode(std::uint32_t position, float cellSize, std::int
 /// The nodes before and after a pixel position, and how far it lies between them. Beyond the last
 /// node both are that node, and the fraction may be above 1 without harm.
 struct GridNeighbours {
-  GridNeighbours() = default;
   GridNeighbours(std::uint32_t position, float cellSize, std::int64_t nodes) {
     const float place = static_cast<float>(position) / cellSize;
     before = std::clamp<std::int64_t>(truncateTo<std::int32_t>(place), 0, nodes - 1);
