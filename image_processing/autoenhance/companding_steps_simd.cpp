@@ -4,7 +4,6 @@
 
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "image_processing/autoenhance/companding_steps_simd.cpp"
-#include <hwy/cache_control.h>
 #include <hwy/foreach_target.h>  // compiles the rest of this file once per instruction set
 #include <hwy/highway.h>
 
@@ -12,6 +11,7 @@
 #include <bit>
 
 #include "image_processing/autoenhance/colour_tables.h"
+#include "image_processing/core/prefetch.h"
 #include "image_processing/core/simd.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -37,13 +37,6 @@ struct Shares {
     }
   }
 };
-
-/// Rows of a photo are read one by one with other work between them, and so are always cold. May
-/// look beyond the photo: a prefetch reads nothing.
-HWY_INLINE void prefetchBeyond(const RGBA8Pixel* pixels) {
-  constexpr std::uintptr_t distance = 4096;
-  hwy::Prefetch(reinterpret_cast<const void*>(reinterpret_cast<std::uintptr_t>(pixels) + distance));
-}
 
 HWY_INLINE void storeSteps(hn::Vec<Floats> red, hn::Vec<Floats> green, hn::Vec<Floats> blue,
                            std::uint16_t* steps) {
@@ -118,7 +111,7 @@ std::size_t permutedSteps(const RGBA8Pixel* pixels, std::uint16_t* steps, std::s
     __m512i p[4];
     for (std::size_t j = 0; j < 4; ++j) {
       p[j] = _mm512_loadu_si512(pixels + i + 16 * j);
-      prefetchBeyond(pixels + i + 16 * j);
+      prefetchAhead(pixels + i + 16 * j);
     }
     hn::Vec<Floats> shares[3][4];
     for (std::size_t channel = 0; channel < 3; ++channel) {
@@ -145,7 +138,8 @@ void compandingSteps(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t
   const auto byte = hn::Set(Words(), 0xFFu);
   std::size_t i = permutedSteps(pixels, steps, count);
   for (; i + lanes <= count; i += lanes) {
-    if (i % 16 == 0) prefetchBeyond(pixels + i);
+    // Rows are read with other work between them, and so are always cold.
+    if (i % 16 == 0) prefetchAhead(pixels + i);
     // Red in the low byte: every target is little-endian.
     const auto p = hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(pixels + i));
     const auto share = [&](const float* table, auto word) HWY_ATTR {

@@ -26,7 +26,8 @@ HWY_INLINE F loadMask(const float* mask) {
 HWY_INLINE F loadMask(const QuantizedFloat<unsigned char>* mask) {
   const hn::Rebind<std::uint8_t, Floats> bytes;
   const auto stored = hn::LoadU(bytes, reinterpret_cast<const std::uint8_t*>(mask));
-  return simd::over255(hn::ConvertTo(Floats(), hn::PromoteTo(Ints(), stored)));
+  return simd::divide(hn::ConvertTo(Floats(), hn::PromoteTo(Ints(), stored)),
+                      simd::Divisor(255.0f));
 }
 
 template <typename T>

@@ -75,16 +75,6 @@ HWY_INLINE V clampTo(V value, V low, V high) {
   return hn::Min(hn::Max(value, low), high);
 }
 
-/// A byte's value in [0, 1], byte / 255 as IEEE rounds it: the reciprocal is split so that the
-/// first product is exact, and no byte comes out wrong.
-template <class V>
-HWY_INLINE V over255(V byte) {
-  const hn::DFromV<V> d;
-  constexpr float high = 257.0f / 65536.0f;
-  constexpr float low = static_cast<float>(1.0 / 255.0 - 257.0 / 65536.0);
-  return hn::Add(hn::Mul(byte, hn::Set(d, high)), hn::Mul(byte, hn::Set(d, low)));
-}
-
 #if HWY_TARGET != HWY_SCALAR  // where a vector has a single lane
 /// A vector of floats from groups of four: group g is read at `at(g)`.
 template <class D, class At>
