@@ -1,41 +1,44 @@
+// Green histograms of 12 megapixels: photo-like, of one colour (every pixel meets the counter just
+// written), noise (no two neighbours alike).
 #include <benchmark/benchmark.h>
 
+#include "bench/support/per_pixel.h"
+#include "bench/support/side_by_side.h"
 #include "image_processing/dupe/green_cdf.h"
 #include "tests/support/pictures.h"
 
-namespace pelorin::image_processing {
+namespace pelorin::bench {
 namespace {
 
-// A 12-megapixel picture: photo-like, of one colour (every pixel meets the counter just written),
-// noise (no two neighbours alike).
-enum Kind { photo, flat, noise };
+using namespace image_processing;
 
-Image<RGBA8Pixel> picture(Kind kind) {
-  constexpr std::uint32_t width = 4000, height = 3000;
-  if (kind == flat) return test_support::flatPicture(width, height, {10, 120, 30, 255});
-  if (kind == noise) return test_support::noisePicture(width, height, 1);
-  return test_support::photoLikePicture(width, height, 1);
-}
-
-void run(benchmark::State& state, void (*compute)(const Image<RGBA8Pixel>&, GreenCDF&)) {
-  const Image<RGBA8Pixel> image = picture(static_cast<Kind>(state.range(0)));
+void greenCdf(benchmark::State& state, const Image<RGBA8Pixel>& image) {
   GreenCDF cdf;
-  for (auto _ : state) {
-    compute(image, cdf);
-    benchmark::DoNotOptimize(cdf);
-  }
-  state.SetItemsProcessed(state.iterations() * static_cast<std::int64_t>(image.pixelCount()));
+  sideBySide(
+      state, image,
+      [&] {
+        computeGreenCDFScalar(image, cdf);
+        benchmark::DoNotOptimize(cdf);
+      },
+      [&] {
+        computeGreenCDF(image, cdf);
+        benchmark::DoNotOptimize(cdf);
+      });
 }
 
-void greenCDFScalar(benchmark::State& state) {
-  run(state, computeGreenCDFScalar);
+void greenCdfOfPhoto(benchmark::State& state) {
+  greenCdf(state, twelveMegapixels());
 }
-void greenCDF(benchmark::State& state) {
-  run(state, computeGreenCDF);
+void greenCdfOfOneColour(benchmark::State& state) {
+  greenCdf(state, test_support::flatPicture(4000, 3000, {10, 120, 30, 255}));
+}
+void greenCdfOfNoise(benchmark::State& state) {
+  greenCdf(state, test_support::noisePicture(4000, 3000, 1));
 }
 
-BENCHMARK(greenCDFScalar)->ArgName("photo_flat_noise")->DenseRange(photo, noise);
-BENCHMARK(greenCDF)->ArgName("photo_flat_noise")->DenseRange(photo, noise);
+BENCHMARK(greenCdfOfPhoto)->UseManualTime()->Iterations(turns)->Unit(benchmark::kMillisecond);
+BENCHMARK(greenCdfOfOneColour)->UseManualTime()->Iterations(turns)->Unit(benchmark::kMillisecond);
+BENCHMARK(greenCdfOfNoise)->UseManualTime()->Iterations(turns)->Unit(benchmark::kMillisecond);
 
 }  // namespace
-}  // namespace pelorin::image_processing
+}  // namespace pelorin::bench

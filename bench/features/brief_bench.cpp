@@ -1,6 +1,7 @@
 #include <benchmark/benchmark.h>
 
 #include "bench/features/grey_pictures.h"
+#include "bench/support/side_by_side.h"
 #include "image_processing/features/brief.h"
 #include "image_processing/features/brief_bits.h"
 
@@ -16,39 +17,28 @@ std::vector<xy> corners(const image_processing::Image<unsigned char>& image) {
   return result;
 }
 
-void reportPerCorner(benchmark::State& state, std::size_t count) {
-  using benchmark::Counter;
-  state.counters["per_corner"] =
-      Counter(static_cast<double>(count), Counter::kIsIterationInvariantRate | Counter::kInvert);
-}
-
-void briefBitsScalar(benchmark::State& state) {
-  const auto image = greyPicture(photo);
-  const auto positions = corners(image);
-  for (auto _ : state) {
-    for (const xy& p : positions) {
-      benchmark::DoNotOptimize(
-          image_processing::briefBitsScalar(image.row(p.y) + p.x, image.width));
-    }
-  }
-  reportPerCorner(state, positions.size());
-}
-
+// Times are for a corner, not for a pixel.
 void brief(benchmark::State& state) {
   const auto image = greyPicture(photo);
   const auto positions = corners(image);
   std::vector<image_processing::BriefDescriptor> descriptors;
-  for (auto _ : state) {
-    descriptors.clear();
-    image_processing::brief(positions.data(), static_cast<int>(positions.size()), image,
-                            descriptors);
-    benchmark::DoNotOptimize(descriptors.data());
-  }
-  reportPerCorner(state, positions.size());
+  sideBySide(
+      state, positions.size(), image.data.get(), image.byteSize(),
+      [&] {
+        for (const xy& p : positions) {
+          benchmark::DoNotOptimize(
+              image_processing::briefBitsScalar(image.row(p.y) + p.x, image.width));
+        }
+      },
+      [&] {
+        descriptors.clear();
+        image_processing::brief(positions.data(), static_cast<int>(positions.size()), image,
+                                descriptors);
+        benchmark::DoNotOptimize(descriptors.data());
+      });
 }
 
-BENCHMARK(briefBitsScalar);
-BENCHMARK(brief);
+BENCHMARK(brief)->UseManualTime()->Iterations(turns)->Unit(benchmark::kMillisecond);
 
 }  // namespace
 }  // namespace pelorin::bench

@@ -1,10 +1,11 @@
+// Corners of pictures from full of detail to smooth: whole detectors, and the scores of all rows.
 #include <benchmark/benchmark.h>
 
 #include <cstdlib>
 #include <vector>
 
 #include "bench/features/grey_pictures.h"
-#include "bench/support/per_pixel.h"
+#include "bench/support/side_by_side.h"
 #include "image_processing/features/fast.h"
 #include "image_processing/features/fast_rows.h"
 
@@ -13,11 +14,6 @@ namespace {
 
 constexpr int threshold = 20;
 
-void finish(benchmark::State& state, const image_processing::Image<unsigned char>& image) {
-  reportPerPixel(state, image.pixelCount());
-  state.SetLabel(nameOf(static_cast<GreyPicture>(state.range(0))));
-}
-
 using Detector = xy*(const unsigned char*, int, int, int, int, int*);
 
 template <Detector* detector>
@@ -25,35 +21,38 @@ void detect(benchmark::State& state) {
   const auto image = greyPicture(static_cast<GreyPicture>(state.range(0)));
   const int width = static_cast<int>(image.width), height = static_cast<int>(image.height);
   int count = 0;
-  for (auto _ : state) {
+  sideBySide(state, image, nullptr, [&] {
     xy* const corners = detector(image.data.get(), width, height, width, threshold, &count);
     benchmark::DoNotOptimize(corners);
     std::free(corners);
-  }
+  });
   state.counters["corners"] = count;
-  finish(state, image);
+  state.SetLabel(nameOf(static_cast<GreyPicture>(state.range(0))));
 }
 
-using RowScorer = decltype(image_processing::fastScoreRow);
-
-template <RowScorer* scorer>
 void scoreRows(benchmark::State& state) {
   const auto image = greyPicture(static_cast<GreyPicture>(state.range(0)));
   std::vector<std::uint8_t> scores(image.width);
-  for (auto _ : state) {
+  const auto score = [&](auto* scoreRow) {
     for (std::uint32_t y = 3; y < image.height - 3; ++y) {
       benchmark::DoNotOptimize(
-          scorer(image.row(y), image.width, 3, image.width - 3, 9, threshold, scores.data()));
+          scoreRow(image.row(y), image.width, 3, image.width - 3, 9, threshold, scores.data()));
     }
-  }
-  finish(state, image);
+  };
+  sideBySide(
+      state, image, [&] { score(image_processing::fastScoreRowScalar); },
+      [&] { score(image_processing::fastScoreRow); });
+  state.SetLabel(nameOf(static_cast<GreyPicture>(state.range(0))));
 }
 
-BENCHMARK(scoreRows<image_processing::fastScoreRowScalar>)->DenseRange(detail, photo);
-BENCHMARK(scoreRows<image_processing::fastScoreRow>)->DenseRange(detail, photo);
-BENCHMARK(detect<fast9_detect>)->DenseRange(detail, photo);
-BENCHMARK(detect<fast9_detect_nonmax>)->DenseRange(detail, photo);
-BENCHMARK(detect<fast12_detect_nonmax>)->DenseRange(detail, photo);
+void onEveryPicture(benchmark::internal::Benchmark* row) {
+  row->DenseRange(detail, photo)->UseManualTime()->Iterations(turns)->Unit(benchmark::kMillisecond);
+}
+
+BENCHMARK(scoreRows)->Apply(onEveryPicture);
+BENCHMARK(detect<fast9_detect>)->Apply(onEveryPicture);
+BENCHMARK(detect<fast9_detect_nonmax>)->Apply(onEveryPicture);
+BENCHMARK(detect<fast12_detect_nonmax>)->Apply(onEveryPicture);
 
 }  // namespace
 }  // namespace pelorin::bench

@@ -1,7 +1,8 @@
-// The quality features of a photo and the loops they come from, as defined and fast.
+// The quality features of a photo and the loops they come from.
 #include <benchmark/benchmark.h>
 
 #include "bench/support/per_pixel.h"
+#include "bench/support/side_by_side.h"
 #include "image_processing/quality/block_features.h"
 #include "image_processing/quality/im_halve.h"
 #include "image_processing/quality/image_structure.h"
@@ -27,54 +28,55 @@ Image<float> structureOfPhoto() {
   return structure;
 }
 
-void features(benchmark::State& state, decltype(&niqeFeatures) kernel) {
+void features(benchmark::State& state) {
   const Image<RGBA8Pixel>& photo = twelveMegapixels();
-  for (auto _ : state) benchmark::DoNotOptimize(kernel(photo));
-  reportPerPixel(state, photo.pixelCount());
+  sideBySide(
+      state, photo, [&] { benchmark::DoNotOptimize(niqeFeaturesScalar(photo)); },
+      [&] { benchmark::DoNotOptimize(niqeFeatures(photo)); });
 }
 
-void grey(benchmark::State& state, decltype(&niqeGrey) kernel) {
+void grey(benchmark::State& state) {
   const Image<RGBA8Pixel>& photo = twelveMegapixels();
   Image<float> out(photo.width, photo.height);
-  for (auto _ : state) kernel(photo.data.get(), out.data.get(), out.pixelCount());
-  reportPerPixel(state, photo.pixelCount());
+  sideBySide(
+      state, photo, [&] { niqeGreyScalar(photo.data.get(), out.data.get(), out.pixelCount()); },
+      [&] { niqeGrey(photo.data.get(), out.data.get(), out.pixelCount()); });
 }
 
-void structure(benchmark::State& state, decltype(&computeImageStructure) kernel) {
+void structure(benchmark::State& state) {
   const Image<float> in = greyPhoto();
   Image<float> out(in.width, in.height);
-  for (auto _ : state) kernel(in, in.width, in.height, out);
-  reportPerPixel(state, in.pixelCount());
+  sideBySide(
+      state, in, [&] { computeImageStructure(in, in.width, in.height, out); },
+      [&] { computeImageStructure_fast(in, in.width, in.height, out); });
 }
 
-void halve(benchmark::State& state, decltype(&imHalve) kernel) {
+void halve(benchmark::State& state) {
   Image<float> image = greyPhoto();
-  for (auto _ : state) {
+  const auto run = [&](auto* kernel) {
     std::uint32_t width = image.width, height = image.height;
     kernel(image, width, height);
-  }
-  reportPerPixel(state, image.pixelCount());
+  };
+  sideBySide(
+      state, image, [&] { run(imHalveScalar); }, [&] { run(imHalve); });
 }
 
-void blocks(benchmark::State& state, decltype(&computeBlockFeatures) kernel) {
+void blocks(benchmark::State& state) {
   const Image<float> in = structureOfPhoto();
   const std::uint32_t columns = in.width / niqeBlockSize, rows = in.height / niqeBlockSize;
   Image<float> out(columns * rows, niqeFeaturesPerScale);
-  for (auto _ : state)
+  const auto run = [&](auto* kernel) {
     kernel(in, niqeFeaturesPerScale, niqeBlockSize, columns, rows, /*scale=*/0, out);
-  reportPerPixel(state, in.pixelCount());
+  };
+  sideBySide(
+      state, in, [&] { run(computeBlockFeaturesScalar); }, [&] { run(computeBlockFeatures); });
 }
 
-BENCHMARK_CAPTURE(features, scalar, niqeFeaturesScalar)->Unit(benchmark::kMillisecond);
-BENCHMARK_CAPTURE(features, fast, niqeFeatures)->Unit(benchmark::kMillisecond);
-BENCHMARK_CAPTURE(grey, scalar, niqeGreyScalar)->Unit(benchmark::kMillisecond);
-BENCHMARK_CAPTURE(grey, fast, niqeGrey)->Unit(benchmark::kMillisecond);
-BENCHMARK_CAPTURE(structure, scalar, computeImageStructure)->Unit(benchmark::kMillisecond);
-BENCHMARK_CAPTURE(structure, fast, computeImageStructure_fast)->Unit(benchmark::kMillisecond);
-BENCHMARK_CAPTURE(halve, scalar, imHalveScalar)->Unit(benchmark::kMillisecond);
-BENCHMARK_CAPTURE(halve, fast, imHalve)->Unit(benchmark::kMillisecond);
-BENCHMARK_CAPTURE(blocks, scalar, computeBlockFeaturesScalar)->Unit(benchmark::kMillisecond);
-BENCHMARK_CAPTURE(blocks, fast, computeBlockFeatures)->Unit(benchmark::kMillisecond);
+BENCHMARK(features)->UseManualTime()->Iterations(turns)->Unit(benchmark::kMillisecond);
+BENCHMARK(grey)->UseManualTime()->Iterations(turns)->Unit(benchmark::kMillisecond);
+BENCHMARK(structure)->UseManualTime()->Iterations(turns)->Unit(benchmark::kMillisecond);
+BENCHMARK(halve)->UseManualTime()->Iterations(turns)->Unit(benchmark::kMillisecond);
+BENCHMARK(blocks)->UseManualTime()->Iterations(turns)->Unit(benchmark::kMillisecond);
 
 }  // namespace
 }  // namespace pelorin::bench
