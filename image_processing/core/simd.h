@@ -53,6 +53,20 @@ HWY_INLINE V divide(V a, const Divisor& b) {
 #endif
 }
 
+/// The square root rounded as IEEE asks; lane by lane where `divide` goes so.
+template <class V>
+HWY_INLINE V squareRoot(V a) {
+#if HWY_ARCH_ARM_V7
+  const hn::DFromV<V> d;
+  HWY_ALIGN float lanes[hn::MaxLanes(d)];
+  hn::Store(a, d, lanes);
+  for (size_t i = 0; i < hn::Lanes(d); ++i) lanes[i] = __builtin_sqrtf(lanes[i]);
+  return hn::Load(d, lanes);
+#else
+  return hn::Sqrt(a);
+#endif
+}
+
 /// Toward zero, for floats that an `std::int32_t` can hold: `hn::ConvertTo` without the three
 /// instructions that saturate the others.
 template <class V, class D = hn::RebindToSigned<hn::DFromV<V>>>

@@ -1,10 +1,9 @@
 #include "image_processing/filters/apply_look.h"
 
 #include <algorithm>
-#include <optional>
+#include <vector>
 
-#include "image_processing/filters/look_blocks.h"
-#include "image_processing/filters/look_planes.h"
+#include "image_processing/filters/direct_look.h"
 #include "image_processing/filters/look_tables.h"
 #include "image_processing/filters/vignette_coordinates.h"
 #include "image_processing/filters/vignette_rows.h"
@@ -12,10 +11,20 @@
 namespace pelorin::image_processing {
 namespace {
 
-// Filling the rows that a picture needs costs about as much as 400 pixels for each possible row.
+// Filling a table takes about as long as it saves on 400 pixels.
 bool tablesPay(const Look& look, std::size_t pixels) {
-  const std::size_t rows = look.vignette == nullptr ? 1 : look.vignette->samples().size();
-  return look.mix == ChannelMix::none && pixels >= 400 * rows;
+  const std::size_t tables = look.vignette == nullptr ? 1 : look.vignette->samples().size();
+  return look.mix == ChannelMix::none && pixels >= 400 * tables;
+}
+
+// Calls `row(from, to, count)` for the pixels of each row of `source` that both images have.
+template <typename Row>
+void forEachRow(const Image<RGBA8Pixel>& source, Image<RGBA8Pixel>& output, Row row) {
+  const std::size_t pixels = std::min(source.pixelCount(), output.pixelCount());
+  for (std::size_t first = 0; first < pixels; first += source.width) {
+    row(source.data.get() + first, output.data.get() + first,
+        std::min<std::size_t>(source.width, pixels - first));
+  }
 }
 
 }  // namespace
@@ -25,26 +34,33 @@ void applyLook(const Look& look, const Image<RGBA8Pixel>& source, Image<RGBA8Pix
   const bool byTables = tablesPay(look, pixels);
   const VignetteCoordinates coordinates(source.width, source.height, look.maskRadius);
   if ((look.vignette != nullptr && !VignetteRows::canCover(coordinates)) ||
-      (!byTables && !LookPlanes::canCompute(look))) {
+      (!byTables && !DirectLook::canCompute(look))) {
     applyLookScalar(look, source, output);
     return;
   }
 
-  std::optional<VignetteRows> rows;
-  if (look.vignette != nullptr) rows.emplace(coordinates, source.width, *look.vignette);
-  VignetteRows* const rowsOrNone = rows.has_value() ? &*rows : nullptr;
-  if (!byTables) {
-    const LookPlanes planes(look);
-    forEachLookBlock(source, output, rowsOrNone, [&](auto... block) { planes.apply(block...); });
+  if (look.vignette == nullptr && byTables) {
+    applyLookTable(lookTable(look), source.data.get(), output.data.get(), pixels);
     return;
   }
-  LookTables tables(look);
   if (look.vignette == nullptr) {
-    applyLookTable(tables.at(0), source.data.get(), output.data.get(), pixels);
+    applyDirectLook(DirectLook(look), {}, source.data.get(), output.data.get(), pixels);
     return;
   }
-  forEachLookBlock(source, output, rowsOrNone,
-                   [&](auto... block) { applyLookTables(tables, block...); });
+  VignetteRows rows(coordinates, source.width, *look.vignette);
+  if (byTables) {
+    const std::vector<LookTable> tables = lookTables(look);
+    forEachRow(source, output, [&](auto... pixelsOfRow) {
+      applyLookTables(tables.data(), rows.row(), pixelsOfRow...);
+      rows.advance();
+    });
+    return;
+  }
+  const DirectLook direct(look);
+  forEachRow(source, output, [&](auto... pixelsOfRow) {
+    applyDirectLook(direct, rows.row(), pixelsOfRow...);
+    rows.advance();
+  });
 }
 
 }  // namespace pelorin::image_processing

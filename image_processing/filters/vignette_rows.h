@@ -1,19 +1,23 @@
 #pragma once
 
-#include <algorithm>
 #include <cmath>
-#include <cstddef>
 #include <cstdint>
 #include <vector>
 
-#include "image_processing/core/image.h"
 #include "image_processing/filters/look.h"
 #include "image_processing/filters/vignette_coordinates.h"
 
 namespace pelorin::image_processing {
 
-/// Which sample of its mask a vignette takes at each pixel, a row at a time: the squares of the
-/// horizontal coordinates are formed once for all rows.
+/// The coordinates of a vignette along one row of the picture.
+struct VignetteRow {
+  const float* uSquares;  ///< Squared horizontal coordinates, one a column.
+  float vSquare;          ///< The squared vertical coordinate.
+  float lastSample;       ///< Index of the mask's last sample.
+};
+
+/// The coordinates of a vignette row by row: the squares of the horizontal ones are formed once for
+/// all rows.
 class VignetteRows {
  public:
   /// Whether the coordinates are numbers all over the picture. Infinite ones are fine; a step that
@@ -37,18 +41,10 @@ class VignetteRows {
     }
   }
 
-  void advanceToNextRow() { v_ += step_; }
+  void advance() { v_ += step_; }
 
-  /// The sample indices of `count` pixels of the current row.
-  void indices(std::size_t firstColumn, std::size_t count, std::int32_t* samples) const {
-    const float vSquare = v_ * v_;
-    const float* const uSquare = uSquares_.data() + firstColumn;
-    for (std::size_t i = 0; i < count; ++i) {
-      // The mask's domain is [0, 1], so its index is truncated from here.
-      const float position = (uSquare[i] + vSquare) * lastSample_;
-      samples[i] = static_cast<std::int32_t>(std::min(position, lastSample_));
-    }
-  }
+  /// The current row; good until this is gone.
+  VignetteRow row() const { return {uSquares_.data(), v_ * v_, lastSample_}; }
 
  private:
   float step_;

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <bit>
+#include <cmath>
 #include <cstdint>
 
 #undef HWY_TARGET_INCLUDE
@@ -37,6 +38,17 @@ std::size_t wrongQuotients(float divisor, float first, std::uint32_t count) {
   return wrong;
 }
 
+/// How many of the roots of 0, 1/256 ... 255 differ from those of the C library.
+std::size_t wrongRoots() {
+  const hn::ScalableTag<float> floats;
+  std::size_t wrong = 0;
+  for (int i = 0; i < 255 * 256; ++i) {
+    const float x = static_cast<float>(i) / 256.0f;
+    wrong += hn::GetLane(simd::squareRoot(hn::Set(floats, x))) != std::sqrt(x);
+  }
+  return wrong;
+}
+
 }  // namespace
 }  // namespace pelorin::image_processing::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();
@@ -45,6 +57,7 @@ HWY_AFTER_NAMESPACE();
 namespace pelorin::image_processing {
 namespace {
 HWY_EXPORT(wrongQuotients);
+HWY_EXPORT(wrongRoots);
 
 // The constants that kernels divide by. Every step scales with powers of two, so that one exponent
 // stands for all.
@@ -62,6 +75,10 @@ TEST(DivideByAConstant, IsTheDivisionAtTheEndsOfItsRange) {
       EXPECT_EQ(HWY_DYNAMIC_DISPATCH(wrongQuotients)(500.0f, first, 1u << 16), 0u) << first;
     }
   });
+}
+
+TEST(SquareRoot, IsTheCLibrarys) {
+  test_support::onEveryInstructionSet([] { EXPECT_EQ(HWY_DYNAMIC_DISPATCH(wrongRoots)(), 0u); });
 }
 
 }  // namespace

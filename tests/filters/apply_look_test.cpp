@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <cstring>
 #include <limits>
@@ -9,16 +10,19 @@
 #include "image_processing/filters/low_dim_rgb_curve_filter.h"
 #include "image_processing/filters/preset_looks.h"
 #include "image_processing/filters/vignette_rows.h"
+#include "tests/support/instruction_sets.h"
 #include "tests/support/looks.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {
 namespace {
 
+using test_support::instructionSets;
 using test_support::lookOf;
 using test_support::maskOf;
 using test_support::noisePicture;
 using test_support::photoLikePicture;
+using test_support::UseInstructionSet;
 
 constexpr float infinity = std::numeric_limits<float>::infinity();
 const float nan = std::nanf("");
@@ -29,23 +33,30 @@ std::vector<Look> looksOfEveryMix(const CubicRadialMask* vignette) {
           lookOf<VintageRGBFilter>(vignette)};
 }
 
-// Both ways into outputs that hold one pixel more, which nobody may touch.
+// A view of pixels that the caller keeps.
+Image<RGBA8Pixel> viewOf(std::vector<RGBA8Pixel>& pixels, const Image<RGBA8Pixel>& sizedAs) {
+  return {sizedAs.width, sizedAs.height,
+          std::shared_ptr<RGBA8Pixel>(pixels.data(), [](RGBA8Pixel*) {})};
+}
+
+// The definition and every instruction set into outputs that hold one pixel more, which nobody may
+// touch.
 testing::AssertionResult equalsScalar(const Look& look, const Image<RGBA8Pixel>& picture) {
-  const std::size_t pixels = picture.pixelCount();
-  std::vector<RGBA8Pixel> expected(pixels + 1, RGBA8Pixel{7, 7, 7, 7});
-  std::vector<RGBA8Pixel> actual = expected;
-  const auto view = [&](std::vector<RGBA8Pixel>& of) {
-    return Image<RGBA8Pixel>(picture.width, picture.height,
-                             std::shared_ptr<RGBA8Pixel>(of.data(), [](RGBA8Pixel*) {}));
-  };
-  Image<RGBA8Pixel> expectedImage = view(expected), actualImage = view(actual);
+  const std::vector<RGBA8Pixel> untouched(picture.pixelCount() + 1, RGBA8Pixel{7, 7, 7, 7});
+  std::vector<RGBA8Pixel> expected = untouched;
+  Image<RGBA8Pixel> expectedImage = viewOf(expected, picture);
   applyLookScalar(look, picture, expectedImage);
-  applyLook(look, picture, actualImage);
-  for (std::size_t i = 0; i <= pixels; ++i) {
-    if (!(expected[i] == actual[i])) {
+  for (const std::int64_t set : instructionSets(HWY_AVX3_DL)) {
+    const UseInstructionSet use(set);
+    std::vector<RGBA8Pixel> actual = untouched;
+    Image<RGBA8Pixel> actualImage = viewOf(actual, picture);
+    applyLook(look, picture, actualImage);
+    if (std::memcmp(actual.data(), expected.data(), actual.size() * sizeof(RGBA8Pixel)) != 0) {
+      const auto bad = std::mismatch(actual.begin(), actual.end(), expected.begin()).first;
       return testing::AssertionFailure()
              << picture.width << "x" << picture.height << " mix " << static_cast<int>(look.mix)
-             << " radius " << look.maskRadius << " alpha " << look.maskAlpha << ": pixel " << i;
+             << " radius " << look.maskRadius << " alpha " << look.maskAlpha << " on "
+             << hwy::TargetName(set) << ": pixel " << bad - actual.begin();
     }
   }
   return testing::AssertionSuccess();
@@ -213,20 +224,19 @@ TEST(ApplyLook, DoesNothingOnAnEmptyImage) {
 }
 
 // Coordinates of a picture this wide differ between repeated addition and a multiplication.
-TEST(ApplyLook, GrowsItsCoordinatesByRepeatedAddition) {
-  const CubicRadialMask mask = maskOf<SummerRGBFilter>();
+TEST(VignetteRows, GrowTheirCoordinatesByRepeatedAddition) {
   const VignetteCoordinates coordinates(4000, 3000, 2.3f);
-  const VignetteRows rows(coordinates, 4000, mask);
-  float u = coordinates.firstU;
+  VignetteRows rows(coordinates, 4000, maskOf<SummerRGBFilter>());
+  float u = coordinates.firstU, v = coordinates.firstV;
   bool multiplicationDiffers = false;
-  for (int x = 0; x < 4000; ++x) {
-    const float v = coordinates.firstV;
-    std::int32_t index;
-    rows.indices(x, 1, &index);
-    ASSERT_EQ(index, mask.indexOf(u * u + v * v)) << x;
-    const float product = coordinates.firstU + static_cast<float>(x) * coordinates.step;
+  for (int i = 0; i < 3000; ++i) {
+    ASSERT_EQ(rows.row().uSquares[i], u * u) << i;
+    ASSERT_EQ(rows.row().vSquare, v * v) << i;
+    const float product = coordinates.firstU + static_cast<float>(i) * coordinates.step;
     multiplicationDiffers = multiplicationDiffers || product != u;
     u += coordinates.step;
+    v += coordinates.step;
+    rows.advance();
   }
   EXPECT_TRUE(multiplicationDiffers);
 }

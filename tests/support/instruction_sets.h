@@ -3,30 +3,56 @@
 #include <gtest/gtest.h>
 #include <hwy/highway.h>
 
+#include <cstdint>
 #include <vector>
 
 namespace pelorin::test_support {
 
-/// Calls `body` once with each instruction set that this machine has and kernels are built for,
-/// together with those it contains, since not every kernel is built for each. Where the set is
-/// chosen at build time there is one call.
-template <typename Body>
-void onEveryInstructionSet(Body body) {
 #ifdef HWY_COMPILE_ONLY_STATIC
-  body();
+constexpr bool setIsChosenAtBuildTime = true;
 #else
-  std::vector<std::int64_t> targets = hwy::SupportedAndGeneratedTargets();
-  // Some kernels are built for one more.
-  if ((hwy::SupportedTargets() & HWY_AVX3_DL) != 0) targets.push_back(HWY_AVX3_DL);
-  const std::int64_t all = hwy::SupportedTargets();
-  for (const std::int64_t target : targets) {
-    SCOPED_TRACE(hwy::TargetName(target));
-    hwy::SetSupportedTargetsForTest(all & -target);  // the better sets are the lower bits
-    body();
-    EXPECT_TRUE(hwy::GetChosenTarget().IsInitialized()) << "no kernel was called";
-    hwy::SetSupportedTargetsForTest(0);
-  }
+constexpr bool setIsChosenAtBuildTime = false;
 #endif
+
+/// The instruction sets that this machine has and kernels are built for.
+/// @param rare  further sets that the kernels under test are built for, such as HWY_AVX3_DL.
+inline std::vector<std::int64_t> instructionSets([[maybe_unused]] std::int64_t rare = 0) {
+  if constexpr (setIsChosenAtBuildTime) {
+    return {HWY_STATIC_TARGET};
+  } else {
+    std::vector<std::int64_t> sets;
+    const std::int64_t all = hwy::SupportedTargets() & (HWY_TARGETS | rare);
+    for (std::int64_t left = all; left != 0; left &= left - 1) sets.push_back(left & -left);
+    return sets;
+  }
+}
+
+/// Makes kernels use `set`, or the next best one they are built for, until the end of the scope.
+class UseInstructionSet {
+ public:
+  explicit UseInstructionSet(std::int64_t set) {
+    if constexpr (!setIsChosenAtBuildTime) {
+      hwy::SetSupportedTargetsForTest(hwy::SupportedTargets() & -set);
+    }
+  }
+  ~UseInstructionSet() {
+    if constexpr (!setIsChosenAtBuildTime) hwy::SetSupportedTargetsForTest(0);
+  }
+  UseInstructionSet(const UseInstructionSet&) = delete;
+  UseInstructionSet& operator=(const UseInstructionSet&) = delete;
+};
+
+/// Calls `body` once with each of `instructionSets(rare)`.
+template <typename Body>
+void onEveryInstructionSet(Body body, std::int64_t rare = 0) {
+  for (const std::int64_t set : instructionSets(rare)) {
+    SCOPED_TRACE(hwy::TargetName(set));
+    const UseInstructionSet use(set);
+    body();
+    if constexpr (!setIsChosenAtBuildTime) {
+      EXPECT_TRUE(hwy::GetChosenTarget().IsInitialized()) << "no kernel was called";
+    }
+  }
 }
 
 }  // namespace pelorin::test_support
