@@ -6,6 +6,7 @@
 #include <hwy/foreach_target.h>  // compiles the rest of this file once per instruction set
 #include <hwy/highway.h>
 
+#include <algorithm>
 #include <bit>
 
 HWY_BEFORE_NAMESPACE();
@@ -21,10 +22,46 @@ struct Circles {
   const std::uint8_t* centre;
   std::ptrdiff_t stride;
 
+  HWY_INLINE ByteVector middle() const { return hn::LoadU(Bytes(), centre); }
+
   template <int i>
   HWY_INLINE ByteVector pixel() const {
     constexpr xy step = fastCircle[i % 16];
     return hn::LoadU(Bytes(), centre + step.y * stride + step.x);
+  }
+
+  // Of `pairs` pairs of opposite pixels, `step` apart from the pixel `first` on: the least of the
+  // brighter ones, and the greatest of the darker ones.
+  template <int pairs, int step, int first = 0>
+  HWY_INLINE ByteVector leastOfBrighter() const {
+    if constexpr (pairs == 1) {
+      return hn::Max(pixel<first>(), pixel<first + 8>());
+    } else {
+      return hn::Min(leastOfBrighter<pairs / 2, step, first>(),
+                     leastOfBrighter<pairs / 2, step, first + pairs / 2 * step>());
+    }
+  }
+  template <int pairs, int step, int first = 0>
+  HWY_INLINE ByteVector greatestOfDarker() const {
+    if constexpr (pairs == 1) {
+      return hn::Min(pixel<first>(), pixel<first + 8>());
+    } else {
+      return hn::Max(greatestOfDarker<pairs / 2, step, first>(),
+                     greatestOfDarker<pairs / 2, step, first + pairs / 2 * step>());
+    }
+  }
+};
+
+// Circles of which some are seen as negatives, those where `negative` is 255 and not 0.
+struct BrightCircles {
+  Circles circles;
+  ByteVector negative;
+
+  HWY_INLINE ByteVector middle() const { return hn::Xor(circles.middle(), negative); }
+
+  template <int i>
+  HWY_INLINE ByteVector pixel() const {
+    return hn::Xor(circles.pixel<i>(), negative);
   }
 
   // Of `count` pixels of the circle from `first` on. Halves of equal length make all arcs of a
@@ -38,49 +75,18 @@ struct Circles {
       return hn::Min(least<first % 16, half>(), least<(first + half) % 16, count - half>());
     }
   }
-  template <int first, int count>
-  HWY_INLINE ByteVector greatest() const {
-    if constexpr (count == 1) {
-      return pixel<first>();
-    } else {
-      constexpr int half = std::bit_ceil(static_cast<unsigned>(count)) / 2;
-      return hn::Max(greatest<first % 16, half>(), greatest<(first + half) % 16, count - half>());
-    }
-  }
 
-  // The largest, over the arcs, of the least value on an arc. The arcs that start at `first` - 1
-  // and at `first` have all but one pixel in common.
-  template <int arc, int first = 0>
+  // The largest, over the arcs that start at `first` - 1, at `first` and so on, of the least value
+  // on an arc. The two arcs of a pair have all but one pixel in common.
+  template <int arc, int first = 0, int pairs = 8>
   HWY_INLINE ByteVector brightestArc() const {
-    const ByteVector either = hn::Max(pixel<first + 15>(), pixel<first + arc - 1>());
-    const ByteVector two = hn::Min(least<first, arc - 1>(), either);
-    if constexpr (first == 14) {
-      return two;
+    if constexpr (pairs == 1) {
+      const ByteVector either = hn::Max(pixel<first + 15>(), pixel<first + arc - 1>());
+      return hn::Min(least<first, arc - 1>(), either);
     } else {
-      return hn::Max(two, brightestArc<arc, first + 2>());
+      return hn::Max(brightestArc<arc, first, pairs / 2>(),
+                     brightestArc<arc, first + pairs, pairs / 2>());
     }
-  }
-  template <int arc, int first = 0>
-  HWY_INLINE ByteVector darkestArc() const {
-    const ByteVector either = hn::Min(pixel<first + 15>(), pixel<first + arc - 1>());
-    const ByteVector two = hn::Max(greatest<first, arc - 1>(), either);
-    if constexpr (first == 14) {
-      return two;
-    } else {
-      return hn::Min(two, darkestArc<arc, first + 2>());
-    }
-  }
-
-  // What remains of the brighter, or darker, pixels of two pairs of opposite ones.
-  template <int first>
-  HWY_INLINE ByteVector brighterOfOpposites() const {
-    return hn::Min(hn::Max(pixel<first>(), pixel<first + 8>()),
-                   hn::Max(pixel<first + 4>(), pixel<first + 12>()));
-  }
-  template <int first>
-  HWY_INLINE ByteVector darkerOfOpposites() const {
-    return hn::Max(hn::Min(pixel<first>(), pixel<first + 8>()),
-                   hn::Min(pixel<first + 4>(), pixel<first + 12>()));
   }
 };
 
@@ -88,29 +94,47 @@ HWY_INLINE bool allZero(ByteVector bytes) {
   return hn::AllTrue(Bytes(), hn::Eq(bytes, hn::Zero(Bytes())));
 }
 
-// False where no pixel is a corner, as four or eight pixels of the circle tell: every arc of nine
-// or more holds a pixel of each pair of opposite ones.
+// False where no pixel is a corner, as `pairs` pairs of opposite pixels tell: every arc of nine or
+// more holds a pixel of each.
+template <int pairs>
 HWY_INLINE bool mayHoldCorners(const Circles circles, ByteVector threshold) {
-  const ByteVector centre = hn::LoadU(Bytes(), circles.centre);
-  const ByteVector high = hn::SaturatedAdd(centre, threshold);
-  const ByteVector low = hn::SaturatedSub(centre, threshold);
-
-  ByteVector bright = circles.brighterOfOpposites<0>();
-  ByteVector dark = circles.darkerOfOpposites<0>();
-  if (allZero(hn::Or(hn::SaturatedSub(bright, high), hn::SaturatedSub(low, dark)))) return false;
-
-  bright = hn::Min(bright, circles.brighterOfOpposites<2>());
-  dark = hn::Max(dark, circles.darkerOfOpposites<2>());
+  const ByteVector high = hn::SaturatedAdd(circles.middle(), threshold);
+  const ByteVector low = hn::SaturatedSub(circles.middle(), threshold);
+  const ByteVector bright = circles.leastOfBrighter<pairs, 8 / pairs>();
+  const ByteVector dark = circles.greatestOfDarker<pairs, 8 / pairs>();
   return !allZero(hn::Or(hn::SaturatedSub(bright, high), hn::SaturatedSub(low, dark)));
 }
 
 template <int arc>
 HWY_INLINE ByteVector scores(const Circles circles, ByteVector threshold) {
-  const ByteVector centre = hn::LoadU(Bytes(), circles.centre);
-  const ByteVector difference = hn::Max(hn::SaturatedSub(circles.brightestArc<arc>(), centre),
-                                        hn::SaturatedSub(centre, circles.darkestArc<arc>()));
+  // Where each of the eight pairs has a bright pixel, too few are left for a dark arc; elsewhere no
+  // arc is bright. There the negative is looked at, so that arcs of one kind remain.
+  const ByteVector high = hn::SaturatedAdd(circles.middle(), threshold);
+  const ByteVector bright =
+      hn::Min(circles.leastOfBrighter<4, 2, 0>(), circles.leastOfBrighter<4, 2, 1>());
+  const auto notBright = hn::Eq(hn::SaturatedSub(bright, high), hn::Zero(Bytes()));
+  const BrightCircles positives = {circles, hn::VecFromMask(Bytes(), notBright)};
+  const ByteVector difference = hn::SaturatedSub(positives.brightestArc<arc>(), positives.middle());
   return hn::IfThenElseZero(hn::Gt(difference, threshold), difference);
 }
+
+// Columns of vectors that something is left to do for. Where corners are is too irregular for a
+// branch to be predicted, so each is kept or not without one.
+class Columns {
+ public:
+  HWY_INLINE void keepIf(bool wanted, std::size_t column) {
+    columns_[count_] = column;
+    count_ += wanted;
+  }
+  const std::size_t* begin() const { return columns_; }
+  const std::size_t* end() const { return columns_ + count_; }
+
+  static constexpr std::size_t room = 64;
+
+ private:
+  std::size_t columns_[room];
+  std::size_t count_ = 0;
+};
 
 template <int arc>
 bool scoreRow(const std::uint8_t* row, std::ptrdiff_t stride, std::size_t begin, std::size_t end,
@@ -121,16 +145,20 @@ bool scoreRow(const std::uint8_t* row, std::ptrdiff_t stride, std::size_t begin,
   }
   const ByteVector thresholds = hn::Set(Bytes(), static_cast<std::uint8_t>(threshold));
   ByteVector any = hn::Zero(Bytes());
-  for (std::size_t x = begin; x < end; x += lanes) {
-    if (x + lanes > end) x = end - lanes;  // the last vector overlaps the one before
-    const Circles circles = {row + x, stride};
-    if (!mayHoldCorners(circles, thresholds)) {
-      hn::StoreU(hn::Zero(Bytes()), Bytes(), map + x);
-      continue;
+  for (std::size_t x = begin; x < end;) {
+    Columns possible;
+    for (std::size_t tested = 0; tested < Columns::room && x < end; ++tested, x += lanes) {
+      const std::size_t column = std::min(x, end - lanes);  // the last overlaps the one before
+      hn::StoreU(hn::Zero(Bytes()), Bytes(), map + column);
+      possible.keepIf(mayHoldCorners<2>({row + column, stride}, thresholds), column);
     }
-    const ByteVector score = scores<arc>(circles, thresholds);
-    hn::StoreU(score, Bytes(), map + x);
-    any = hn::Or(any, score);
+    for (const std::size_t column : possible) {
+      const Circles circles = {row + column, stride};
+      if (!mayHoldCorners<4>(circles, thresholds)) continue;  // many in noise, else hardly any
+      const ByteVector score = scores<arc>(circles, thresholds);
+      hn::StoreU(score, Bytes(), map + column);
+      any = hn::Or(any, score);
+    }
   }
   return !allZero(any);
 }
@@ -186,14 +214,19 @@ std::size_t fastListMaxima(const std::uint8_t* above, const std::uint8_t* scores
   const Bytes bytes;
   const std::size_t lanes = hn::Lanes(bytes);
   std::size_t count = 0, x = begin;
-  for (; x + lanes <= end; x += lanes) {
-    const ByteVector score = hn::LoadU(bytes, scores + x);
-    if (allZero(score)) continue;
-    const ByteVector beside =
-        hn::Max(hn::LoadU(bytes, scores + x - 1), hn::LoadU(bytes, scores + x + 1));
-    const ByteVector neighbour =
-        hn::Max(beside, hn::Max(greatestOfThree(above + x), greatestOfThree(below + x)));
-    count += listLanes(hn::Gt(score, neighbour), x, y, corners + count);
+  while (x + lanes <= end) {
+    Columns withCorners;
+    for (std::size_t tested = 0; tested < Columns::room && x + lanes <= end; ++tested, x += lanes) {
+      withCorners.keepIf(!allZero(hn::LoadU(bytes, scores + x)), x);
+    }
+    for (const std::size_t column : withCorners) {
+      const ByteVector score = hn::LoadU(bytes, scores + column);
+      const ByteVector beside =
+          hn::Max(hn::LoadU(bytes, scores + column - 1), hn::LoadU(bytes, scores + column + 1));
+      const ByteVector neighbour = hn::Max(
+          beside, hn::Max(greatestOfThree(above + column), greatestOfThree(below + column)));
+      count += listLanes(hn::Gt(score, neighbour), column, y, corners + count);
+    }
   }
   return count + fastListMaximaScalar(above, scores, below, x, end, y, corners + count);
 }

@@ -16,6 +16,10 @@ using Scores = std::vector<std::uint8_t>;
 
 constexpr std::uint8_t untouched = 77;
 
+// Rows are worked off in pieces of 64 vectors: around one, two and more of them on every set.
+constexpr std::uint32_t wideRows[] = {1029, 1030, 1031, 1046, 1047, 1062, 2053, 2054, 2055, 2087,
+                                      4101, 4102, 4103, 4165, 4166, 4167, 8198, 8199, 8300};
+
 // `scorer` over the middle row of seven, with columns to spare on either side.
 template <typename Scorer>
 Scores scoresBy(Scorer scorer, const GreyImage& image, bool upward, int arc, int threshold,
@@ -44,6 +48,15 @@ TEST(FastScoreRow, EqualsTheScalarDefinitionOnEveryInstructionSetAtEveryWidth) {
       const int arc = 9 + static_cast<int>(width % 4);
       expectSameScores(test_support::greyNoise(width, 7, width), arc, 10);
       expectSameScores(test_support::greyPhoto(width, 7, width), arc, 10);
+    }
+  });
+}
+
+TEST(FastScoreRow, EqualsTheScalarDefinitionOnEveryInstructionSetInWideRows) {
+  onEveryInstructionSet([] {
+    for (const std::uint32_t width : wideRows) {
+      expectSameScores(test_support::greyNoise(width, 7, width), 9, 60);
+      expectSameScores(test_support::greyPhoto(width, 7, width), 9, 10);
     }
   });
 }
@@ -88,12 +101,13 @@ TEST(FastScoreRow, ScoresSolitaryPixelsOfEveryContrast) {
   });
 }
 
-// Maps with many zeros, ties and steps of one.
-Scores someScores(std::size_t width, std::uint64_t seed) {
+// Maps with many zeros, whole stretches of them if sparse, ties and steps of one.
+Scores someScores(std::size_t width, std::uint64_t seed, bool sparse = false) {
   test_support::Random random(seed);
   Scores scores(width);
   for (std::uint8_t& score : scores) {
-    score = random.below(3) == 0 ? static_cast<std::uint8_t>(250 + random.below(6)) : 0;
+    const bool corner = random.below(sparse ? 80 : 3) == 0;
+    score = corner ? static_cast<std::uint8_t>(250 + random.below(6)) : 0;
   }
   return scores;
 }
@@ -111,18 +125,30 @@ TEST(FastListCorners, EqualsTheScalarDefinitionOnEveryInstructionSet) {
   });
 }
 
+void expectSameMaxima(std::size_t width, bool sparse) {
+  const Scores above = someScores(width, width, sparse),
+               scores = someScores(width, width + 1000, sparse),
+               below = someScores(width, width + 2000, sparse);
+  std::vector<xy> expected(width, {-1, -1}), actual = expected;
+  const std::size_t count = fastListMaximaScalar(above.data(), scores.data(), below.data(), 3,
+                                                 width - 3, 5, expected.data());
+  ASSERT_EQ(
+      fastListMaxima(above.data(), scores.data(), below.data(), 3, width - 3, 5, actual.data()),
+      count);
+  ASSERT_EQ(actual, expected) << width;
+}
+
 TEST(FastListMaxima, EqualsTheScalarDefinitionOnEveryInstructionSet) {
   onEveryInstructionSet([] {
-    for (std::size_t width = 7; width <= 200; ++width) {
-      const Scores above = someScores(width, width), scores = someScores(width, width + 1000),
-                   below = someScores(width, width + 2000);
-      std::vector<xy> expected(width, {-1, -1}), actual = expected;
-      const std::size_t count = fastListMaximaScalar(above.data(), scores.data(), below.data(), 3,
-                                                     width - 3, 5, expected.data());
-      ASSERT_EQ(
-          fastListMaxima(above.data(), scores.data(), below.data(), 3, width - 3, 5, actual.data()),
-          count);
-      ASSERT_EQ(actual, expected) << width;
+    for (std::size_t width = 7; width <= 200; ++width) expectSameMaxima(width, false);
+  });
+}
+
+TEST(FastListMaxima, EqualsTheScalarDefinitionOnEveryInstructionSetInWideRows) {
+  onEveryInstructionSet([] {
+    for (const std::uint32_t width : wideRows) {
+      expectSameMaxima(width, false);
+      expectSameMaxima(width, true);
     }
   });
 }
