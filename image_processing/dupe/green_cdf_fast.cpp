@@ -2,6 +2,7 @@
 #include <cstddef>
 #include <cstdint>
 
+#include "image_processing/core/prefetch.h"
 #include "image_processing/dupe/green_cdf.h"
 
 namespace pelorin::image_processing {
@@ -10,15 +11,19 @@ namespace {
 // A counter just written is read back only after some cycles. Neighbouring pixels are mostly alike,
 // so each of them counts in a histogram of its own.
 constexpr std::size_t ways = 8;
-using Counts = std::array<std::array<std::uint32_t, 256>, ways>;
+// The last are not used: 4096 bytes apart, counters of two histograms would be taken for one.
+using Histogram = std::array<std::uint32_t, 256 + 16>;
+using Counts = std::array<Histogram, ways>;
 
 // No counter overflows within one block.
 constexpr std::size_t pixelsPerBlock = std::size_t{1} << 31;
 
 void count(const RGBA8Pixel* pixels, std::size_t pixelCount, Counts& counts) {
+  constexpr std::size_t pixelsInLine = cacheLine / sizeof(RGBA8Pixel);
   std::size_t i = 0;
-  for (; i + ways <= pixelCount; i += ways) {
-    for (std::size_t way = 0; way < ways; ++way) ++counts[way][pixels[i + way].g];
+  for (; i + pixelsInLine <= pixelCount; i += pixelsInLine) {
+    prefetchAhead(pixels + i);
+    for (std::size_t x = 0; x < pixelsInLine; ++x) ++counts[x % ways][pixels[i + x].g];
   }
   for (; i < pixelCount; ++i) ++counts[0][pixels[i].g];
 }
@@ -36,7 +41,7 @@ void computeGreenCDF(const Image<RGBA8Pixel>& image, GreenCDF& cdf) {
   for (std::size_t first = 0; first < pixelCount; first += pixelsPerBlock) {
     Counts counts{};
     count(image.data.get() + first, std::min(pixelsPerBlock, pixelCount - first), counts);
-    for (const std::array<std::uint32_t, 256>& way : counts) {
+    for (const Histogram& way : counts) {
       for (std::size_t i = 0; i < total.size(); ++i) total[i] += way[i];
     }
   }
