@@ -79,25 +79,27 @@ void expectTheDefinition(const Image<RGBA8Pixel>& photo, const FilterConfig& con
   metadata.faces.push_back(std::make_shared<BoundingBox>(BoundingBox{2, 14, 11, 3}));
   const Masks<T> expected = masksByDefinition<T>(photo, metadata, config);
   const std::vector<float> expectedCdf = cdfByDefinition(photo);
-  onEveryInstructionSet([&] {
-    ImageStatistics statistics;
-    ImageMasks<T, T> masks;
-    prepareImage(photo, metadata, config, statistics, masks);
-    ASSERT_TRUE(masks.computed);
-    ASSERT_EQ(fingerprint(*masks.bilateralMask), fingerprint(expected.bilateral));
-    ASSERT_EQ(fingerprint(*masks.ltmMask), fingerprint(expected.ltm));
-    ASSERT_EQ(statistics.cdf, expectedCdf);
+  onEveryInstructionSet(
+      [&] {
+        ImageStatistics statistics;
+        ImageMasks<T, T> masks;
+        prepareImage(photo, metadata, config, statistics, masks);
+        ASSERT_TRUE(masks.computed);
+        ASSERT_EQ(fingerprint(*masks.bilateralMask), fingerprint(expected.bilateral));
+        ASSERT_EQ(fingerprint(*masks.ltmMask), fingerprint(expected.ltm));
+        ASSERT_EQ(statistics.cdf, expectedCdf);
 
-    ImageStatistics alone;
-    analyzeImage(photo, metadata, alone);
-    ASSERT_EQ(alone.cdf, expectedCdf);
-    ASSERT_EQ(alone.faceMedianBin, statistics.faceMedianBin);
+        ImageStatistics alone;
+        analyzeImage(photo, metadata, alone);
+        ASSERT_EQ(alone.cdf, expectedCdf);
+        ASSERT_EQ(alone.faceMedianBin, statistics.faceMedianBin);
 
-    ImageMasks<T, T> onlyMasks;
-    computeImageMasks(photo, metadata, config, onlyMasks);
-    ASSERT_EQ(fingerprint(*onlyMasks.bilateralMask), fingerprint(expected.bilateral));
-    ASSERT_EQ(fingerprint(*onlyMasks.ltmMask), fingerprint(expected.ltm));
-  });
+        ImageMasks<T, T> onlyMasks;
+        computeImageMasks(photo, metadata, config, onlyMasks);
+        ASSERT_EQ(fingerprint(*onlyMasks.bilateralMask), fingerprint(expected.bilateral));
+        ASSERT_EQ(fingerprint(*onlyMasks.ltmMask), fingerprint(expected.ltm));
+      },
+      HWY_AVX3_DL);
 }
 
 template <typename T>
