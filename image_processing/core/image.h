@@ -6,6 +6,7 @@
 #include <memory>
 
 #include "image_processing/core/checked_size.h"
+#include "image_processing/core/huge_pages.h"
 #include "image_processing/core/pixel_types.h"
 
 namespace pelorin::image_processing {
@@ -28,8 +29,10 @@ class Image {
   Image(std::uint32_t width, std::uint32_t height, std::shared_ptr<T> pixels = nullptr)
       : data(std::move(pixels)), width(width), height(height), bytesPerPixel(sizeof(T)) {
     const std::size_t bytes = checkedProduct(width, height, sizeof(T));
-    if (data == nullptr)
+    if (data == nullptr) {
       data = std::shared_ptr<T>(new T[bytes / sizeof(T)], std::default_delete<T[]>());
+      preferHugePages(data.get(), bytes);
+    }
   }
 
   std::size_t pixelCount() const { return static_cast<std::size_t>(width) * height; }

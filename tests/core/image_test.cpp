@@ -3,7 +3,10 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
+#include <cstdio>
 #include <cstring>
+#include <fstream>
+#include <string>
 #include <utility>
 #include <vector>
 
@@ -88,6 +91,46 @@ TEST(Image, SetWritesEveryPixel) {
   const auto image = makeSharedImage<float>(4, 5);
   image->set(0.25f);
   for (std::size_t i = 0; i < 20; ++i) EXPECT_EQ(image->data.get()[i], 0.25f);
+}
+
+#if defined(__linux__) && (defined(__x86_64__) || defined(__aarch64__))
+/// What the system notes of the mapping that holds an address, "hg" for a wish for huge pages;
+/// empty where it notes nothing.
+std::string mappingFlagsAt(const void* address) {
+  std::ifstream mappings("/proc/self/smaps");
+  bool isIt = false;
+  for (std::string line; std::getline(mappings, line);) {
+    unsigned long long from, to;
+    if (std::sscanf(line.c_str(), "%llx-%llx ", &from, &to) == 2) {
+      const auto wanted = reinterpret_cast<std::uintptr_t>(address);
+      isIt = from <= wanted && wanted < to;
+    }
+    if (isIt && line.starts_with("VmFlags:")) return line;
+  }
+  return "";
+}
+
+TEST(Image, AsksForHugePagesWhenItIsLarge) {
+  if (!std::ifstream("/sys/kernel/mm/transparent_hugepage/enabled")) {
+    GTEST_SKIP() << "the system has no huge pages";
+  }
+  const Image<RGBA8Pixel> image(2000, 1000);
+  const std::string flags = mappingFlagsAt(image.row(500));
+  if (flags.empty()) GTEST_SKIP() << "the system does not tell what it was asked for";
+  EXPECT_NE(flags.find(" hg"), std::string::npos) << flags;
+}
+#endif
+
+TEST(PreferHugePages, TakesAnyPlaceAndSizeAndChangesNoByte) {
+  constexpr std::size_t size = (5 << 20) + 12345;
+  std::vector<unsigned char> bytes(size, 7);
+  for (const std::size_t offset : {0, 1, 4095, 1 << 20, 3 << 20}) {
+    for (const std::size_t count : {std::size_t{0}, std::size_t{1}, size - offset}) {
+      preferHugePages(bytes.data() + offset, count);
+    }
+  }
+  preferHugePages(nullptr, 0);
+  EXPECT_EQ(bytes, std::vector<unsigned char>(size, 7));
 }
 
 TEST(ImageForwardIterator, OutlivesItsImage) {
