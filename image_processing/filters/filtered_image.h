@@ -25,7 +25,9 @@ class FilteredImage {
   /// @throws what the filter's `init` throws; the next request then tries again.
   std::shared_ptr<AbstractFilter> setupFilter(const std::string& name, const std::string& params);
 
-  /// Applies a filter by name into `output`, which has the size of the source.
+  /// Applies a filter by name into `output`, which has the size of the source. It may be the source
+  /// itself, when the photo as it was is needed no more: filters write no pixel before they have
+  /// read it, but the session's masks and statistics stay those of the photo as it was.
   /// @returns false, with nothing written, when the name is unknown.
   /// @throws what `init` and `applyConfig` of the filter throw.
   bool applyFilterWithParams(const std::string& name, const std::string& params,

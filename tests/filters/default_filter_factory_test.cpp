@@ -6,6 +6,8 @@
 #include <string>
 #include <vector>
 
+#include "image_processing/filters/filtered_image.h"
+#include "tests/support/fingerprint.h"
 #include "tests/support/looks.h"
 #include "tests/support/pictures.h"
 
@@ -47,6 +49,27 @@ TEST(DefaultFilterFactory, MakesEveryLook) {
     filter->init("");
     const Image<RGBA8Pixel> output = test_support::applied(*filter, 20, 10, "");
     EXPECT_EQ(output.row(9)[19].a, picture.row(9)[19].a) << row.name;
+  }
+}
+
+TEST(DefaultFilterFactory, MakesFiltersThatGiveTheSameBytesInThePlaceOfTheirSource) {
+  for (const auto& [name, description] : DefaultFilterFactory::filterFactory()->descriptions) {
+    // Small enough for the plain code, and large enough for tables and every tail.
+    for (const auto& [width, height] : {std::pair{1u, 1u}, {7u, 5u}, {61u, 43u}, {407u, 397u}}) {
+      const auto picture = [w = width, h = height] {
+        return std::make_shared<Image<RGBA8Pixel>>(test_support::photoLikePicture(w, h, 3));
+      };
+      const auto apply = [&, name = name](std::shared_ptr<Image<RGBA8Pixel>> source,
+                                          Image<RGBA8Pixel> output) {
+        FilteredImage session(source, {}, "", defaultFilterConfigValue,
+                              DefaultFilterFactory::filterFactory());
+        session.applyFilterWithParams(name, "slider=0.7;", defaultFilterConfigValue, output);
+        return test_support::fingerprint(output);
+      };
+      const auto inPlace = picture();
+      EXPECT_EQ(apply(inPlace, *inPlace), apply(picture(), Image<RGBA8Pixel>(width, height)))
+          << name << " of " << width << " x " << height;
+    }
   }
 }
 
