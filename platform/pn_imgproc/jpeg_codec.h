@@ -3,6 +3,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstdlib>
+#include <functional>
 #include <memory>
 #include <span>
 #include <stdexcept>
@@ -69,6 +70,13 @@ JpegHeader readJpegHeader(std::span<const std::uint8_t> file);
 ///         complete scans.
 DecodedPicture decodeJpeg(std::span<const std::uint8_t> file, int scale = 1,
                           const DecodeLimits& limits = {});
+
+/// As `decodeJpeg`, into memory of the caller's own.
+/// @param makeRoom  called once, with the decoded width and height, for the place of that many RGBA
+///                  pixels. What it throws passes through.
+void decodeJpegInto(
+    const std::function<std::uint8_t*(std::uint32_t width, std::uint32_t height)>& makeRoom,
+    std::span<const std::uint8_t> file, int scale = 1, const DecodeLimits& limits = {});
 
 /// Encodes RGBA pixels (alpha is ignored) as a baseline file, 4:2:0 with the standard Huffman
 /// tables: tables of its own would save a few percent and more than double the time.

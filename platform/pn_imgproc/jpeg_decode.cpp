@@ -18,9 +18,9 @@ unsigned divisorFor(int scale) {
   return std::min(8u, std::bit_floor(static_cast<unsigned>(std::max(1, scale))));
 }
 
-std::unique_ptr<std::uint8_t, DecodedPicture::Free> allocateRgba(std::uint64_t width,
-                                                                 std::uint64_t height) {
-  const std::uint64_t size = width * height * 4;
+std::unique_ptr<std::uint8_t, DecodedPicture::Free> allocateRgba(std::uint32_t width,
+                                                                 std::uint32_t height) {
+  const std::uint64_t size = std::uint64_t{width} * height * 4;
   if (size > std::numeric_limits<std::size_t>::max() / 2) throw std::bad_alloc();
   std::unique_ptr<std::uint8_t, DecodedPicture::Free> pixels(
       static_cast<std::uint8_t*>(std::malloc(static_cast<std::size_t>(size))));
@@ -71,6 +71,18 @@ std::vector<std::uint8_t> embeddedProfile(LibjpegReader& reader) {
 
 DecodedPicture decodeJpeg(std::span<const std::uint8_t> file, int scale,
                           const DecodeLimits& limits) {
+  DecodedPicture picture = {};
+  const auto makeRoom = [&](std::uint32_t width, std::uint32_t height) {
+    picture = {allocateRgba(width, height), width, height};
+    return picture.pixels.get();
+  };
+  decodeJpegInto(makeRoom, file, scale, limits);
+  return picture;
+}
+
+void decodeJpegInto(
+    const std::function<std::uint8_t*(std::uint32_t width, std::uint32_t height)>& makeRoom,
+    std::span<const std::uint8_t> file, int scale, const DecodeLimits& limits) {
   LibjpegReader reader(file);
   reader.keepSegments(profileMarker);
   reader.readHeader();
@@ -79,19 +91,17 @@ DecodedPicture decodeJpeg(std::span<const std::uint8_t> file, int scale,
   jpeg_decompress_struct& codec = reader.codec();
   chooseOutput(codec, scale);
   reader.run([&] { jpeg_calc_output_dimensions(&codec); });
-  DecodedPicture picture = {allocateRgba(codec.output_width, codec.output_height),
-                            codec.output_width, codec.output_height};
+  std::uint8_t* const pixels = makeRoom(codec.output_width, codec.output_height);
   reader.run([&] {
     jpeg_start_decompress(&codec);
-    readRows(codec, picture.pixels.get());
+    readRows(codec, pixels);
   });
   reader.checkEveryChannelCame();
   if (codec.out_color_space == JCS_CMYK) {
-    cmykToRgba(picture.pixels.get(), picture.width, picture.height, codec.saw_Adobe_marker != FALSE,
+    cmykToRgba(pixels, codec.output_width, codec.output_height, codec.saw_Adobe_marker != FALSE,
                embeddedProfile(reader));
   }
   reader.run([&] { jpeg_finish_decompress(&codec); });
-  return picture;
 }
 
 }  // namespace pelorin::imgproc

@@ -55,7 +55,7 @@ std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t wid
   }
   for (const MetadataSegment& segment : metadata) checkSegment(segment);
 
-  LibjpegWriter writer(65536 + std::size_t{width} * height / 4);  // most photos fit at once
+  LibjpegWriter writer(std::size_t{width} * height / 2);  // more than most photos need
   jpeg_compress_struct& codec = writer.codec();
   writer.run([&] {
     codec.image_width = width;

@@ -2,12 +2,12 @@
 
 #include <jerror.h>
 
-#include <algorithm>
 #include <exception>
 
 namespace pelorin::imgproc {
 
-LibjpegWriter::LibjpegWriter(std::size_t firstSize) : destination_{{}, {}, firstSize} {
+LibjpegWriter::LibjpegWriter(std::size_t expectedSize) {
+  destination_.bytes.reserve(expectedSize);
   codec_.err = errors_.manager();
   try {
     run([this] { jpeg_create_compress(&codec_); });
@@ -16,7 +16,7 @@ LibjpegWriter::LibjpegWriter(std::size_t firstSize) : destination_{{}, {}, first
     throw;
   }
   destination_.base.init_destination = begin;
-  destination_.base.empty_output_buffer = makeRoom;
+  destination_.base.empty_output_buffer = empty;
   destination_.base.term_destination = end;
   codec_.dest = &destination_.base;
 }
@@ -26,30 +26,37 @@ void LibjpegWriter::copySegments(const jpeg_decompress_struct& source) {
     jpeg_write_marker(&codec_, segment->marker, segment->data, segment->data_length);
 }
 
-bool LibjpegWriter::grow(Destination& destination) {
-  const std::size_t used = destination.bytes.size();
+LibjpegWriter::Destination& LibjpegWriter::destinationOf(j_compress_ptr codec) {
+  return *reinterpret_cast<Destination*>(codec->dest);
+}
+
+void LibjpegWriter::append(j_compress_ptr codec, std::size_t count) {
+  Destination& destination = destinationOf(codec);
+  const std::uint8_t* const block = destination.block.data();
+  bool done = false;
   try {
-    destination.bytes.resize(std::max(destination.firstSize, used * 2));
+    destination.bytes.insert(destination.bytes.end(), block, block + count);
+    done = true;
   } catch (const std::exception&) {  // bad_alloc or length_error; neither may cross libjpeg
-    return false;
   }
-  destination.base.next_output_byte = destination.bytes.data() + used;
-  destination.base.free_in_buffer = destination.bytes.size() - used;
-  return true;
+  if (!done) ERREXIT1(codec, JERR_OUT_OF_MEMORY, 0);
 }
 
 void LibjpegWriter::begin(j_compress_ptr codec) {
-  if (!grow(*reinterpret_cast<Destination*>(codec->dest))) ERREXIT1(codec, JERR_OUT_OF_MEMORY, 0);
+  Destination& destination = destinationOf(codec);
+  destination.base.next_output_byte = destination.block.data();
+  destination.base.free_in_buffer = destination.block.size();
 }
 
-boolean LibjpegWriter::makeRoom(j_compress_ptr codec) {
+boolean LibjpegWriter::empty(j_compress_ptr codec) {
+  append(codec, destinationOf(codec).block.size());  // whatever the counters say
   begin(codec);
   return TRUE;
 }
 
 void LibjpegWriter::end(j_compress_ptr codec) {
-  auto& destination = *reinterpret_cast<Destination*>(codec->dest);
-  destination.bytes.resize(destination.bytes.size() - destination.base.free_in_buffer);
+  const Destination& destination = destinationOf(codec);
+  append(codec, destination.block.size() - destination.base.free_in_buffer);
 }
 
 }  // namespace pelorin::imgproc

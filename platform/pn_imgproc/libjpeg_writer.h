@@ -1,5 +1,6 @@
 #pragma once
 
+#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <utility>
@@ -12,8 +13,8 @@ namespace pelorin::imgproc {
 /// A libjpeg compressor into a vector, and what its errors become.
 class LibjpegWriter {
  public:
-  /// @param firstSize  how many bytes to make room for at first; doubled when they are used up.
-  explicit LibjpegWriter(std::size_t firstSize);
+  /// @param expectedSize  how many bytes to make room for; more cost a copy of them.
+  explicit LibjpegWriter(std::size_t expectedSize);
   ~LibjpegWriter() { jpeg_destroy_compress(&codec_); }
   LibjpegWriter(const LibjpegWriter&) = delete;
   LibjpegWriter& operator=(const LibjpegWriter&) = delete;
@@ -34,15 +35,17 @@ class LibjpegWriter {
   std::vector<std::uint8_t> takeFile() { return std::move(destination_.bytes); }
 
  private:
+  // Filled block by block: a vector made large enough for libjpeg to write into would be cleared.
   struct Destination {
     jpeg_destination_mgr base;  // first, so that libjpeg's pointer to it is one to the whole
     std::vector<std::uint8_t> bytes;
-    std::size_t firstSize;
+    std::array<std::uint8_t, 65536> block;
   };
 
-  static bool grow(Destination& destination);
+  static Destination& destinationOf(j_compress_ptr codec);
+  static void append(j_compress_ptr codec, std::size_t count);
   static void begin(j_compress_ptr codec);
-  static boolean makeRoom(j_compress_ptr codec);
+  static boolean empty(j_compress_ptr codec);
   static void end(j_compress_ptr codec);
 
   LibjpegErrors errors_;

@@ -75,6 +75,39 @@ TEST(DecodeJpeg, TakesTheScaleAsADivisorRoundedDownToAPowerOfTwo) {
   }
 }
 
+TEST(DecodeJpegInto, AsksOnceForRoomOfTheDecodedSize) {
+  const Bytes file = makeJpeg({.width = 101, .height = 67});
+  for (const int scale : {1, 2, 8}) {
+    const DecodedPicture expected = decodeJpeg(file, scale);
+    Bytes pixels;
+    int calls = 0;
+    const auto makeRoom = [&](std::uint32_t width, std::uint32_t height) {
+      ++calls;
+      EXPECT_EQ(width, expected.width);
+      EXPECT_EQ(height, expected.height);
+      pixels.resize(std::size_t{width} * height * 4);
+      return pixels.data();
+    };
+    decodeJpegInto(makeRoom, file, scale);
+    EXPECT_EQ(calls, 1);
+    EXPECT_EQ(pixels, rgbaBytes(expected));
+  }
+}
+
+TEST(DecodeJpegInto, LetsPassWhatIsThrownForWantOfRoom) {
+  const auto noRoom = [](std::uint32_t, std::uint32_t) -> std::uint8_t* { throw std::bad_alloc(); };
+  EXPECT_THROW(decodeJpegInto(noRoom, makeJpeg({})), std::bad_alloc);
+}
+
+TEST(DecodeJpegInto, AsksForNoRoomBeyondTheLimits) {
+  const auto never = [](std::uint32_t, std::uint32_t) -> std::uint8_t* {
+    ADD_FAILURE() << "asked for room";
+    throw std::bad_alloc();
+  };
+  const Bytes file = makeJpeg({.width = 32, .height = 24});
+  EXPECT_THROW(decodeJpegInto(never, file, 1, {.pixels = 32 * 24 - 1}), JpegError);
+}
+
 TEST(DecodeJpeg, ReadsThePhotoLikePictureItWasGiven) {
   const auto picture = test_support::photoLikePicture(160, 120, /*seed=*/5);
   const Bytes file = makeJpeg({.width = 160,
