@@ -48,20 +48,22 @@ Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter)
 
 Done process(const Work& work, const PlannedFile& file) {
   stopIfInterrupted();
-  Photo photo = loadPhoto(file.input, work.photo);
+  thread_local SparePixels spare;  // each worker's own
+  Photo photo = loadPhoto(file.input, work.photo, spare);
   stopIfInterrupted();
-  const Done done = {photo.image->width, photo.image->height};
-  Image<RGBA8Pixel> result(done.width, done.height);
+  Image<RGBA8Pixel>& picture = *photo.image;
+  const Done done = {picture.width, picture.height};
   {
     // The session ends before the encoder begins: its masks are several times the picture.
     FilteredImage session(photo.image, metadataWithFaces(work.faces, done.width, done.height), "",
                           defaultFilterConfigValue, DefaultFilterFactory::filterFactory());
-    photo.image = nullptr;
     session.applyFilterWithParams(work.filter.filter, work.filter.params, defaultFilterConfigValue,
-                                  result);
+                                  /*output=*/picture);
   }
   stopIfInterrupted();
-  savePicture(file.output, result, work.photo.raw.has_value(), work.quality, photo.metadata);
+  const bool raw = work.photo.raw.has_value();
+  savePicture(file.output, picture, raw, work.quality, photo.metadata);
+  if (!raw) spare.keep(picture);
   return done;
 }
 

@@ -1,6 +1,5 @@
 #include "cli/common/photo.h"
 
-#include <span>
 #include <utility>
 
 #include "cli/common/errors.h"
@@ -15,11 +14,15 @@ namespace pelorin::cli {
 using image_processing::Image;
 using image_processing::RGBA8Pixel;
 
-std::shared_ptr<Image<RGBA8Pixel>> imageOf(imgproc::DecodedPicture decoded) {
-  const std::shared_ptr<std::uint8_t> bytes = std::move(decoded.pixels);
-  return std::make_shared<Image<RGBA8Pixel>>(
-      decoded.width, decoded.height,
-      std::shared_ptr<RGBA8Pixel>(bytes, reinterpret_cast<RGBA8Pixel*>(bytes.get())));
+std::shared_ptr<Image<RGBA8Pixel>> decodedImage(std::span<const std::uint8_t> file, int scale,
+                                                SparePixels& spare) {
+  std::shared_ptr<Image<RGBA8Pixel>> image;
+  const auto makeRoom = [&](std::uint32_t width, std::uint32_t height) {
+    image = spare.picture(width, height);
+    return reinterpret_cast<std::uint8_t*>(image->data.get());
+  };
+  imgproc::decodeJpegInto(makeRoom, file, scale);
+  return image;
 }
 
 JpegFacts readFacts(const imgproc::JpegHeader& header) {
@@ -32,6 +35,11 @@ JpegFacts readFacts(const imgproc::JpegHeader& header) {
 }
 
 Photo loadPhoto(const Input& input, const PhotoOptions& options) {
+  SparePixels none;
+  return loadPhoto(input, options, none);
+}
+
+Photo loadPhoto(const Input& input, const PhotoOptions& options, SparePixels& spare) {
   Photo photo;
   Turn turn;
   if (options.raw) {
@@ -43,7 +51,7 @@ Photo loadPhoto(const Input& input, const PhotoOptions& options) {
     imgproc::JpegHeader header = imgproc::readJpegHeader(file);
     photo.facts = readFacts(header);
     photo.metadata = keptMetadata(std::move(header));
-    photo.image = imageOf(imgproc::decodeJpeg(file, options.scale));
+    photo.image = decodedImage(file, options.scale, spare);
     turn = uprightTurn(photo.facts->orientation);
   }
   stopIfInterrupted();

@@ -3,11 +3,13 @@
 #include <cstdint>
 #include <memory>
 #include <optional>
+#include <span>
 #include <vector>
 
 #include "cli/common/capture_time.h"
 #include "cli/common/inputs.h"
 #include "cli/common/raw_pixels.h"
+#include "cli/common/spare_pixels.h"
 #include "image_processing/core/image.h"
 #include "platform/pn_imgproc/jpeg_codec.h"
 
@@ -36,12 +38,16 @@ struct PhotoOptions {
 };
 
 /// Reads a photo, decodes it and turns it upright.
+/// @param spare  where the pixels of a decoded one may come from.
 /// @throws what reading and decoding throw, for `explain`; Interrupted on Ctrl-C.
+Photo loadPhoto(const Input& input, const PhotoOptions& options, SparePixels& spare);
 Photo loadPhoto(const Input& input, const PhotoOptions& options);
 
-/// The decoder's buffer as an image: no second copy of the pixels exists.
-std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> imageOf(
-    imgproc::DecodedPicture decoded);
+/// The picture of a JPEG file at 1/`scale` of its size, as it is stored.
+/// @param spare  where its pixels may come from.
+/// @throws what decoding throws.
+std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> decodedImage(
+    std::span<const std::uint8_t> file, int scale, SparePixels& spare);
 
 /// What the header alone tells, without decoding.
 JpegFacts readFacts(const imgproc::JpegHeader& header);

@@ -27,7 +27,8 @@ PhotoRecord readPhotoRecord(const Input& input, int scale) {
   const JpegFacts facts = readFacts(imgproc::readJpegHeader(file));
   if (scale == automaticScale) scale = scaleFor(facts.width, facts.height);
   PhotoRecord record{facts.width, facts.height, facts.orientation, facts.captureTime, {}};
-  computeGreenCDF(*imageOf(imgproc::decodeJpeg(file, scale)), record.cdf);
+  SparePixels none;
+  computeGreenCDF(*decodedImage(file, scale, none), record.cdf);
   return record;
 }
 

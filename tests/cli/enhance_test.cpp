@@ -106,6 +106,8 @@ TEST(Enhance, GivesTheSameFilesHoweverManyAtOnce) {
   for (int i = 0; i < 6; ++i) {
     const std::string name = std::to_string(i) + ".jpg";
     EXPECT_EQ(folder.read("one/" + name), folder.read("two/" + name));
+    EXPECT_EQ(folder.read("one/" + name),
+              enhancedDirectly(folder.read("in/" + name), "AE0", "slider=0.4;"));
   }
   EXPECT_FALSE(folder.has("one/3b.jpg"));
 }
