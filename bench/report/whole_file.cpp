@@ -1,0 +1,88 @@
+#include "bench/report/whole_file.h"
+
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <string_view>
+#include <vector>
+
+#include "bench/report/child.h"
+#include "bench/report/codec_floor.h"
+#include "bench/report/instruction_sets.h"
+#include "bench/report/photos.h"
+#include "platform/pn_imgproc/file_io.h"
+
+namespace pelorin::bench {
+namespace {
+
+constexpr PhotoSize size = {4000, 3000};
+constexpr int rounds = 5, photosInARun = 4;
+
+double perPixel(double seconds) {
+  return seconds * 1e3 / size.megapixels();
+}
+
+double fastest(const std::vector<double>& seconds) {
+  return *std::min_element(seconds.begin(), seconds.end());
+}
+
+}  // namespace
+
+std::string wholeFileTable(const std::string& command, const std::string& avx2Only) {
+  const PhotoFiles files(size, photosInARun);
+  const std::vector<std::uint8_t> bytes = imgproc::readFile(files.first());
+  CodecFloor floor(bytes, size.width, size.height);
+  floor.run();
+
+  struct Row {
+    std::string name;
+    std::vector<std::string> arguments;
+    int photos = 1;
+  };
+  std::vector<Row> rows = {
+      {"`quenby --version`: start and end of a process", {command, "--version"}}};
+  const auto enhance = [&](const std::string& filter, const std::string& input) {
+    return std::vector<std::string>{command,         "enhance",     "-r",      input,      "-o",
+                                    files.results(), "--overwrite", "--quiet", "--filter", filter};
+  };
+  for (const char* filter : {"PassThrough", "AE0", "AE08bit", "WinterRGB"}) {
+    rows.push_back({fmt::format("`--filter {}`", filter), enhance(filter, files.first())});
+    rows.push_back({fmt::format("`--filter {}`, each of {} photos", filter, photosInARun),
+                    enhance(filter, files.folder()), photosInARun});
+  }
+  const std::vector<InstructionSet> sets = instructionSets();
+
+  // Round by round, so that the machine's moods meet all of them. The fastest counts: a run also
+  // pays for memory that a virtual machine has to ask its host for.
+  std::vector<double> floorTimes;
+  std::vector<std::vector<double>> times(rows.size() * sets.size());
+  for (int round = 0; round < rounds; ++round) {
+    floorTimes.push_back(secondsOf([&] { floor.run(); }));
+    for (std::size_t r = 0; r < rows.size(); ++r) {
+      for (std::size_t s = 0; s < sets.size(); ++s) {
+        const std::string preload = sets[s].name == std::string_view("AVX2") ? avx2Only : "";
+        times[r * sets.size() + s].push_back(runCommand(rows[r].arguments, preload).seconds /
+                                             rows[r].photos);
+      }
+    }
+  }
+
+  const double floorTime = perPixel(fastest(floorTimes));
+  std::string table = "| Nanoseconds a pixel |", rule = "|---|";
+  for (const InstructionSet& set : sets) {
+    table += fmt::format(" {} | of the floor |", set.name);
+    rule += "---:|---:|";
+  }
+  table += "\n" + rule + "\n| floor: decode, copy, encode |";
+  for (std::size_t s = 0; s < sets.size(); ++s) table += fmt::format(" {:.2f} | 1.00 |", floorTime);
+  for (std::size_t r = 0; r < rows.size(); ++r) {
+    table += "\n| " + rows[r].name + " |";
+    for (std::size_t s = 0; s < sets.size(); ++s) {
+      const double time = perPixel(fastest(times[r * sets.size() + s]));
+      table += fmt::format(" {:.2f} | {:.2f} |", time, time / floorTime);
+    }
+  }
+  return table + "\n";
+}
+
+}  // namespace pelorin::bench
