@@ -28,7 +28,7 @@ Image<float> lightnessByDefinition(const Image<RGBA8Pixel>& photo) {
   Image<float> lightness(photo.width, photo.height);
   for (std::size_t i = 0; i < photo.pixelCount(); ++i) {
     const RGBA8Pixel& p = photo.data.get()[i];
-    lightness.data.get()[i] = lightnessOf(colourTables(), p.r, p.g, p.b) / 100.0f;
+    lightness.data.get()[i] = rgbToLab(p.r, p.g, p.b).L / 100.0f;
   }
   return lightness;
 }

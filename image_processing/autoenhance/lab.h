@@ -12,14 +12,6 @@ struct Lab {
   float L, a, b;
 };
 
-/// The L of `rgbToLab` alone.
-inline float lightnessOf(const ColourTables& tables, std::uint8_t r, std::uint8_t g,
-                         std::uint8_t b) {
-  const float R = tables.linear[r], G = tables.linear[g], B = tables.linear[b];
-  const float fy = tables.xyzToLab(0.2126729f * R + 0.7151522f * G + 0.072175f * B);
-  return 116.0f * fy - 16.0f;
-}
-
 /// 8-bit sRGB to Lab. The matrix is sRGB to XYZ with the white point divided out.
 inline Lab rgbToLab(const ColourTables& tables, std::uint8_t r, std::uint8_t g, std::uint8_t b) {
   const float R = tables.linear[r], G = tables.linear[g], B = tables.linear[b];

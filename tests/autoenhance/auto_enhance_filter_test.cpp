@@ -5,9 +5,13 @@
 #include <boost/lexical_cast.hpp>
 #include <cmath>
 #include <cstring>
+#include <limits>
 #include <stdexcept>
+#include <type_traits>
 #include <utility>
 
+#include "image_processing/autoenhance/build_tone_curve.h"
+#include "image_processing/autoenhance/enhance_row.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/pictures.h"
 
@@ -139,13 +143,48 @@ TYPED_TEST(AutoEnhance, TakesEverySize) {
   }
 }
 
+/// The pass as it is defined, over the filter's own masks.
+template <typename Filter>
+Image<RGBA8Pixel> byDefinition(const Image<RGBA8Pixel>& photo, float slider) {
+  Filter filter(stateOf(photo));
+  filter.init("");
+  ImageStatistics statistics;
+  analyzeImage(photo, {}, statistics);
+  FilterConfig config = defaultFilterConfigValue;
+  updateFilterConfigForSliderValue(slider, &config);
+  const TonePass pass(buildToneCurve(statistics, config), 100.0f, config.vibrance, config.ltmBlend,
+                      config.detailGain);
+  const auto bilateral = filter.getBilateralMask(), ltm = filter.getLtmMask();
+  Image<RGBA8Pixel> output(photo.width, photo.height);
+  enhanceRowScalar<float>(pass, photo.data.get(), bilateral->data.get(), ltm->data.get(),
+                          output.data.get(), photo.pixelCount());
+  return output;
+}
+
 TYPED_TEST(AutoEnhance, GivesDefinedBytesForAnySlider) {
+  constexpr float infinity = std::numeric_limits<float>::infinity();
+  struct Case {
+    const char* slider;
+    float value;
+    const char *floatMasks, *byteMasks;
+  };
+  const char* const black = "70ae621d85b7c525";  // what NaN becomes
+  const Case cases[] = {
+      {"nan", std::nanf(""), black, black},
+      {"inf", infinity, black, black},
+      {"-inf", -infinity, black, black},
+      {"1e30", 1e30f, "0c8ff9bc42e51df3", "02b3ee69e53221b8"},
+      {"-1e30", -1e30f, "26fbaf41dc7e86b4", "37908f67019b05ae"},
+      {"-0.3", -0.3f, "6f5ecbd8cd8d98db", "ba5433c2c7333f78"},
+      {"17", 17.0f, "ebbcbe6f9feb9638", "dcb7754e2ed3c2f7"},
+  };
   const auto photo = photoLikePicture(30, 20, 9);
-  for (const char* slider : {"nan", "inf", "-inf", "1e30", "-1e30", "-0.3", "17"}) {
-    const std::string params = std::string("slider=") + slider + ";";
-    EXPECT_EQ(fingerprint(this->enhanced(photo, "", params)),
-              fingerprint(this->enhanced(photo, params, params)))
-        << slider;
+  for (const Case& c : cases) {
+    SCOPED_TRACE(c.slider);
+    const auto output = this->enhanced(photo, "", std::string("slider=") + c.slider + ";");
+    const bool bytes = std::is_same_v<TypeParam, AEFilter8bit>;
+    EXPECT_EQ(fingerprint(output), bytes ? c.byteMasks : c.floatMasks);
+    EXPECT_EQ(fingerprint(output), fingerprint(byDefinition<TypeParam>(photo, c.value)));
   }
 }
 

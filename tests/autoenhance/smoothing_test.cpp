@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <limits>
 #include <utility>
@@ -176,13 +177,19 @@ TEST(Smoothing, PutsWhiteIntoTheLastBinAndReadsItBack) {
 }
 
 TEST(Smoothing, ReturnsTheLastNodesValueBeyondTheLastNode) {
-  // 23 columns in cells of 5: 4 nodes, the last at 15, and columns 20 ... 22 lie beyond it.
+  // 23 columns in cells of 5: 4 nodes, the last at column 15. A ramp up to column 14, and one value
+  // from there on, so that the columns beyond are read at one lightness.
   Image<float> image(23, 20);
   for (std::uint32_t y = 0; y < 20; ++y) {
-    for (std::uint32_t x = 0; x < 23; ++x) image.row(y)[x] = 0.5f;
+    for (std::uint32_t x = 0; x < 23; ++x) {
+      image.row(y)[x] = 0.2f + 0.02f * static_cast<float>(std::min(x, 15u));
+    }
   }
   const Image<float> smoothed = gridSmoothed(image, 0.7f, 5.0f);
-  for (std::uint32_t x = 15; x < 23; ++x) EXPECT_NEAR(smoothed.row(10)[x], 0.5f, 1e-5f) << x;
+  const float atTheNode = smoothed.row(10)[15];
+  EXPECT_LT(atTheNode, 0.499f) << "the ramp must be felt at the last node";
+  EXPECT_LT(smoothed.row(10)[10], atTheNode - 0.02f) << "the nodes must differ";
+  for (std::uint32_t x = 16; x < 23; ++x) EXPECT_NEAR(smoothed.row(10)[x], atTheNode, 1e-6f) << x;
 }
 
 TEST(Smoothing, TakesAnySizeAndCell) {

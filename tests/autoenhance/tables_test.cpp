@@ -103,15 +103,6 @@ TEST(RgbToLab, MapsWhiteToExactly100AndBlackToExactlyZero) {
   EXPECT_EQ(black.b, 0.0f);
 }
 
-TEST(RgbToLab, AgreesWithItsLightnessAlone) {
-  const ColourTables& tables = colourTables();
-  for (int code = 0; code < 256; ++code) {
-    const auto r = static_cast<std::uint8_t>(code), g = static_cast<std::uint8_t>(code * 7),
-               b = static_cast<std::uint8_t>(code * 13);
-    EXPECT_EQ(lightnessOf(tables, r, g, b), rgbToLab(r, g, b).L);
-  }
-}
-
 TEST(LabToRgb, ComesBackWithinAFewCodesForMostColoursAnd18AtWorst) {
   int worst = 0;
   long sum = 0, count = 0;

@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <limits>
 #include <numeric>
@@ -121,11 +122,47 @@ TEST(CurveMassage, HoldsTheSlopeNearItsBounds) {
   }
 }
 
-TEST(CurveMassage, KeepsTheClampedHistogramFromRoundToRound) {
-  std::vector<float> once = darkCurve(51), twice = once;
-  curveMassage(once, 0.75f, 8.0f, 1);
+TEST(CurveMassage, GivesTheSharesWorkedOutByHand) {
+  // Shares 1/2, 1/4, 1/4 and 0 of four bins; none may be below 3/16.
+  std::vector<float> curve = {0.0f, 0.5f, 0.75f, 1.0f, 1.0f};
+  std::vector<float> twice = curve;
+  curveMassage(curve, 0.75f, 8.0f, 1);
+  const double sum = 19.0 / 16;
+  const double once[] = {0.0, 0.5 / sum, 0.75 / sum, 1.0 / sum, 1.0};
+  for (int i = 0; i < 5; ++i) EXPECT_NEAR(curve[i], once[i], 1e-6) << i;
   curveMassage(twice, 0.75f, 8.0f, 2);
-  EXPECT_NE(once, twice);
+  const double sumAgain = 16.0 / 19 + 3.0 / 16;
+  for (int i = 0; i < 4; ++i) EXPECT_NEAR(twice[i], once[i] / sumAgain, 1e-6) << i;
+  EXPECT_NEAR(twice[4], 1.0, 1e-6);
+}
+
+TEST(CurveMassage, KeepsTheClampedHistogramFromRoundToRound) {
+  const std::vector<float> before = darkCurve(51);
+  constexpr int rounds = 20;
+  const float low = 0.75f / 50.0f, high = 8.0f / 50.0f;
+  std::vector<float> kept, taken, expected, fromCurve = before;
+  computeHistogramFromCDF(before, kept);
+  const auto clampAndNormalise = [&](std::vector<float>& histogram) {
+    double sum = 0.0;
+    for (float& share : histogram) {
+      share = std::min(std::max(share, low), high);
+      sum += static_cast<double>(share);
+    }
+    const double normaliser = 1.0 / sum;
+    for (float& share : histogram) share = static_cast<float>(share * normaliser);
+  };
+  for (int round = 0; round < rounds; ++round) {
+    clampAndNormalise(kept);
+    // What it would be if each round began with the curve of the last one.
+    computeHistogramFromCDF(fromCurve, taken);
+    clampAndNormalise(taken);
+    computeCDF(taken, fromCurve);
+  }
+  computeCDF(kept, expected);
+  std::vector<float> curve = before;
+  curveMassage(curve, 0.75f, 8.0f, rounds);
+  EXPECT_EQ(curve, expected);
+  EXPECT_NE(curve, fromCurve) << "the test could not tell the difference";
 }
 
 TEST(CurveMassage, GivesDefinedNumbersForNaN) {
