@@ -10,6 +10,7 @@
 #include "cli/common/jobs.h"
 #include "cli/common/json_output.h"
 #include "cli/common/photo.h"
+#include "cli/common/recycled_memory.h"
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/filtered_image.h"
 
@@ -126,6 +127,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
   JsonOutput json(options.report, singleFile);
   if (options.outputs.planOnly) return printPlan(plan, json);
 
+  if (options.jobs == 1 && plan.size() > 1) recycleFreedMemory();
   const OutputFolders folders(plan);
   Talk talk(verb, options.report.quiet, plan.size());
   std::size_t done = 0, failed = 0, skipped = 0;
