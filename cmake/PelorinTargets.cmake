@@ -88,20 +88,23 @@ function(pelorin_bench name)
   set_property(GLOBAL APPEND PROPERTY PELORIN_BENCHES ${name})
 endfunction()
 
-# pelorin_fuzz(<name> DEPENDS ...): the fuzz target in <name>.cpp. With clang it is a libFuzzer
+# pelorin_fuzz(<name> [RUNS n] DEPENDS ...): the fuzz target in <name>.cpp. With clang it is a libFuzzer
 # binary; with any other compiler it replays files and runs seeded random inputs, so that a short
 # run belongs to the tests everywhere.
 function(pelorin_fuzz name)
-  cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "DEPENDS")
+  cmake_parse_arguments(PARSE_ARGV 1 arg "" "RUNS" "DEPENDS")
+  if(NOT arg_RUNS)
+    set(arg_RUNS 2000)
+  endif()
   add_executable(${name} ${PROJECT_SOURCE_DIR}/fuzz/${name}.cpp)
   target_link_libraries(${name} PRIVATE ${arg_DEPENDS})
   if(CMAKE_CXX_COMPILER_ID MATCHES Clang)
     target_compile_options(${name} PRIVATE -fsanitize=fuzzer)
     target_link_options(${name} PRIVATE -fsanitize=fuzzer)
-    add_test(NAME ${name} COMMAND ${name} -runs=2000 -seed=1 -max_len=4096)
+    add_test(NAME ${name} COMMAND ${name} -runs=${arg_RUNS} -seed=1 -max_len=4096)
   else()
     target_sources(${name} PRIVATE ${PROJECT_SOURCE_DIR}/fuzz/replay_main.cpp)
-    add_test(NAME ${name} COMMAND ${name} --random 2000 --seed 1 --max-length 4096)
+    add_test(NAME ${name} COMMAND ${name} --random ${arg_RUNS} --seed 1 --max-length 4096)
   endif()
   pelorin_run_early(${name})
 endfunction()
