@@ -1,4 +1,4 @@
-#include "cli/verbs.h"
+#include "cli/verbs/verbs.h"
 
 int main(int argc, char** argv) {
   using namespace pelorin::cli;

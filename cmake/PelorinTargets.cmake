@@ -60,13 +60,14 @@ function(pelorin_run_early test)
   set_tests_properties(${test} PROPERTIES COST 100)
 endfunction()
 
-# pelorin_test(<name> [THREADS] [SOURCES ...] DEPENDS ...): the tests in <name>.cpp, run by ctest one
+# pelorin_test(<file> [THREADS] [SOURCES ...] DEPENDS ...): the tests in <file>.cpp, run by ctest one
 # by one. THREADS marks tests that start threads: the thread sanitizer's run builds and runs those.
-function(pelorin_test name)
+function(pelorin_test file)
   cmake_parse_arguments(PARSE_ARGV 1 arg "THREADS" "" "SOURCES;DEPENDS")
   if(NOT arg_SOURCES)
-    set(arg_SOURCES ${name}.cpp)
+    set(arg_SOURCES ${file}.cpp)
   endif()
+  get_filename_component(name ${file} NAME)
   add_executable(${name} ${arg_SOURCES})
   target_link_libraries(${name} PRIVATE ${arg_DEPENDS} pelorin_test_support GTest::gmock_main)
   pelorin_compile_as_test(${name})

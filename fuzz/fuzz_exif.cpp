@@ -4,8 +4,8 @@
 #include <cstdlib>
 #include <vector>
 
-#include "cli/common/capture_time.h"
-#include "cli/common/exif_orientation.h"
+#include "photo/metadata/capture_time.h"
+#include "photo/metadata/exif_orientation.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
   using namespace pelorin::cli;

@@ -5,7 +5,7 @@
 #include <cstdlib>
 #include <vector>
 
-#include "platform/pn_imgproc/jpeg_codec.h"
+#include "photo/jpeg/jpeg_codec.h"
 
 namespace {
 

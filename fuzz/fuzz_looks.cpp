@@ -8,8 +8,8 @@
 #include <string>
 #include <vector>
 
-#include "image_processing/filters/low_dim_rgb_curve_filter.h"
-#include "image_processing/filters/preset_looks.h"
+#include "image_processing/filters/looks/low_dim_rgb_curve_filter.h"
+#include "image_processing/filters/looks/preset_looks.h"
 
 namespace pelorin::image_processing {
 namespace {

@@ -41,7 +41,7 @@ platform_library(jnigraphics SOURCES jnigraphics/bitmap.cpp jnigraphics/desktop_
 
 # Where no JPEG library is packaged for the target, tests bring a codec of their own.
 set(PELORIN_JPEG_CODEC pelorin_jpeg_codec CACHE STRING
-    "The target that implements platform/pn_imgproc/jpeg_codec.h")
+    "The target that implements photo/jpeg/jpeg_codec.h")
 mark_as_advanced(PELORIN_JPEG_CODEC)
 platform_library(
   pn_imgproc SOURCES pn_imgproc/native_image_processor.cpp pn_imgproc/stream.cpp

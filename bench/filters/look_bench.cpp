@@ -5,9 +5,9 @@
 
 #include "bench/support/per_pixel.h"
 #include "bench/support/side_by_side.h"
-#include "image_processing/filters/apply_look.h"
-#include "image_processing/filters/low_dim_rgb_curve_filter.h"
-#include "image_processing/filters/preset_looks.h"
+#include "image_processing/filters/looks/apply_look.h"
+#include "image_processing/filters/looks/low_dim_rgb_curve_filter.h"
+#include "image_processing/filters/looks/preset_looks.h"
 #include "tests/support/looks.h"
 
 namespace pelorin::bench {

@@ -9,8 +9,8 @@
 #include "bench/support/per_pixel.h"
 #include "image_processing/autoenhance/enhance_row.h"
 #include "image_processing/dupe/green_cdf.h"
-#include "image_processing/filters/apply_look.h"
-#include "image_processing/filters/preset_looks.h"
+#include "image_processing/filters/looks/apply_look.h"
+#include "image_processing/filters/looks/preset_looks.h"
 #include "tests/support/looks.h"
 
 namespace pelorin::bench {

@@ -16,8 +16,8 @@
 #include "bench/report/scale.h"
 #include "bench/report/stages.h"
 #include "bench/report/whole_file.h"
-#include "cli/pictures/png_file.h"
-#include "platform/pn_imgproc/file_io.h"
+#include "photo/file_io.h"
+#include "photo/png/png_file.h"
 
 namespace pelorin::bench {
 namespace {

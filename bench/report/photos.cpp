@@ -6,7 +6,7 @@
 #include <filesystem>
 
 #include "bench/report/child.h"
-#include "platform/pn_imgproc/jpeg_codec.h"
+#include "photo/jpeg/jpeg_codec.h"
 #include "tests/support/pictures.h"
 
 namespace fs = std::filesystem;

@@ -10,7 +10,7 @@
 #include "bench/report/codec_floor.h"
 #include "bench/report/instruction_sets.h"
 #include "bench/report/photos.h"
-#include "platform/pn_imgproc/file_io.h"
+#include "photo/file_io.h"
 
 namespace pelorin::bench {
 namespace {

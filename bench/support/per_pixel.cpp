@@ -14,8 +14,8 @@ const Image<RGBA8Pixel>& twelveMegapixels() {
 
 void reportPerPixel(benchmark::State& state, std::uint64_t pixels) {
   using benchmark::Counter;
-  state.counters["per_px"] = Counter(static_cast<double>(pixels),
-                                     Counter::kIsIterationInvariantRate | Counter::kInvert);
+  state.counters["per_px"] =
+      Counter(static_cast<double>(pixels), Counter::kIsIterationInvariantRate | Counter::kInvert);
 }
 
 }  // namespace pelorin::bench

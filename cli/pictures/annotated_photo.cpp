@@ -5,9 +5,9 @@
 #include <cstdio>
 #include <memory>
 
-#include "cli/pictures/area_average.h"
 #include "cli/pictures/plot.h"
 #include "cli/pictures/text.h"
+#include "photo/area_average.h"
 
 namespace pelorin::cli {
 namespace {

@@ -2,8 +2,8 @@
 
 #include <cstdlib>
 
-#include "platform/pn_imgproc/jpeg_codec.h"
-#include "platform/pn_imgproc/libjpeg_errors.h"
+#include "photo/jpeg/jpeg_codec.h"
+#include "photo/jpeg/libjpeg_errors.h"
 
 namespace pelorin::cli {
 

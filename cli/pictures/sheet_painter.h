@@ -5,7 +5,7 @@
 #include <string_view>
 #include <vector>
 
-#include "cli/pictures/area_average.h"
+#include "photo/area_average.h"
 
 namespace pelorin::cli {
 

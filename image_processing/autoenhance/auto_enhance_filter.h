@@ -3,8 +3,8 @@
 #include <memory>
 #include <string>
 
-#include "image_processing/autoenhance/image_masks.h"
-#include "image_processing/autoenhance/image_statistics.h"
+#include "image_processing/autoenhance/lightness/image_statistics.h"
+#include "image_processing/autoenhance/masks/image_masks.h"
 #include "image_processing/filters/abstract_filter.h"
 
 namespace pelorin::image_processing {

@@ -3,9 +3,9 @@
 #include <algorithm>
 #include <cmath>
 
-#include "image_processing/autoenhance/lab.h"
-#include "image_processing/autoenhance/tone_curve.h"
-#include "image_processing/autoenhance/vibrance.h"
+#include "image_processing/autoenhance/colour/lab.h"
+#include "image_processing/autoenhance/colour/vibrance.h"
+#include "image_processing/autoenhance/lightness/tone_curve.h"
 
 namespace pelorin::image_processing {
 

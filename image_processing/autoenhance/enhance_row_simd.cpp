@@ -8,10 +8,10 @@
 #include <algorithm>
 #include <bit>
 
-#include "image_processing/autoenhance/colour_tables.h"
-#include "image_processing/autoenhance/companding_steps.h"
-#include "image_processing/autoenhance/lab_simd.h"
-#include "image_processing/autoenhance/vibrance_simd.h"
+#include "image_processing/autoenhance/colour/colour_tables.h"
+#include "image_processing/autoenhance/colour/companding_steps.h"
+#include "image_processing/autoenhance/colour/lab_simd.h"
+#include "image_processing/autoenhance/colour/vibrance_simd.h"
 #include "image_processing/core/prefetch.h"
 #include "image_processing/core/simd.h"
 #include "image_processing/core/small_table.h"

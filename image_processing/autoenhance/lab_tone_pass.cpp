@@ -2,8 +2,8 @@
 
 #include <algorithm>
 
-#include "image_processing/autoenhance/build_tone_curve.h"
 #include "image_processing/autoenhance/enhance_row.h"
+#include "image_processing/autoenhance/lightness/build_tone_curve.h"
 
 namespace pelorin::image_processing {
 namespace {

@@ -2,8 +2,8 @@
 
 #include <vector>
 
-#include "image_processing/autoenhance/image_masks.h"
-#include "image_processing/autoenhance/image_statistics.h"
+#include "image_processing/autoenhance/lightness/image_statistics.h"
+#include "image_processing/autoenhance/masks/image_masks.h"
 #include "image_processing/core/image.h"
 #include "image_processing/filters/filter_config.h"
 

@@ -3,9 +3,9 @@
 #include <mutex>
 
 #include "image_processing/autoenhance/auto_enhance_filter.h"
-#include "image_processing/filters/low_dim_rgb_curve_filter.h"
+#include "image_processing/filters/looks/low_dim_rgb_curve_filter.h"
+#include "image_processing/filters/looks/preset_looks.h"
 #include "image_processing/filters/pass_through.h"
-#include "image_processing/filters/preset_looks.h"
 
 namespace pelorin::image_processing {
 

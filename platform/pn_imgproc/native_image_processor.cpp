@@ -3,8 +3,8 @@
 #include <exception>
 #include <new>
 
+#include "photo/jpeg/jpeg_codec.h"
 #include "platform/pn/log.h"
-#include "platform/pn_imgproc/jpeg_codec.h"
 #include "platform/pn_imgproc/utf8_path.h"
 
 namespace pelorin::imgproc {

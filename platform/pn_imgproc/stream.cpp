@@ -4,7 +4,7 @@
 #include <stdexcept>
 #include <string_view>
 
-#include "platform/pn_imgproc/file_io.h"
+#include "photo/file_io.h"
 #include "platform/pn_imgproc/utf8_path.h"
 
 namespace pelorin::imgproc {

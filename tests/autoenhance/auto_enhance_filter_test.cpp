@@ -10,8 +10,8 @@
 #include <type_traits>
 #include <utility>
 
-#include "image_processing/autoenhance/build_tone_curve.h"
 #include "image_processing/autoenhance/enhance_row.h"
+#include "image_processing/autoenhance/lightness/build_tone_curve.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/pictures.h"
 

@@ -7,8 +7,8 @@
 #include <hwy/foreach_target.h>  // compiles the rest of this file once per instruction set
 #include <hwy/highway.h>
 
-#include "image_processing/autoenhance/colour_tables.h"
-#include "image_processing/autoenhance/lab_simd.h"
+#include "image_processing/autoenhance/colour/colour_tables.h"
+#include "image_processing/autoenhance/colour/lab_simd.h"
 #include "tests/support/instruction_sets.h"
 #include "tests/support/pictures.h"
 

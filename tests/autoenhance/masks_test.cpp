@@ -4,10 +4,10 @@
 #include <cstring>
 #include <limits>
 
-#include "image_processing/autoenhance/face_blend.h"
-#include "image_processing/autoenhance/flatness_mask.h"
-#include "image_processing/autoenhance/image_masks.h"
-#include "image_processing/autoenhance/lab.h"
+#include "image_processing/autoenhance/colour/lab.h"
+#include "image_processing/autoenhance/masks/face_blend.h"
+#include "image_processing/autoenhance/masks/flatness_mask.h"
+#include "image_processing/autoenhance/masks/image_masks.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/pictures.h"
 

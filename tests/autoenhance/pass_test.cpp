@@ -4,10 +4,10 @@
 #include <cstdlib>
 #include <limits>
 
-#include "image_processing/autoenhance/lab.h"
+#include "image_processing/autoenhance/colour/lab.h"
+#include "image_processing/autoenhance/colour/vibrance.h"
 #include "image_processing/autoenhance/lab_tone_pass.h"
-#include "image_processing/autoenhance/tone_curve.h"
-#include "image_processing/autoenhance/vibrance.h"
+#include "image_processing/autoenhance/lightness/tone_curve.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/pictures.h"
 

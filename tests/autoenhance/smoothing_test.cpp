@@ -5,11 +5,11 @@
 #include <limits>
 #include <utility>
 
-#include "image_processing/autoenhance/bilateral_filter.h"
-#include "image_processing/autoenhance/bilateral_grid.h"
-#include "image_processing/autoenhance/gaussian_approximation.h"
-#include "image_processing/autoenhance/mirror.h"
-#include "image_processing/autoenhance/trilerp.h"
+#include "image_processing/autoenhance/masks/bilateral_filter.h"
+#include "image_processing/autoenhance/masks/bilateral_grid.h"
+#include "image_processing/autoenhance/masks/gaussian_approximation.h"
+#include "image_processing/autoenhance/masks/mirror.h"
+#include "image_processing/autoenhance/masks/trilerp.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {

@@ -1,8 +1,8 @@
 #include <gtest/gtest.h>
 
-#include "image_processing/autoenhance/cdf.h"
-#include "image_processing/autoenhance/image_statistics.h"
-#include "image_processing/autoenhance/lab.h"
+#include "image_processing/autoenhance/colour/lab.h"
+#include "image_processing/autoenhance/lightness/cdf.h"
+#include "image_processing/autoenhance/lightness/image_statistics.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {

@@ -3,8 +3,8 @@
 #include <cmath>
 #include <limits>
 
-#include "image_processing/autoenhance/colour_tables.h"
-#include "image_processing/autoenhance/lab.h"
+#include "image_processing/autoenhance/colour/colour_tables.h"
+#include "image_processing/autoenhance/colour/lab.h"
 #include "tests/support/fingerprint.h"
 
 namespace pelorin::image_processing {

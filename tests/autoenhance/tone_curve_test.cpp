@@ -1,4 +1,4 @@
-#include "image_processing/autoenhance/tone_curve.h"
+#include "image_processing/autoenhance/lightness/tone_curve.h"
 
 #include <gtest/gtest.h>
 
@@ -7,8 +7,8 @@
 #include <limits>
 #include <numeric>
 
-#include "image_processing/autoenhance/build_tone_curve.h"
-#include "image_processing/autoenhance/cdf.h"
+#include "image_processing/autoenhance/lightness/build_tone_curve.h"
+#include "image_processing/autoenhance/lightness/cdf.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {

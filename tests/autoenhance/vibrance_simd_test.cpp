@@ -9,8 +9,8 @@
 #include <array>
 #include <cstdint>
 
-#include "image_processing/autoenhance/vibrance.h"
-#include "image_processing/autoenhance/vibrance_simd.h"
+#include "image_processing/autoenhance/colour/vibrance.h"
+#include "image_processing/autoenhance/colour/vibrance_simd.h"
 #include "tests/support/instruction_sets.h"
 
 HWY_BEFORE_NAMESPACE();

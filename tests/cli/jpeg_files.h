@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "image_processing/core/image.h"
-#include "platform/pn_imgproc/jpeg_codec.h"
+#include "photo/jpeg/jpeg_codec.h"
 #include "tests/cli/temporary_folder.h"
 
 namespace pelorin::test_support {

@@ -3,7 +3,7 @@
 #include <sys/inotify.h>
 #include <unistd.h>
 
-#include "platform/pn_imgproc/jpeg_codec.h"
+#include "photo/jpeg/jpeg_codec.h"
 #include "tests/jni/support/natives_fixture.h"
 #include "tests/jni/support/picture_files.h"
 #include "tests/support/pictures.h"

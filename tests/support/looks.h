@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "image_processing/filters/abstract_filter.h"
-#include "image_processing/filters/look.h"
+#include "image_processing/filters/looks/look.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::test_support {

@@ -4,7 +4,7 @@
 
 #include <cstdlib>
 
-#include "platform/pn_imgproc/jpeg_codec.h"
+#include "photo/jpeg/jpeg_codec.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::cli {

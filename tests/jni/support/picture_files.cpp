@@ -5,7 +5,7 @@
 #include <algorithm>
 #include <stdexcept>
 
-#include "platform/pn_imgproc/jpeg_codec.h"
+#include "photo/jpeg/jpeg_codec.h"
 
 namespace pelorin::test_support {
 

@@ -1,7 +1,7 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "platform/pn_imgproc/jpeg_codec.h"
+#include "photo/jpeg/jpeg_codec.h"
 
 // A codec for tests where no JPEG library is at hand: a file is "RAW", one more byte, width and
 // height in two bytes each, and RGBA pixels. What the natives do around a codec does not depend on

@@ -1,0 +1,145 @@
+#include "cli/frame/command_line.h"
+
+#include <CLI/CLI.hpp>
+#include <algorithm>
+#include <csignal>
+#include <cstdio>
+
+#include "cli/frame/errors.h"
+#include "cli/frame/interrupt.h"
+#include "cli/frame/nearest_name.h"
+
+namespace pelorin::cli {
+namespace {
+
+std::vector<std::string> optionNames(const CLI::App& app) {
+  std::vector<std::string> names;
+  for (const CLI::Option* option : app.get_options()) {
+    for (const std::string& name : option->get_lnames()) names.push_back("--" + name);
+    for (const std::string& name : option->get_snames()) names.push_back("-" + name);
+  }
+  return names;
+}
+
+}  // namespace
+
+CommandLine::CommandLine()
+    : app_(std::make_unique<CLI::App>("Quenby makes photos better, one or a thousand at a time.")) {
+  app_->name("quenby");
+  app_->set_version_flag("--version", "quenby " PELORIN_VERSION, "Print the version and leave");
+  app_->set_help_flag("-h,--help", "Print this help and leave");
+  app_->require_subcommand(0, 1);
+  app_->get_formatter()->label("SUBCOMMAND", "VERB");
+  app_->get_formatter()->column_width(30);
+  app_->footer(
+      "Examples:\n"
+      "  quenby enhance photo.jpg -o better.jpg\n"
+      "  quenby enhance -r holiday -o better/ -j 4\n"
+      "  quenby info photo.jpg\n\n"
+      "`quenby VERB --help` tells all about a verb.");
+}
+
+CommandLine::~CommandLine() = default;
+
+Verb CommandLine::addVerb(const std::string& name, const std::string& summary,
+                          const std::string& examples, std::function<ExitCode()> work) {
+  CLI::App* verb = app_->add_subcommand(name, summary);
+  std::string footer = "Examples:\n";
+  for (std::size_t start = 0; start < examples.size();) {
+    const std::size_t end = std::min(examples.find('\n', start), examples.size());
+    footer += "  " + examples.substr(start, end - start) + "\n";
+    start = end + 1;
+  }
+  footer +=
+      "\nExit codes: 0 all done, 1 some files failed, 2 wrong usage, 3 nothing to do,\n"
+      "130 interrupted.";
+  verb->footer(footer);
+  verb->group("Verbs");
+  verbs_.push_back({verb, std::move(work)});
+  return Verb(verb);
+}
+
+std::vector<std::string> CommandLine::verbNames() const {
+  std::vector<std::string> names;
+  for (const Work& work : verbs_) names.push_back(work.verb->get_name());
+  return names;
+}
+
+ExitCode CommandLine::refuse(const std::string& message, const CLI::App* verb) const {
+  const std::string of = verb == nullptr ? "" : " " + verb->get_name();
+  std::fprintf(stderr, "quenby%s: %s (see quenby%s --help)\n", of.c_str(), message.c_str(),
+               of.c_str());
+  return ExitCode::usage;
+}
+
+ExitCode CommandLine::run(int argc, char** argv) {
+  // Writes beyond a limit or into a closed pipe are then errors like any other.
+  std::signal(SIGPIPE, SIG_IGN);
+  std::signal(SIGXFSZ, SIG_IGN);
+  installInterruptHandler();
+
+  std::vector<std::string> arguments(argv + 1, argv + argc);
+  if (arguments.empty()) {
+    std::fputs(app_->help().c_str(), stderr);
+    return ExitCode::usage;
+  }
+  if (arguments[0] == "help") {
+    arguments.erase(arguments.begin());
+    arguments.push_back("--help");
+  }
+  const std::vector<std::string> verbs = verbNames();
+  if (!arguments[0].starts_with('-') && std::ranges::find(verbs, arguments[0]) == verbs.end()) {
+    return refuse(unknownName("verb", arguments[0], verbs), nullptr);
+  }
+  for (std::string& argument : arguments) {
+    // CLI11 takes [a,b] for a list; here it can only be a file's name.
+    if (argument.starts_with('[')) argument.insert(0, "./");
+  }
+
+  const auto chosen = [this]() -> const Work* {
+    const auto named = std::ranges::find_if(verbs_, [](const Work& w) { return w.verb->parsed(); });
+    return named == verbs_.end() ? nullptr : &*named;
+  };
+  try {
+    std::vector<std::string> reversed(arguments.rbegin(), arguments.rend());
+    app_->parse(std::move(reversed));
+  } catch (const CLI::Success& asked) {  // --help, --version
+    app_->exit(asked);
+    return ExitCode::allDone;
+  } catch (const CLI::ExtrasError& error) {
+    const CLI::App* verb = chosen() == nullptr ? nullptr : chosen()->verb;
+    for (const CLI::App* app : {verb, static_cast<const CLI::App*>(app_.get())}) {
+      if (app == nullptr) continue;
+      for (const std::string& extra : app->remaining()) {
+        if (extra.size() < 2 || extra[0] != '-') continue;
+        return refuse(unknownName("option", extra, optionNames(verb ? *verb : *app_)), verb);
+      }
+    }
+    return refuse(error.what(), verb);
+  } catch (const CLI::ParseError& error) {
+    return refuse(error.what(), chosen() == nullptr ? nullptr : chosen()->verb);
+  }
+
+  const Work* work = chosen();
+  if (work == nullptr) return refuse("no verb given", nullptr);
+  const std::string name = work->verb->get_name();
+  ExitCode code;
+  try {
+    code = work->run();
+  } catch (const UsageError& error) {
+    return refuse(error.what(), work->verb);
+  } catch (const Interrupted&) {
+    return ExitCode::interrupted;
+  } catch (const std::exception& error) {
+    std::fprintf(stderr, "quenby %s: %s\n", name.c_str(), explain(error).c_str());
+    return ExitCode::someFailed;
+  }
+  const bool printed = std::fflush(stdout) == 0 && std::ferror(stdout) == 0;
+  if (!printed && code == ExitCode::allDone) {
+    std::fprintf(stderr, "quenby %s: standard output cannot be written\n", name.c_str());
+    return ExitCode::someFailed;
+  }
+  return code;
+}
+
+}  // namespace pelorin::cli

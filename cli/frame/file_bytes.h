@@ -1,0 +1,21 @@
+#pragma once
+
+#include <cstdint>
+#include <span>
+#include <string>
+#include <vector>
+
+#include "cli/frame/inputs.h"
+
+namespace pelorin::cli {
+
+/// All bytes of a file or of standard input.
+/// @throws std::system_error when they cannot be read, Interrupted on Ctrl-C while waiting.
+std::vector<std::uint8_t> readInput(const Input& input);
+
+/// Writes a file in one step, old or new and never half; "-" and special files (/dev/null, a named
+/// pipe) are written as they come.
+/// @throws FileError, naming the file, when it cannot be written; an old file is then as it was.
+void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes);
+
+}  // namespace pelorin::cli

@@ -1,0 +1,175 @@
+#include "cli/frame/filter_files.h"
+
+#include <fmt/format.h>
+
+#include <memory>
+#include <optional>
+
+#include "cli/frame/errors.h"
+#include "cli/frame/interrupt.h"
+#include "cli/frame/jobs.h"
+#include "cli/frame/json_output.h"
+#include "cli/frame/recycled_memory.h"
+#include "image_processing/filters/default_filter_factory.h"
+#include "image_processing/filters/filtered_image.h"
+#include "photo/photo.h"
+
+namespace pelorin::cli {
+namespace {
+
+using image_processing::defaultFilterConfigValue;
+using image_processing::DefaultFilterFactory;
+using image_processing::FilteredImage;
+using image_processing::Image;
+using image_processing::RGBA8Pixel;
+
+struct Work {
+  FilterToApply filter;
+  std::vector<FaceFractions> faces;
+  PhotoOptions photo;
+  int quality;
+  bool overwrite;
+};
+
+struct Done {
+  std::uint32_t width, height;
+};
+
+Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter) {
+  Work work = {filter, readFaces(options.faces), {}, options.quality, options.outputs.overwrite};
+  if (options.rotate % 90 != 0) throw UsageError("--rotate: must be a multiple of 90");
+  work.photo = {options.scale, options.rotate, std::nullopt};
+  if (!options.raw.empty()) {
+    if (options.scale != 1) throw UsageError("--scale: raw pixels are read at their full size");
+    if (options.inputs.recursive) throw UsageError("--raw: name the files, folders hold JPEG");
+    work.photo.raw = readRawSize(options.raw);
+  }
+  return work;
+}
+
+Done process(const Work& work, const PlannedFile& file) {
+  stopIfInterrupted();
+  thread_local SparePixels spare;  // each worker's own
+  Photo photo = loadPhoto(file.input, work.photo, spare);
+  stopIfInterrupted();
+  Image<RGBA8Pixel>& picture = *photo.image;
+  const Done done = {picture.width, picture.height};
+  {
+    // The session ends before the encoder begins: its masks are several times the picture.
+    FilteredImage session(photo.image, metadataWithFaces(work.faces, done.width, done.height), "",
+                          defaultFilterConfigValue, DefaultFilterFactory::filterFactory());
+    session.applyFilterWithParams(work.filter.filter, work.filter.params, defaultFilterConfigValue,
+                                  /*output=*/picture);
+  }
+  stopIfInterrupted();
+  const bool raw = work.photo.raw.has_value();
+  savePicture(file.output, picture, raw, work.quality, photo.metadata);
+  if (!raw) spare.keep(picture);
+  return done;
+}
+
+Json describe(const PlannedFile& file, const char* status) {
+  return {{"input", file.input.path}, {"output", file.output}, {"status", status}};
+}
+
+ExitCode printPlan(const std::vector<PlannedFile>& plan, JsonOutput& json) {
+  bool something = false;
+  for (const PlannedFile& file : plan) {
+    something = something || !file.skipped;
+    json.add(describe(file, file.skipped ? "exists" : "planned"));
+    if (json.wanted()) continue;
+    fmt::print("{} -> {}{}\n", file.input.path, file.output,
+               file.skipped ? " (exists: skipped without --overwrite)" : "");
+  }
+  return something ? ExitCode::allDone : ExitCode::nothingToDo;
+}
+
+}  // namespace
+
+void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
+                           const std::string& placeholders) {
+  addInputOptions(verb, options.inputs);
+  addOutputOptions(verb, options.outputs, "{stem}_{filter}.jpg", placeholders);
+  addFaceOption(verb, options.faces);
+  verb.option("--rotate", options.rotate,
+              "Turn further by so many degrees clockwise, a multiple of 90")
+      .type("DEGREES");
+  verb.option("--scale", options.scale, "Decode at 1/1, 1/2, 1/4 or 1/8 of the size")
+      .oneOf({"1", "2", "4", "8"});
+  verb.option("--quality", options.quality, "JPEG quality, 90 unless given")
+      .between(1, 100)
+      .group("Output");
+  addRawOption(verb, options.raw);
+  addJobsOption(verb, options.jobs);
+  addReportOptions(verb, options.report);
+}
+
+ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
+                     const FilterToApply& filter) {
+  const Work work = readOptions(options, filter);
+  const bool raw = work.photo.raw.has_value();
+  if (options.outputs.output.empty() && options.outputs.name.empty()) {
+    throw UsageError("say where results go: -o FILE, -o FOLDER, or --name to put them beside");
+  }
+  if (options.outputs.output == "-" && (options.report.json || options.report.jsonLines)) {
+    throw UsageError("-o -: standard output takes the picture or --json, not both");
+  }
+  if (options.outputs.name.empty()) {
+    options.outputs.name = raw ? "{stem}_{filter}.rgba" : "{stem}_{filter}.jpg";
+  }
+  std::map<std::string, std::string> values = filter.values;
+  values["filter"] = filter.filter;
+  const std::vector<Input> inputs = expandInputs(options.inputs);
+  const std::vector<PlannedFile> plan =
+      planOutputs(inputs, options.inputs, options.outputs, values);
+
+  const bool singleFile = isSingleFile(options.inputs, inputs);
+  JsonOutput json(options.report, singleFile);
+  if (options.outputs.planOnly) return printPlan(plan, json);
+
+  if (options.jobs == 1 && plan.size() > 1) recycleFreedMemory();
+  const OutputFolders folders(plan);
+  Talk talk(verb, options.report.quiet, plan.size());
+  std::size_t done = 0, failed = 0, skipped = 0;
+  const bool finished = attemptJobs<std::optional<Done>>(
+      plan.size(), options.jobs,
+      [&](std::size_t index) -> std::optional<Done> {
+        return plan[index].skipped ? std::nullopt : std::optional(process(work, plan[index]));
+      },
+      [&](std::size_t index, const Attempt<std::optional<Done>>& attempt) {
+        const PlannedFile& file = plan[index];
+        if (!attempt.result) {
+          ++failed;
+          talk.error(file.input.shownName(), attempt.error);
+          Json object = describe(file, "failed");
+          object["error"] = attempt.error;
+          json.add(object);
+        } else if (!*attempt.result) {
+          ++skipped;
+          talk.error(file.output, "exists already; add --overwrite to replace it");
+          json.add(describe(file, "exists"));
+        } else {
+          ++done;
+          Json object = describe(file, "done");
+          object["width"] = (*attempt.result)->width;
+          object["height"] = (*attempt.result)->height;
+          object["filter"] = filter.filter;
+          object["params"] = filter.params;
+          json.add(object);
+        }
+        talk.fileDone();
+      });
+  if (plan.empty()) talk.note("no photos found");
+  if (plan.size() > 1) {
+    talk.note(fmt::format("{} of {} photos done, {} failed, {} there already", done, plan.size(),
+                          failed, skipped));
+  }
+  if (!finished) {
+    talk.note("interrupted; finished files stand");
+    return ExitCode::interrupted;
+  }
+  if (done == 0 && failed == 0) return ExitCode::nothingToDo;
+  return failed + skipped > 0 ? ExitCode::someFailed : ExitCode::allDone;
+}
+
+}  // namespace pelorin::cli

@@ -1,0 +1,45 @@
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "cli/frame/exit_code.h"
+#include "cli/frame/faces.h"
+#include "cli/frame/inputs.h"
+#include "cli/frame/outputs.h"
+#include "cli/frame/talk.h"
+#include "cli/frame/verb.h"
+
+namespace pelorin::cli {
+
+/// The options of every verb that makes filtered files of files.
+struct FilterFilesOptions {
+  InputOptions inputs;
+  OutputOptions outputs;
+  ReportOptions report;
+  std::vector<std::string> faces;
+  std::string raw;
+  int rotate = 0;
+  int scale = 1;
+  int quality = 90;
+  int jobs = 1;
+};
+
+/// Adds all of them to a verb. Results in a folder are called `{stem}_{filter}` by default.
+/// @param placeholders  what `--name` may hold, for the help.
+void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
+                           const std::string& placeholders = "{stem} and {filter}");
+
+/// What to do with every file.
+struct FilterToApply {
+  std::string filter;                         ///< Registry name; must exist.
+  std::string params;                         ///< As the filter reads it; already checked.
+  std::map<std::string, std::string> values;  ///< For `--name`, beside {stem} and {filter}.
+};
+
+/// Plans, then loads, filters and saves every file, reports, and says how it went.
+/// @throws UsageError before any work.
+ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
+                     const FilterToApply& filter);
+
+}  // namespace pelorin::cli

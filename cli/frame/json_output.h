@@ -1,0 +1,30 @@
+#pragma once
+
+#include <nlohmann/json.hpp>
+
+#include "cli/frame/talk.h"
+
+namespace pelorin::cli {
+
+using Json = nlohmann::ordered_json;
+
+/// Data on stdout: nothing without `--json` or `--jsonl`; one object a line with `--jsonl`; with
+/// `--json` one object, or an array of them unless the user named a single file.
+class JsonOutput {
+ public:
+  JsonOutput(const ReportOptions& options, bool singleFile)
+      : json_(options.json), lines_(options.jsonLines), single_(singleFile) {}
+  JsonOutput(const JsonOutput&) = delete;
+  JsonOutput& operator=(const JsonOutput&) = delete;
+  /// Completes the document.
+  ~JsonOutput();
+
+  bool wanted() const { return json_ || lines_; }
+  void add(const Json& object);
+
+ private:
+  bool json_, lines_, single_;
+  bool begun_ = false;
+};
+
+}  // namespace pelorin::cli

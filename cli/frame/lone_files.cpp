@@ -1,0 +1,104 @@
+#include "cli/frame/lone_files.h"
+
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <cctype>
+#include <filesystem>
+
+#include "cli/frame/errors.h"
+#include "cli/frame/interrupt.h"
+
+namespace fs = std::filesystem;
+
+namespace pelorin::cli {
+namespace {
+
+void requirePlaceFor(const std::string& path, const std::vector<Input>& inputs) {
+  if (path == "-") return;
+  std::error_code ignored;
+  if (path.empty() || path.back() == '/' || fs::is_directory(path, ignored)) {
+    throw UsageError(path + ": is a folder; name a file in it");
+  }
+  const fs::path folder = fs::path(path).parent_path();
+  if (!folder.empty() && !fs::is_directory(folder, ignored)) {
+    throw UsageError(folder.string() + ": there is no such folder; make it first (mkdir -p)");
+  }
+  for (const Input& input : inputs) {
+    if (!input.isStandardInput() && fs::equivalent(input.path, path, ignored)) {
+      throw UsageError(path + ": is itself an input; choose another output");
+    }
+  }
+}
+
+/// Special files (/dev/null, a pipe) have nothing to lose.
+bool holdsAFile(const std::string& path) {
+  std::error_code ignored;
+  const fs::file_status status = fs::status(path, ignored);
+  return path != "-" && fs::exists(status) && !fs::is_other(status);
+}
+
+}  // namespace
+
+void addLoneOutputOptions(Verb verb, LoneOutputOptions& options, const std::string& typeName,
+                          const std::string& help) {
+  verb.option("-o,--output", options.output, help).type(typeName).group("Output");
+  verb.flag("--overwrite", options.overwrite, "Replace files that are there already")
+      .group("Output");
+  verb.flag("-n,--dry-run", options.planOnly, "Print what would become what, and do nothing")
+      .group("Output");
+}
+
+Input loneInput(const std::string& name) {
+  std::error_code ignored;
+  if (name.empty()) throw UsageError("the input has an empty name");
+  if (fs::is_directory(name, ignored)) throw UsageError(name + ": is a folder; name one photo");
+  return {name, {}};
+}
+
+std::optional<ExitCode> stopBeforeWork(const std::vector<Input>& inputs,
+                                       const std::vector<std::string>& outputs,
+                                       const LoneOutputOptions& options, Talk& talk,
+                                       JsonOutput& json) {
+  bool kept = false;
+  for (const std::string& output : outputs) {
+    requirePlaceFor(output, inputs);
+    if (options.overwrite || !holdsAFile(output)) continue;
+    talk.error(output, "exists already; add --overwrite to replace it");
+    kept = true;
+  }
+  if (!kept && !options.planOnly) return std::nullopt;
+  Json plan = {{"inputs", Json::array()}, {"outputs", outputs}};
+  plan["status"] = kept ? "exists" : "planned";
+  for (const Input& input : inputs) {
+    plan["inputs"].push_back(input.path);
+    if (kept || json.wanted()) continue;
+    for (const std::string& output : outputs) fmt::print("{} -> {}\n", input.path, output);
+  }
+  json.add(plan);
+  return kept ? ExitCode::nothingToDo : ExitCode::allDone;
+}
+
+void requireExtension(const std::string& path, const std::vector<std::string>& extensions) {
+  std::string extension = fs::path(path).extension().string();
+  for (char& letter : extension) {
+    letter = static_cast<char>(std::tolower(static_cast<unsigned char>(letter)));
+  }
+  const bool known = std::find(extensions.begin(), extensions.end(), extension) != extensions.end();
+  if (extension.empty() || known) return;
+  throw UsageError(path + ": would not be a " + extension + " file; name it " + extensions[0]);
+}
+
+bool succeeds(Talk& talk, const std::string& file, const std::function<void()>& step) {
+  try {
+    step();
+    return true;
+  } catch (const Interrupted&) {
+    throw;
+  } catch (const std::exception& error) {
+    talk.error(file, explain(error));
+    return false;
+  }
+}
+
+}  // namespace pelorin::cli

@@ -1,0 +1,153 @@
+#include "cli/frame/outputs.h"
+
+#include <system_error>
+
+#include "cli/frame/errors.h"
+#include "cli/frame/nearest_name.h"
+
+namespace fs = std::filesystem;
+
+namespace pelorin::cli {
+namespace {
+
+std::string fillIn(const std::string& name, const std::map<std::string, std::string>& values) {
+  std::string filled;
+  for (std::size_t at = 0; at < name.size();) {
+    const std::size_t open = name.find('{', at);
+    filled += name.substr(at, open - at);
+    if (open == std::string::npos) break;
+    const std::size_t close = name.find('}', open);
+    if (close == std::string::npos) throw UsageError("--name: a '{' has no '}' in '" + name + "'");
+    const std::string key = name.substr(open + 1, close - open - 1);
+    const auto found = values.find(key);
+    if (found == values.end()) {
+      std::vector<std::string> keys;
+      for (const auto& [known, value] : values) keys.push_back(known);
+      throw UsageError("--name: " + unknownName("placeholder", key, keys));
+    }
+    filled += found->second;
+    at = close + 1;
+  }
+  if (filled.empty() || filled == "." || filled == ".." || filled.find('/') != std::string::npos) {
+    throw UsageError("--name: '" + filled + "' is not a file name");
+  }
+  return filled;
+}
+
+void requireFolder(const fs::path& folder) {
+  std::error_code ignored;
+  if (fs::is_directory(folder, ignored)) return;
+  if (fs::exists(folder, ignored)) {
+    throw UsageError(folder.string() + ": is not a folder; choose another output");
+  }
+  throw UsageError(folder.string() + ": there is no such folder; make it first (mkdir -p)");
+}
+
+std::string nameInFolder(const Input& input, const OutputOptions& options,
+                         std::map<std::string, std::string> values) {
+  const fs::path path = input.path;
+  values["stem"] = input.isStandardInput() ? "stdin" : path.stem().string();
+  const std::string name = fillIn(options.name, values);
+  if (options.output.empty()) return (path.parent_path() / name).string();
+  return (fs::path(options.output) / input.subfolder / name).string();
+}
+
+std::string identity(const std::string& path) {
+  std::error_code failed;
+  const fs::path canonical = fs::weakly_canonical(path, failed);
+  return failed ? fs::path(path).lexically_normal().string() : canonical.string();
+}
+
+void refuseClashes(const std::vector<PlannedFile>& plan, bool overwrite) {
+  std::map<std::string, const PlannedFile*> byInput, byOutput;
+  for (const PlannedFile& file : plan) {
+    if (!file.input.isStandardInput()) byInput.emplace(identity(file.input.path), &file);
+  }
+  for (const PlannedFile& file : plan) {
+    if (file.output == "-") continue;
+    const std::string id = identity(file.output);
+    const auto [first, isNew] = byOutput.emplace(id, &file);
+    if (!isNew) {
+      throw UsageError(file.output + ": both " + first->second->input.shownName() + " and " +
+                       file.input.shownName() + " would become this file; change --name");
+    }
+    const auto replaced = byInput.find(id);
+    if (replaced == byInput.end()) continue;
+    if (identity(file.input.path) != id) {
+      throw UsageError(file.output +
+                       ": is itself an input and would be replaced by the result of " +
+                       file.input.shownName() + "; change --name or -o");
+    }
+    if (!overwrite) {
+      throw UsageError(file.output + ": is the input itself; add --overwrite to replace it");
+    }
+  }
+}
+
+}  // namespace
+
+void addOutputOptions(Verb verb, OutputOptions& options, const std::string& defaultName,
+                      const std::string& placeholders) {
+  verb.option("-o,--output", options.output,
+              "A file, an existing folder, or - (standard output); without it results stand "
+              "beside their inputs, called by --name")
+      .type("FILE|DIR")
+      .group("Output");
+  verb.option("--name", options.name,
+              "How results are called in a folder, from " + placeholders + "; " + defaultName +
+                  " unless given")
+      .type("PATTERN")
+      .group("Output");
+  verb.flag("--overwrite", options.overwrite, "Replace files that are there already")
+      .group("Output");
+  verb.flag("-n,--dry-run", options.planOnly, "Print what would become what, and do nothing")
+      .group("Output");
+}
+
+std::vector<PlannedFile> planOutputs(const std::vector<Input>& inputs, const InputOptions& named,
+                                     const OutputOptions& options,
+                                     const std::map<std::string, std::string>& values) {
+  const std::string& output = options.output;
+  const bool toStandardOutput = output == "-";
+  std::error_code ignored;
+  const bool intoFolder = output.empty() || fs::is_directory(output, ignored);
+  const bool oneFile = isSingleFile(named, inputs);
+
+  if (toStandardOutput && !oneFile) throw UsageError("-o -: only one file fits standard output");
+  if (!intoFolder && !toStandardOutput) {
+    if (!oneFile || output.back() == '/') requireFolder(output);
+    const fs::path parent = fs::path(output).parent_path();
+    if (!parent.empty()) requireFolder(parent);
+  }
+
+  std::vector<PlannedFile> plan;
+  for (const Input& input : inputs) {
+    PlannedFile file = {input, intoFolder ? nameInFolder(input, options, values) : output, false};
+    // Special files (/dev/null, a pipe) have nothing to lose.
+    const fs::file_status status = fs::status(file.output, ignored);
+    const bool exists = file.output != "-" && fs::exists(status) && !fs::is_other(status);
+    file.skipped = exists && !options.overwrite;
+    plan.push_back(std::move(file));
+  }
+  refuseClashes(plan, options.overwrite);
+  return plan;
+}
+
+OutputFolders::OutputFolders(const std::vector<PlannedFile>& plan) {
+  for (const PlannedFile& file : plan) {
+    if (!file.skipped && file.output != "-") make(fs::path(file.output).parent_path());
+  }
+}
+
+OutputFolders::~OutputFolders() {
+  std::error_code ignored;
+  for (auto folder = made_.rbegin(); folder != made_.rend(); ++folder) fs::remove(*folder, ignored);
+}
+
+void OutputFolders::make(const fs::path& folder) {
+  if (folder.empty() || fs::is_directory(folder)) return;
+  make(folder.parent_path());
+  if (fs::create_directory(folder)) made_.push_back(folder);
+}
+
+}  // namespace pelorin::cli

@@ -1,0 +1,60 @@
+#pragma once
+
+#include <filesystem>
+#include <map>
+#include <string>
+#include <vector>
+
+#include "cli/frame/inputs.h"
+#include "cli/frame/verb.h"
+
+namespace pelorin::cli {
+
+/// Where results go, as the user said it.
+struct OutputOptions {
+  std::string output;  ///< `-o`: a file, an existing folder, "-", or empty.
+  std::string name;    ///< `--name`: how files in a folder are called.
+  bool overwrite = false;
+  bool planOnly = false;
+};
+
+/// Adds `-o`, `--name`, `--overwrite` and `-n` to a verb.
+/// @param defaultName   used when `--name` is not given, for example "{stem}_{filter}.jpg".
+/// @param placeholders  what `--name` may hold in braces, for the help: "{stem}, {filter}".
+void addOutputOptions(Verb verb, OutputOptions& options, const std::string& defaultName,
+                      const std::string& placeholders);
+
+/// One input and the file it becomes.
+struct PlannedFile {
+  Input input;
+  std::string output;  ///< "-" is standard output.
+  bool skipped;        ///< There already, and `--overwrite` was not given.
+};
+
+/// Says for every input which file it becomes, before any work. In a folder a result is called
+/// after `name`, whose {stem} is the input's name without its extension and whose other
+/// placeholders are `values`; below it stand the input's own sub-folders.
+/// @param named  what the user typed as inputs: several, a folder or a list need an output folder.
+/// @throws UsageError when two inputs would become one file, when a result would replace an input
+///         (its own is allowed with `--overwrite`), when the output folder is missing, and for a
+///         name that is no file name or has an unknown placeholder.
+std::vector<PlannedFile> planOutputs(const std::vector<Input>& inputs, const InputOptions& named,
+                                     const OutputOptions& options,
+                                     const std::map<std::string, std::string>& values);
+
+/// The sub-folders that a plan needs: made at once, and the ones that stayed empty removed at the
+/// end.
+class OutputFolders {
+ public:
+  /// @throws std::filesystem::filesystem_error when one cannot be made.
+  explicit OutputFolders(const std::vector<PlannedFile>& plan);
+  ~OutputFolders();
+  OutputFolders(const OutputFolders&) = delete;
+  OutputFolders& operator=(const OutputFolders&) = delete;
+
+ private:
+  void make(const std::filesystem::path& folder);
+  std::vector<std::filesystem::path> made_;  // parents before children
+};
+
+}  // namespace pelorin::cli

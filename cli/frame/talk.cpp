@@ -1,0 +1,63 @@
+#include "cli/frame/talk.h"
+
+#include <fmt/format.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <utility>
+
+namespace pelorin::cli {
+
+void addReportOptions(Verb verb, ReportOptions& options) {
+  Option json = verb.flag("--json", options.json,
+                          "Print data as JSON: an object for one file, else an array");
+  json.group("Reporting");
+  verb.flag("--jsonl", options.jsonLines, "Print data as JSON, one object a line and file")
+      .excludes(json)
+      .group("Reporting");
+  verb.flag("-q,--quiet", options.quiet, "Say nothing but errors").group("Reporting");
+}
+
+Talk::Talk(std::string verb, bool quiet, std::size_t files)
+    : verb_(std::move(verb)),
+      quiet_(quiet),
+      hasBar_(!quiet && files > 1 && isatty(STDERR_FILENO) == 1),
+      files_(files) {
+  showBar();
+}
+
+Talk::~Talk() {
+  hideBar();
+}
+
+void Talk::error(const std::string& file, const std::string& clause) {
+  hideBar();
+  fmt::print(stderr, "quenby {}: {}: {}\n", verb_, file, clause);
+  showBar();
+}
+
+void Talk::note(const std::string& line) {
+  if (quiet_) return;
+  hideBar();
+  fmt::print(stderr, "{}\n", line);
+  showBar();
+}
+
+void Talk::fileDone() {
+  ++done_;
+  showBar();
+}
+
+void Talk::hideBar() {
+  if (hasBar_) fmt::print(stderr, "\r\033[K");
+}
+
+void Talk::showBar() {
+  if (!hasBar_) return;
+  constexpr std::size_t width = 40;
+  const std::size_t filled = done_ * width / files_;
+  fmt::print(stderr, "\r[{:#<{}}{:<{}}] {}/{}", "", filled, "", width - filled, done_, files_);
+  std::fflush(stderr);
+}
+
+}  // namespace pelorin::cli

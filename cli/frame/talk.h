@@ -1,0 +1,44 @@
+#pragma once
+
+#include <cstddef>
+#include <string>
+
+#include "cli/frame/verb.h"
+
+namespace pelorin::cli {
+
+/// How a verb reports, as the user said it.
+struct ReportOptions {
+  bool json = false;
+  bool jsonLines = false;
+  bool quiet = false;
+};
+
+/// Adds `--json`, `--jsonl` and `--quiet` to a verb.
+void addReportOptions(Verb verb, ReportOptions& options);
+
+/// Everything that is said to a person, on stderr: errors, notes, and one progress bar when stderr
+/// is a terminal and there are several files. Not for several threads.
+class Talk {
+ public:
+  Talk(std::string verb, bool quiet, std::size_t files);
+  ~Talk();
+  Talk(const Talk&) = delete;
+  Talk& operator=(const Talk&) = delete;
+
+  /// "quenby enhance: a.jpg: is empty, not a JPEG file". Said even when quiet.
+  void error(const std::string& file, const std::string& clause);
+  void note(const std::string& line);
+  /// Moves the bar on by one file.
+  void fileDone();
+
+ private:
+  void hideBar();
+  void showBar();
+
+  std::string verb_;
+  bool quiet_, hasBar_;
+  std::size_t files_, done_ = 0;
+};
+
+}  // namespace pelorin::cli

@@ -1,0 +1,133 @@
+#include <fmt/format.h>
+
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "cli/frame/errors.h"
+#include "cli/frame/interrupt.h"
+#include "cli/frame/json_output.h"
+#include "cli/frame/number_text.h"
+#include "cli/frame/talk.h"
+#include "cli/verbs/dupes/report.h"
+#include "cli/verbs/verbs.h"
+#include "image_processing/dupe/cdf_distance.h"
+#include "photo/collection/pair_search.h"
+#include "photo/collection/photo_record.h"
+#include "photo/photo.h"
+
+namespace pelorin::cli {
+namespace {
+
+struct CompareOptions {
+  std::string a, b;
+  std::string dt, sameOrientation;
+  std::string raw, raw2;
+  int scale = 1;
+  ReportOptions report;
+};
+
+Shot readShot(const std::string& path, const std::string& raw, int scale) {
+  const Input input = {path, {}};
+  try {
+    PhotoOptions options;
+    options.scale = scale;
+    if (!raw.empty()) options.raw = readRawSize(raw);
+    const Photo photo = loadPhoto(input, options);
+    Shot shot;
+    image_processing::computeGreenCDF(*photo.image, shot.cdf);
+    if (photo.facts) {
+      shot.orientation = photo.facts->orientation;
+      if (photo.facts->captureTime) shot.time = shotTime(*photo.facts->captureTime);
+    }
+    return shot;
+  } catch (const UsageError&) {
+    throw;
+  } catch (const Interrupted&) {
+    throw;
+  } catch (const std::exception& error) {
+    throw FileError(input.shownName() + ": " + explain(error));
+  }
+}
+
+ExitCode runCompare(const CompareOptions& options) {
+  if (options.a == "-" && options.b == "-") {
+    throw UsageError("standard input can be named only once");
+  }
+  const bool anyRaw = !options.raw.empty() || !options.raw2.empty();
+  if (anyRaw && options.scale != 1) {
+    throw UsageError("--scale: raw pixels are read at their full size");
+  }
+  std::optional<float> givenSeconds;
+  if (!options.dt.empty()) givenSeconds = readFiniteNumber("--dt", options.dt);
+
+  Shot a = readShot(options.a, options.raw, options.scale);
+  Shot b = readShot(options.b, options.raw2.empty() ? options.raw : options.raw2, options.scale);
+  const char* timeSource = a.time && b.time ? "camera" : "unknown";
+  if (givenSeconds) {
+    timeSource = "given";
+    a.time = ShotTime{0.0, std::nullopt};
+    b.time = ShotTime{*givenSeconds, std::nullopt};
+  }
+  if (!options.sameOrientation.empty()) {
+    a.orientation = 1;
+    b.orientation = options.sameOrientation == "yes" ? 1 : 2;
+  }
+
+  const ShotPair pair = compareShots(a, b);
+  const float gainAB = image_processing::matchCDFDomain(a.cdf, b.cdf);
+  const float gainBA = image_processing::matchCDFDomain(b.cdf, a.cdf);
+  JsonOutput json(options.report, /*singleFile=*/true);
+  if (json.wanted()) {
+    Json object = {{"a", options.a}, {"b", options.b}};
+    object.update(pairAsJson(pair));
+    object["timeSource"] = timeSource;
+    object["gainAB"] = nineDigits(gainAB);
+    object["gainBA"] = nineDigits(gainBA);
+    json.add(object);
+    return ExitCode::allDone;
+  }
+  fmt::print("score        {:.9g}\n", pair.score);
+  fmt::print("distance     {:.9g}\n", pair.distance);
+  fmt::print("gain A to B  {:.9g}\n", gainAB);
+  fmt::print("gain B to A  {:.9g}\n", gainBA);
+  fmt::print("time apart   {}\n", pair.timesKnown
+                                      ? fmt::format("{:.9g} s ({})", pair.seconds, timeSource)
+                                      : std::string("not known, taken as 0"));
+  fmt::print("orientation  {}\n", pair.sameOrientation ? "same" : "different");
+  return ExitCode::allDone;
+}
+
+}  // namespace
+
+void addCompare(CommandLine& commandLine) {
+  const auto options = std::make_shared<CompareOptions>();
+  Verb verb =
+      commandLine.addVerb("compare", "Tell how likely two photos are near-duplicates, and why",
+                          "quenby compare a.jpg b.jpg\n"
+                          "quenby compare a.jpg b.jpg --dt 2.5 --same-orientation yes --json\n"
+                          "quenby compare a.rgba b.rgba --raw 640x480 --raw2 480x640",
+                          [options] { return runCompare(*options); });
+  verb.option("A", options->a, "A JPEG file, or - (standard input)")
+      .type("FILE")
+      .required()
+      .group("Input");
+  verb.option("B", options->b, "Another").type("FILE").required().group("Input");
+  verb.option("--dt", options->dt,
+              "Seconds between the two; from the cameras' times unless given, 0 where those "
+              "are not known")
+      .type("SECONDS");
+  verb.option("--same-orientation", options->sameOrientation,
+              "Whether the camera was held alike; from the photos unless given")
+      .oneOf({"yes", "no"});
+  verb.option("--scale", options->scale, "Decode at 1/1, 1/2, 1/4 or 1/8 of the size")
+      .oneOf({"1", "2", "4", "8"});
+  addRawOption(verb, options->raw);
+  verb.option("--raw2", options->raw2,
+              "Size of B's raw pixels where it is another than A's; alone, only B is raw")
+      .type("WxH")
+      .group("Raw pixels");
+  addReportOptions(verb, options->report);
+}
+
+}  // namespace pelorin::cli

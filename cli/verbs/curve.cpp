@@ -1,0 +1,135 @@
+#include <fmt/format.h>
+
+#include <filesystem>
+#include <memory>
+#include <vector>
+
+#include "cli/frame/errors.h"
+#include "cli/frame/faces.h"
+#include "cli/frame/file_bytes.h"
+#include "cli/frame/json_output.h"
+#include "cli/frame/lone_files.h"
+#include "cli/frame/number_text.h"
+#include "cli/pictures/tone_curve_plot.h"
+#include "cli/verbs/verbs.h"
+#include "image_processing/autoenhance/lightness/build_tone_curve.h"
+#include "image_processing/autoenhance/lightness/image_statistics.h"
+#include "image_processing/filters/filter_config.h"
+#include "photo/photo.h"
+#include "photo/png/png_file.h"
+
+namespace pelorin::cli {
+namespace {
+
+using image_processing::ImageStatistics;
+
+struct CurveOptions {
+  std::string input, raw;
+  std::string slider = "0.4";
+  LoneOutputOptions outputs;
+  ReportOptions report;
+  std::vector<std::string> faces;
+  bool text = false;
+};
+
+struct Curve {
+  std::uint32_t width, height;
+  ImageStatistics statistics;
+  std::vector<float> samples;
+};
+
+Curve curveOf(const Photo& photo, float slider, const std::vector<FaceFractions>& faces) {
+  Curve curve{photo.image->width, photo.image->height, {}, {}};
+  image_processing::analyzeImage(*photo.image, metadataWithFaces(faces, curve.width, curve.height),
+                                 curve.statistics);
+  image_processing::FilterConfig config = image_processing::defaultFilterConfigValue;
+  image_processing::updateFilterConfigForSliderValue(slider, &config);
+  curve.samples = image_processing::buildToneCurve(curve.statistics, config);
+  return curve;
+}
+
+Plot plotOf(const Curve& curve, const Input& input, float slider, std::size_t faces) {
+  const std::string name = input.isStandardInput()
+                               ? "standard input"
+                               : std::filesystem::path(input.path).filename().string();
+  std::string about =
+      fmt::format("{} \xC3\x97 {} pixels, slider {:g}", curve.width, curve.height, slider);
+  if (faces > 0) about += fmt::format(", {} {}", faces, faces == 1 ? "face" : "faces");
+  return toneCurvePlot("Tone curve of " + name, about, curve.samples, curve.statistics.cdf,
+                       curve.statistics.faceMedianBin);
+}
+
+Json numbers(const std::vector<float>& values) {
+  Json list = Json::array();
+  for (const float value : values) list.push_back(nineDigits(value));
+  return list;
+}
+
+Json describe(const Curve& curve, const Input& input, float slider) {
+  return {{"file", input.path},
+          {"width", curve.width},
+          {"height", curve.height},
+          {"slider", nineDigits(slider)},
+          {"faceMedianBin", curve.statistics.faceMedianBin},
+          {"cdf", numbers(curve.statistics.cdf)},
+          {"curve", numbers(curve.samples)}};
+}
+
+ExitCode runCurve(const CurveOptions& options) {
+  const float slider = readSlider("--slider", options.slider);
+  const std::vector<FaceFractions> faces = readFaces(options.faces);
+  PhotoOptions photoOptions;
+  if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
+  const Input input = loneInput(options.input);
+  const std::string& output = options.outputs.output;
+  JsonOutput json(options.report, true);
+  if (output.empty() && !options.text && !json.wanted()) {
+    throw UsageError("say what to make of the curve: -o PLOT.png, --text or --json");
+  }
+  if ((output == "-") + options.text + json.wanted() > 1) {
+    throw UsageError("standard output takes one of -o -, --text and --json");
+  }
+  requireExtension(output, {".png"});
+  Talk talk("curve", options.report.quiet, 1);
+  const bool plotted = !output.empty();
+  const std::vector<std::string> outputs(plotted ? 1 : 0, output);
+  if (const auto code = stopBeforeWork({input}, outputs, options.outputs, talk, json)) return *code;
+
+  Curve curve;
+  const bool done = succeeds(talk, input.shownName(), [&] {
+    curve = curveOf(loadPhoto(input, photoOptions), slider, faces);
+    if (!plotted) return;
+    writeOutput(output, encodePng(drawPlot(plotOf(curve, input, slider, faces.size()))));
+  });
+  if (!done) return ExitCode::someFailed;
+  if (options.text) {
+    for (const float sample : curve.samples) fmt::print("{:.9g}\n", sample);
+  }
+  json.add(describe(curve, input, slider));
+  return ExitCode::allDone;
+}
+
+}  // namespace
+
+void addCurve(CommandLine& commandLine) {
+  const auto options = std::make_shared<CurveOptions>();
+  Verb verb =
+      commandLine.addVerb("curve", "Plot or print the tone curve that auto-enhance gives a photo",
+                          "quenby curve photo.jpg --slider 0.6 -o curve.png\n"
+                          "quenby curve photo.jpg --slider 0.6 --text\n"
+                          "quenby curve photo.jpg --json\n",
+                          [options] { return runCurve(*options); });
+  verb.option("IN", options->input, "A photo: a JPEG file or - (standard input)").required();
+  verb.option("--slider", options->slider, "Strength from 0 (none) to 1; 0.4 unless given")
+      .type("NUMBER");
+  addFaceOption(verb, options->faces);
+  verb.flag("--text", options->text,
+            "Print the 51 samples, one a line, with nine significant digits");
+  addLoneOutputOptions(verb, options->outputs, "FILE",
+                       "The PNG file for the plot, or - (standard output)");
+  addRawOption(verb, options->raw);
+  verb.named("--raw").help("Read packed RGBA bytes of this size");
+  addReportOptions(verb, options->report);
+}
+
+}  // namespace pelorin::cli

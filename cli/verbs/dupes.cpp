@@ -1,0 +1,269 @@
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <filesystem>
+#include <memory>
+#include <optional>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "cli/frame/errors.h"
+#include "cli/frame/file_bytes.h"
+#include "cli/frame/jobs.h"
+#include "cli/frame/number_text.h"
+#include "cli/frame/talk.h"
+#include "cli/verbs/dupes/html_report.h"
+#include "cli/verbs/dupes/report.h"
+#include "cli/verbs/verbs.h"
+#include "photo/collection/pair_search.h"
+#include "photo/collection/photo_library.h"
+#include "photo/collection/photo_score.h"
+#include "photo/collection/thumbnail.h"
+
+namespace pelorin::cli {
+namespace {
+
+struct DupesOptions {
+  InputOptions inputs;
+  ReportOptions report;
+  std::string threshold = "0";
+  std::string scale = "auto";
+  std::string cache;
+  std::string keep;
+  std::string html;
+  bool assumeFileTime = false;
+  bool overwrite = false;
+  int jobs = 1;
+};
+
+constexpr const char* verbName = "dupes";
+
+// A few hundred pieces: enough to share among cores and to show how far the search is.
+bool searchPairs(const std::vector<Shot>& shots, float threshold, const DupesOptions& options,
+                 std::vector<ShotPair>& pairs) {
+  const PairSearch search(shots, threshold);
+  const std::size_t pieces = std::min<std::size_t>(search.stepCount(), 400);
+  Talk talk(verbName, options.report.quiet, pieces);
+  std::vector<std::vector<ShotPair>> found(pieces);
+  const bool finished = runJobs(
+      pieces, options.jobs,
+      [&](std::size_t piece) {
+        // Every so-manieth step: neighbours in time are equally dense, so pieces are equally long.
+        for (std::size_t step = piece; step < search.stepCount(); step += pieces) {
+          stopIfInterrupted();
+          search.run(step, found[piece]);
+        }
+      },
+      [&](std::size_t piece) {
+        pairs.insert(pairs.end(), found[piece].begin(), found[piece].end());
+        found[piece] = {};
+        talk.fileDone();
+      });
+  sortPairs(pairs);
+  return finished;
+}
+
+// Reads the photos whose score decides once more, unless the cache knows it.
+bool scorePhotos(const DupesOptions& options, PhotoCache* cache, std::string& cacheTrouble,
+                 DupeReport& report) {
+  struct Unscored {
+    std::size_t photo;
+    std::optional<FileStamp> stamp;  // taken before the file is read
+  };
+  std::vector<Unscored> unscored;
+  for (const std::size_t i : photosToScore(report.groups, report.photos)) {
+    ScannedPhoto& photo = report.photos[i];
+    if (photo.input.isStandardInput()) continue;  // cannot be read twice
+    const std::optional<FileStamp> stamp = stampOf(photo.input);
+    if (cache != nullptr && stamp) photo.niqe = cache->findScore(photo.input.path, *stamp);
+    if (!photo.niqe) unscored.push_back({i, stamp});
+  }
+  Talk talk(verbName, options.report.quiet, unscored.size());
+  return attemptJobs<float>(
+      unscored.size(), options.jobs,
+      [&](std::size_t job) { return scoreOf(report.photos[unscored[job].photo].input); },
+      [&](std::size_t job, const Attempt<float>& attempt) {
+        const auto& [i, stamp] = unscored[job];
+        const Input& input = report.photos[i].input;
+        report.photos[i].niqe = attempt.result;
+        if (!attempt.result) {
+          report.failed.push_back({input, "no score of it: " + attempt.error});
+          talk.error(input.shownName(), report.failed.back().reason);
+        } else if (cache != nullptr && stamp && cacheTrouble.empty()) {
+          try {
+            cache->storeScore(input.path, *stamp, *attempt.result);
+          } catch (const CacheError& error) {
+            cacheTrouble = error.what();
+          }
+        }
+        talk.fileDone();
+      });
+}
+
+// Reads the photos of all groups once more, for their pictures.
+bool writeHtml(const DupesOptions& options, DupeReport& report) {
+  std::vector<std::size_t> shown;
+  for (const DupeGroup& group : report.groups) {
+    for (const std::size_t photo : group.photos) {
+      if (!report.photos[photo].input.isStandardInput()) shown.push_back(photo);
+    }
+  }
+  std::vector<std::vector<std::uint8_t>> thumbnails(report.photos.size());
+  using Thumbnail = std::vector<std::uint8_t>;
+  {
+    Talk talk(verbName, options.report.quiet, shown.size());
+    const bool finished = attemptJobs<Thumbnail>(
+        shown.size(), options.jobs,
+        [&](std::size_t job) { return thumbnailOf(report.photos[shown[job]]); },
+        [&](std::size_t job, const Attempt<Thumbnail>& attempt) {
+          if (attempt.result) {
+            thumbnails[shown[job]] = *attempt.result;
+          } else {
+            const Input& input = report.photos[shown[job]].input;
+            report.failed.push_back({input, "no picture of it: " + attempt.error});
+            talk.error(input.shownName(), report.failed.back().reason);
+          }
+          talk.fileDone();
+        });
+    if (!finished) return false;
+  }
+  const std::string html = htmlReport(report, thumbnails);
+  writeOutput(options.html, {reinterpret_cast<const std::uint8_t*>(html.data()), html.size()});
+  return true;
+}
+
+void printReport(const DupesOptions& options, const DupeReport& report) {
+  if (options.report.json) {
+    Json document = {{"threshold", nineDigits(report.threshold)},
+                     {"photos", report.photos.size()},
+                     {"groups", Json::array()},
+                     {"failed", Json::array()}};
+    for (const DupeGroup& group : report.groups) {
+      document["groups"].push_back(groupAsJson(report, group));
+    }
+    for (const FailedPhoto& failed : report.failed) {
+      document["failed"].push_back(failureAsJson(failed));
+    }
+    JsonOutput(options.report, /*singleFile=*/true).add(document);
+  } else if (options.report.jsonLines) {
+    JsonOutput json(options.report, /*singleFile=*/false);
+    for (const DupeGroup& group : report.groups) json.add(groupAsJson(report, group));
+    for (const FailedPhoto& failed : report.failed) json.add(failureAsJson(failed));
+  } else if (options.html != "-") {
+    std::size_t number = 0;
+    for (const DupeGroup& group : report.groups) {
+      fmt::print("{}", groupAsText(report, group, ++number));
+    }
+  }
+}
+
+void checkHtml(const DupesOptions& options) {
+  if (options.html == "-" && (options.report.json || options.report.jsonLines)) {
+    throw UsageError("--html -: standard output takes the page or --json, not both");
+  }
+  std::error_code ignored;
+  if (!options.overwrite && std::filesystem::is_regular_file(options.html, ignored)) {
+    throw UsageError("--html: " + options.html + " exists; add --overwrite to replace it");
+  }
+}
+
+// Time tells more than light: without it, photos that are only a little alike reach threshold 0.
+void noteUntimed(const DupeReport& report, Talk& talk) {
+  const auto untimed =
+      std::count_if(report.photos.begin(), report.photos.end(),
+                    [](const ScannedPhoto& photo) { return photo.timeSource == TimeSource::none; });
+  if (untimed == 0) return;
+  talk.note(
+      fmt::format("{} of {} photos tell no time and were compared as if taken with every "
+                  "other; if that joins too much, try --assume-mtime or --threshold 2",
+                  untimed, report.photos.size()));
+}
+
+ExitCode runDupes(const DupesOptions& options) {
+  const float threshold = readFiniteNumber("--threshold", options.threshold);
+  checkHtml(options);
+  const std::vector<Input> inputs = withoutRepetitions(expandInputs(options.inputs));
+  if (inputs.empty()) {
+    Talk(verbName, options.report.quiet, 0).note("no photos found");
+    return ExitCode::nothingToDo;
+  }
+  std::unique_ptr<PhotoCache> cache;
+  if (!options.cache.empty()) cache = std::make_unique<PhotoCache>(options.cache);
+
+  PhotoLibrary library;
+  {
+    Talk talk(verbName, options.report.quiet, inputs.size());
+    library = scanPhotos(
+        inputs,
+        {options.scale == "auto" ? automaticScale : std::stoi(options.scale), options.jobs,
+         options.assumeFileTime, cache.get()},
+        [&](const FailedPhoto& failed) { talk.error(failed.input.shownName(), failed.reason); },
+        [&] { talk.fileDone(); });
+  }
+  if (library.interrupted) return ExitCode::interrupted;
+  std::vector<ShotPair> pairs;
+  if (!searchPairs(library.shots, threshold, options, pairs)) return ExitCode::interrupted;
+
+  DupeReport report = {
+      threshold, std::move(library.photos), {}, std::move(library.failed), !options.keep.empty()};
+  report.groups = groupPairs(report.photos.size(), pairs);
+  if (report.rank && !scorePhotos(options, cache.get(), library.cacheTrouble, report)) {
+    return ExitCode::interrupted;
+  }
+  if (!options.html.empty() && !writeHtml(options, report)) return ExitCode::interrupted;
+  printReport(options, report);
+
+  Talk talk(verbName, options.report.quiet, 0);
+  noteUntimed(report, talk);
+  talk.note(summaryOf(report));
+  if (!library.cacheTrouble.empty()) {
+    fmt::print(stderr, "quenby {}: {}\n", verbName, library.cacheTrouble);
+  }
+  const bool trouble = !report.failed.empty() || !library.cacheTrouble.empty();
+  return trouble ? ExitCode::someFailed : ExitCode::allDone;
+}
+
+}  // namespace
+
+void addDupes(CommandLine& commandLine) {
+  const auto options = std::make_shared<DupesOptions>();
+  Verb verb = commandLine.addVerb(
+      verbName, "Find near-duplicates among photos: the same scene, a moment apart",
+      "quenby dupes -r holiday\n"
+      "quenby dupes -r photos -j 0 --cache photos.cache --html report.html\n"
+      "quenby dupes *.jpg --threshold 1.5 --keep best\n"
+      "quenby dupes -r photos --keep best --jsonl | jq -r '.ranking[]? | select(.keep | not).file'",
+      [options] { return runDupes(*options); });
+  addInputOptions(verb, options->inputs);
+  verb.option("--threshold", options->threshold,
+              "Smallest score of a pair; 0 unless given, larger is stricter, the same photo "
+              "twice scores about 3.6")
+      .type("SCORE");
+  verb.option("--scale", options->scale,
+              "Decode photos at 1/1, 1/2, 1/4 or 1/8 of their size; auto, unless given, is "
+              "1/8 from 4 megapixels on and less for smaller photos")
+      .oneOf({"auto", "1", "2", "4", "8"});
+  verb.flag("--assume-mtime", options->assumeFileTime,
+            "Photos without a capture time take that of their file; otherwise they are "
+            "compared with every photo, the time apart taken as 0");
+  verb.option("--cache", options->cache,
+              "Keep what was read in this file, so that the next run reads only new and "
+              "changed photos")
+      .type("FILE");
+  verb.option("--keep", options->keep,
+              "best: say in each group which photo to keep, by resolution, then by how "
+              "natural it looks (NIQE), then by the size of the file; photos of equal "
+              "resolution are read again for that; nothing is ever deleted")
+      .oneOf({"best"});
+  verb.option("--html", options->html,
+              "Write a page with the groups' pictures side by side; reads those photos again")
+      .type("FILE")
+      .group("Output");
+  verb.flag("--overwrite", options->overwrite, "Replace an --html file that exists")
+      .group("Output");
+  addJobsOption(verb, options->jobs);
+  addReportOptions(verb, options->report);
+}
+
+}  // namespace pelorin::cli

@@ -1,0 +1,137 @@
+#include "cli/verbs/dupes/html_report.h"
+
+#include <fmt/format.h>
+
+#include <map>
+#include <string_view>
+
+namespace pelorin::cli {
+namespace {
+
+constexpr std::string_view head = R"(<!DOCTYPE html>
+<html lang="en">
+<head>
+<meta charset="utf-8">
+<meta name="viewport" content="width=device-width, initial-scale=1">
+<title>Near-duplicates</title>
+<style>
+:root { color-scheme: light dark; }
+body { font: 15px/1.45 system-ui, sans-serif; }
+body { margin: 2rem auto; max-width: 75rem; padding: 0 1rem; }
+section { border-top: 1px solid #8886; padding: 1rem 0; }
+.photos { display: flex; flex-wrap: wrap; gap: 1rem; }
+figure { margin: 0; width: 16rem; }
+figure.keep img, figure.keep .none { outline: 3px solid #2a8a3e; }
+img, .none { display: block; max-width: 100%; border-radius: 3px; }
+.none { width: 16rem; line-height: 8rem; text-align: center; background: #8883; }
+figcaption { overflow-wrap: anywhere; margin-top: .3rem; }
+small { display: block; opacity: .75; }
+table { border-collapse: collapse; margin-top: 1rem; font-variant-numeric: tabular-nums; }
+th, td { text-align: left; padding: .15rem .8rem .15rem 0; overflow-wrap: anywhere; }
+</style>
+</head>
+<body>
+<h1>Near-duplicates</h1>
+)";
+
+std::string escaped(std::string_view text) {
+  std::string html;
+  for (const char letter : text) {
+    switch (letter) {
+      case '&':
+        html += "&amp;";
+        break;
+      case '<':
+        html += "&lt;";
+        break;
+      case '>':
+        html += "&gt;";
+        break;
+      case '"':
+        html += "&quot;";
+        break;
+      default:
+        html += letter;
+    }
+  }
+  return html;
+}
+
+std::string base64(const std::vector<std::uint8_t>& bytes) {
+  constexpr std::string_view digits =
+      "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789+/";
+  std::string text;
+  for (std::size_t i = 0; i < bytes.size(); i += 3) {
+    const auto byte = [&](std::size_t at) -> std::uint32_t {
+      return at < bytes.size() ? bytes[at] : 0;
+    };
+    const std::uint32_t bits = byte(i) << 16 | byte(i + 1) << 8 | byte(i + 2);
+    text += digits[bits >> 18];
+    text += digits[bits >> 12 & 63];
+    text += i + 1 < bytes.size() ? digits[bits >> 6 & 63] : '=';
+    text += i + 2 < bytes.size() ? digits[bits & 63] : '=';
+  }
+  return text;
+}
+
+std::string figure(const ScannedPhoto& photo, const std::vector<std::uint8_t>& thumbnail,
+                   const Ranked* ranked, bool keep) {
+  const std::string name = escaped(photo.input.shownName());
+  std::string html = keep ? "<figure class=\"keep\">\n" : "<figure>\n";
+  html += thumbnail.empty() ? std::string("<div class=\"none\">no picture</div>\n")
+                            : fmt::format("<img alt=\"{}\" src=\"data:image/jpeg;base64,{}\">\n",
+                                          name, base64(thumbnail));
+  html += fmt::format("<figcaption>{}\n<small>{} × {}, {}</small>\n", name, photo.width,
+                      photo.height, escaped(timeText(photo)));
+  if (ranked != nullptr) {
+    html += fmt::format("<small>{}{}</small>\n", keep ? "keep: " : "", escaped(ranked->reason));
+  }
+  return html + "</figcaption>\n</figure>\n";
+}
+
+std::string pairTable(const DupeReport& report, const DupeGroup& group) {
+  std::string html =
+      "<table>\n<tr><th>Photo</th><th>Photo</th><th>Score</th><th>Seconds apart</th>"
+      "<th>Distance</th><th>Orientation</th></tr>\n";
+  for (const ShotPair& pair : group.pairs) {
+    html += fmt::format(
+        "<tr><td>{}</td><td>{}</td><td>{:.2f}</td><td>{}</td><td>{:.4f}</td><td>{}</td></tr>\n",
+        escaped(report.photos[pair.first].input.shownName()),
+        escaped(report.photos[pair.second].input.shownName()), pair.score,
+        pair.timesKnown ? fmt::format("{:.2f}", pair.seconds)
+                        : std::string("not known, taken as 0"),
+        pair.distance, pair.sameOrientation ? "same" : "different");
+  }
+  return html + "</table>\n";
+}
+
+}  // namespace
+
+std::string htmlReport(const DupeReport& report,
+                       const std::vector<std::vector<std::uint8_t>>& thumbnails) {
+  std::string html(head);
+  html += fmt::format("<p>{}, threshold {}.</p>\n", summaryOf(report), report.threshold);
+  for (std::size_t g = 0; g < report.groups.size(); ++g) {
+    const DupeGroup& group = report.groups[g];
+    const std::vector<Ranked> ranking =
+        report.rank ? rankGroup(group, report.photos) : std::vector<Ranked>{};
+    std::map<std::size_t, const Ranked*> rankedOf;
+    for (const Ranked& ranked : ranking) rankedOf[ranked.photo] = &ranked;
+    html += fmt::format("<section>\n<h2>Group {}</h2>\n<div class=\"photos\">\n", g + 1);
+    for (const std::size_t i : group.photos) {
+      const Ranked* ranked = report.rank ? rankedOf[i] : nullptr;
+      html += figure(report.photos[i], thumbnails[i], ranked,
+                     ranked != nullptr && ranked == ranking.data());
+    }
+    html += "</div>\n" + pairTable(report, group) + "</section>\n";
+  }
+  if (!report.failed.empty()) html += "<section>\n<h2>Not read</h2>\n<ul>\n";
+  for (const FailedPhoto& failed : report.failed) {
+    html +=
+        fmt::format("<li>{}: {}</li>\n", escaped(failed.input.shownName()), escaped(failed.reason));
+  }
+  if (!report.failed.empty()) html += "</ul>\n</section>\n";
+  return html + "</body>\n</html>\n";
+}
+
+}  // namespace pelorin::cli

@@ -1,0 +1,176 @@
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "cli/frame/faces.h"
+#include "cli/frame/histogram_chart.h"
+#include "cli/frame/inputs.h"
+#include "cli/frame/jobs.h"
+#include "cli/frame/json_output.h"
+#include "cli/frame/number_text.h"
+#include "cli/verbs/verbs.h"
+#include "image_processing/autoenhance/lightness/build_tone_curve.h"
+#include "image_processing/autoenhance/lightness/cdf.h"
+#include "photo/photo.h"
+
+namespace pelorin::cli {
+namespace {
+
+using image_processing::FilterConfig;
+using image_processing::ImageStatistics;
+
+struct InfoOptions {
+  InputOptions inputs;
+  ReportOptions report;
+  std::vector<std::string> faces;
+  std::string raw;
+  std::string slider = "0.4";
+  int jobs = 1;
+};
+
+struct Info {
+  std::uint32_t width, height;
+  std::optional<JpegFacts> facts;
+  ImageStatistics statistics;
+  std::vector<float> curve;
+};
+
+Info inspect(const Input& input, const PhotoOptions& options,
+             const std::vector<FaceFractions>& faces, float slider) {
+  stopIfInterrupted();
+  const Photo photo = loadPhoto(input, options);
+  Info info = {photo.image->width, photo.image->height, photo.facts, {}, {}};
+  image_processing::analyzeImage(*photo.image, metadataWithFaces(faces, info.width, info.height),
+                                 info.statistics);
+  FilterConfig config = image_processing::defaultFilterConfigValue;
+  image_processing::updateFilterConfigForSliderValue(slider, &config);
+  info.curve = image_processing::buildToneCurve(info.statistics, config);
+  return info;
+}
+
+// As the face median: the first entry of the CDF that reaches one half.
+std::size_t medianBin(const std::vector<float>& cdf) {
+  const auto reached = std::find_if(cdf.begin(), cdf.end(), [](float sum) { return sum >= 0.5f; });
+  return static_cast<std::size_t>(reached - cdf.begin());
+}
+
+double lightnessOf(std::size_t cdfEntry) {
+  return static_cast<double>(cdfEntry) * 100.0 / 49.0;
+}
+
+std::vector<double> nineDigitsOf(const std::vector<float>& values) {
+  std::vector<double> numbers;
+  for (const float value : values) numbers.push_back(nineDigits(value));
+  return numbers;
+}
+
+Json jsonOf(const Input& input, const Info& info, float slider) {
+  Json object = {{"file", input.path}, {"width", info.width}, {"height", info.height}};
+  if (info.facts) {
+    object["storedWidth"] = info.facts->width;
+    object["storedHeight"] = info.facts->height;
+    object["components"] = info.facts->components;
+    object["progressive"] = info.facts->progressive;
+    object["orientation"] = info.facts->orientation;
+    object["captureTime"] = info.facts->captureTime ? Json(info.facts->captureTime->text) : Json();
+  }
+  object["medianBin"] = medianBin(info.statistics.cdf);
+  object["faceMedianBin"] = info.statistics.faceMedianBin;
+  object["cdf"] = nineDigitsOf(info.statistics.cdf);
+  object["slider"] = nineDigits(slider);
+  object["curve"] = nineDigitsOf(info.curve);
+  return object;
+}
+
+const char* kindOf(int components) {
+  return components == 1 ? "grey" : components == 4 ? "CMYK" : "colour";
+}
+
+void printFacts(const Info& info) {
+  fmt::print("  size         {} x {} (upright)\n", info.width, info.height);
+  if (!info.facts) return;
+  const JpegFacts& facts = *info.facts;
+  fmt::print("  stored       {} x {}, {}, {}\n", facts.width, facts.height,
+             kindOf(facts.components), facts.progressive ? "progressive" : "baseline");
+  fmt::print("  orientation  {}\n", facts.orientation);
+  fmt::print("  taken        {}\n", facts.captureTime ? facts.captureTime->text : "unknown");
+}
+
+void printText(const Input& input, const Info& info, const std::string& slider) {
+  fmt::print("{}\n", input.shownName());
+  printFacts(info);
+  fmt::print("  median       about lightness {:.0f} of 100\n",
+             lightnessOf(medianBin(info.statistics.cdf)));
+  if (info.statistics.faceMedianBin >= 0) {
+    fmt::print("  face median  about lightness {:.0f} of 100\n",
+               lightnessOf(static_cast<std::size_t>(info.statistics.faceMedianBin)));
+  }
+  std::vector<float> histogram;
+  image_processing::computeHistogramFromCDF(info.statistics.cdf, histogram);
+  fmt::print("  lightness histogram, dark to light\n{}", histogramChart(histogram, 8, "    "));
+  fmt::print("  tone curve at slider {}, in percent\n    in  ", slider);
+  for (std::size_t i = 0; i < info.curve.size(); i += 5) fmt::print("{:4}", 2 * i);
+  fmt::print("\n    out ");
+  for (std::size_t i = 0; i < info.curve.size(); i += 5) fmt::print("{:4.0f}", info.curve[i] * 100);
+  fmt::print("\n");
+}
+
+ExitCode runInfo(const InfoOptions& options) {
+  const float slider = readSlider("--slider", options.slider);
+  const std::vector<FaceFractions> faces = readFaces(options.faces);
+  PhotoOptions photo;
+  if (!options.raw.empty()) photo.raw = readRawSize(options.raw);
+  const std::vector<Input> inputs = expandInputs(options.inputs);
+
+  JsonOutput json(options.report, isSingleFile(options.inputs, inputs));
+  Talk talk("info", options.report.quiet, inputs.size());
+  std::size_t failed = 0;
+  const bool finished = attemptJobs<Info>(
+      inputs.size(), options.jobs,
+      [&](std::size_t index) { return inspect(inputs[index], photo, faces, slider); },
+      [&](std::size_t index, const Attempt<Info>& attempt) {
+        const Input& input = inputs[index];
+        if (!attempt.result) {
+          ++failed;
+          talk.error(input.shownName(), attempt.error);
+          json.add({{"file", input.path}, {"error", attempt.error}});
+        } else if (json.wanted()) {
+          json.add(jsonOf(input, *attempt.result, slider));
+        } else {
+          printText(input, *attempt.result, options.slider);
+        }
+        talk.fileDone();
+      });
+  if (!finished) return ExitCode::interrupted;
+  if (inputs.empty()) {
+    talk.note("no photos found");
+    return ExitCode::nothingToDo;
+  }
+  return failed > 0 ? ExitCode::someFailed : ExitCode::allDone;
+}
+
+}  // namespace
+
+void addInfo(CommandLine& commandLine) {
+  const auto options = std::make_shared<InfoOptions>();
+  Verb verb = commandLine.addVerb(
+      "info", "Tell a photo's size, orientation, time, lightness and tone curve",
+      "quenby info photo.jpg\n"
+      "quenby info --jsonl -r holiday\n"
+      "quenby info photo.jpg --slider 0.8 --face 0.4,0.1,0.6,0.4\n"
+      "quenby info --json --raw 640x480 - < in.rgba",
+      [options] { return runInfo(*options); });
+  addInputOptions(verb, options->inputs);
+  verb.option("--slider", options->slider,
+              "Strength, 0 to 1, whose tone curve is shown; 0.4 unless given")
+      .type("S");
+  addFaceOption(verb, options->faces);
+  addRawOption(verb, options->raw);
+  addJobsOption(verb, options->jobs);
+  addReportOptions(verb, options->report);
+}
+
+}  // namespace pelorin::cli

@@ -1,0 +1,177 @@
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <filesystem>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "cli/frame/errors.h"
+#include "cli/frame/file_bytes.h"
+#include "cli/frame/lone_files.h"
+#include "cli/pictures/corner_picture.h"
+#include "cli/verbs/corners.h"
+#include "cli/verbs/verbs.h"
+#include "image_processing/dupe/grayscale.h"
+#include "photo/photo.h"
+#include "photo/png/png_file.h"
+
+namespace pelorin::cli {
+namespace {
+
+struct KeypointsOptions {
+  std::string input, raw;
+  CornerSearch search;
+  bool unsuppressed = false;
+  bool text = false;
+  LoneOutputOptions drawing;
+  ReportOptions report;
+};
+
+struct Keypoints {
+  std::uint32_t width, height;
+  std::vector<Corner> corners;
+};
+
+std::string countText(std::size_t count, const CornerSearch& search) {
+  return fmt::format("{} {} (FAST-{}, threshold {}{})", count, count == 1 ? "corner" : "corners",
+                     search.arc, search.threshold, search.suppressed ? "" : ", not suppressed");
+}
+
+std::vector<std::uint8_t> drawingOf(const Photo& photo, const Input& input,
+                                    const std::vector<Corner>& corners,
+                                    const CornerSearch& search) {
+  std::vector<MarkedPixel> marks;
+  for (const Corner& corner : corners) {
+    marks.push_back({corner.position.x, corner.position.y, static_cast<float>(corner.score)});
+  }
+  const std::string name = input.isStandardInput()
+                               ? input.shownName()
+                               : std::filesystem::path(input.path).filename().string();
+  const std::string about = fmt::format("{} \xC3\x97 {} pixels, {}", photo.image->width,
+                                        photo.image->height, countText(corners.size(), search));
+  return encodePng(drawCorners(*photo.image, std::move(marks), "Corners of " + name, about,
+                               "Score: the largest threshold at which it is still a corner"));
+}
+
+Json jsonOf(const Input& input, const Keypoints& keypoints, const CornerSearch& search) {
+  Json object = {{"file", input.path},
+                 {"width", keypoints.width},
+                 {"height", keypoints.height},
+                 {"n", search.arc},
+                 {"threshold", search.threshold},
+                 {"suppressed", search.suppressed},
+                 {"count", keypoints.corners.size()},
+                 {"corners", Json::array()}};
+  for (const Corner& corner : keypoints.corners) {
+    Json entry = {{"x", corner.position.x}, {"y", corner.position.y}, {"score", corner.score}};
+    if (corner.descriptor) entry["descriptor"] = hexOf(*corner.descriptor);
+    object["corners"].push_back(std::move(entry));
+  }
+  return object;
+}
+
+void printText(const Keypoints& keypoints) {
+  for (const Corner& corner : keypoints.corners) {
+    fmt::print("{} {} {}", corner.position.x, corner.position.y, corner.score);
+    if (corner.descriptor) fmt::print(" {}", hexOf(*corner.descriptor));
+    fmt::print("\n");
+  }
+}
+
+void printSummary(const Input& input, const Keypoints& keypoints, const CornerSearch& search) {
+  fmt::print("{}\n", input.shownName());
+  fmt::print("  size         {} x {} (upright)\n", keypoints.width, keypoints.height);
+  fmt::print("  found        {}\n", countText(keypoints.corners.size(), search));
+  if (keypoints.corners.empty()) return;
+  std::vector<int> scores;
+  for (const Corner& corner : keypoints.corners) scores.push_back(corner.score);
+  std::ranges::sort(scores);
+  fmt::print("  scores       {} to {}, median {}\n", scores.front(), scores.back(),
+             scores[scores.size() / 2]);
+  if (search.described) {
+    const auto described = std::ranges::count_if(
+        keypoints.corners, [](const Corner& corner) { return corner.descriptor.has_value(); });
+    fmt::print("  descriptors  {}, the other corners are too close to a border\n", described);
+  }
+}
+
+ExitCode runKeypoints(const KeypointsOptions& options) {
+  PhotoOptions photoOptions;
+  if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
+  CornerSearch search = options.search;
+  search.suppressed = !options.unsuppressed;
+  const Input input = loneInput(options.input);
+  const std::string& drawing = options.drawing.output;
+  if (drawing == "-") {
+    throw UsageError("--draw: name a file; standard output has the corners");
+  }
+  requireExtension(drawing, {".png"});
+  const std::vector<std::string> outputs(drawing.empty() ? 0 : 1, drawing);
+  Talk talk("keypoints", options.report.quiet, 1);
+  JsonOutput json(options.report, true);
+  if (const auto code = stopBeforeWork({input}, outputs, options.drawing, talk, json)) return *code;
+
+  Keypoints keypoints;
+  const bool done = succeeds(talk, input.shownName(), [&] {
+    const Photo photo = loadPhoto(input, photoOptions);
+    keypoints = {photo.image->width, photo.image->height,
+                 findCorners(image_processing::imageMakeGrayscale(*photo.image), search)};
+    if (!drawing.empty()) {
+      writeOutput(drawing, drawingOf(photo, input, keypoints.corners, search));
+    }
+  });
+  if (!done) return ExitCode::someFailed;
+  if (json.wanted()) {
+    json.add(jsonOf(input, keypoints, search));
+  } else if (options.text) {
+    printText(keypoints);
+  } else {
+    printSummary(input, keypoints, search);
+  }
+  return ExitCode::allDone;
+}
+
+}  // namespace
+
+void addKeypoints(CommandLine& commandLine) {
+  const auto options = std::make_shared<KeypointsOptions>();
+  Verb verb =
+      commandLine.addVerb("keypoints", "Find a photo's corners (FAST) and describe them (BRIEF)",
+                          "quenby keypoints photo.jpg\n"
+                          "quenby keypoints photo.jpg --text > corners.txt\n"
+                          "quenby keypoints photo.jpg --draw corners.png --threshold 40\n"
+                          "quenby keypoints photo.jpg --json --brief\n"
+                          "quenby keypoints --text --raw 640x480 - < in.rgba",
+                          [options] { return runKeypoints(*options); });
+  verb.option("IN", options->input, "A photo: a JPEG file or - (standard input)").required();
+  verb.option("--n", options->search.arc,
+              "How many neighbouring pixels of the 16 on a circle of radius 3 must all be "
+              "brighter or all darker than its centre; 9 unless given")
+      .between(9, 12);
+  verb.option("--threshold", options->search.threshold,
+              "By more than how much, in green; 20 unless given")
+      .between(0, 255);
+  verb.flag("--no-suppression", options->unsuppressed,
+            "Keep corners beside a corner with the same or a higher score");
+  verb.flag("--brief", options->search.described,
+            "Add descriptors, 64 hexadecimal digits, bit 255 first, to the corners that are "
+            "more than 15 pixels from every border");
+  verb.option("--draw", options->drawing.output, "Draw the corners over the photo, as PNG")
+      .type("FILE")
+      .group("Output");
+  verb.flag("--overwrite", options->drawing.overwrite, "Replace a drawing that is there")
+      .needs(verb.named("--draw"))
+      .group("Output");
+  addRawOption(verb, options->raw);
+  verb.named("--raw").help("Read packed RGBA bytes of this size, not a JPEG file");
+  Option text =
+      verb.flag("--text", options->text,
+                "Print a line `x y score` for each corner, row by row, and its descriptor "
+                "behind it")
+          .group("Reporting");
+  addReportOptions(verb, options->report);
+  text.excludes(verb.named("--json")).excludes(verb.named("--jsonl"));
+}
+
+}  // namespace pelorin::cli

@@ -1,0 +1,130 @@
+#include <algorithm>
+#include <filesystem>
+#include <memory>
+#include <vector>
+
+#include "cli/frame/errors.h"
+#include "cli/frame/faces.h"
+#include "cli/frame/file_bytes.h"
+#include "cli/frame/json_output.h"
+#include "cli/frame/lone_files.h"
+#include "cli/frame/nearest_name.h"
+#include "cli/pictures/grey_picture.h"
+#include "cli/verbs/verbs.h"
+#include "image_processing/autoenhance/auto_enhance_filter.h"
+#include "image_processing/filters/default_filter_factory.h"
+#include "image_processing/filters/filtered_image.h"
+#include "photo/photo.h"
+#include "photo/png/png_file.h"
+
+namespace pelorin::cli {
+namespace {
+
+using image_processing::Image;
+
+struct MasksOptions {
+  std::string input, raw;
+  LoneOutputOptions outputs;
+  ReportOptions report;
+  std::string filter = "AE0";
+  std::vector<std::string> faces;
+  bool exact = false;
+};
+
+struct Masks {
+  std::shared_ptr<Image<float>> bilateral, ltm;
+};
+
+Masks masksOf(Photo photo, const std::string& filter, const std::vector<FaceFractions>& faces,
+              bool exact) {
+  image_processing::FilterConfig config = image_processing::defaultFilterConfigValue;
+  config.useBilateralGrid = exact ? 0 : 1;
+  image_processing::FilteredImage session(
+      photo.image, metadataWithFaces(faces, photo.image->width, photo.image->height), "", config,
+      image_processing::DefaultFilterFactory::filterFactory());
+  const auto prepared = session.setupFilter(filter, "");
+  const auto& withMasks = dynamic_cast<const image_processing::AEFilterBase&>(*prepared);
+  return {withMasks.getBilateralMask(), withMasks.getLtmMask()};
+}
+
+void writeMask(const std::string& path, const Image<float>& mask, bool raw) {
+  if (raw) {
+    writeOutput(path, {reinterpret_cast<const std::uint8_t*>(mask.data.get()), mask.byteSize()});
+  } else {
+    writeOutput(path, encodePng(greyPicture(mask)));
+  }
+}
+
+void writeMasks(const Masks& masks, const std::string& bilateralPath, const std::string& ltmPath,
+                bool raw) {
+  const bool isNew = !std::filesystem::exists(bilateralPath);
+  writeMask(bilateralPath, *masks.bilateral, raw);
+  try {
+    writeMask(ltmPath, *masks.ltm, raw);
+  } catch (...) {
+    // One mask without the other is half a result.
+    if (isNew) std::filesystem::remove(bilateralPath);
+    throw;
+  }
+}
+
+ExitCode runMasks(const MasksOptions& options) {
+  const std::vector<std::string> filters = {"AE0", "AE08bit"};
+  if (std::find(filters.begin(), filters.end(), options.filter) == filters.end()) {
+    throw UsageError("--filter: " + unknownName("filter with masks", options.filter, filters));
+  }
+  const std::vector<FaceFractions> faces = readFaces(options.faces);
+  PhotoOptions photoOptions;
+  if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
+  const bool raw = photoOptions.raw.has_value();
+
+  const Input input = loneInput(options.input);
+  const std::filesystem::path folder = options.outputs.output;
+  const std::string bilateralPath = folder / (raw ? "bilateral.f32" : "bilateral.png");
+  const std::string ltmPath = folder / (raw ? "ltm.f32" : "ltm.png");
+  const std::vector<std::string> paths = {bilateralPath, ltmPath};
+  Talk talk("masks", options.report.quiet, 1);
+  JsonOutput json(options.report, true);
+  if (const auto code = stopBeforeWork({input}, paths, options.outputs, talk, json)) return *code;
+
+  Masks masks;
+  const bool done = succeeds(talk, input.shownName(), [&] {
+    masks = masksOf(loadPhoto(input, photoOptions), options.filter, faces, options.exact);
+    writeMasks(masks, bilateralPath, ltmPath, raw);
+  });
+  if (!done) return ExitCode::someFailed;
+  json.add({{"file", input.path},
+            {"width", masks.ltm->width},
+            {"height", masks.ltm->height},
+            {"filter", options.filter},
+            {"outputs", paths}});
+  return ExitCode::allDone;
+}
+
+}  // namespace
+
+void addMasks(CommandLine& commandLine) {
+  const auto options = std::make_shared<MasksOptions>();
+  Verb verb = commandLine.addVerb(
+      "masks", "Write what auto-enhance sees of a photo: its two masks, as pictures",
+      "quenby masks photo.jpg -o masks/\n"
+      "quenby masks photo.jpg -o masks/ --face 0.4,0.1,0.6,0.4\n"
+      "quenby masks pixels.rgba --raw 640x480 -o planes/\n",
+      [options] { return runMasks(*options); });
+  verb.option("IN", options->input, "A photo: a JPEG file or - (standard input)").required();
+  addLoneOutputOptions(verb, options->outputs, "DIR",
+                       "The folder for bilateral.png, the smoothed lightness, and ltm.png, the "
+                       "flatness; with --raw bilateral.f32 and ltm.f32");
+  verb.named("--output").required();
+  verb.option("--filter", options->filter, "AE0 (unless given) or AE08bit").type("NAME");
+  addFaceOption(verb, options->faces);
+  verb.flag("--exact", options->exact,
+            "Smooth with the exact bilateral filter in place of the grid; slow");
+  addRawOption(verb, options->raw);
+  verb.named("--raw").help(
+      "Read packed RGBA bytes of this size and write the masks as 32-bit floats of this "
+      "machine's byte order, rows back to back");
+  addReportOptions(verb, options->report);
+}
+
+}  // namespace pelorin::cli

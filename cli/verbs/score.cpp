@@ -1,0 +1,190 @@
+#include <fmt/format.h>
+
+#include <filesystem>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "cli/frame/errors.h"
+#include "cli/frame/file_bytes.h"
+#include "cli/frame/interrupt.h"
+#include "cli/frame/jobs.h"
+#include "cli/frame/lone_files.h"
+#include "cli/frame/number_text.h"
+#include "cli/frame/outputs.h"
+#include "cli/pictures/heat_map.h"
+#include "cli/verbs/score_output.h"
+#include "cli/verbs/verbs.h"
+#include "image_processing/quality/block_features.h"
+#include "photo/photo.h"
+#include "photo/png/png_file.h"
+
+namespace pelorin::cli {
+namespace {
+
+using image_processing::niqeBlockSize;
+
+struct ScoreOptions {
+  InputOptions inputs;
+  ScoreFormat format;
+  OutputOptions maps;
+  Option mapGiven;
+  std::optional<std::string> failAbove;
+  std::string raw;
+  int jobs = 1;
+};
+
+std::vector<std::uint8_t> heatMapOf(const Photo& photo, const Input& input,
+                                    const ScoredPhoto& scored) {
+  const std::string name = input.isStandardInput()
+                               ? input.shownName()
+                               : std::filesystem::path(input.path).filename().string();
+  const auto& niqe = scored.niqe;
+  const std::string about =
+      fmt::format("NIQE {:.2f}, {} \xC3\x97 {} pixels, {} \xC3\x97 {} blocks", niqe.score,
+                  scored.width, scored.height, niqe.blockColumns, niqe.blockRows);
+  return encodePng(drawHeatMap(
+      *photo.image, {niqeBlockSize, niqe.blockColumns, niqe.blockRows, niqe.blockDistances},
+      "Quality of " + name, about, "Distance of each block from natural photos; lower is better"));
+}
+
+/// @param map  where the heat map goes; null for none.
+ScoredPhoto score(const Input& input, const PhotoOptions& options, const PlannedFile* map) {
+  stopIfInterrupted();
+  const Photo photo = loadPhoto(input, options);
+  stopIfInterrupted();
+  ScoredPhoto scored = {photo.image->width, photo.image->height,
+                        image_processing::analyzeNiqe(*photo.image)};
+  stopIfInterrupted();
+  if (map != nullptr && !map->skipped && !scored.isTooSmall()) {
+    writeOutput(map->output, heatMapOf(photo, input, scored));
+  }
+  return scored;
+}
+
+std::vector<PlannedFile> planMaps(const ScoreOptions& options, const std::vector<Input>& inputs) {
+  if (!options.mapGiven.given()) return {};
+  const std::string& output = options.maps.output;
+  if (output.empty() || output == "-") {
+    throw UsageError("--map: name a file or an existing folder; standard output has the scores");
+  }
+  if (!std::filesystem::is_directory(output)) requireExtension(output, {".png"});
+  return planOutputs(inputs, options.inputs, options.maps, {});
+}
+
+struct Tally {
+  std::size_t scored = 0, tooSmall = 0, failed = 0, above = 0;
+
+  ExitCode exitCode() const {
+    if (failed > 0) return ExitCode::someFailed;
+    if (above > 0) return ExitCode::aboveLimit;
+    return scored == 0 ? ExitCode::nothingToDo : ExitCode::allDone;
+  }
+};
+
+ExitCode runScore(const ScoreOptions& options) {
+  std::optional<float> limit;
+  if (options.failAbove) limit = readFiniteNumber("--fail-above", *options.failAbove);
+  PhotoOptions photoOptions;
+  if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
+  const std::vector<Input> inputs = expandInputs(options.inputs);
+  const std::vector<PlannedFile> maps = planMaps(options, inputs);
+  const OutputFolders folders(maps);
+
+  ScoreOutput output(options.format, isSingleFile(options.inputs, inputs));
+  Talk talk("score", options.format.report.quiet, inputs.size());
+  Tally tally;
+  const auto reportScore = [&](std::size_t index, const ScoredPhoto& photo) {
+    const Input& input = inputs[index];
+    output.add(input, photo);
+    if (photo.isTooSmall()) {
+      ++tally.tooSmall;
+      talk.error(input.shownName(),
+                 fmt::format("is {} x {} pixels, too small: a score needs {} x {} or more",
+                             photo.width, photo.height, niqeBlockSize, niqeBlockSize));
+      return;
+    }
+    ++tally.scored;
+    if (limit && !(photo.niqe.score <= *limit)) {
+      ++tally.above;
+      talk.error(input.shownName(),
+                 fmt::format("scores {:.9g}, above {}", photo.niqe.score, *options.failAbove));
+    }
+    if (!maps.empty() && maps[index].skipped) {
+      ++tally.failed;
+      talk.error(maps[index].output, "exists already; add --overwrite to replace it");
+    }
+  };
+  const bool finished = attemptJobs<ScoredPhoto>(
+      inputs.size(), options.jobs,
+      [&](std::size_t index) {
+        return score(inputs[index], photoOptions, maps.empty() ? nullptr : &maps[index]);
+      },
+      [&](std::size_t index, const Attempt<ScoredPhoto>& attempt) {
+        if (attempt.result) {
+          reportScore(index, *attempt.result);
+        } else {
+          ++tally.failed;
+          talk.error(inputs[index].shownName(), attempt.error);
+          output.addFailed(inputs[index], attempt.error);
+        }
+        talk.fileDone();
+      });
+  if (!finished) return ExitCode::interrupted;
+  if (inputs.empty()) talk.note("no photos found");
+  return tally.exitCode();
+}
+
+}  // namespace
+
+void addScore(CommandLine& commandLine) {
+  const auto options = std::make_shared<ScoreOptions>();
+  Verb verb = commandLine.addVerb("score", "Say how natural photos look (NIQE; lower is better)",
+                                  "quenby score photo.jpg\n"
+                                  "quenby score --csv -r holiday -j 0 > scores.csv\n"
+                                  "quenby score --fail-above 6 *.jpg\n"
+                                  "quenby score photo.jpg --map heat.png\n"
+                                  "quenby score -r holiday --map heat/ --name '{stem}_heat.png'\n"
+                                  "quenby score --features --raw 640x480 - < in.rgba",
+                                  [options] { return runScore(*options); });
+  verb.addToFooter(
+      "\n4: every file was scored or too small, and a score is above --fail-above."
+      "\n1 comes before 4; 3 also says that every photo was too small.\n"
+      "\nScores are of the full-size upright picture and compare only under one model."
+      "\nThey change when a picture is scaled, so score pictures at one size."
+      "\nSides below 96 pixels are too small: a line on stderr, null in JSON, an empty"
+      "\nfield in CSV.");
+  addInputOptions(verb, options->inputs);
+  Option csv = verb.flag("--csv", options->format.csv,
+                         "Print comma-separated values, with a line of names first")
+                   .group("Reporting");
+  verb.flag("--features", options->format.features,
+            "Print the 36 mean features, one a line (after a # line with the file's name "
+            "when there are several); with --csv or --json beside the score")
+      .group("Reporting");
+  verb.option("--fail-above", options->failAbove, "Exit with 4 when a score is above this")
+      .type("X");
+  options->mapGiven =
+      verb.option("--map", options->maps.output,
+                  "Write each photo's heat map, the distances of its blocks over the photo, "
+                  "to this PNG file or into this folder")
+          .type("FILE|DIR")
+          .group("Output");
+  options->maps.name = "{stem}_niqe.png";
+  verb.option("--name", options->maps.name,
+              "How maps are called in a folder; {stem}_niqe.png unless given")
+      .type("PATTERN")
+      .needs(options->mapGiven)
+      .group("Output");
+  verb.flag("--overwrite", options->maps.overwrite, "Replace maps that are there already")
+      .needs(options->mapGiven)
+      .group("Output");
+  addRawOption(verb, options->raw);
+  verb.named("--raw").help("Read packed RGBA bytes of this size, not JPEG files");
+  addJobsOption(verb, options->jobs);
+  addReportOptions(verb, options->format.report);
+  csv.excludes(verb.named("--json")).excludes(verb.named("--jsonl"));
+}
+
+}  // namespace pelorin::cli

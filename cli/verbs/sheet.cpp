@@ -1,0 +1,202 @@
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <filesystem>
+#include <memory>
+#include <optional>
+#include <vector>
+
+#include "cli/frame/errors.h"
+#include "cli/frame/faces.h"
+#include "cli/frame/file_bytes.h"
+#include "cli/frame/interrupt.h"
+#include "cli/frame/jobs.h"
+#include "cli/frame/json_output.h"
+#include "cli/frame/lone_files.h"
+#include "cli/pictures/canvas.h"
+#include "cli/pictures/jpeg_band_encoder.h"
+#include "cli/pictures/sheet_painter.h"
+#include "cli/verbs/sheet_columns.h"
+#include "cli/verbs/verbs.h"
+#include "image_processing/filters/default_filter_factory.h"
+#include "image_processing/filters/filtered_image.h"
+#include "photo/area_average.h"
+#include "photo/photo.h"
+#include "photo/turn.h"
+
+namespace pelorin::cli {
+namespace {
+
+using image_processing::defaultFilterConfigValue;
+
+struct SheetOptions {
+  InputOptions inputs;
+  LoneOutputOptions outputs;
+  ReportOptions report;
+  SheetColumnOptions columns;
+  std::vector<std::string> faces;
+  std::string raw;
+  std::optional<std::string> title;
+  std::uint32_t cell = 320;
+  int quality = 90;
+  int jobs = 1;
+};
+
+/// What one photo contributes.
+struct SheetRow {
+  std::string label;
+  std::vector<Image<RGBA8Pixel>> thumbnails;
+};
+
+struct SheetWork {
+  std::vector<SheetColumn> columns;
+  std::vector<FaceFractions> faces;
+  PhotoOptions photo;
+};
+
+/// Room for the photo's thumbnails. What cannot be known before the photo is decoded (standard
+/// input can be read only once) gets a whole cell, and what cannot be read at all a low strip.
+PictureSize roomFor(const Input& input, const PhotoOptions& options, std::uint32_t cell) {
+  const PictureSize box{cell, cell};
+  if (options.raw) return fitWithin({options.raw->width, options.raw->height}, box);
+  if (input.isStandardInput()) return box;
+  try {
+    const JpegFacts facts = readFacts(imgproc::readJpegHeader(readInput(input)));
+    const bool onItsSide = uprightTurn(facts.orientation).quarters % 2 != 0;
+    const PictureSize stored{facts.width, facts.height};
+    return fitWithin(onItsSide ? PictureSize{stored.height, stored.width} : stored, box);
+  } catch (const Interrupted&) {
+    throw;
+  } catch (const std::exception&) {
+    return {cell, cell / 4};  // the reason is said when its turn comes
+  }
+}
+
+SheetRow makeRow(const SheetWork& work, const Input& input, PictureSize room) {
+  Photo photo = loadPhoto(input, work.photo);
+  const PictureSize size{photo.image->width, photo.image->height};
+  const PictureSize small = fitWithin(size, room);
+  const std::string name = input.isStandardInput()
+                               ? input.shownName()
+                               : std::filesystem::path(input.path).filename().string();
+  SheetRow row{fmt::format("{}  \xC2\xB7  {} \xC3\x97 {}", name, size.width, size.height), {}};
+  row.thumbnails.push_back(areaAverage(*photo.image, small));
+  image_processing::FilteredImage session(
+      photo.image, metadataWithFaces(work.faces, size.width, size.height), "",
+      defaultFilterConfigValue, image_processing::DefaultFilterFactory::filterFactory());
+  Image<RGBA8Pixel> filtered(size.width, size.height);
+  for (const SheetColumn& column : work.columns) {
+    stopIfInterrupted();
+    session.applyFilterWithParams(column.filter, column.params, defaultFilterConfigValue, filtered);
+    row.thumbnails.push_back(areaAverage(filtered, small));
+  }
+  return row;
+}
+
+SheetPlan planOf(const SheetOptions& options, const SheetWork& work,
+                 const std::vector<Input>& inputs) {
+  SheetPlan plan{options.title.value_or(titleOf(work.columns)), {"Original"}, {}};
+  for (const SheetColumn& column : work.columns) plan.columnLabels.push_back(column.label);
+  for (const Input& input : inputs) {
+    stopIfInterrupted();
+    plan.thumbnailSizes.push_back(roomFor(input, work.photo, options.cell));
+  }
+  return plan;
+}
+
+ExitCode runSheet(const SheetOptions& options) {
+  SheetWork work{sheetColumns(options.columns), readFaces(options.faces), {}};
+  if (!options.raw.empty()) {
+    if (options.inputs.recursive) throw UsageError("--raw: name the files, folders hold JPEG");
+    work.photo.raw = readRawSize(options.raw);
+  }
+  const std::string& output = options.outputs.output;
+  requireExtension(output, {".jpg", ".jpeg", ".jpe"});
+  const std::vector<Input> inputs = expandInputs(options.inputs);
+  JsonOutput json(options.report, true);
+  if (output == "-" && json.wanted()) {
+    throw UsageError("-o -: standard output takes the sheet or --json, not both");
+  }
+  Talk talk("sheet", options.report.quiet, inputs.size());
+  if (inputs.empty()) {
+    talk.note("no photos found");
+    return ExitCode::nothingToDo;
+  }
+  if (const auto code = stopBeforeWork(inputs, {output}, options.outputs, talk, json)) return *code;
+
+  const SheetPainter painter(planOf(options, work, inputs));
+  if (!painter.fits()) {
+    throw UsageError(fmt::format(
+        "the sheet would be {} x {} pixels, above {} x {}; name fewer photos or looks, or a "
+        "smaller --cell",
+        painter.width(), painter.height(), Canvas::largestSide, JpegBandEncoder::largestSide));
+  }
+  JpegBandEncoder encoder(static_cast<std::uint32_t>(painter.width()),
+                          static_cast<std::uint32_t>(painter.height()), options.quality);
+  encoder.add(painter.heading());
+  std::size_t failed = 0;
+  Json rows = Json::array();
+  const bool finished = attemptJobs<SheetRow>(
+      inputs.size(), options.jobs,
+      [&](std::size_t index) { return makeRow(work, inputs[index], painter.thumbnailSize(index)); },
+      [&](std::size_t index, const Attempt<SheetRow>& attempt) {
+        Json row = {{"input", inputs[index].path}, {"status", "done"}};
+        if (attempt.result) {
+          encoder.add(painter.row(index, attempt.result->label, attempt.result->thumbnails));
+        } else {
+          ++failed;
+          talk.error(inputs[index].shownName(), attempt.error);
+          encoder.add(painter.row(index, inputs[index].shownName(), {}, attempt.error));
+          row["status"] = "failed";
+          row["error"] = attempt.error;
+        }
+        rows.push_back(row);
+        talk.fileDone();
+      });
+  if (!finished) {
+    talk.note("interrupted; no sheet was made");
+    return ExitCode::interrupted;
+  }
+  const bool something = failed < inputs.size();
+  if (something) writeOutput(output, encoder.finish());
+  json.add({{"output", output},
+            {"status", something ? "done" : "failed"},
+            {"width", painter.width()},
+            {"height", painter.height()},
+            {"photos", rows}});
+  return failed == 0 ? ExitCode::allDone : ExitCode::someFailed;
+}
+
+}  // namespace
+
+void addSheet(CommandLine& commandLine) {
+  const auto options = std::make_shared<SheetOptions>();
+  Verb verb =
+      commandLine.addVerb("sheet", "One labelled picture of photos beside their enhanced versions",
+                          "quenby sheet *.jpg -o sheet.jpg\n"
+                          "quenby sheet -r holiday -o sheet.jpg --looks Auto,Winter\n"
+                          "quenby sheet photo.jpg -o sliders.jpg --sliders 0,0.3,0.6,1\n",
+                          [options] { return runSheet(*options); });
+  addInputOptions(verb, options->inputs);
+  addSheetColumnOptions(verb, options->columns);
+  addFaceOption(verb, options->faces);
+  addLoneOutputOptions(verb, options->outputs, "FILE",
+                       "The JPEG file for the sheet, or - (standard output)");
+  verb.named("--output").required();
+  verb.option("--title", options->title, "What stands above the sheet")
+      .type("TEXT")
+      .group("Output");
+  verb.option("--cell", options->cell,
+              "Longest side of a small picture in pixels; 320 unless given")
+      .between(32, 4096)
+      .group("Output");
+  verb.option("--quality", options->quality, "JPEG quality, 90 unless given")
+      .between(1, 100)
+      .group("Output");
+  addRawOption(verb, options->raw);
+  verb.named("--raw").help("Read packed RGBA bytes of this size");
+  addJobsOption(verb, options->jobs);
+  addReportOptions(verb, options->report);
+}
+
+}  // namespace pelorin::cli

@@ -1,0 +1,20 @@
+#pragma once
+
+#include "cli/frame/command_line.h"
+
+namespace pelorin::cli {
+
+// Each is defined in the file of its verb.
+void addCompare(CommandLine& commandLine);
+void addCurve(CommandLine& commandLine);
+void addDupes(CommandLine& commandLine);
+void addEnhance(CommandLine& commandLine);
+void addInfo(CommandLine& commandLine);
+void addLook(CommandLine& commandLine);
+void addLooks(CommandLine& commandLine);
+void addKeypoints(CommandLine& commandLine);
+void addMasks(CommandLine& commandLine);
+void addScore(CommandLine& commandLine);
+void addSheet(CommandLine& commandLine);
+
+}  // namespace pelorin::cli

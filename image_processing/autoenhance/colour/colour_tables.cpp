@@ -1,0 +1,15 @@
+#include "image_processing/autoenhance/colour/colour_tables.h"
+
+namespace pelorin::image_processing {
+
+const ColourTables& colourTables() {
+  static const ColourTables tables;
+  return tables;
+}
+
+namespace {
+// At load, so that the first photo does not wait for them.
+[[maybe_unused]] const ColourTables& builtAtLoad = colourTables();
+}  // namespace
+
+}  // namespace pelorin::image_processing

@@ -1,0 +1,29 @@
+#pragma once
+
+#include <array>
+
+#include "image_processing/autoenhance/colour/lab_tables.h"
+#include "image_processing/autoenhance/colour/srgb.h"
+#include "image_processing/autoenhance/masks/shaping_tables.h"
+
+namespace pelorin::image_processing {
+
+/// Every table that auto-enhance shares between photos. Built together, in one place, because
+/// tables of several files would be built in an order that the linker chooses.
+struct ColourTables {
+  std::array<float, 256> linear = makeSRGBToLinearTable();
+  XYZ2labTable xyzToLab{10000};
+  Lab2xzTable labToXz{1000};
+  Lab2yTable labToY{1000};
+  Uint8_Gamma_sRGB_Table encode;
+  SuperQuadric skinA{-10.0f, 50.0f, 1024, 10.0f};     ///< How much a Lab a is a skin's.
+  SuperQuadric skinB{-10.0f, 60.0f, 1024, 10.0f};     ///< How much a Lab b is a skin's.
+  std::array<float, 1024> codes = encode.asFloats();  ///< `encode`, as vectors gather it.
+  Power flatness{0.0f, 1.0f, 512, 1.5f};              ///< Shapes the share of flat neighbours.
+};
+
+/// The process's tables, built when the library is loaded and never written afterwards, so any
+/// thread may read them. A loop over pixels asks once, before it starts.
+const ColourTables& colourTables();
+
+}  // namespace pelorin::image_processing

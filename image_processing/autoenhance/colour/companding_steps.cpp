@@ -1,0 +1,41 @@
+#include "image_processing/autoenhance/colour/companding_steps.h"
+
+#include "image_processing/autoenhance/colour/colour_tables.h"
+
+namespace pelorin::image_processing {
+namespace {
+
+/// L of every step, divided.
+std::array<float, compandingStepCount> makeLightness(float divisor) {
+  const std::vector<float>& fy = colourTables().xyzToLab.samples();
+  std::array<float, compandingStepCount> lightness;
+  for (std::size_t step = 0; step < compandingStepCount; ++step) {
+    lightness[step] = (116.0f * fy[step] - 16.0f) / divisor;
+  }
+  return lightness;
+}
+
+}  // namespace
+
+void compandingStepsScalar(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t count) {
+  const ColourTables& tables = colourTables();
+  for (std::size_t i = 0; i < count; ++i) {
+    const float R = tables.linear[pixels[i].r];
+    const float G = tables.linear[pixels[i].g];
+    const float B = tables.linear[pixels[i].b];
+    const float Y = 0.2126729f * R + 0.7151522f * G + 0.072175f * B;
+    steps[i] = static_cast<std::uint16_t>(tables.xyzToLab.indexOf(Y));
+  }
+}
+
+const std::array<float, compandingStepCount>& lightnessOfSteps() {
+  static const auto lightness = makeLightness(1.0f);
+  return lightness;
+}
+
+const std::array<float, compandingStepCount>& unitLightnessOfSteps() {
+  static const auto lightness = makeLightness(100.0f);
+  return lightness;
+}
+
+}  // namespace pelorin::image_processing

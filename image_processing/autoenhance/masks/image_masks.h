@@ -1,0 +1,55 @@
+#pragma once
+
+#include <memory>
+
+#include "image_processing/autoenhance/lightness/image_statistics.h"
+#include "image_processing/core/image.h"
+#include "image_processing/core/image_metadata.h"
+#include "image_processing/filters/filter_config.h"
+
+namespace pelorin::image_processing {
+
+/// The two masks of one photo, each of the photo's size with values in [0, 1]. Copies share them.
+template <typename TB, typename TL>
+struct ImageMasks {
+  std::shared_ptr<Image<TB>> bilateralMask;  ///< Lightness / 100, smoothed with its edges kept.
+  std::shared_ptr<Image<TL>> ltmMask;        ///< Local flatness, drawn toward 0.5 on faces' skin.
+  /// False until every pixel of both has been written; the pixels are not to be read before.
+  bool computed = false;
+};
+
+/// Makes both masks new, whatever the record held. With `detailGainHigh` 0 they are allocated and
+/// not computed.
+/// @throws std::bad_alloc; the record then counts as not computed.
+///
+/// Keeps no state. For (float, float) and (QuantizedFloat<unsigned char>, the same), as the next.
+template <typename TB, typename TL>
+void computeImageMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
+                       const FilterConfig& config, ImageMasks<TB, TL>& masks);
+
+/// `analyzeImage` and `computeImageMasks` in one: the photo's lightness is found once for both.
+template <typename TB, typename TL>
+void prepareImage(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
+                  const FilterConfig& config, ImageStatistics& statistics,
+                  ImageMasks<TB, TL>& masks);
+
+/// Computes both masks through the grid and counts the photo's pixels on the way. Two passes over
+/// the photo: neither its lightness nor the table of sums ever exists as a whole.
+/// @param bilateral, ltm  written; of the photo's size.
+/// @throws std::bad_alloc.
+template <typename TB, typename TL>
+void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
+                        const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
+                        LightnessCounter& counter);
+
+/// Fills the LTM mask: flatness when `amount` is above 0, else 0, then the faces one by one, each
+/// blending into what the one before left.
+/// @param lightness  of the photo / 100; `bilateral` its smoothing; `mask` written. All of one
+/// size.
+/// @param radius     half-size of the flatness window, at least 0.
+template <typename TB, typename TL>
+void computeLtmMask(const ImageMetadata& metadata, const Image<RGBA8Pixel>& photo,
+                    const Image<float>& lightness, const Image<TB>& bilateral, float amount,
+                    int radius, Image<TL>& mask);
+
+}  // namespace pelorin::image_processing

@@ -1,0 +1,78 @@
+#pragma once
+
+#include <memory>
+#include <mutex>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "image_processing/filters/abstract_filter.h"
+#include "image_processing/filters/looks/apply_look.h"
+#include "image_processing/filters/looks/look_parameters.h"
+
+namespace pelorin::image_processing {
+
+/// A look: an optional vignette, a channel mix and one tone curve a channel. `T`, the concrete
+/// class, supplies the curves, the vignette's settings and, as `T::channelMix`, the mix.
+///
+/// Every application may override the curves ("r", "g", "b"), for itself only, and the vignette
+/// ("maskRadius", "maskAlpha", "applyMask"), for itself and all later ones of the same filter.
+/// Several threads may apply one filter at once, each into an output of its own.
+template <typename T>
+class AbstractRGBCurveFilter : public AbstractFilter {
+ public:
+  static constexpr ChannelMix channelMix = ChannelMix::none;
+
+  using AbstractFilter::AbstractFilter;
+
+  /// Builds the vignette's table. Reads nothing from the parameters.
+  void init(const std::string&) override {
+    float edge, centre;
+    getRadialMaskParameters(edge, centre, maskRadius_, maskAlpha_, applyMask_);
+    radialMask_ = std::make_unique<CubicRadialMask>(edge, centre, radialMaskSamples);
+  }
+
+  /// `init` comes first. Throws std::bad_alloc alone.
+  void applyConfig(const std::string& params, const FilterConfig&,
+                   Image<RGBA8Pixel>& output) override {
+    std::vector<float> red, green, blue;
+    getRGBCurves(red, green, blue, params);
+    parseRGBCurves(red, green, blue, params);
+    Look look{{LookCurve(std::move(red)), LookCurve(std::move(green)), LookCurve(std::move(blue))},
+              T::channelMix};
+    {
+      const std::lock_guard lock(maskMutex_);
+      parseMaskParameters(maskRadius_, maskAlpha_, applyMask_, params);
+      look.maskRadius = maskRadius_;
+      look.maskAlpha = maskAlpha_;
+      look.vignette = applyMask_ ? radialMask_.get() : nullptr;
+    }
+    applyLook(look, *state->image, output);
+  }
+
+  /// Appends the samples of each curve (at least 2, in 0 ... 255) to an empty vector.
+  virtual void getRGBCurves(std::vector<float>& red, std::vector<float>& green,
+                            std::vector<float>& blue, const std::string& params) = 0;
+
+  /// The vignette's settings: mask values at the edge and in the centre, and what `maskRadius`,
+  /// `maskAlpha` and `applyMask` are until a parameter string changes them.
+  virtual void getRadialMaskParameters(float& edge, float& centre, float& maskRadius,
+                                       float& maskAlpha, bool& applyMask) {
+    edge = 0.0f;
+    centre = 1.0f;
+    maskRadius = 1.0f;
+    maskAlpha = 1.0f;
+    applyMask = false;
+  }
+
+ private:
+  static constexpr int radialMaskSamples = 400;
+
+  float maskRadius_ = 1.0f;
+  float maskAlpha_ = 1.0f;
+  bool applyMask_ = false;
+  std::unique_ptr<CubicRadialMask> radialMask_;
+  std::mutex maskMutex_;  // guards the three settings while the filter is applied
+};
+
+}  // namespace pelorin::image_processing

@@ -1,0 +1,235 @@
+#include "image_processing/filters/looks/direct_look.h"
+
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "image_processing/filters/looks/direct_look_simd.cpp"
+#include <hwy/foreach_target.h>  // compiles the rest of this file once per instruction set
+#include <hwy/highway.h>
+
+#include <algorithm>
+
+#include "image_processing/core/prefetch.h"
+#include "image_processing/core/simd.h"
+#include "image_processing/core/small_table.h"
+#include "image_processing/filters/looks/vignette_simd.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace pelorin::image_processing::HWY_NAMESPACE {
+namespace {
+namespace hn = hwy::HWY_NAMESPACE;
+using Floats = hn::CappedTag<float, 16>;
+using Ints = hn::RebindToSigned<Floats>;
+using Words = hn::RebindToUnsigned<Floats>;
+using F = hn::Vec<Floats>;
+using I = hn::Vec<Ints>;
+using W = hn::Vec<Words>;
+
+HWY_INLINE F set(float value) {
+  return hn::Set(Floats(), value);
+}
+
+HWY_INLINE F toFloats(I ints) {
+  return hn::ConvertTo(Floats(), ints);
+}
+
+struct Colour {
+  F r, g, b;
+};
+
+/// `softLight` for masks up to 0.5.
+HWY_INLINE F darkened(F x, F mask) {
+  const F strength = hn::Sub(set(0.003921569f), hn::Mul(mask, set(0.007843138f)));
+  return hn::Sub(x, hn::Mul(hn::Mul(strength, x), hn::Sub(set(255.0f), x)));
+}
+
+/// `softLight` for masks above 0.5.
+HWY_INLINE F lightened(F x, F mask) {
+  F cubic = hn::Sub(hn::Mul(set(0.0002460592f), x), set(0.047058824f));
+  cubic = hn::Mul(hn::Add(hn::Mul(cubic, x), set(4.0f)), x);
+  const F root = hn::Mul(set(15.9687195f), simd::squareRoot(x));
+  const F lightest = hn::IfThenElse(hn::Le(x, set(63.75f)), cubic, root);
+  const F strength = hn::Sub(hn::Mul(set(2.0f), mask), set(1.0f));
+  return hn::Add(x, hn::Mul(strength, hn::Sub(lightest, x)));
+}
+
+HWY_INLINE Colour vignetted(const Colour& c, F mask, float opacity) {
+  const auto dark = hn::Le(mask, set(0.5f));
+  Colour blend{darkened(c.r, mask), darkened(c.g, mask), darkened(c.b, mask)};
+  // Most of a picture is dark and spared the roots.
+  if (!hn::AllTrue(Floats(), dark)) {
+    blend.r = hn::IfThenElse(dark, blend.r, lightened(c.r, mask));
+    blend.g = hn::IfThenElse(dark, blend.g, lightened(c.g, mask));
+    blend.b = hn::IfThenElse(dark, blend.b, lightened(c.b, mask));
+  }
+  if (opacity == 1.0f) return blend;
+  const auto over = [&](F above, F below) HWY_ATTR {
+    return hn::Add(hn::Mul(set(opacity), above), hn::Mul(set(1.0f - opacity), below));
+  };
+  return {over(blend.r, c.r), over(blend.g, c.g), over(blend.b, c.b)};
+}
+
+template <ChannelMix mix>
+HWY_INLINE Colour mixed(const Colour& c) {
+  const auto sum = [](F a, F b, F c) HWY_ATTR { return hn::Add(hn::Add(a, b), c); };
+  if constexpr (mix == ChannelMix::none) {
+    return c;
+  } else if constexpr (mix == ChannelMix::grey) {
+    const F grey = sum(hn::Mul(set(0.8f), c.r), hn::Mul(set(0.1f), c.g), hn::Mul(set(0.1f), c.b));
+    return {grey, grey, grey};
+  } else {
+    const Colour much{hn::Mul(set(0.9f), c.r), hn::Mul(set(0.9f), c.g), hn::Mul(set(0.9f), c.b)};
+    const Colour little{hn::Mul(set(0.05f), c.r), hn::Mul(set(0.05f), c.g),
+                        hn::Mul(set(0.05f), c.b)};
+    return {sum(much.r, little.g, little.b), sum(little.r, much.g, little.b),
+            sum(little.r, little.g, much.b)};
+  }
+}
+
+/// Two neighbouring samples of a curve.
+struct Segment {
+  F lower, upper;
+};
+
+/// A curve of any length.
+class LongCurve {
+ public:
+  explicit LongCurve(const DirectLook::Curve& curve)
+      : samples_(curve.samples.data()), last_(curve.last) {}
+
+  HWY_INLINE Segment at(I index) const {
+    const I held = hn::Min(index, hn::Set(Ints(), last_));
+    return {hn::GatherIndex(Floats(), samples_, held),
+            hn::GatherIndex(Floats(), samples_ + 1, held)};
+  }
+
+ private:
+  const float* samples_;
+  std::int32_t last_;
+};
+
+#if HWY_TARGET <= HWY_AVX2
+/// A curve of at most `DirectLook::shortCurve` samples, which no index exceeds.
+class ShortCurve {
+ public:
+  HWY_INLINE explicit ShortCurve(const DirectLook::Curve& curve) : samples_(curve.samples.data()) {}
+
+  HWY_INLINE Segment at(I index) const {
+    return {samples_(index), samples_(hn::Add(index, hn::Set(Ints(), 1)))};
+  }
+
+ private:
+  simd::SmallTable samples_;
+};
+#else
+// Gathers are loops here, which do better with the same indices for both samples.
+using ShortCurve = LongCurve;
+#endif
+
+/// Where a value lies in a curve.
+struct Place {
+  I index;
+  F fraction;
+};
+
+HWY_INLINE Place placeOf(F value, float samplesPerUnit) {
+  const F position = hn::Mul(value, set(samplesPerUnit));
+  const I index = simd::truncate(position);
+  return {index, hn::Sub(position, toFloats(index))};
+}
+
+template <typename Curve>
+HWY_INLINE W byteAt(const Curve& curve, const Place& place) {
+  const Segment segment = curve.at(place.index);
+  const F y = hn::Add(hn::Mul(place.fraction, segment.upper),
+                      hn::Mul(hn::Sub(set(1.0f), place.fraction), segment.lower));
+  const I whole = simd::truncate(hn::Max(y, hn::Zero(Floats())));
+  return hn::And(hn::BitCast(Words(), whole), hn::Set(Words(), 0xFFu));
+}
+
+template <ChannelMix mix, bool vignette, typename Curve>
+void applyToVectors(const DirectLook& direct, const VignetteRow& row, const RGBA8Pixel* from,
+                    RGBA8Pixel* to, std::size_t count) {
+  // Copies, since `to` might be anything the arguments refer to.
+  const Curve red(direct.curves[0]), green(direct.curves[1]), blue(direct.curves[2]);
+  const float redSteps = direct.curves[0].samplesPerUnit;
+  const float greenSteps = direct.curves[1].samplesPerUnit;
+  const float blueSteps = direct.curves[2].samplesPerUnit;
+  const bool samePlaces = mix == ChannelMix::grey && direct.stepsAreEqual;
+  const VignetteRow coordinates = row;
+  const float* const masks = vignette ? direct.look.vignette->samples().data() : nullptr;
+  const float opacity = direct.look.maskAlpha;
+
+  for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
+    prefetchAhead(from + i);
+    prefetchAhead(to + i);
+    // Red in the low byte: every target is little-endian.
+    const W pixels = hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(from + i));
+    const W byte = hn::Set(Words(), 0xFFu);
+    Colour c{toFloats(hn::BitCast(Ints(), hn::And(pixels, byte))),
+             toFloats(hn::BitCast(Ints(), hn::And(hn::ShiftRight<8>(pixels), byte))),
+             toFloats(hn::BitCast(Ints(), hn::And(hn::ShiftRight<16>(pixels), byte)))};
+    if constexpr (vignette) {
+      const I sample = simd::maskSamples(Floats(), coordinates, coordinates.uSquares + i);
+      c = vignetted(c, hn::GatherIndex(Floats(), masks, sample), opacity);
+    }
+    c = mixed<mix>(c);
+    const Place r = placeOf(c.r, redSteps);
+    const Place g = samePlaces ? r : placeOf(c.g, greenSteps);
+    const Place b = samePlaces ? r : placeOf(c.b, blueSteps);
+    W result = hn::And(pixels, hn::Set(Words(), 0xFF000000u));
+    result = hn::Or(result, byteAt(red, r));
+    result = hn::Or(result, hn::ShiftLeft<8>(byteAt(green, g)));
+    result = hn::Or(result, hn::ShiftLeft<16>(byteAt(blue, b)));
+    hn::StoreU(result, Words(), reinterpret_cast<std::uint32_t*>(to + i));
+  }
+}
+
+template <ChannelMix mix, bool vignette>
+void applyMix(const DirectLook& direct, const VignetteRow& row, const RGBA8Pixel* from,
+              RGBA8Pixel* to, std::size_t count) {
+  const auto apply = direct.curvesAreShort ? applyToVectors<mix, vignette, ShortCurve>
+                                           : applyToVectors<mix, vignette, LongCurve>;
+  const std::size_t lanes = hn::Lanes(Floats());
+  const std::size_t left = count % lanes, whole = count - left;
+  apply(direct, row, from, to, whole);
+  if (left == 0) return;
+  // The pixels that fill no vector, in one of their own.
+  RGBA8Pixel pixels[hn::MaxLanes(Floats())] = {};
+  float squares[hn::MaxLanes(Floats())] = {};
+  std::copy_n(from + whole, left, pixels);
+  if constexpr (vignette) std::copy_n(row.uSquares + whole, left, squares);
+  apply(direct, {squares, row.vSquare, row.lastSample}, pixels, pixels, lanes);
+  std::copy_n(pixels, left, to + whole);
+}
+
+template <bool vignette>
+void applyLook(const DirectLook& direct, const VignetteRow& row, const RGBA8Pixel* from,
+               RGBA8Pixel* to, std::size_t count) {
+  switch (direct.look.mix) {
+    case ChannelMix::none:
+      return applyMix<ChannelMix::none, vignette>(direct, row, from, to, count);
+    case ChannelMix::grey:
+      return applyMix<ChannelMix::grey, vignette>(direct, row, from, to, count);
+    case ChannelMix::faded:
+      return applyMix<ChannelMix::faded, vignette>(direct, row, from, to, count);
+  }
+}
+
+void applyDirectLook(const DirectLook& direct, const VignetteRow& row, const RGBA8Pixel* from,
+                     RGBA8Pixel* to, std::size_t count) {
+  const auto apply = direct.look.vignette != nullptr ? applyLook<true> : applyLook<false>;
+  apply(direct, row, from, to, count);
+}
+
+}  // namespace
+}  // namespace pelorin::image_processing::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#if HWY_ONCE
+namespace pelorin::image_processing {
+HWY_EXPORT(applyDirectLook);
+void applyDirectLook(const DirectLook& direct, const VignetteRow& row, const RGBA8Pixel* from,
+                     RGBA8Pixel* to, std::size_t count) {
+  HWY_DYNAMIC_DISPATCH(applyDirectLook)(direct, row, from, to, count);
+}
+}  // namespace pelorin::image_processing
+#endif

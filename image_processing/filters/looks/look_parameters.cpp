@@ -1,0 +1,43 @@
+#include "image_processing/filters/looks/look_parameters.h"
+
+#include <utility>
+
+#include "image_processing/core/parameter_strings.h"
+
+namespace pelorin::image_processing {
+
+void parseRGBCurves(std::vector<float>& red, std::vector<float>& green, std::vector<float>& blue,
+                    const std::string& params) {
+  for (const std::string& item : splitStringAt(params, ";")) {
+    const std::vector<std::string> keyAndValue = splitStringOnceAt(item, "=");
+    const std::string& key = keyAndValue[0];
+    std::vector<float>* const curve = key == "r"   ? &red
+                                      : key == "g" ? &green
+                                      : key == "b" ? &blue
+                                                   : nullptr;
+    if (curve == nullptr) continue;
+    std::vector<float> samples;
+    for (const std::string& number : splitStringAt(keyAndValue[1], ",")) {
+      samples.push_back(static_cast<float>(readNumber(number) * 255.0));
+    }
+    if (samples.size() >= 2) *curve = std::move(samples);
+  }
+}
+
+void parseMaskParameters(float& maskRadius, float& maskAlpha, bool& applyMask,
+                         const std::string& params) {
+  for (const std::string& item : splitStringAt(params, ";")) {
+    const std::vector<std::string> keyAndValue = splitStringOnceAt(item, "=");
+    const std::string& key = keyAndValue[0];
+    const std::string& value = keyAndValue[1];
+    if (key == "maskRadius") {
+      maskRadius = static_cast<float>(readNumber(value));
+    } else if (key == "maskAlpha") {
+      maskAlpha = static_cast<float>(readNumber(value));
+    } else if (key == "applyMask") {
+      applyMask = readNumber(value) != 0.0;
+    }
+  }
+}
+
+}  // namespace pelorin::image_processing

@@ -1,0 +1,22 @@
+#pragma once
+
+#include <cstddef>
+#include <string>
+#include <vector>
+
+#include "photo/collection/grouping.h"
+#include "photo/collection/scanned_photo.h"
+
+namespace pelorin::cli {
+
+/// A photo's place in its group, the best first, and why it stands there.
+struct Ranked {
+  std::size_t photo;   ///< Place in the list of photos.
+  std::string reason;  ///< "the most pixels, 12.0 megapixels".
+};
+
+/// Ranks a group by resolution, then by score (photos without one last), then by the size of the
+/// file, then by the order of the list. The first is the one to keep; nothing is done to any file.
+std::vector<Ranked> rankGroup(const DupeGroup& group, const std::vector<ScannedPhoto>& photos);
+
+}  // namespace pelorin::cli

@@ -1,0 +1,19 @@
+#pragma once
+
+#include <cstddef>
+#include <vector>
+
+#include "photo/collection/pair_search.h"
+
+namespace pelorin::cli {
+
+/// Photos that pairs tie together, directly or through others.
+struct DupeGroup {
+  std::vector<std::size_t> photos;  ///< Ascending, at least two.
+  std::vector<ShotPair> pairs;      ///< The pairs among them, in the given order.
+};
+
+/// The groups that `pairs` make of `photoCount` photos, by their first photo.
+std::vector<DupeGroup> groupPairs(std::size_t photoCount, const std::vector<ShotPair>& pairs);
+
+}  // namespace pelorin::cli

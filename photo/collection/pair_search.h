@@ -1,0 +1,68 @@
+#pragma once
+
+#include <cstddef>
+#include <span>
+#include <vector>
+
+#include "photo/collection/shot.h"
+
+namespace pelorin::cli {
+
+/// Two shots and what they have in common.
+struct ShotPair {
+  std::size_t first, second;  ///< Places in the searched list, first < second.
+  float score;
+  float distance;
+  double seconds;  ///< Between them; 0 where not both times are known.
+  bool timesKnown;
+  bool sameOrientation;
+
+  friend bool operator==(const ShotPair&, const ShotPair&) = default;
+};
+
+/// What `a` and `b` have in common; `first` and `second` are left 0.
+ShotPair compareShots(const Shot& a, const Shot& b);
+
+/// Finds all pairs that reach a threshold without comparing all: the score bounds the time between
+/// near-duplicates, so that it is enough to look around each shot in the order of their times.
+/// Shots without a time are compared with every other, the time between taken as 0.
+///
+/// The work comes in independent steps, which any threads may share in any order: n log n in all
+/// where shots without a time are few and no more than so many are taken at once.
+class PairSearch {
+ public:
+  /// @param shots      kept by reference.
+  /// @param threshold  smallest score of a pair; not NaN.
+  PairSearch(std::span<const Shot> shots, float threshold);
+
+  std::size_t stepCount() const { return untimed_.size() + byUTC_.size() + byWallClock_.size(); }
+
+  /// Appends what step `step` (below `stepCount`) finds; every pair is found by exactly one step.
+  void run(std::size_t step, std::vector<ShotPair>& found) const;
+
+ private:
+  struct Moment {
+    double seconds;
+    std::size_t shot;
+  };
+  using Timeline = std::vector<Moment>;
+
+  static void sortByTime(Timeline& timeline);
+  void compare(std::size_t a, std::size_t b, std::vector<ShotPair>& found) const;
+
+  std::span<const Shot> shots_;
+  float threshold_;
+  double longestBetween_[2];  ///< Seconds, by whether the orientations are the same.
+  double longest_;
+  std::vector<std::size_t> untimed_;
+  Timeline byUTC_;        ///< The shots whose UTC is known.
+  Timeline byWallClock_;  ///< All shots with a time.
+};
+
+/// All pairs that reach `threshold`, by `first`, then `second`: every step, in this thread.
+std::vector<ShotPair> findPairs(std::span<const Shot> shots, float threshold);
+
+/// Brings pairs into the order of `findPairs`.
+void sortPairs(std::vector<ShotPair>& pairs);
+
+}  // namespace pelorin::cli

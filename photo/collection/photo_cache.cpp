@@ -1,0 +1,274 @@
+#include "photo/collection/photo_cache.h"
+
+#include <fmt/format.h>
+#include <sqlite3.h>
+
+#include <bit>
+#include <cmath>
+#include <cstring>
+#include <filesystem>
+#include <limits>
+#include <string_view>
+
+#include "image_processing/quality/niqe.h"
+
+namespace pelorin::cli {
+namespace {
+
+using image_processing::niqeModelId;
+
+constexpr int applicationId = 0x51426443;  // "QBdC": whose file it is
+constexpr int layoutVersion = 2;
+constexpr int millisecondsToWait = 60'000;  // for another run that is writing
+
+constexpr const char* makeTables =
+    "CREATE TABLE photos ("
+    "  path BLOB NOT NULL, bytes INTEGER NOT NULL, modified INTEGER NOT NULL,"
+    "  engine TEXT NOT NULL, scale INTEGER NOT NULL,"
+    "  width INTEGER NOT NULL, height INTEGER NOT NULL, orientation INTEGER NOT NULL,"
+    "  time TEXT, seconds REAL, zone INTEGER,"
+    "  cdf BLOB NOT NULL, checksum INTEGER NOT NULL,"
+    "  PRIMARY KEY (path, scale)) WITHOUT ROWID;"
+    "CREATE TABLE scores ("
+    "  path BLOB NOT NULL, bytes INTEGER NOT NULL, modified INTEGER NOT NULL,"
+    "  engine TEXT NOT NULL, model TEXT NOT NULL,"
+    "  score REAL, checksum INTEGER NOT NULL,"  // null: too small
+    "  PRIMARY KEY (path, model)) WITHOUT ROWID";
+constexpr const char* findPhoto =
+    "SELECT width, height, orientation, time, seconds, zone, cdf, checksum FROM photos "
+    "WHERE path = ?1 AND bytes = ?2 AND modified = ?3 AND engine = ?4 AND scale = ?5";
+constexpr const char* storePhoto =
+    "REPLACE INTO photos VALUES (?1, ?2, ?3, ?4, ?5, ?6, ?7, ?8, ?9, ?10, ?11, ?12, ?13)";
+constexpr const char* findScoreOfPhoto =
+    "SELECT score, checksum FROM scores "
+    "WHERE path = ?1 AND bytes = ?2 AND modified = ?3 AND engine = ?4 AND model = ?5";
+constexpr const char* storeScoreOfPhoto = "REPLACE INTO scores VALUES (?1, ?2, ?3, ?4, ?5, ?6, ?7)";
+
+struct Key {
+  std::string path;
+  FileStamp stamp;
+};
+
+Key keyOf(const std::string& photo, const FileStamp& stamp) {
+  return {std::filesystem::absolute(photo).lexically_normal().string(), stamp};
+}
+
+// SQLite notices damage to its own structure but not to what is kept in it, nor that a row is found
+// in the place of another. FNV-1a.
+std::int64_t checksum(const Key& key, std::string_view content) {
+  const std::string text =
+      fmt::format("{} {} {} {}", key.path, key.stamp.bytes, key.stamp.modified, content);
+  std::uint64_t hash = 0xCBF29CE484222325u;
+  for (const char byte : text) {
+    hash = (hash ^ static_cast<unsigned char>(byte)) * 0x100000001B3u;
+  }
+  return static_cast<std::int64_t>(hash);
+}
+
+std::int64_t checksum(const Key& key, int scale, const PhotoRecord& record) {
+  std::string text =
+      fmt::format("{} {} {} {} ", scale, record.width, record.height, record.orientation);
+  if (record.captureTime) {
+    const CaptureTime& time = *record.captureTime;
+    text += fmt::format("{} {} {} {}", time.text, std::bit_cast<std::uint64_t>(time.seconds),
+                        time.hasZone, time.zoneSeconds);
+  }
+  text.append(reinterpret_cast<const char*>(record.cdf.data()), sizeof record.cdf);
+  return checksum(key, text);
+}
+
+std::int64_t checksum(const Key& key, float score) {
+  const std::string text = std::isnan(score) ? "too small" : fmt::format("{}", score);
+  return checksum(key, fmt::format("{} {}", niqeModelId, text));
+}
+
+void bindKey(sqlite3_stmt* statement, const Key& key) {
+  sqlite3_bind_blob64(statement, 1, key.path.data(), key.path.size(), SQLITE_TRANSIENT);
+  sqlite3_bind_int64(statement, 2, static_cast<std::int64_t>(key.stamp.bytes));
+  sqlite3_bind_int64(statement, 3, key.stamp.modified);
+  sqlite3_bind_text(statement, 4, PELORIN_VERSION, -1, SQLITE_STATIC);
+}
+
+void bindRecord(sqlite3_stmt* statement, const Key& key, int scale, const PhotoRecord& record) {
+  sqlite3_bind_int64(statement, 6, record.width);
+  sqlite3_bind_int64(statement, 7, record.height);
+  sqlite3_bind_int(statement, 8, record.orientation);
+  if (record.captureTime) {  // a value not bound is null
+    const CaptureTime& time = *record.captureTime;
+    sqlite3_bind_text(statement, 9, time.text.c_str(), -1, SQLITE_TRANSIENT);
+    sqlite3_bind_double(statement, 10, time.seconds);
+    if (time.hasZone) sqlite3_bind_int(statement, 11, time.zoneSeconds);
+  }
+  sqlite3_bind_blob(statement, 12, record.cdf.data(), sizeof record.cdf, SQLITE_TRANSIENT);
+  sqlite3_bind_int64(statement, 13, checksum(key, scale, record));
+}
+
+// Empty when the row is not what was stored.
+std::optional<PhotoRecord> readRecord(sqlite3_stmt* statement, const Key& key, int scale) {
+  PhotoRecord record{};
+  record.width = static_cast<std::uint32_t>(sqlite3_column_int64(statement, 0));
+  record.height = static_cast<std::uint32_t>(sqlite3_column_int64(statement, 1));
+  record.orientation = sqlite3_column_int(statement, 2);
+  if (const auto* text = sqlite3_column_text(statement, 3); text != nullptr) {
+    CaptureTime& time = record.captureTime.emplace();
+    time.text = reinterpret_cast<const char*>(text);
+    time.seconds = sqlite3_column_double(statement, 4);
+    time.hasZone = sqlite3_column_type(statement, 5) != SQLITE_NULL;
+    time.zoneSeconds = sqlite3_column_int(statement, 5);
+  }
+  const void* cdf = sqlite3_column_blob(statement, 6);
+  if (sqlite3_column_bytes(statement, 6) != sizeof record.cdf) return std::nullopt;
+  std::memcpy(record.cdf.data(), cdf, sizeof record.cdf);
+  if (checksum(key, scale, record) != sqlite3_column_int64(statement, 7)) return std::nullopt;
+  return record;
+}
+
+// A statement is ready for its next use on every way out.
+class Use {
+ public:
+  explicit Use(sqlite3_stmt* statement) : statement_(statement) {}
+  ~Use() {
+    sqlite3_reset(statement_);
+    sqlite3_clear_bindings(statement_);
+  }
+  Use(const Use&) = delete;
+  Use& operator=(const Use&) = delete;
+
+ private:
+  sqlite3_stmt* statement_;
+};
+
+}  // namespace
+
+void PhotoCache::Close::operator()(sqlite3* database) const {
+  sqlite3_close(database);
+}
+void PhotoCache::Close::operator()(sqlite3_stmt* statement) const {
+  sqlite3_finalize(statement);
+}
+
+PhotoCache::PhotoCache(const std::string& file) : file_(file) {
+  sqlite3* database = nullptr;
+  const int code =
+      sqlite3_open_v2(file.c_str(), &database, SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE, nullptr);
+  database_.reset(database);
+  if (code != SQLITE_OK) fail(code);
+  sqlite3_busy_timeout(database, millisecondsToWait);
+  prepareTables();
+  find_ = prepare(findPhoto);
+  store_ = prepare(storePhoto);
+  findScore_ = prepare(findScoreOfPhoto);
+  storeScore_ = prepare(storeScoreOfPhoto);
+}
+
+PhotoCache::~PhotoCache() = default;
+
+void PhotoCache::prepareTables() {
+  const auto isNew = [this] { return number("SELECT count(*) FROM sqlite_master") == 0; };
+  // Only an empty file is written to before it is known to be ours.
+  if (isNew()) {
+    execute("BEGIN IMMEDIATE");
+    if (isNew()) {  // else another run was faster
+      execute(makeTables);
+      execute(fmt::format("PRAGMA application_id = {}", applicationId).c_str());
+      execute(fmt::format("PRAGMA user_version = {}", layoutVersion).c_str());
+    }
+    execute("COMMIT");
+  }
+  if (number("PRAGMA application_id") != applicationId) refuse("is not a cache of this command");
+  if (number("PRAGMA user_version") != layoutVersion) {
+    refuse("was made by another version of this command");
+  }
+  // With a log, storing waits for no disk and readers for no writer. Where it cannot be had, the
+  // cache is only slower.
+  sqlite3_exec(database_.get(), "PRAGMA journal_mode = WAL", nullptr, nullptr, nullptr);
+  execute("PRAGMA synchronous = NORMAL");
+}
+
+std::optional<PhotoRecord> PhotoCache::find(const std::string& photo, const FileStamp& stamp,
+                                            int scale) {
+  const Use use(find_.get());
+  const Key key = keyOf(photo, stamp);
+  bindKey(find_.get(), key);
+  sqlite3_bind_int(find_.get(), 5, scale);
+  if (!step(find_.get())) return std::nullopt;
+  std::optional<PhotoRecord> record = readRecord(find_.get(), key, scale);
+  if (!record) refuse("is damaged");
+  return record;
+}
+
+void PhotoCache::store(const std::string& photo, const FileStamp& stamp, int scale,
+                       const PhotoRecord& record) {
+  const Use use(store_.get());
+  const Key key = keyOf(photo, stamp);
+  bindKey(store_.get(), key);
+  sqlite3_bind_int(store_.get(), 5, scale);
+  bindRecord(store_.get(), key, scale, record);
+  step(store_.get());
+}
+
+std::optional<float> PhotoCache::findScore(const std::string& photo, const FileStamp& stamp) {
+  sqlite3_stmt* const statement = findScore_.get();
+  const Use use(statement);
+  const Key key = keyOf(photo, stamp);
+  bindKey(statement, key);
+  sqlite3_bind_text(statement, 5, niqeModelId, -1, SQLITE_STATIC);
+  if (!step(statement)) return std::nullopt;
+  const bool tooSmall = sqlite3_column_type(statement, 0) == SQLITE_NULL;
+  const float score = tooSmall ? std::numeric_limits<float>::quiet_NaN()
+                               : static_cast<float>(sqlite3_column_double(statement, 0));
+  if (checksum(key, score) != sqlite3_column_int64(statement, 1)) refuse("is damaged");
+  return score;
+}
+
+void PhotoCache::storeScore(const std::string& photo, const FileStamp& stamp, float score) {
+  sqlite3_stmt* const statement = storeScore_.get();
+  const Use use(statement);
+  const Key key = keyOf(photo, stamp);
+  bindKey(statement, key);
+  sqlite3_bind_text(statement, 5, niqeModelId, -1, SQLITE_STATIC);
+  if (!std::isnan(score)) sqlite3_bind_double(statement, 6, score);
+  sqlite3_bind_int64(statement, 7, checksum(key, score));
+  step(statement);
+}
+
+void PhotoCache::execute(const char* sql) {
+  const int code = sqlite3_exec(database_.get(), sql, nullptr, nullptr, nullptr);
+  if (code != SQLITE_OK) fail(code);
+}
+
+std::int64_t PhotoCache::number(const char* sql) {
+  const Statement statement = prepare(sql);
+  return step(statement.get()) ? sqlite3_column_int64(statement.get(), 0) : 0;
+}
+
+PhotoCache::Statement PhotoCache::prepare(const char* sql) {
+  sqlite3_stmt* statement = nullptr;
+  const int code = sqlite3_prepare_v2(database_.get(), sql, -1, &statement, nullptr);
+  if (code != SQLITE_OK) fail(code);
+  return Statement(statement);
+}
+
+bool PhotoCache::step(sqlite3_stmt* statement) {
+  const int code = sqlite3_step(statement);
+  if (code != SQLITE_ROW && code != SQLITE_DONE) fail(code);
+  return code == SQLITE_ROW;
+}
+
+void PhotoCache::fail(int code) {
+  if (code == SQLITE_NOTADB) refuse("is not a cache of this command");
+  // A table that is not there or not as it was made.
+  if (code == SQLITE_CORRUPT || code == SQLITE_ERROR) refuse("is damaged");
+  if (code == SQLITE_BUSY) {
+    throw CacheError(file_ + ": is in use by another run; wait for it or name another --cache");
+  }
+  throw CacheError(fmt::format("{}: cannot be used as a cache: {}; check the path and the disk",
+                               file_, sqlite3_errstr(code)));
+}
+
+void PhotoCache::refuse(const std::string& why) {
+  throw CacheError(
+      fmt::format("{}: {}; delete the file or name another one with --cache", file_, why));
+}
+
+}  // namespace pelorin::cli

@@ -1,0 +1,14 @@
+#pragma once
+
+#include <cstdint>
+#include <vector>
+
+#include "photo/collection/scanned_photo.h"
+
+namespace pelorin::cli {
+
+/// A small upright JPEG picture of a photo, at most 256 pixels on its longer side.
+/// @throws what reading, decoding and encoding throw, for `explain`.
+std::vector<std::uint8_t> thumbnailOf(const ScannedPhoto& photo);
+
+}  // namespace pelorin::cli

@@ -1,0 +1,79 @@
+#include <algorithm>
+#include <array>
+#include <string>
+#include <string_view>
+
+#include "photo/jpeg/jpeg_codec.h"
+#include "photo/jpeg/libjpeg_writer.h"
+
+namespace pelorin::imgproc {
+namespace {
+
+constexpr std::size_t longestPayload = 65533;
+
+bool startsWith(const MetadataSegment& segment, std::uint8_t marker, std::string_view name) {
+  return segment.marker == marker && segment.payload.size() >= name.size() &&
+         std::equal(name.begin(), name.end(), segment.payload.begin());
+}
+
+bool tellsTheFileFormat(const MetadataSegment& segment) {
+  using namespace std::string_view_literals;
+  return startsWith(segment, JPEG_APP0, "JFIF\0"sv) ||
+         startsWith(segment, JPEG_APP0 + 1, "Exif\0"sv);
+}
+
+void checkSegment(const MetadataSegment& segment) {
+  const bool isApp = segment.marker >= JPEG_APP0 && segment.marker <= JPEG_APP0 + 15;
+  if (!isApp && segment.marker != JPEG_COM) throw JpegError("metadata must be APPn or COM");
+  if (segment.payload.size() > longestPayload) {
+    throw JpegError("a metadata segment is over " + std::to_string(longestPayload) + " bytes");
+  }
+}
+
+// Within `run`.
+void writeRows(jpeg_compress_struct& codec, const std::uint8_t* rgba) {
+  std::array<JSAMPROW, 16> rows;
+  while (codec.next_scanline < codec.image_height) {
+    const JDIMENSION count =
+        std::min<JDIMENSION>(rows.size(), codec.image_height - codec.next_scanline);
+    for (JDIMENSION i = 0; i < count; ++i) {
+      const std::size_t y = codec.next_scanline + i;
+      rows[i] = const_cast<JSAMPROW>(rgba + y * codec.image_width * 4);  // libjpeg only reads
+    }
+    jpeg_write_scanlines(&codec, rows.data(), count);
+  }
+}
+
+}  // namespace
+
+std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t width,
+                                     std::uint32_t height, int quality,
+                                     std::span<const MetadataSegment> metadata) {
+  if (width < 1 || height < 1 || width > JPEG_MAX_DIMENSION || height > JPEG_MAX_DIMENSION) {
+    throw JpegError("a JPEG file cannot be " + std::to_string(width) + " x " +
+                    std::to_string(height) + " pixels, only 1 to 65500 each way");
+  }
+  for (const MetadataSegment& segment : metadata) checkSegment(segment);
+
+  LibjpegWriter writer(std::size_t{width} * height / 2);  // more than most photos need
+  jpeg_compress_struct& codec = writer.codec();
+  writer.run([&] {
+    codec.image_width = width;
+    codec.image_height = height;
+    codec.input_components = 4;
+    codec.in_color_space = JCS_EXT_RGBA;
+    jpeg_set_defaults(&codec);
+    jpeg_set_quality(&codec, quality, TRUE);
+    codec.write_JFIF_header = std::none_of(metadata.begin(), metadata.end(), tellsTheFileFormat);
+    jpeg_start_compress(&codec, TRUE);
+    for (const MetadataSegment& segment : metadata) {
+      jpeg_write_marker(&codec, segment.marker, segment.payload.data(),
+                        static_cast<unsigned>(segment.payload.size()));
+    }
+    writeRows(codec, rgba);
+    jpeg_finish_compress(&codec);
+  });
+  return writer.takeFile();
+}
+
+}  // namespace pelorin::imgproc

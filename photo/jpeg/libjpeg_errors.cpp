@@ -1,0 +1,82 @@
+#include "photo/jpeg/libjpeg_errors.h"
+
+#include <jerror.h>
+
+#include <new>
+#include <string>
+#include <string_view>
+
+#include "photo/jpeg/jpeg_codec.h"
+
+namespace pelorin::imgproc {
+namespace {
+
+// Warnings after which every sample is still the one the file holds.
+bool isHarmless(int warning) {
+  switch (warning) {
+    case JWRN_EXTRANEOUS_DATA:
+    case JWRN_ADOBE_XFORM:
+    case JWRN_JFIF_MAJOR:
+    case JWRN_NOT_SEQUENTIAL:
+    case JWRN_BOGUS_ICC:
+      return true;
+    default:
+      return false;
+  }
+}
+
+std::string explain(int code, std::string_view message) {
+  switch (code) {
+    case JERR_INPUT_EMPTY:
+    case JERR_NO_SOI:
+      return "not a JPEG file";
+    case JERR_NO_IMAGE:
+      return "a JPEG file without a picture";
+    case JWRN_JPEG_EOF:
+      return "truncated: the picture data ends early";
+    case JERR_IMAGE_TOO_BIG:
+      return "a side is over 65500 pixels";
+    case JERR_BAD_PRECISION:
+      return "unsupported: only 8 bits a sample can be read";
+    case JERR_SOF_UNSUPPORTED:
+      return "unsupported: neither a baseline nor a progressive JPEG file";
+    case JERR_BAD_MCU_SIZE:
+    case JERR_MISMATCHED_QUANT_TABLE:
+      return "unsupported: " + std::string(message);
+    default:
+      break;
+  }
+  constexpr std::string_view prefix = "Corrupt JPEG data: ";
+  if (message.starts_with(prefix)) message.remove_prefix(prefix.size());
+  return "damaged: " + std::string(message);
+}
+
+}  // namespace
+
+LibjpegErrors::LibjpegErrors() : state_() {
+  jpeg_std_error(&state_.base);
+  state_.base.error_exit = jumpOut;
+  state_.base.emit_message = jumpOutIfDamaged;
+  state_.base.output_message = [](j_common_ptr) {};
+}
+
+void LibjpegErrors::jumpOut(j_common_ptr codec) {
+  std::longjmp(reinterpret_cast<State*>(codec->err)->landing, 1);
+}
+
+void LibjpegErrors::jumpOutIfDamaged(j_common_ptr codec, int level) {
+  const bool isWarning = level < 0;
+  if (isWarning && !isHarmless(codec->err->msg_code)) jumpOut(codec);
+}
+
+void LibjpegErrors::throwError() {
+  const int code = state_.base.msg_code;
+  if (code == JERR_OUT_OF_MEMORY) throw std::bad_alloc();
+  jpeg_common_struct codec = {};
+  codec.err = &state_.base;
+  char message[JMSG_LENGTH_MAX];
+  state_.base.format_message(&codec, message);
+  throw JpegError(explain(code, message));
+}
+
+}  // namespace pelorin::imgproc

@@ -1,0 +1,43 @@
+#include "photo/jpeg/libjpeg_reader.h"
+
+#include "photo/jpeg/jpeg_codec.h"
+
+namespace pelorin::imgproc {
+
+LibjpegReader::LibjpegReader(std::span<const std::uint8_t> file) : file_(file) {
+  codec_.err = errors_.manager();
+  try {
+    run([this] { jpeg_create_decompress(&codec_); });
+  } catch (...) {
+    jpeg_destroy_decompress(&codec_);  // half of it may be there
+    throw;
+  }
+}
+
+void LibjpegReader::keepSegments(int marker) {
+  constexpr unsigned wholeSegment = 0xFFFF;
+  run([this, marker] { jpeg_save_markers(&codec_, marker, wholeSegment); });
+}
+
+void LibjpegReader::keepAllSegments() {
+  keepSegments(JPEG_COM);
+  for (int n = 0; n < 16; ++n) keepSegments(JPEG_APP0 + n);
+}
+
+void LibjpegReader::readHeader() {
+  run([this] {
+    jpeg_mem_src(&codec_, file_.data(), file_.size());
+    jpeg_read_header(&codec_, TRUE);
+  });
+}
+
+void LibjpegReader::checkEveryChannelCame() const {
+  for (int i = 0; i < codec_.num_components; ++i) {
+    // Set when the channel's first scan begins.
+    if (codec_.comp_info[i].quant_table == nullptr) {
+      throw JpegError("truncated: a colour channel is missing");
+    }
+  }
+}
+
+}  // namespace pelorin::imgproc

@@ -1,0 +1,62 @@
+#include "photo/jpeg/libjpeg_writer.h"
+
+#include <jerror.h>
+
+#include <exception>
+
+namespace pelorin::imgproc {
+
+LibjpegWriter::LibjpegWriter(std::size_t expectedSize) {
+  destination_.bytes.reserve(expectedSize);
+  codec_.err = errors_.manager();
+  try {
+    run([this] { jpeg_create_compress(&codec_); });
+  } catch (...) {
+    jpeg_destroy_compress(&codec_);  // half of it may be there
+    throw;
+  }
+  destination_.base.init_destination = begin;
+  destination_.base.empty_output_buffer = empty;
+  destination_.base.term_destination = end;
+  codec_.dest = &destination_.base;
+}
+
+void LibjpegWriter::copySegments(const jpeg_decompress_struct& source) {
+  for (auto segment = source.marker_list; segment != nullptr; segment = segment->next)
+    jpeg_write_marker(&codec_, segment->marker, segment->data, segment->data_length);
+}
+
+LibjpegWriter::Destination& LibjpegWriter::destinationOf(j_compress_ptr codec) {
+  return *reinterpret_cast<Destination*>(codec->dest);
+}
+
+void LibjpegWriter::append(j_compress_ptr codec, std::size_t count) {
+  Destination& destination = destinationOf(codec);
+  const std::uint8_t* const block = destination.block.data();
+  bool done = false;
+  try {
+    destination.bytes.insert(destination.bytes.end(), block, block + count);
+    done = true;
+  } catch (const std::exception&) {  // bad_alloc or length_error; neither may cross libjpeg
+  }
+  if (!done) ERREXIT1(codec, JERR_OUT_OF_MEMORY, 0);
+}
+
+void LibjpegWriter::begin(j_compress_ptr codec) {
+  Destination& destination = destinationOf(codec);
+  destination.base.next_output_byte = destination.block.data();
+  destination.base.free_in_buffer = destination.block.size();
+}
+
+boolean LibjpegWriter::empty(j_compress_ptr codec) {
+  append(codec, destinationOf(codec).block.size());  // whatever the counters say
+  begin(codec);
+  return TRUE;
+}
+
+void LibjpegWriter::end(j_compress_ptr codec) {
+  const Destination& destination = destinationOf(codec);
+  append(codec, destination.block.size() - destination.base.free_in_buffer);
+}
+
+}  // namespace pelorin::imgproc

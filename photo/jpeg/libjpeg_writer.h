@@ -1,0 +1,56 @@
+#pragma once
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <utility>
+#include <vector>
+
+#include "photo/jpeg/libjpeg_errors.h"
+
+namespace pelorin::imgproc {
+
+/// A libjpeg compressor into a vector, and what its errors become.
+class LibjpegWriter {
+ public:
+  /// @param expectedSize  how many bytes to make room for; more cost a copy of them.
+  explicit LibjpegWriter(std::size_t expectedSize);
+  ~LibjpegWriter() { jpeg_destroy_compress(&codec_); }
+  LibjpegWriter(const LibjpegWriter&) = delete;
+  LibjpegWriter& operator=(const LibjpegWriter&) = delete;
+
+  jpeg_compress_struct& codec() { return codec_; }
+
+  /// As LibjpegErrors::run.
+  template <typename Body>
+  void run(const Body& body) {
+    errors_.run(body);
+  }
+
+  /// Writes the segments that a reader kept, JFIF and Adobe among them: libjpeg's own must be off.
+  /// Within `run`, before the picture data.
+  void copySegments(const jpeg_decompress_struct& source);
+
+  /// What was written, once libjpeg has finished; empty afterwards.
+  std::vector<std::uint8_t> takeFile() { return std::move(destination_.bytes); }
+
+ private:
+  // Filled block by block: a vector made large enough for libjpeg to write into would be cleared.
+  struct Destination {
+    jpeg_destination_mgr base;  // first, so that libjpeg's pointer to it is one to the whole
+    std::vector<std::uint8_t> bytes;
+    std::array<std::uint8_t, 65536> block;
+  };
+
+  static Destination& destinationOf(j_compress_ptr codec);
+  static void append(j_compress_ptr codec, std::size_t count);
+  static void begin(j_compress_ptr codec);
+  static boolean empty(j_compress_ptr codec);
+  static void end(j_compress_ptr codec);
+
+  LibjpegErrors errors_;
+  jpeg_compress_struct codec_ = {};
+  Destination destination_;
+};
+
+}  // namespace pelorin::imgproc
