@@ -1,6 +1,9 @@
 #include "image_processing/filters/filtered_image.h"
 
+#include <stdexcept>
 #include <utility>
+
+#include "image_processing/filters/pass_through.h"
 
 namespace pelorin::image_processing {
 
@@ -32,6 +35,11 @@ bool FilteredImage::applyFilterWithParams(const std::string& name, const std::st
                                           const FilterConfig& config, Image<RGBA8Pixel>& output) {
   const std::shared_ptr<AbstractFilter> filter = setupFilter(name, params);
   if (filter == nullptr) return false;
+  const Image<RGBA8Pixel>& source = *state_->image;
+  const bool sameSize = output.width == source.width && output.height == source.height;
+  // The copy fits itself to its output; every other filter writes the source's size.
+  if (!sameSize && dynamic_cast<const PassThrough*>(filter.get()) == nullptr)
+    throw std::invalid_argument("the output has another size than the photo");
   filter->applyConfig(params, config, output);
   return true;
 }

@@ -29,7 +29,9 @@ class FilteredImage {
   /// itself, when the photo as it was is needed no more: filters write no pixel before they have
   /// read it, but the session's masks and statistics stay those of the photo as it was.
   /// @returns false, with nothing written, when the name is unknown.
-  /// @throws what `init` and `applyConfig` of the filter throw.
+  /// @throws std::invalid_argument, with nothing written, for an output of another size, except that
+  ///         PassThrough copies as many bytes as both have; and what `init` and `applyConfig` of the
+  ///         filter throw.
   bool applyFilterWithParams(const std::string& name, const std::string& params,
                              const FilterConfig& config, Image<RGBA8Pixel>& output);
 

@@ -9,6 +9,7 @@
 #include <mutex>
 #include <stdexcept>
 #include <thread>
+#include <utility>
 #include <vector>
 
 #include "image_processing/filters/default_filter_factory.h"
@@ -85,6 +86,36 @@ TEST_F(FilteredImageTest, LeavesTheOutputUntouchedForAnUnknownName) {
   ConcreteDescription<RecordingFilter> late("NoSuchFilter", "", "");
   factory->addFilterDescription(&late);
   EXPECT_TRUE(session.applyFilterWithParams("NoSuchFilter", "", {}, output));
+}
+
+TEST_F(FilteredImageTest, RefusesAnOutputOfAnotherSizeAndWritesNothing) {
+  FilteredImage session(image, {}, "", defaultFilterConfigValue,
+                        DefaultFilterFactory::filterFactory());
+  for (const auto& [width, height] :
+       {std::pair{7u, 6u}, {8u, 5u}, {9u, 6u}, {8u, 7u}, {6u, 8u}, {0u, 0u}}) {
+    Image<RGBA8Pixel> output = flatPicture(width, height, {1, 2, 3, 4});
+    const std::string before = fingerprint(output);
+    for (const auto& [name, description] : DefaultFilterFactory::filterFactory()->descriptions) {
+      if (name == "PassThrough") continue;
+      EXPECT_THROW(session.applyFilterWithParams(name, "slider=0.4;s1=0.5;s2=0.5;s3=0.5;s4=0.5;",
+                                                 {}, output),
+                   std::invalid_argument)
+          << name << " " << width << " x " << height;
+    }
+    EXPECT_FALSE(session.applyFilterWithParams("NoSuchFilter", "", {}, output));
+    EXPECT_EQ(fingerprint(output), before);
+  }
+}
+
+TEST_F(FilteredImageTest, LetsPassThroughCopyWhatFitsAnOutputOfAnotherSize) {
+  FilteredImage session(image, {}, "", defaultFilterConfigValue,
+                        DefaultFilterFactory::filterFactory());
+  Image<RGBA8Pixel> smaller(4, 6), larger = flatPicture(10, 6, {1, 2, 3, 4});
+  EXPECT_TRUE(session.applyFilterWithParams("PassThrough", "", {}, smaller));
+  EXPECT_EQ(std::memcmp(smaller.data.get(), image->data.get(), smaller.byteSize()), 0);
+  EXPECT_TRUE(session.applyFilterWithParams("PassThrough", "", {}, larger));
+  EXPECT_EQ(std::memcmp(larger.data.get(), image->data.get(), image->byteSize()), 0);
+  EXPECT_EQ(larger.data.get()[48], (RGBA8Pixel{1, 2, 3, 4}));
 }
 
 TEST_F(FilteredImageTest, TriesAgainAfterAnInitThatThrew) {
