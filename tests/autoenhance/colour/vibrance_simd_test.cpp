@@ -1,7 +1,7 @@
 #include <gtest/gtest.h>
 
 #undef HWY_TARGET_INCLUDE
-#define HWY_TARGET_INCLUDE "tests/autoenhance/vibrance_simd_test.cpp"
+#define HWY_TARGET_INCLUDE "tests/autoenhance/colour/vibrance_simd_test.cpp"
 #include <hwy/foreach_target.h>  // compiles the rest of this file once per instruction set
 #include <hwy/highway.h>
 

@@ -5,27 +5,15 @@
 #include <algorithm>
 #include <cmath>
 #include <limits>
-#include <numeric>
+#include <vector>
 
-#include "image_processing/autoenhance/lightness/build_tone_curve.h"
 #include "image_processing/autoenhance/lightness/cdf.h"
-#include "tests/support/pictures.h"
+#include "tests/support/curves.h"
 
 namespace pelorin::image_processing {
 namespace {
 
-std::vector<float> identity(int samples) {
-  std::vector<float> curve(samples);
-  for (int i = 0; i < samples; ++i) curve[i] = static_cast<float>(i) / (samples - 1);
-  return curve;
-}
-
-/// A CDF whose mass lies at the dark end.
-std::vector<float> darkCurve(int samples) {
-  std::vector<float> curve = identity(samples);
-  for (float& y : curve) y = y * y;
-  return curve;
-}
+using test_support::darkCurve;
 
 TEST(ToneCurve, ReturnsTheFirstSampleAtZeroAndTheLastAtTheTop) {
   const std::vector<float> curve = {3.0f, 5.0f, 11.0f};
@@ -51,32 +39,8 @@ TEST(ToneCurve, ReadsNoSampleOutsideItself) {
   }
 }
 
-TEST(BuildToneCurve, IsTheIdentityAtSliderZeroAndStaysItThroughTheMassage) {
-  ImageStatistics statistics;
-  statistics.cdf = darkCurve(51);
-  FilterConfig config = defaultFilterConfigValue;
-  updateFilterConfigForSliderValue(0.0f, &config);
-  const std::vector<float> curve = buildToneCurve(statistics, config);
-  for (int i = 0; i < 51; ++i) EXPECT_NEAR(curve[i], i / 50.0f, 2e-6f) << i;
-}
-
-TEST(BuildToneCurve, NeverDecreasesAndRunsFromZeroToOne) {
-  for (int seed = 0; seed < 4; ++seed) {
-    ImageStatistics statistics;
-    analyzeImage(test_support::photoLikePicture(80, 60, seed), {}, statistics);
-    for (const float slider : {0.0f, 0.2f, 0.5f, 1.0f}) {
-      FilterConfig config = defaultFilterConfigValue;
-      updateFilterConfigForSliderValue(slider, &config);
-      const std::vector<float> curve = buildToneCurve(statistics, config);
-      EXPECT_EQ(curve.front(), 0.0f);
-      EXPECT_NEAR(curve.back(), 1.0f, 1e-5f);
-      for (int i = 1; i < 51; ++i) EXPECT_GE(curve[i], curve[i - 1]);
-    }
-  }
-}
-
 TEST(UpdateCurveForFaces, ChangesNothingWithoutAFaceOrATarget) {
-  const std::vector<float> before = darkCurve(51);
+  const std::vector<float> before = darkCurve();
   std::vector<float> curve = before;
   updateCurveForFaces(0.5f, -1, curve);
   updateCurveForFaces(0.0f, 20, curve);
@@ -87,14 +51,14 @@ TEST(UpdateCurveForFaces, ChangesNothingWithoutAFaceOrATarget) {
 }
 
 TEST(UpdateCurveForFaces, ChangesNothingWhenTheTargetIsMet) {
-  const std::vector<float> before = darkCurve(51);
+  const std::vector<float> before = darkCurve();
   std::vector<float> curve = before;
   updateCurveForFaces(0.15f, 20, curve);  // (20/50)² = 0.16
   EXPECT_EQ(curve, before);
 }
 
 TEST(UpdateCurveForFaces, LiftsTheFaceMedianTowardTheTargetAndKeepsTheMass) {
-  std::vector<float> curve = darkCurve(51);
+  std::vector<float> curve = darkCurve();
   updateCurveForFaces(0.15f, 10, curve);  // (10/50)² = 0.04
   EXPECT_GT(curve[10], 0.13f);
   EXPECT_NEAR(curve[50], 1.0f, 1e-5f);
@@ -102,7 +66,7 @@ TEST(UpdateCurveForFaces, LiftsTheFaceMedianTowardTheTargetAndKeepsTheMass) {
 }
 
 TEST(UpdateCurveForFaces, MovesNothingIntoTheLastBin) {
-  std::vector<float> curve = darkCurve(51);
+  std::vector<float> curve = darkCurve();
   for (float& y : curve) y *= 0.1f;
   const std::vector<float> before = curve;
   updateCurveForFaces(0.15f, 49, curve);
@@ -137,7 +101,7 @@ TEST(CurveMassage, GivesTheSharesWorkedOutByHand) {
 }
 
 TEST(CurveMassage, KeepsTheClampedHistogramFromRoundToRound) {
-  const std::vector<float> before = darkCurve(51);
+  const std::vector<float> before = darkCurve();
   constexpr int rounds = 20;
   const float low = 0.75f / 50.0f, high = 8.0f / 50.0f;
   std::vector<float> kept, taken, expected, fromCurve = before;

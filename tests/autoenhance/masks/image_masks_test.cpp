@@ -1,7 +1,12 @@
-// The whole preparation of a photo beside the definitions of its stages, byte for byte.
+#include "image_processing/autoenhance/masks/image_masks.h"
+
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
+#include <cstdint>
+#include <string>
+#include <utility>
 #include <vector>
 
 #include "image_processing/autoenhance/colour/lab.h"
@@ -12,7 +17,7 @@
 #include "image_processing/autoenhance/masks/grid_blur.h"
 #include "image_processing/autoenhance/masks/grid_slice.h"
 #include "image_processing/autoenhance/masks/grid_splat.h"
-#include "image_processing/autoenhance/masks/image_masks.h"
+#include "tests/support/faces.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/instruction_sets.h"
 #include "tests/support/pictures.h"
@@ -22,7 +27,130 @@ namespace {
 
 using Quantized = QuantizedFloat<unsigned char>;
 using test_support::fingerprint;
+using test_support::flatPicture;
+using test_support::noisePicture;
 using test_support::onEveryInstructionSet;
+using test_support::photoLikePicture;
+using test_support::withFaces;
+
+using FloatMasks = ImageMasks<float, float>;
+using ByteMasks = ImageMasks<Quantized, Quantized>;
+
+constexpr RGBA8Pixel skin{224, 172, 140, 255};  // Lab a and b well inside both windows
+
+template <typename Masks = FloatMasks>
+Masks masksOf(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata = {},
+              const FilterConfig& config = defaultFilterConfigValue) {
+  Masks masks;
+  computeImageMasks(photo, metadata, config, masks);
+  return masks;
+}
+
+TEST(ImageMasks, AreAllocatedAndNotComputedWithoutDetailGain) {
+  FilterConfig config = defaultFilterConfigValue;
+  config.detailGainHigh = 0.0f;
+  const FloatMasks masks = masksOf(photoLikePicture(30, 20, 1), {}, config);
+  EXPECT_FALSE(masks.computed);
+  ASSERT_NE(masks.bilateralMask, nullptr);
+  ASSERT_NE(masks.ltmMask, nullptr);
+  EXPECT_EQ(masks.bilateralMask->width, 30u);
+  EXPECT_EQ(masks.ltmMask->height, 20u);
+}
+
+TEST(ImageMasks, ReplaceWhatTheRecordHeld) {
+  FloatMasks masks = masksOf(photoLikePicture(30, 20, 1));
+  const auto before = masks.ltmMask;
+  computeImageMasks(photoLikePicture(11, 9, 2), {}, defaultFilterConfigValue, masks);
+  EXPECT_NE(masks.ltmMask, before);
+  EXPECT_EQ(masks.ltmMask->width, 11u);
+  EXPECT_EQ(before.use_count(), 1);
+}
+
+TEST(ImageMasks, HaveThePhotosSizeAndUsualRange) {
+  const FloatMasks masks = masksOf(photoLikePicture(97, 61, 3));
+  EXPECT_TRUE(masks.computed);
+  for (const auto& mask : {masks.bilateralMask, masks.ltmMask}) {
+    ASSERT_EQ(mask->pixelCount(), 97u * 61u);
+    for (std::size_t i = 0; i < mask->pixelCount(); ++i) {
+      ASSERT_GE(mask->data.get()[i], 0.0f);
+      ASSERT_LE(mask->data.get()[i], 1.0001f);
+    }
+  }
+}
+
+TEST(ImageMasks, ComeFromTheExactFilterWhenTheGridIsOff) {
+  FilterConfig config = defaultFilterConfigValue;
+  config.useBilateralGrid = 0;
+  config.bilateralSpatialFraction = 0.1f;
+  const auto photo = photoLikePicture(60, 40, 4);
+  FilterConfig grid = config;
+  grid.useBilateralGrid = 1;
+  EXPECT_NE(fingerprint(*masksOf(photo, {}, config).bilateralMask),
+            fingerprint(*masksOf(photo, {}, grid).bilateralMask));
+}
+
+TEST(ImageMasks, TakeASpatialExtentOfAtLeastOnePixel) {
+  const auto photo = photoLikePicture(50, 30, 5);
+  FilterConfig one = defaultFilterConfigValue;
+  one.bilateralSpatialFraction = 1.0f / 30.0f;
+  const std::string expected = fingerprint(*masksOf(photo, {}, one).bilateralMask);
+  for (const float fraction : {0.0f, -5.0f, 0.01f, std::nanf("")}) {
+    FilterConfig config = defaultFilterConfigValue;
+    config.bilateralSpatialFraction = fraction;
+    EXPECT_EQ(fingerprint(*masksOf(photo, {}, config).bilateralMask), expected) << fraction;
+  }
+}
+
+TEST(ImageMasks, OfAnEmptyPhotoAreEmpty) {
+  const FloatMasks masks = masksOf(Image<RGBA8Pixel>(0, 9), withFaces({{0, 5, 5, 0}}));
+  EXPECT_TRUE(masks.computed);
+  EXPECT_EQ(masks.ltmMask->pixelCount(), 0u);
+}
+
+TEST(LtmMask, IsZeroWithoutAmountExceptOnSkinNearFaces) {
+  Image<RGBA8Pixel> photo = flatPicture(60, 60, {40, 90, 200, 255});
+  for (std::uint32_t y = 20; y < 40; ++y) {
+    for (std::uint32_t x = 20; x < 40; ++x) photo.row(y)[x] = skin;
+  }
+  for (const float amount : {0.0f, -1.0f, std::nanf("")}) {
+    FilterConfig config = defaultFilterConfigValue;
+    config.ltmMaskAmount = amount;
+    const Image<float> plain = *masksOf(photo, {}, config).ltmMask;
+    for (std::size_t i = 0; i < plain.pixelCount(); ++i) ASSERT_EQ(plain.data.get()[i], 0.0f);
+    const Image<float> faced = *masksOf(photo, withFaces({{22, 38, 38, 22}}), config).ltmMask;
+    EXPECT_NEAR(faced.row(30)[30], 0.5f, 0.01f);
+    EXPECT_EQ(faced.row(45)[30], 0.0f);  // in the region, but blue
+    EXPECT_EQ(faced.row(5)[5], 0.0f);
+  }
+}
+
+TEST(LtmMask, IsOneOnAFlatPhoto) {
+  const Image<float> mask = *masksOf(flatPicture(80, 50, {120, 120, 120, 255})).ltmMask;
+  // The smoothing returns a constant only to a few parts in a million, and the sums round.
+  for (std::size_t i = 0; i < mask.pixelCount(); ++i) ASSERT_NEAR(mask.data.get()[i], 1.0f, 5e-3f);
+}
+
+TEST(LtmMask, IsNearZeroInNoise) {
+  const Image<float> mask = *masksOf(noisePicture(80, 50, 1)).ltmMask;
+  for (std::size_t i = 0; i < mask.pixelCount(); ++i) ASSERT_LT(mask.data.get()[i], 0.35f);
+}
+
+TEST(LtmMask, TakesItsDetailFromTheByteInTheEightBitVariant) {
+  const auto photo = photoLikePicture(64, 48, 9);
+  const ByteMasks masks = masksOf<ByteMasks>(photo);
+  Image<float> lightness(64, 48), base(64, 48), mask(64, 48);
+  for (std::size_t i = 0; i < photo.pixelCount(); ++i) {
+    const RGBA8Pixel& p = photo.data.get()[i];
+    lightness.data.get()[i] = rgbToLab(p.r, p.g, p.b).L / 100.0f;
+    base.data.get()[i] = masks.bilateralMask->data.get()[i].stored() / 255.0f;
+  }
+  computeFlatnessMask(lightness, base, 8, mask);
+  for (std::size_t i = 0; i < photo.pixelCount(); ++i) {
+    Quantized expected;
+    expected = mask.data.get()[i];
+    ASSERT_EQ(masks.ltmMask->data.get()[i].stored(), expected.stored());
+  }
+}
 
 std::vector<float> cdfByDefinition(const Image<RGBA8Pixel>& photo) {
   std::vector<float> counts(50), cdf;
@@ -75,8 +203,7 @@ Masks<T> masksByDefinition(const Image<RGBA8Pixel>& photo, const ImageMetadata& 
 
 template <typename T>
 void expectTheDefinition(const Image<RGBA8Pixel>& photo, const FilterConfig& config) {
-  ImageMetadata metadata;
-  metadata.faces.push_back(std::make_shared<BoundingBox>(BoundingBox{2, 14, 11, 3}));
+  const ImageMetadata metadata = withFaces({{2, 14, 11, 3}});
   const Masks<T> expected = masksByDefinition<T>(photo, metadata, config);
   const std::vector<float> expectedCdf = cdfByDefinition(photo);
   onEveryInstructionSet(
@@ -103,11 +230,11 @@ void expectTheDefinition(const Image<RGBA8Pixel>& photo, const FilterConfig& con
 }
 
 template <typename T>
-class Preparation : public testing::Test {};
+class PrepareImage : public testing::Test {};
 using MaskTypes = testing::Types<float, Quantized>;
-TYPED_TEST_SUITE(Preparation, MaskTypes);
+TYPED_TEST_SUITE(PrepareImage, MaskTypes);
 
-TYPED_TEST(Preparation, IsItsDefinitionAtAnySize) {
+TYPED_TEST(PrepareImage, IsItsDefinitionAtAnySize) {
   for (const auto& [width, height] : {std::pair{1u, 1u},
                                       {1u, 37u},
                                       {53u, 1u},
@@ -120,22 +247,21 @@ TYPED_TEST(Preparation, IsItsDefinitionAtAnySize) {
                                       {1100u, 45u},
                                       {321u, 241u}}) {
     SCOPED_TRACE(testing::Message() << width << " x " << height);
-    for (const auto& photo : {test_support::photoLikePicture(width, height, 7),
-                              test_support::noisePicture(width, height, 8)}) {
+    for (const auto& photo : {photoLikePicture(width, height, 7), noisePicture(width, height, 8)}) {
       expectTheDefinition<TypeParam>(photo, defaultFilterConfigValue);
     }
   }
 }
 
-TYPED_TEST(Preparation, IsItsDefinitionOnBlackGreyAndWhite) {
+TYPED_TEST(PrepareImage, IsItsDefinitionOnBlackGreyAndWhite) {
   for (const std::uint8_t code : {0, 1, 119, 255}) {
-    expectTheDefinition<TypeParam>(test_support::flatPicture(130, 70, {code, code, code, 255}),
+    expectTheDefinition<TypeParam>(flatPicture(130, 70, {code, code, code, 255}),
                                    defaultFilterConfigValue);
   }
 }
 
-TYPED_TEST(Preparation, IsItsDefinitionWithAnyConfiguration) {
-  const auto photo = test_support::photoLikePicture(75, 58, 9);
+TYPED_TEST(PrepareImage, IsItsDefinitionWithAnyConfiguration) {
+  const auto photo = photoLikePicture(75, 58, 9);
   const auto with = [&](auto change) {
     FilterConfig config = defaultFilterConfigValue;
     change(config);
@@ -159,8 +285,8 @@ TYPED_TEST(Preparation, IsItsDefinitionWithAnyConfiguration) {
   });
 }
 
-TYPED_TEST(Preparation, CountsAlsoWhenNoMasksAreComputed) {
-  const auto photo = test_support::photoLikePicture(75, 58, 10);
+TYPED_TEST(PrepareImage, CountsAlsoWhenNoMasksAreComputed) {
+  const auto photo = photoLikePicture(75, 58, 10);
   FilterConfig config = defaultFilterConfigValue;
   config.detailGainHigh = 0.0f;
   ImageStatistics statistics;
@@ -170,7 +296,7 @@ TYPED_TEST(Preparation, CountsAlsoWhenNoMasksAreComputed) {
   EXPECT_EQ(statistics.cdf, cdfByDefinition(photo));
 }
 
-TYPED_TEST(Preparation, OfAnEmptyPhotoIsEmpty) {
+TYPED_TEST(PrepareImage, OfAnEmptyPhotoIsEmpty) {
   for (const auto& [width, height] : {std::pair{0u, 9u}, {9u, 0u}, {0u, 0u}}) {
     const Image<RGBA8Pixel> photo(width, height);
     ImageStatistics statistics, alone;

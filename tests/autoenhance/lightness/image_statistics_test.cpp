@@ -1,8 +1,13 @@
+#include "image_processing/autoenhance/lightness/image_statistics.h"
+
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <cstdint>
+#include <vector>
+
 #include "image_processing/autoenhance/colour/lab.h"
-#include "image_processing/autoenhance/lightness/cdf.h"
-#include "image_processing/autoenhance/lightness/image_statistics.h"
+#include "tests/support/faces.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {
@@ -10,12 +15,7 @@ namespace {
 
 using test_support::flatPicture;
 using test_support::photoLikePicture;
-
-ImageMetadata withFaces(std::initializer_list<BoundingBox> boxes) {
-  ImageMetadata metadata;
-  for (const BoundingBox& box : boxes) metadata.faces.push_back(std::make_shared<BoundingBox>(box));
-  return metadata;
-}
+using test_support::withFaces;
 
 ImageStatistics statisticsOf(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata = {}) {
   ImageStatistics statistics;
@@ -122,14 +122,6 @@ TEST(ImageStatistics, BinBySharesOfTheScale) {
     ++expected[static_cast<int>(49.0f * rgbToLab(code, code, code).L / 100.0f)];
   }
   for (int bin = 0; bin < 50; ++bin) EXPECT_EQ(histogram[bin], expected[bin] / 256.0f) << bin;
-}
-
-TEST(ComputeCDF, AndItsInverseSumAndDifferLeftToRight) {
-  std::vector<float> cdf, histogram;
-  computeCDF({0.25f, 0.5f, 0.25f}, cdf);
-  EXPECT_EQ(cdf, (std::vector<float>{0.0f, 0.25f, 0.75f, 1.0f}));
-  computeHistogramFromCDF(cdf, histogram);
-  EXPECT_EQ(histogram, (std::vector<float>{0.25f, 0.5f, 0.25f}));
 }
 
 }  // namespace

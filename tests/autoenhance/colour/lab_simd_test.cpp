@@ -3,7 +3,7 @@
 #include <vector>
 
 #undef HWY_TARGET_INCLUDE
-#define HWY_TARGET_INCLUDE "tests/autoenhance/lab_simd_test.cpp"
+#define HWY_TARGET_INCLUDE "tests/autoenhance/colour/lab_simd_test.cpp"
 #include <hwy/foreach_target.h>  // compiles the rest of this file once per instruction set
 #include <hwy/highway.h>
 
