@@ -1,11 +1,12 @@
 # Builds libpn_quenby.so as for a device, whose four libraries are taken from a folder, and looks at
 # its symbols. Another build's libraries play the device's.
 #   cmake -DSOURCE=... -DLIBRARIES=... -DSCRATCH=... -DTOOLCHAIN=... -DGENERATOR=... -DFLAGS=...
-#         -DNM=... -DREADELF=... -DCHECK=... -P device_build.cmake
+#         -DHEADERS=... -DNM=... -DREADELF=... -DCHECK=... -P device_build.cmake
 cmake_minimum_required(VERSION 3.25)
 execute_process(
   COMMAND ${CMAKE_COMMAND} -S ${SOURCE} -B ${SCRATCH} -G ${GENERATOR} -DCMAKE_BUILD_TYPE=Debug
           -DCMAKE_TOOLCHAIN_FILE=${TOOLCHAIN} -DPELORIN_CLI=OFF -DPELORIN_TESTS=OFF
+          -DPELORIN_INSTALL=OFF -DPELORIN_HEADERS=${HEADERS}
           -DPELORIN_DEVICE_LIBRARIES=${LIBRARIES}
           # The platform's own header would be in the compiler's path.
           "-DCMAKE_CXX_FLAGS=${FLAGS} -idirafter ${SOURCE}/platform/jnigraphics/include"

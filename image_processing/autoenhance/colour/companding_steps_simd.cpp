@@ -1,5 +1,3 @@
-// Byte permutes over whole tables are worth a version of their own.
-#define HWY_WANT_AVX3_DL
 #include "image_processing/autoenhance/colour/companding_steps.h"
 
 #undef HWY_TARGET_INCLUDE

@@ -33,6 +33,8 @@ constexpr std::ptrdiff_t firstColumn(std::ptrdiff_t k) {
 
 /// What the lanes carry from step to step: lane k of vector v is row v · lanes + k.
 struct Wavefront {
+  HWY_ATTR Wavefront() {}  // an implicit one is not compiled for the instruction set
+
   F left[vectors];        // the sums of the last step
   F beforeLeft[vectors];  // and of the one before it
   F aboveLeft[vectors];

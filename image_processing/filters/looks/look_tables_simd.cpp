@@ -1,7 +1,5 @@
 #include "image_processing/filters/looks/look_tables.h"
 
-// Its permutes of bytes hold a table of 256 in four registers.
-#define HWY_WANT_AVX3_DL
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "image_processing/filters/looks/look_tables_simd.cpp"
 #include <hwy/foreach_target.h>  // compiles the rest of this file once per instruction set
