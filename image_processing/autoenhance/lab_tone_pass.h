@@ -18,10 +18,9 @@ void apply(const Image<RGBA8Pixel>& source, const ImageStatistics& statistics,
 /// The pass over the pixels: to Lab, L through the tone curve and, with masks, recombined from
 /// smoothed base and detail, back to sRGB with a and b unchanged, then vibrance. Alpha is copied.
 /// @param output  of the size of `source`; may be the same pixels. When the sizes differ, pixels
-/// are
-///                walked in storage order until either image ends.
+///                are walked in storage order until either image ends.
 /// @param config  `vibrance`, `detailGain`, `ltmBlend` are used; `detailGainHigh` 0 turns masks
-/// off.
+///                off.
 /// @param curve   at least 2 samples over [0, 1], in [0, 1].
 /// @param scale   L of white, 100.
 /// @param masks   of the size of `source`; treated as off when they were never computed.

@@ -20,8 +20,7 @@ constexpr float dupeTimeOffset = 0.05f;  ///< In the unit of dt.
 
 /// The score of two photos whose distance is known.
 /// @param dt        difference of the capture times, meant in seconds; its sign does not matter,
-/// NaN
-///                  gives NaN.
+///                  NaN gives NaN.
 /// @param distance  what `exposureInvariantCDFDistance` gave.
 float dupeScoreOfDistance(float distance, float dt, bool sameOrientation);
 

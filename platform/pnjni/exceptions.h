@@ -9,12 +9,14 @@ void throwCppExceptionIf(bool condition);
 
 /// To be called in a catch block: raises the Java exception that stands for the C++ one.
 ///
-/// | C++ | Java | message |
-/// |---|---|---|
-/// | std::bad_alloc | OutOfMemoryError | "out of native memory" |
-/// | std::out_of_range, std::invalid_argument, std::bad_cast | IllegalArgumentException | `what()`
-/// | | std::system_error | java.io.IOException | `what()` | | anything else | RuntimeException |
-/// `what()`, if it has one |
+/// | C++                   | Java                     | message                   |
+/// |-----------------------|--------------------------|---------------------------|
+/// | std::bad_alloc        | OutOfMemoryError         | "out of native memory"    |
+/// | std::out_of_range     | IllegalArgumentException | `what()`                  |
+/// | std::invalid_argument | IllegalArgumentException | `what()`                  |
+/// | std::bad_cast         | IllegalArgumentException | `what()`                  |
+/// | std::system_error     | java.io.IOException      | `what()`                  |
+/// | anything else         | RuntimeException         | `what()`, if it has one   |
 ///
 /// A Java exception that is pending already stays: it is the cause. Allocates no native memory.
 void translatePendingCppExceptionToJavaException() noexcept;

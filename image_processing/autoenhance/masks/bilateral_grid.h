@@ -14,9 +14,8 @@ namespace pelorin::image_processing {
 ///                    kernel is empty and the output is all 0.
 /// @param spatial     cell size in pixels, truncated; meant from 1 to the shorter side. Outside of
 ///                    that, the cell is one pixel or the grid one node along the side.
-/// @param smoothed    written; of the size of `lightness`. Images are shared, so writing into the
-/// copy
-///                    fills the caller's; its own buffer.
+/// @param smoothed    written; of the size of `lightness`, its own buffer. Images are shared, so
+///                    writing into the copy fills the caller's.
 /// @throws std::bad_alloc when the grid of columns x rows x 32 nodes does not fit.
 ///
 /// Keeps no state; calls with different outputs may run at once. After Chen, Paris and Durand,
@@ -37,8 +36,9 @@ Grid makeGrid(std::uint32_t width, std::uint32_t height, float cellSize);
 template <typename T>
 class SmoothedRows : public RowSource<T> {
  public:
-  /// Holds on to all but the cell size. @param smoothed  written row by row. @throws
-  /// std::bad_alloc.
+  /// Holds on to all but the cell size.
+  /// @param smoothed  written row by row.
+  /// @throws std::bad_alloc.
   SmoothedRows(const Grid& grid, float cellSize, RowSource<float>& lightness, Image<T>& smoothed)
       : slicer_(grid, smoothed.width, cellSize), lightness_(lightness), smoothed_(smoothed) {}
 

@@ -11,8 +11,7 @@ namespace pelorin::image_processing {
 /// @param lightness  values in [0, 1].
 /// @param smoothed   the smoothing of `lightness`, of the same size.
 /// @param radius     half-size of the window, at least 0; below 0 there is no window and the mask
-/// is 0.
-///                   The window is centred one pixel right of and below the mask pixel.
+///                   is 0. The window is centred one pixel right of and below the mask pixel.
 /// @param mask       written; of the size of `lightness`. Its own buffer.
 /// @throws std::bad_alloc when about 2 · radius rows of sums do not fit.
 ///

@@ -44,9 +44,10 @@ void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& met
 
 /// Fills the LTM mask: flatness when `amount` is above 0, else 0, then the faces one by one, each
 /// blending into what the one before left.
-/// @param lightness  of the photo / 100; `bilateral` its smoothing; `mask` written. All of one
-/// size.
+/// @param lightness  of the photo / 100; of the photo's size, as all images here.
+/// @param bilateral  the smoothing of `lightness`.
 /// @param radius     half-size of the flatness window, at least 0.
+/// @param mask       written.
 template <typename TB, typename TL>
 void computeLtmMask(const ImageMetadata& metadata, const Image<RGBA8Pixel>& photo,
                     const Image<float>& lightness, const Image<TB>& bilateral, float amount,
