@@ -1,6 +1,8 @@
 #include "jni/session_table.h"
 
+#include <atomic>
 #include <cstdint>
+#include <random>
 #include <utility>
 
 #include "jni/log.h"
@@ -12,10 +14,22 @@ void logUnknown(jlong handle) {
   pn_printLog(logError, logTag, "no session has the handle %lld", static_cast<long long>(handle));
 }
 
+/// Every class loader has a copy of this library with a count of its own. Each starts at a point of
+/// 2^62, so that a handle of one means nothing to another either.
+jlong firstHandle() {
+  std::random_device random;
+  return static_cast<jlong>((std::uint64_t{random()} << 32 | random()) >> 2) + 1;
+}
+
+jlong nextHandle() {
+  static std::atomic<jlong> next = firstHandle();
+  return next++;
+}
+
 }  // namespace
 
 jlong SessionTable::open(std::shared_ptr<QuenbySession> session) {
-  const auto handle = static_cast<jlong>(reinterpret_cast<std::uintptr_t>(session.get()));
+  const jlong handle = nextHandle();
   const std::lock_guard lock(mutex_);
   sessions_.emplace(handle, std::move(session));
   return handle;
@@ -39,7 +53,6 @@ void SessionTable::release(jlong handle) {
     if (found != sessions_.end()) {
       session = std::move(found->second);
       sessions_.erase(found);
-      recentlyReleased_[releases_++ % recentlyReleased_.size()] = session;
       return;
     }
   }

@@ -2,7 +2,6 @@
 
 #include <jni.h>
 
-#include <array>
 #include <cstddef>
 #include <map>
 #include <memory>
@@ -12,9 +11,9 @@
 
 namespace pelorin::quenby {
 
-/// The sessions that are open in this process. A handle is the address of its session, never 0.
-/// A native works on a share of its session, so a release meanwhile cannot take memory from under
-/// it, and a handle that is not in the table reaches nothing. Any thread may call.
+/// The sessions that are open in this process. Handles are positive and count up, whichever table
+/// gives them, so none is ever used twice and an old one reaches nothing. A native works on a share
+/// of its session, so a release meanwhile cannot take memory from under it. Any thread may call.
 class SessionTable {
  public:
   /// @throws std::bad_alloc; the session is then gone.
@@ -31,10 +30,6 @@ class SessionTable {
  private:
   mutable std::mutex mutex_;
   std::map<jlong, std::shared_ptr<QuenbySession>> sessions_;
-  // A weak pointer keeps the memory, though not the session. While it is here, no new session gets
-  // that address, and the old handle stays unknown.
-  std::array<std::weak_ptr<QuenbySession>, 256> recentlyReleased_;
-  std::size_t releases_ = 0;
 };
 
 /// The table of the natives.

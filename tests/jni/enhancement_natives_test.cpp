@@ -315,6 +315,25 @@ TEST_F(EnhancementNatives, DoNothingForHandlesThatAreNoSession) {
   EXPECT_EQ(output.bytes, FakeBitmap(64, 48).bytes);
 }
 
+TEST_F(EnhancementNatives, ReachNoLaterSessionByAnOldHandle) {
+  const jlong stale = open(photo);
+  natives.release(stale);
+  FakeBitmap other(8, 8), untouched(64, 48);
+  for (int i = 0; i < 20'000; ++i) {
+    const jlong handle = natives.init(other.reference());
+    ASSERT_NE(handle, stale);
+    natives.preprocess(nullptr, handle);
+    natives.apply(stale, untouched.reference(), passThrough, empty);
+    natives.preprocess(noFaces, stale);
+    natives.release(stale);
+    ASSERT_EQ(quenby::openSessions().size(), 1u) << i;
+    natives.release(handle);
+  }
+  EXPECT_EQ(untouched.bytes, FakeBitmap(64, 48).bytes);
+  EXPECT_EQ(untouched.timesLocked, 0);
+  takeLogLines();
+}
+
 TEST_F(EnhancementNatives, WorkOnABitmapWithoutPixels) {
   for (const auto& [width, height] : {std::pair{0u, 0u}, {5u, 0u}, {0u, 5u}}) {
     FakeBitmap nothing(width, height), nothingOut(width, height);

@@ -3,6 +3,8 @@
 #include <gtest/gtest.h>
 
 #include <set>
+#include <thread>
+#include <vector>
 
 #include "tests/jni/support/fake_log.h"
 #include "tests/support/pictures.h"
@@ -17,11 +19,11 @@ std::shared_ptr<QuenbySession> newSession() {
   return std::make_shared<QuenbySession>(flatPicture(2, 2, {1, 2, 3, 4}));
 }
 
-TEST(SessionTable, KnowsASessionByItsAddress) {
+TEST(SessionTable, KnowsASessionByItsHandle) {
   SessionTable table;
   const auto session = newSession();
   const jlong handle = table.open(session);
-  EXPECT_EQ(handle, static_cast<jlong>(reinterpret_cast<std::uintptr_t>(session.get())));
+  EXPECT_GT(handle, 0);
   EXPECT_EQ(table.find(handle), session);
   EXPECT_EQ(table.size(), 1u);
 }
@@ -52,14 +54,53 @@ TEST(SessionTable, FreesThePixelsOfAReleasedSession) {
   EXPECT_TRUE(pixels.expired());
 }
 
-TEST(SessionTable, GivesNoHandleASecondTimeSoonAfterItsRelease) {
+TEST(SessionTable, GivesNoHandleASecondTime) {
   SessionTable table;
-  std::set<jlong> handles;
-  for (int i = 0; i < 256; ++i) {
-    const jlong handle = table.open(newSession());
-    EXPECT_TRUE(handles.insert(handle).second);
+  const jlong stale = table.open(newSession());
+  table.release(stale);
+  // Its memory serves the next one, as that of a released session may.
+  const auto session = newSession();
+  jlong previous = stale;
+  for (int i = 0; i < 1'000'000; ++i) {
+    const jlong handle = table.open(session);
+    ASSERT_GT(handle, previous);  // so neither is it any of those before
+    if (i % 997 == 0) {
+      ASSERT_EQ(table.find(stale), nullptr);
+      table.release(stale);
+      ASSERT_EQ(table.find(handle), session);
+    }
     table.release(handle);
+    previous = handle;
   }
+  EXPECT_EQ(table.size(), 0u);
+  takeLogLines();
+}
+
+TEST(SessionTable, SharesItsCountWithEveryOther) {
+  SessionTable one, another;
+  const jlong first = one.open(newSession()), second = another.open(newSession());
+  EXPECT_GT(second, first);
+  EXPECT_GT(one.open(newSession()), second);
+  EXPECT_EQ(another.find(first), nullptr);
+  takeLogLines();
+}
+
+TEST(SessionTable, CountsOnAfterEveryReleaseInManyThreads) {
+  SessionTable table;
+  std::vector<std::vector<jlong>> handles(4);
+  std::vector<std::thread> threads;
+  for (auto& own : handles) {
+    threads.emplace_back([&] {
+      for (int i = 0; i < 2000; ++i) {
+        own.push_back(table.open(newSession()));
+        table.release(own.back());
+      }
+    });
+  }
+  for (std::thread& thread : threads) thread.join();
+  std::set<jlong> all;
+  for (const auto& own : handles) all.insert(own.begin(), own.end());
+  EXPECT_EQ(all.size(), 8000u);
 }
 
 }  // namespace
