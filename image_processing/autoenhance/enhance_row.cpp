@@ -5,7 +5,7 @@
 
 #include "image_processing/autoenhance/colour/lab.h"
 #include "image_processing/autoenhance/colour/vibrance.h"
-#include "image_processing/autoenhance/lightness/tone_curve.h"
+#include "image_processing/core/sampled_curve.h"
 
 namespace pelorin::image_processing {
 

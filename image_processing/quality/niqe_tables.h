@@ -2,7 +2,7 @@
 
 #include <array>
 
-#include "image_processing/autoenhance/lightness/tone_curve.h"
+#include "image_processing/core/sampled_curve.h"
 
 namespace pelorin::image_processing {
 

@@ -9,7 +9,7 @@
 
 #include "image_processing/autoenhance/colour/lab.h"
 #include "image_processing/autoenhance/colour/vibrance.h"
-#include "image_processing/autoenhance/lightness/tone_curve.h"
+#include "image_processing/core/sampled_curve.h"
 #include "tests/support/curves.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/pictures.h"

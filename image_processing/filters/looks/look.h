@@ -7,8 +7,8 @@
 #include <utility>
 #include <vector>
 
-#include "image_processing/autoenhance/lightness/tone_curve.h"
 #include "image_processing/core/float_to_integer.h"
+#include "image_processing/core/sampled_curve.h"
 #include "image_processing/filters/looks/cubic_radial_mask.h"
 
 namespace pelorin::image_processing {
