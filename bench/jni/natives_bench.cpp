@@ -37,6 +37,10 @@ class JavaSide {
  public:
   JavaSide(std::uint32_t width, std::uint32_t height) : env(environment()) {
     checked(env->PushLocalFrame(32));
+    const jclass library =
+        checked(env->FindClass("com/pelorin/photos/quenby/autoenhance/NativeLibrary"));
+    env->CallStaticVoidMethod(library, checked(env->GetStaticMethodID(library, "load", "()V")));
+    check();
     const char* const engineName = "com/pelorin/photos/quenby/autoenhance/QuenbyEngine";
     const jclass engineClass = checked(env->FindClass(engineName));
     engine = checked(

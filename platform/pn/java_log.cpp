@@ -4,6 +4,6 @@
 
 /// The native of com.pelorin.photos.quenby.desktop.NativeLog.
 extern "C" JNIEXPORT void JNICALL
-Java_com_pelorin_photos_quenby_desktop_NativeLog_setPriority(JNIEnv*, jclass, jint priority) {
+Java_com_pelorin_photos_quenby_desktop_NativeLog_setLeastPriority(JNIEnv*, jclass, jint priority) {
   pn_setLogPriority(priority);
 }

@@ -15,16 +15,19 @@ public final class NativeLog {
     /** Nothing at all. */
     public static final int SILENT = 8;
 
-    static {
-        NativeLibraries.load();
-    }
-
     private NativeLog() {}
 
     /**
-     * Drops lines below a priority from now on, in the whole process.
+     * Drops lines below a priority from now on, in the whole process. Loads the native libraries,
+     * if that has not been done.
      *
      * @param priority one of the constants
+     * @throws UnsatisfiedLinkError when they cannot be loaded
      */
-    public static native void setPriority(int priority);
+    public static void setPriority(int priority) {
+        NativeLibraries.load();
+        setLeastPriority(priority);
+    }
+
+    private static native void setLeastPriority(int priority);
 }

@@ -43,6 +43,7 @@ public final class Duplicates {
     public static float score(Photo a, Photo b) {
         Bitmaps.requireReadable(a.bitmap, "the first photo");
         Bitmaps.requireReadable(b.bitmap, "the second photo");
+        NativeLibrary.load();
         float score = ImageDupeDetector.similarityScore(
                 a.bitmap, a.seconds, a.orientation, b.bitmap, b.seconds, b.orientation);
         if (score == ImageDupeDetector.SIMILARITY_ERROR) { // recycled meanwhile

@@ -2,10 +2,13 @@ package com.pelorin.photos.quenby.autoenhance;
 
 import android.graphics.Bitmap;
 import android.graphics.RectF;
-import java.lang.ref.Cleaner;
+import java.lang.ref.PhantomReference;
 import java.lang.ref.Reference;
+import java.lang.ref.ReferenceQueue;
+import java.util.Collections;
+import java.util.HashSet;
 import java.util.List;
-import java.util.concurrent.atomic.AtomicLong;
+import java.util.Set;
 import java.util.logging.Logger;
 
 /**
@@ -14,50 +17,78 @@ import java.util.logging.Logger;
  * its own.
  *
  * <p>A session holds native memory, a multiple of the photo's, and wants to be closed. One that is
- * forgotten is freed when the garbage collector finds it, with a warning in the log.
+ * forgotten is freed, with a warning in the log, when a session is opened or closed after the
+ * garbage collector has found it; no thread waits for that.
  */
 public final class EnhanceSession implements AutoCloseable {
     private static final Logger LOG = Logger.getLogger(EnhanceSession.class.getName());
-    private static final Cleaner CLEANER = Cleaner.create();
     private static final QuenbyEngine ENGINE = new QuenbyEngine();
+    private static final ReferenceQueue<EnhanceSession> UNREACHABLE = new ReferenceQueue<>();
+    /** A reference that nobody holds is never queued. */
+    private static final Set<Handle> OPEN = Collections.synchronizedSet(new HashSet<>());
 
     private final int width;
     private final int height;
     private final Handle handle;
-    private final Cleaner.Cleanable cleanable;
 
-    /** The part of a session that outlives it, so it must not refer to it. */
-    private static final class Handle implements Runnable {
-        final AtomicLong value;
-        private volatile boolean closed;
+    /**
+     * The part of a session that outlives it. The native session is released when it is closed and
+     * no call uses it, so a call that has begun never meets a released one.
+     */
+    private static final class Handle extends PhantomReference<EnhanceSession> {
+        private final long value;
+        private int calls;
+        private boolean closed;
 
-        Handle(long value) {
-            this.value = new AtomicLong(value);
+        Handle(EnhanceSession session, long value) {
+            super(session, UNREACHABLE);
+            this.value = value;
+            OPEN.add(this);
         }
 
-        /** Runs once: at {@code close}, or when a forgotten session is found. */
-        @Override
-        public void run() {
-            if (!closed) {
-                LOG.warning("an EnhanceSession was never closed; its memory is freed only now");
-            }
-            ENGINE.releaseSession(value.getAndSet(0));
-        }
-
-        long get() {
-            long current = value.get();
-            if (current == 0) {
+        /** To be followed by {@link #endCall}. */
+        synchronized long beginCall() {
+            if (closed) {
                 throw new SessionClosedException();
             }
-            return current;
+            ++calls;
+            return value;
+        }
+
+        void endCall() {
+            boolean last;
+            synchronized (this) {
+                last = --calls == 0 && closed;
+            }
+            if (last) {
+                ENGINE.releaseSession(value);
+            }
+        }
+
+        void close() {
+            OPEN.remove(this);
+            boolean last;
+            synchronized (this) {
+                last = calls == 0 && !closed;
+                closed = true;
+            }
+            if (last) {
+                ENGINE.releaseSession(value);
+            }
         }
     }
 
     private EnhanceSession(long handle, int width, int height) {
-        this.handle = new Handle(handle);
+        this.handle = new Handle(this, handle);
         this.width = width;
         this.height = height;
-        this.cleanable = CLEANER.register(this, this.handle);
+    }
+
+    private static void closeForgotten() {
+        for (Reference<?> found; (found = UNREACHABLE.poll()) != null;) {
+            LOG.warning("an EnhanceSession was never closed; its memory is freed only now");
+            ((Handle) found).close();
+        }
     }
 
     /**
@@ -69,7 +100,7 @@ public final class EnhanceSession implements AutoCloseable {
      * @throws OutOfMemoryError          when the copy does not fit into memory
      */
     public static EnhanceSession open(Bitmap photo) {
-        return open(photo, List.of());
+        return open(photo, Collections.emptyList());
     }
 
     /**
@@ -85,6 +116,8 @@ public final class EnhanceSession implements AutoCloseable {
     public static EnhanceSession open(Bitmap photo, List<RectF> faces) {
         Bitmaps.requireReadable(photo, "the photo");
         RectF[] checked = Faces.check(faces);
+        NativeLibrary.load();
+        closeForgotten();
         long handle = ENGINE.init(photo);
         if (handle == 0) { // recycled meanwhile
             throw new UnsuitableBitmapException("the photo's pixels cannot be read");
@@ -108,10 +141,11 @@ public final class EnhanceSession implements AutoCloseable {
      */
     public void setFaces(List<RectF> faces) {
         RectF[] checked = Faces.check(faces);
+        long session = handle.beginCall();
         try {
-            ENGINE.preprocess(checked, handle.get());
+            ENGINE.preprocess(checked, session);
         } finally {
-            Reference.reachabilityFence(this);
+            handle.endCall();
         }
     }
 
@@ -133,7 +167,8 @@ public final class EnhanceSession implements AutoCloseable {
     }
 
     /**
-     * Writes the filtered photo into a bitmap.
+     * Writes the filtered photo into a bitmap. When this returns, it is written; a call that comes
+     * too late, while another thread closes the session or recycles the output, throws.
      *
      * @param filter which filter
      * @param params its parameters, "key=value;" items, every one with its semicolon
@@ -148,10 +183,14 @@ public final class EnhanceSession implements AutoCloseable {
             throw new UnknownFilterException(null);
         }
         Bitmaps.requireRoomFor(width, height, output);
+        long session = handle.beginCall();
         try {
-            ENGINE.applyAutoEnhanceFilter(handle.get(), output, filter.key(), params);
+            ENGINE.applyAutoEnhanceFilter(session, output, filter.key(), params);
         } finally {
-            Reference.reachabilityFence(this);
+            handle.endCall();
+        }
+        if (output.isRecycled()) { // meanwhile, perhaps before it was written
+            throw new UnsuitableBitmapException("the output was recycled by another thread");
         }
     }
 
@@ -189,10 +228,13 @@ public final class EnhanceSession implements AutoCloseable {
         return height;
     }
 
-    /** Frees the session once calls at work in other threads are done. Again does nothing. */
+    /**
+     * Ends the session. Calls that are at work in other threads finish, and the last of them frees
+     * its memory; those that come later throw. Again does nothing.
+     */
     @Override
     public void close() {
-        handle.closed = true;
-        cleanable.clean();
+        handle.close();
+        closeForgotten();
     }
 }

@@ -5,16 +5,15 @@ import android.graphics.Bitmap;
 /**
  * The native of the duplicate detector, as it is. {@link Duplicates} is the comfortable way to it.
  * Any thread may call.
+ *
+ * <p>{@link NativeLibrary#load} comes first: this class does not load the library, since loading
+ * initialises it. Until then the method throws {@link UnsatisfiedLinkError}.
  */
 public class ImageDupeDetector {
     /** What {@link #similarityScore} answers when a bitmap cannot be read; no photos score that. */
     public static final float SIMILARITY_ERROR = -2222.0f;
 
-    static {
-        NativeLibrary.load();
-    }
-
-    /** Loads the native library, if that has not been done. */
+    /** Makes nothing of use: the only method is static. */
     public ImageDupeDetector() {}
 
     /**

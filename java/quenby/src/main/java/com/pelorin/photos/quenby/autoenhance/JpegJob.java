@@ -136,6 +136,7 @@ public final class JpegJob {
     }
 
     private void callNative(Path target) throws IOException {
+        NativeLibrary.load();
         boolean written;
         try {
             written = new QuenbyEngine().applyAutoEnhanceFilterToJpegFile(input.toString(),

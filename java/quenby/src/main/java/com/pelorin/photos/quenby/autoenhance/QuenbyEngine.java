@@ -8,13 +8,13 @@ import java.io.IOException;
  * The natives of the enhancement engine, as they are. {@link EnhanceSession} and {@link JpegJob}
  * are the comfortable way to them: they check what these take on trust, report what these log.
  * Any thread may call, several at once on one session too.
+ *
+ * <p>{@link NativeLibrary#load} comes first: this class does not load the library, since loading
+ * initialises it, and a second thread that did both in another order would wait for ever. Until
+ * then every method throws {@link UnsatisfiedLinkError}.
  */
 public class QuenbyEngine {
-    static {
-        NativeLibrary.load();
-    }
-
-    /** Loads the native library, if that has not been done. */
+    /** Makes a caller of the natives; it has no state. */
     public QuenbyEngine() {}
 
     /**

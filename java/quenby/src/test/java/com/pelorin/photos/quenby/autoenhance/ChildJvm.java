@@ -1,7 +1,8 @@
 package com.pelorin.photos.quenby.autoenhance;
 
+import java.io.File;
 import java.io.IOException;
-import java.nio.charset.StandardCharsets;
+import java.nio.file.Files;
 import java.nio.file.Path;
 import java.util.ArrayList;
 import java.util.List;
@@ -9,6 +10,8 @@ import java.util.concurrent.TimeUnit;
 
 /** A virtual machine of its own, with this one's classes. */
 final class ChildJvm {
+    private static final int TIMEOUT_SECONDS = 300;
+
     final int exitCode;
     /** Standard output and standard error as they came. */
     final String output;
@@ -31,6 +34,35 @@ final class ChildJvm {
     /** {@code shell} is run before the virtual machine takes its place: "ulimit -f 8;". */
     static ChildJvm run(String shell, List<String> options, Class<?> main, String... arguments)
             throws IOException, InterruptedException {
+        return start(shell, options, main, arguments).await();
+    }
+
+    /** One that runs. */
+    static final class Running {
+        private final Process process;
+        private final File output;
+
+        private Running(Process process, File output) {
+            this.process = process;
+            this.output = output;
+        }
+
+        ChildJvm await() throws IOException, InterruptedException {
+            boolean ended = process.waitFor(TIMEOUT_SECONDS, TimeUnit.SECONDS);
+            if (!ended) {
+                process.destroyForcibly().waitFor();
+            }
+            String text = Files.readString(output.toPath());
+            Files.delete(output.toPath());
+            if (!ended) {
+                throw new IOException("the child did not end; so far:\n" + text);
+            }
+            return new ChildJvm(process.exitValue(), text);
+        }
+    }
+
+    static Running start(String shell, List<String> options, Class<?> main, String... arguments)
+            throws IOException {
         List<String> command = new ArrayList<>();
         command.addAll(List.of("bash", "-c", shell + " exec \"$@\"", "bash"));
         command.add(Path.of(System.getProperty("java.home"), "bin", "java").toString());
@@ -44,13 +76,10 @@ final class ChildJvm {
         command.addAll(options);
         command.add(main.getName());
         command.addAll(List.of(arguments));
-        Process process = new ProcessBuilder(command).redirectErrorStream(true).start();
-        String output =
-                new String(process.getInputStream().readAllBytes(), StandardCharsets.UTF_8);
-        if (!process.waitFor(5, TimeUnit.MINUTES)) {
-            process.destroyForcibly();
-            throw new IOException("the child did not end; so far:\n" + output);
-        }
-        return new ChildJvm(process.exitValue(), output);
+        // A file, since a pipe that nobody reads yet holds a child up.
+        File output = File.createTempFile("child", ".txt");
+        Process process = new ProcessBuilder(command).redirectErrorStream(true)
+                .redirectOutput(output).start();
+        return new Running(process, output);
     }
 }

@@ -6,11 +6,17 @@ import static org.junit.jupiter.api.Assertions.assertThrows;
 import static org.junit.jupiter.api.Assertions.assertTrue;
 
 import android.graphics.Bitmap;
+import org.junit.jupiter.api.BeforeAll;
 import org.junit.jupiter.api.Test;
 
 class DuplicatesTest {
     private final Bitmap one = Pictures.photo(64, 64, 1);
     private final Bitmap other = Pictures.photo(40, 50, 9);
+
+    @BeforeAll
+    static void load() {
+        NativeLibrary.load();
+    }
 
     @Test
     void thePhotoItselfIsADuplicate() {

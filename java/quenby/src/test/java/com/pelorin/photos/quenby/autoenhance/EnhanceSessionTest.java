@@ -9,7 +9,12 @@ import android.graphics.Bitmap;
 import android.graphics.RectF;
 import java.util.Arrays;
 import java.util.List;
+import java.util.concurrent.Callable;
 import java.util.concurrent.CountDownLatch;
+import java.util.concurrent.CyclicBarrier;
+import java.util.concurrent.ExecutorService;
+import java.util.concurrent.Executors;
+import java.util.concurrent.Future;
 import java.util.concurrent.TimeUnit;
 import java.util.logging.Handler;
 import java.util.logging.LogRecord;
@@ -22,7 +27,7 @@ class EnhanceSessionTest {
 
     @Test
     void givesWhatTheNativesGive() {
-        QuenbyEngine engine = new QuenbyEngine();
+        QuenbyEngine engine = Natives.engine();
         RectF face = new RectF(0.2f, 0.2f, 0.6f, 0.6f);
         long handle = engine.init(photo);
         engine.preprocess(new RectF[] {face}, handle);
@@ -101,6 +106,59 @@ class EnhanceSessionTest {
         assertThrows(SessionClosedException.class, () -> session.setFaces(List.of()));
     }
 
+    /** While two threads apply and a third closes, a call writes or throws. */
+    @Test
+    void aCallThatComesAfterTheEndThrows() throws Exception {
+        Bitmap pixel = Pictures.photo(1, 1, 2);
+        ExecutorService threads = Executors.newFixedThreadPool(2);
+        for (int round = 0; round < 1000; ++round) {
+            EnhanceSession session = EnhanceSession.open(pixel);
+            CyclicBarrier start = new CyclicBarrier(3);
+            Callable<Boolean> apply = () -> {
+                Bitmap own = Pictures.sameSize(pixel);
+                start.await();
+                try {
+                    for (;;) {
+                        own.setPixel(0, 0, 0);
+                        session.apply(Filter.ORIGINAL, "", own);
+                        if (own.getPixel(0, 0) == 0) {
+                            return false;
+                        }
+                    }
+                } catch (SessionClosedException tooLate) {
+                    return own.getPixel(0, 0) == 0;
+                }
+            };
+            Future<Boolean> one = threads.submit(apply);
+            Future<Boolean> other = threads.submit(apply);
+            start.await();
+            session.close();
+            assertTrue(one.get() && other.get(), "a call returned without having written");
+        }
+        threads.shutdown();
+    }
+
+    @Test
+    void anOutputThatIsRecycledMeanwhileIsReported() throws Exception {
+        ExecutorService threads = Executors.newFixedThreadPool(1);
+        Bitmap large = Pictures.photo(200, 150, 2);
+        try (EnhanceSession session = EnhanceSession.open(large)) {
+            for (int round = 0; round < 100; ++round) {
+                Bitmap own = Pictures.sameSize(large);
+                Future<?> recycled = threads.submit(own::recycle);
+                int[] returned = {0};
+                assertThrows(UnsuitableBitmapException.class, () -> {
+                    for (;; ++returned[0]) {
+                        session.enhance(0.5f, own);
+                    }
+                });
+                recycled.get();
+                assertTrue(own.getTimesLocked() >= returned[0], "a call wrote nothing");
+            }
+        }
+        threads.shutdown();
+    }
+
     @Test
     void isFreedAndLoggedWhenForgotten() throws InterruptedException {
         CountDownLatch warned = new CountDownLatch(1);
@@ -124,7 +182,8 @@ class EnhanceSessionTest {
         EnhanceSession.open(photo); // and nobody holds it
         for (int i = 0; i < 100 && warned.getCount() > 0; ++i) {
             System.gc();
-            warned.await(100, TimeUnit.MILLISECONDS);
+            warned.await(10, TimeUnit.MILLISECONDS);
+            EnhanceSession.open(photo).close();
         }
         logger.removeHandler(handler);
         logger.setUseParentHandlers(true);

@@ -25,7 +25,7 @@ class HostileArgumentsTest {
     private static final int CALLS_OF_EACH = 400;
 
     @TempDir Path folder;
-    private final QuenbyEngine engine = new QuenbyEngine();
+    private final QuenbyEngine engine = Natives.engine();
     private final Bitmap photo = Pictures.photo(20, 16, 3);
 
     @BeforeAll

@@ -23,7 +23,7 @@ import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.io.TempDir;
 
 class JpegFileTest {
-    private final QuenbyEngine engine = new QuenbyEngine();
+    private final QuenbyEngine engine = Natives.engine();
     @TempDir Path folder;
     private Path input;
     private Path output;
@@ -123,7 +123,7 @@ class JpegFileTest {
         public static void main(String[] paths) throws IOException {
             for (int rotation : new int[] {0, 90}) {
                 try {
-                    new QuenbyEngine().applyAutoEnhanceFilterToJpegFile(
+                    Natives.engine().applyAutoEnhanceFilterToJpegFile(
                             paths[0], paths[1], rotation, null, 1, "AE0", "slider=0.4;");
                     System.exit(1);
                 } catch (IOException expected) {

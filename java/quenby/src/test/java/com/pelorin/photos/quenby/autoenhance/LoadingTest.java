@@ -29,7 +29,7 @@ class LoadingTest {
         private Load() {}
 
         public static void main(String[] arguments) throws Exception {
-            long handle = new QuenbyEngine().init(Pictures.photo(4, 4, 1));
+            long handle = Natives.engine().init(Pictures.photo(4, 4, 1));
             String loaded = Files.readAllLines(Path.of("/proc/self/maps")).stream()
                     .filter(line -> line.contains("libpn_quenby"))
                     .map(line -> line.substring(line.indexOf('/'))).findFirst().orElse("nowhere");

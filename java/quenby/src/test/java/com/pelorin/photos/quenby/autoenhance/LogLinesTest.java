@@ -21,7 +21,7 @@ class LogLinesTest {
             if (priority.length > 0) {
                 NativeLog.setPriority(Integer.parseInt(priority[0]));
             }
-            QuenbyEngine engine = new QuenbyEngine();
+            QuenbyEngine engine = Natives.engine();
             Bitmap photo = Bitmap.createBitmap(400, 300, Bitmap.Config.ARGB_8888);
             long handle = engine.init(photo);
             engine.preprocess(new RectF[] {new RectF(0.25f, 0.1f, 0.75f, 0.6f), null}, handle);

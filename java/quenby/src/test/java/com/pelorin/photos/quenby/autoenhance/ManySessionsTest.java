@@ -21,7 +21,7 @@ class ManySessionsTest {
     }
 
     private static void openAndRelease(int count) {
-        QuenbyEngine engine = new QuenbyEngine();
+        QuenbyEngine engine = Natives.engine();
         Bitmap photo = Pictures.photo(8, 8, 1);
         Bitmap output = Pictures.sameSize(photo);
         RectF[] faces = {new RectF(0, 0, 1, 1)};

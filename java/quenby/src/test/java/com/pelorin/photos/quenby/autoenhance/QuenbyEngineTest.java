@@ -21,7 +21,7 @@ import java.util.stream.IntStream;
 import org.junit.jupiter.api.Test;
 
 class QuenbyEngineTest {
-    private final QuenbyEngine engine = new QuenbyEngine();
+    private final QuenbyEngine engine = Natives.engine();
     private final Bitmap photo = Pictures.photo(97, 61, 1);
     private final Bitmap output = Pictures.sameSize(photo);
 

@@ -98,7 +98,7 @@ class ThreadSanitizerTest {
         private static final int ROUNDS = 10;
         private static final int STEPS = 2 * Filter.values().length;
 
-        private final QuenbyEngine engine = new QuenbyEngine();
+        private final QuenbyEngine engine = Natives.engine();
         private final Bitmap photo = Pictures.photo(48, 36, 1);
         /** By faces and step. */
         private final byte[][][] expected = new byte[FACES.length][STEPS][];
