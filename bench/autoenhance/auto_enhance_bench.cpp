@@ -6,6 +6,7 @@
 #include "bench/support/per_pixel.h"
 #include "bench/support/side_by_side.h"
 #include "image_processing/autoenhance/auto_enhance_filter.h"
+#include "tests/support/filter_state.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::bench {
@@ -30,16 +31,11 @@ const Image<RGBA8Pixel>& photoOf(std::int64_t megapixelsTimesTwo) {
   }
 }
 
-std::shared_ptr<FilteredImageState> stateOf(const Image<RGBA8Pixel>& photo) {
-  return std::make_shared<FilteredImageState>(FilteredImageState{
-      std::make_shared<Image<RGBA8Pixel>>(photo), {}, "", defaultFilterConfigValue});
-}
-
 /// A photo's preparation with each instruction set, the first touch of its new masks included.
 template <typename Filter>
 void init(benchmark::State& state) {
   const Image<RGBA8Pixel>& photo = photoOf(state.range(0));
-  const auto shared = stateOf(photo);
+  const auto shared = test_support::stateOf(photo);
   sideBySide(state, photo, {}, [&] {
     Filter filter(shared);
     filter.init("");
@@ -50,7 +46,7 @@ void init(benchmark::State& state) {
 template <typename Filter, bool withMasks>
 void applyConfig(benchmark::State& state) {
   const Image<RGBA8Pixel>& photo = photoOf(state.range(0));
-  Filter filter(stateOf(photo));
+  Filter filter(test_support::stateOf(photo));
   filter.init("");
   const std::string params = withMasks ? "slider=0.4;" : "slider=0.4;gtmOnly=true;";
   Image<RGBA8Pixel> output(photo.width, photo.height);

@@ -12,6 +12,7 @@
 
 #include "image_processing/autoenhance/enhance_row.h"
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
+#include "tests/support/filter_state.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/pictures.h"
 
@@ -22,11 +23,7 @@ using test_support::fingerprint;
 using test_support::flatPicture;
 using test_support::noisePicture;
 using test_support::photoLikePicture;
-
-std::shared_ptr<FilteredImageState> stateOf(const Image<RGBA8Pixel>& image) {
-  return std::make_shared<FilteredImageState>(FilteredImageState{
-      std::make_shared<Image<RGBA8Pixel>>(image), {}, "", defaultFilterConfigValue});
-}
+using test_support::stateOf;
 
 template <typename Filter>
 class AutoEnhance : public testing::Test {

@@ -7,13 +7,14 @@
 #include <vector>
 
 #include "tests/support/instruction_sets.h"
+#include "tests/support/mask_types.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {
 namespace {
 
-using Quantized = QuantizedFloat<unsigned char>;
 using test_support::onEveryInstructionSet;
+using test_support::Quantized;
 using test_support::Random;
 using test_support::randomPixels;
 
@@ -55,8 +56,7 @@ void expectTheDefinition(const TonePass& pass, const std::vector<RGBA8Pixel>& in
 
 template <typename Mask>
 class EnhanceRow : public testing::Test {};
-using MaskTypes = testing::Types<float, Quantized>;
-TYPED_TEST_SUITE(EnhanceRow, MaskTypes);
+TYPED_TEST_SUITE(EnhanceRow, test_support::MaskTypes);
 
 TYPED_TEST(EnhanceRow, MatchesItsDefinitionAtEveryTailLength) {
   const TonePass pass(wavyCurve(51), 100.0f, 1.5f, 0.6f, 0.5f);

@@ -5,6 +5,8 @@
 #include <string>
 
 #include "image_processing/autoenhance/auto_enhance_filter.h"
+#include "tests/support/faces.h"
+#include "tests/support/filter_state.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/pictures.h"
 
@@ -13,6 +15,8 @@ namespace {
 
 using test_support::fingerprint;
 using test_support::photoLikePicture;
+using test_support::stateOf;
+using test_support::withFaces;
 
 struct Golden {
   std::uint32_t width, height;
@@ -29,20 +33,15 @@ void PrintTo(const Golden& golden, std::ostream* stream) {
 
 template <typename Filter>
 std::string result(const Golden& golden) {
-  FilteredImageState state{std::make_shared<Image<RGBA8Pixel>>(
-                               photoLikePicture(golden.width, golden.height, golden.width)),
-                           {},
-                           "",
-                           defaultFilterConfigValue};
   const auto w = static_cast<std::int32_t>(golden.width);
   const auto h = static_cast<std::int32_t>(golden.height);
-  if (golden.faces) {
-    state.metadata.faces = {std::make_shared<BoundingBox>(BoundingBox{w / 4, w / 2, h / 2, h / 5}),
-                            std::make_shared<BoundingBox>(BoundingBox{w / 3, w, h + 9, h / 2})};
-  }
-  state.config.useBilateralGrid = golden.grid ? 1 : 0;
-  state.config.bilateralSpatialFraction = golden.grid ? 0.025f : 0.05f;
-  Filter filter(std::make_shared<FilteredImageState>(state));
+  ImageMetadata metadata;
+  if (golden.faces) metadata = withFaces({{w / 4, w / 2, h / 2, h / 5}, {w / 3, w, h + 9, h / 2}});
+  FilterConfig config = defaultFilterConfigValue;
+  config.useBilateralGrid = golden.grid ? 1 : 0;
+  config.bilateralSpatialFraction = golden.grid ? 0.025f : 0.05f;
+  const auto photo = photoLikePicture(golden.width, golden.height, golden.width);
+  Filter filter(stateOf(photo, metadata, config));
   filter.init("");
   Image<RGBA8Pixel> output(golden.width, golden.height);
   filter.applyConfig(std::string("slider=") + golden.slider, defaultFilterConfigValue, output);

@@ -11,11 +11,12 @@
 #include <vector>
 
 #include "image_processing/core/image_metadata.h"
+#include "tests/support/mask_types.h"
 
 namespace pelorin::image_processing {
 namespace {
 
-using Quantized = QuantizedFloat<unsigned char>;
+using test_support::Quantized;
 
 template <typename T>
 class ImageOfEveryType : public testing::Test {};

@@ -9,12 +9,14 @@
 
 #include "tests/dupe/synthetic_cdfs.h"
 #include "tests/support/fingerprint.h"
+#include "tests/support/green_cdf.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {
 namespace {
 
 using test_support::anotherShot;
+using test_support::cdfOf;
 using test_support::flatPicture;
 using test_support::photoLikePicture;
 using test_support::syntheticCDF;
@@ -22,12 +24,6 @@ using test_support::syntheticCDF;
 constexpr int smallestInt = std::numeric_limits<int>::min();
 constexpr int largestInt = std::numeric_limits<int>::max();
 constexpr float infinity = std::numeric_limits<float>::infinity();
-
-GreenCDF cdfOf(const Image<RGBA8Pixel>& image) {
-  GreenCDF cdf;
-  computeGreenCDF(image, cdf);
-  return cdf;
-}
 
 GreenCDF evenCDF() {
   GreenCDF cdf;

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "image_processing/dupe/cdf_distance.h"
+#include "tests/support/green_cdf.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {
@@ -23,10 +24,7 @@ float score(const Image<RGBA8Pixel>& a, const Image<RGBA8Pixel>& b, float dt, bo
 }
 
 float distance(const Image<RGBA8Pixel>& a, const Image<RGBA8Pixel>& b) {
-  GreenCDF cdfA, cdfB;
-  computeGreenCDF(a, cdfA);
-  computeGreenCDF(b, cdfB);
-  return exposureInvariantCDFDistance(cdfA, cdfB);
+  return exposureInvariantCDFDistance(test_support::cdfOf(a), test_support::cdfOf(b));
 }
 
 float sumOfTerms(float distance, float logTime, bool same) {

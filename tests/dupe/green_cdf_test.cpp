@@ -6,21 +6,16 @@
 #include <cstring>
 #include <utility>
 
+#include "tests/support/green_cdf.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {
 namespace {
 
+using test_support::cdfOf;
 using test_support::flatPicture;
 using test_support::noisePicture;
 using test_support::photoLikePicture;
-
-GreenCDF cdfOf(const Image<RGBA8Pixel>& image) {
-  GreenCDF cdf;
-  cdf.fill(-7.0f);
-  computeGreenCDF(image, cdf);
-  return cdf;
-}
 
 void expectTheScalarDefinition(const Image<RGBA8Pixel>& image) {
   GreenCDF expected;

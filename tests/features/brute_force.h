@@ -3,7 +3,7 @@
 #include <vector>
 
 #include "image_processing/features/xy.h"
-#include "tests/features/grey_pictures.h"
+#include "tests/support/grey_pictures.h"
 
 // Corners once more, as literally as can be and by no path of the engine.
 namespace pelorin::test_support {

@@ -4,7 +4,7 @@
 
 #include <vector>
 
-#include "tests/features/grey_pictures.h"
+#include "tests/support/grey_pictures.h"
 #include "tests/support/instruction_sets.h"
 
 namespace pelorin::image_processing {

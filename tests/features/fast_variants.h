@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "image_processing/features/fast.h"
-#include "tests/features/grey_pictures.h"
+#include "tests/support/grey_pictures.h"
 
 namespace pelorin::test_support {
 

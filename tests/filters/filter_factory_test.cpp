@@ -9,17 +9,14 @@
 
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/pass_through.h"
+#include "tests/support/filter_state.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {
 namespace {
 
 using test_support::noisePicture;
-
-std::shared_ptr<FilteredImageState> stateOf(const Image<RGBA8Pixel>& image) {
-  return std::make_shared<FilteredImageState>(FilteredImageState{
-      std::make_shared<Image<RGBA8Pixel>>(image), {}, "", defaultFilterConfigValue});
-}
+using test_support::stateOf;
 
 TEST(FilterFactory, FindsExactNamesOnly) {
   const auto factory = DefaultFilterFactory::filterFactory();

@@ -1,24 +1,14 @@
 #pragma once
 
-#include <memory>
 #include <string>
 #include <vector>
 
 #include "image_processing/filters/abstract_filter.h"
 #include "image_processing/filters/looks/look.h"
+#include "tests/support/filter_state.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::test_support {
-
-/// The state of a session on `picture`, whose pixels are shared.
-inline std::shared_ptr<image_processing::FilteredImageState> stateOf(
-    const Image<RGBA8Pixel>& picture) {
-  return std::make_shared<image_processing::FilteredImageState>(
-      image_processing::FilteredImageState{.image = std::make_shared<Image<RGBA8Pixel>>(picture),
-                                           .metadata = {},
-                                           .sessionName = "",
-                                           .config = {}});
-}
 
 /// What an initialised filter makes of its session's picture, which is `width` x `height`.
 inline Image<RGBA8Pixel> applied(image_processing::AbstractFilter& filter, std::uint32_t width,

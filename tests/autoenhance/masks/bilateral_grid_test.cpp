@@ -8,11 +8,12 @@
 #include <utility>
 
 #include "tests/support/float_images.h"
+#include "tests/support/mask_types.h"
 
 namespace pelorin::image_processing {
 namespace {
 
-using Quantized = QuantizedFloat<unsigned char>;
+using test_support::Quantized;
 
 using test_support::constantImage;
 using test_support::randomImage;

@@ -5,12 +5,13 @@
 #include <cstdint>
 #include <limits>
 
+#include "tests/support/mask_types.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {
 namespace {
 
-using Quantized = QuantizedFloat<unsigned char>;
+using test_support::Quantized;
 
 using test_support::flatPicture;
 

@@ -8,12 +8,13 @@
 #include "tests/autoenhance/masks/geometries.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/instruction_sets.h"
+#include "tests/support/mask_types.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {
 namespace {
 
-using Quantized = QuantizedFloat<unsigned char>;
+using test_support::Quantized;
 
 using test_support::fingerprint;
 using test_support::geometries;
@@ -69,8 +70,7 @@ TEST(FlatnessMask, TakesAnyRadius) {
 
 template <typename T>
 class FlatnessMaskOf : public testing::Test {};
-using MaskTypes = testing::Types<float, Quantized>;
-TYPED_TEST_SUITE(FlatnessMaskOf, MaskTypes);
+TYPED_TEST_SUITE(FlatnessMaskOf, test_support::MaskTypes);
 
 TYPED_TEST(FlatnessMaskOf, MatchesItsDefinition) {
   for (const Geometry& g : geometries) {

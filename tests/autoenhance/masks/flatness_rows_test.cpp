@@ -6,11 +6,12 @@
 #include <vector>
 
 #include "tests/support/instruction_sets.h"
+#include "tests/support/mask_types.h"
 
 namespace pelorin::image_processing {
 namespace {
 
-using Quantized = QuantizedFloat<unsigned char>;
+using test_support::Quantized;
 
 using test_support::onEveryInstructionSet;
 

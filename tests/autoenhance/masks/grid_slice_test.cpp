@@ -9,11 +9,12 @@
 #include "tests/autoenhance/masks/geometries.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/instruction_sets.h"
+#include "tests/support/mask_types.h"
 
 namespace pelorin::image_processing {
 namespace {
 
-using Quantized = QuantizedFloat<unsigned char>;
+using test_support::Quantized;
 
 using test_support::fingerprint;
 using test_support::geometries;
@@ -24,8 +25,7 @@ using test_support::onEveryInstructionSet;
 
 template <typename T>
 class GridSlice : public testing::Test {};
-using MaskTypes = testing::Types<float, Quantized>;
-TYPED_TEST_SUITE(GridSlice, MaskTypes);
+TYPED_TEST_SUITE(GridSlice, test_support::MaskTypes);
 
 TYPED_TEST(GridSlice, MatchesItsDefinition) {
   for (const Geometry& g : geometries) {

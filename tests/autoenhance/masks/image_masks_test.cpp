@@ -20,17 +20,18 @@
 #include "tests/support/faces.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/instruction_sets.h"
+#include "tests/support/mask_types.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {
 namespace {
 
-using Quantized = QuantizedFloat<unsigned char>;
 using test_support::fingerprint;
 using test_support::flatPicture;
 using test_support::noisePicture;
 using test_support::onEveryInstructionSet;
 using test_support::photoLikePicture;
+using test_support::Quantized;
 using test_support::withFaces;
 
 using FloatMasks = ImageMasks<float, float>;
@@ -231,8 +232,7 @@ void expectTheDefinition(const Image<RGBA8Pixel>& photo, const FilterConfig& con
 
 template <typename T>
 class PrepareImage : public testing::Test {};
-using MaskTypes = testing::Types<float, Quantized>;
-TYPED_TEST_SUITE(PrepareImage, MaskTypes);
+TYPED_TEST_SUITE(PrepareImage, test_support::MaskTypes);
 
 TYPED_TEST(PrepareImage, IsItsDefinitionAtAnySize) {
   for (const auto& [width, height] : {std::pair{1u, 1u},

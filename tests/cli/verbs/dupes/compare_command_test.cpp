@@ -7,6 +7,7 @@
 #include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/cli/verbs/dupes/photo_library_files.h"
+#include "tests/support/green_cdf.h"
 
 namespace pelorin::test_support {
 namespace {
@@ -21,12 +22,6 @@ using testing::HasSubstr;
 Bytes rawOf(const Image<RGBA8Pixel>& picture) {
   const auto* bytes = reinterpret_cast<const std::uint8_t*>(picture.data.get());
   return Bytes(bytes, bytes + picture.byteSize());
-}
-
-GreenCDF cdfOf(const Image<RGBA8Pixel>& picture) {
-  GreenCDF cdf;
-  computeGreenCDF(picture, cdf);
-  return cdf;
 }
 
 Json compare(std::vector<std::string> arguments) {
