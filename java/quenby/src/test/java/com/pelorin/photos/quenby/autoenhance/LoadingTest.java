@@ -86,8 +86,8 @@ class LoadingTest {
     @Test
     void otherLibrariesInTheJarGetAFolderOfTheirOwn() throws Exception {
         Path classes = folder.resolve("classes");
-        Path libraries = Files.createDirectories(classes.resolve(
-                "com/pelorin/photos/quenby/desktop/linux-" + System.getProperty("os.arch")));
+        Path libraries = Files.createDirectories(
+                classes.resolve("native/linux-" + System.getProperty("os.arch")));
         byte[] library = Files.readAllBytes(Path.of(builtLibraries(), "libpn.so"));
         Files.write(libraries.resolve("libpn.so"), Arrays.copyOf(library, library.length + 1));
         String temporary = "-Djava.io.tmpdir=" + folder;
@@ -109,9 +109,78 @@ class LoadingTest {
     @Test
     void anUnwritableFolderGivesWayToTheHomeFolder() throws Exception {
         Path home = Files.createDirectory(folder.resolve("home"));
-        Files.createDirectory(home.resolve(".cache"));
         String loaded = load("-Djava.io.tmpdir=/no/such/folder", "-Duser.home=" + home);
         assertTrue(loaded.startsWith("works from " + home + "/.cache/quenby-"), loaded);
+    }
+
+    @Test
+    void aHomeThatCannotBeWrittenIsNotNeeded() throws Exception {
+        String loaded = load("-Djava.io.tmpdir=" + folder, "-Duser.home=/proc");
+        assertTrue(loaded.startsWith("works from " + folder), loaded);
+    }
+
+    /** Where a folder that may hold no programs can be had. */
+    private ChildJvm loadWithoutPrograms(String home) throws Exception {
+        String mount = "mount -t tmpfs -o noexec,mode=1777 tmpfs " + folder;
+        Process probe = new ProcessBuilder("unshare", "-m", "bash", "-c", mount)
+                .redirectErrorStream(true).start();
+        String refusal = new String(probe.getInputStream().readAllBytes());
+        assumeTrue(probe.waitFor() == 0, "no folder can be mounted noexec here: " + refusal);
+        return ChildJvm.run("exec unshare -m bash -c '" + mount + "; exec \"$@\"' bash \"$@\";",
+                List.of("-Djava.io.tmpdir=" + folder, "-Duser.home=" + home), Load.class);
+    }
+
+    @Test
+    void aFolderThatMayHoldNoProgramsGivesWayToTheHomeFolder(@TempDir Path home)
+            throws Exception {
+        ChildJvm child = loadWithoutPrograms(home.toString());
+        assertTrue(child.output.contains("works from " + home + "/.cache/quenby-"), child.output);
+    }
+
+    @Test
+    void whereNoProgramsMayBeHeldTheErrorNamesTheProperties() throws Exception {
+        ChildJvm child = loadWithoutPrograms("/proc");
+        assertTrue(child.output.contains("UnsatisfiedLinkError"), child.output);
+        assertTrue(child.output.contains("this jar, copied into " + folder), child.output);
+        assertTrue(child.output.contains("Set the property quenby.library"), child.output);
+        assertTrue(child.output.contains("java.io.tmpdir"), child.output);
+    }
+
+    @Test
+    void machinesMayStartTogether() throws Exception {
+        for (int round = 0; round < 3; ++round) {
+            Path empty = Files.createDirectory(folder.resolve("round" + round));
+            List<ChildJvm.Running> running = new ArrayList<>();
+            for (int i = 0; i < 8; ++i) {
+                running.add(ChildJvm.start("", List.of("-Djava.io.tmpdir=" + empty,
+                        "-Duser.home=/proc", "-XX:TieredStopAtLevel=1", "-XX:+UseSerialGC"),
+                        LoadOnTime.class, empty.toString(), "8"));
+            }
+            for (ChildJvm.Running each : running) {
+                ChildJvm child = each.await();
+                assertTrue(child.output.contains("works from " + empty), child.output);
+            }
+            try (Stream<Path> files = Files.list(empty)) {
+                assertEquals(1, files.filter(file -> file.toString().contains("quenby-")).count());
+            }
+        }
+    }
+
+    /** Loads when as many are ready. */
+    static final class LoadOnTime {
+        private LoadOnTime() {}
+
+        public static void main(String[] arguments) throws Exception {
+            Path folder = Path.of(arguments[0]);
+            Files.createTempFile(folder, "ready", null);
+            for (long ready = 0; ready < Long.parseLong(arguments[1]);) {
+                Thread.sleep(1);
+                try (Stream<Path> files = Files.list(folder)) {
+                    ready = files.filter(file -> file.toString().contains("ready")).count();
+                }
+            }
+            Load.main(arguments);
+        }
     }
 
     @Test
@@ -122,6 +191,7 @@ class LoadingTest {
         assertTrue(output.contains("java.library.path /no/such/path"), output);
         assertTrue(output.contains("/no/such/folder/quenby-"), output);
         assertTrue(output.contains("/no/such/home/.cache/quenby-"), output);
+        assertTrue(output.contains("Set the property quenby.library"), output);
     }
 
     @Test
