@@ -5,12 +5,28 @@
 
 #include <boost/algorithm/string/classification.hpp>
 #include <boost/algorithm/string/split.hpp>
-#include <boost/lexical_cast.hpp>
+#include <boost/lexical_cast/bad_lexical_cast.hpp>
+#include <cmath>
 #include <locale>
+#include <new>
 #include <sstream>
 #include <stdexcept>
 
 namespace pelorin::image_processing {
+namespace {
+
+/// The C library's locale with a point. A Java launcher sets that of its user, under which plain
+/// `strtod` may expect a comma.
+locale_t classicLocale() {
+  static const locale_t classic = [] {
+    const locale_t made = newlocale(LC_ALL_MASK, "C", nullptr);
+    if (made == nullptr) throw std::bad_alloc();
+    return made;
+  }();
+  return classic;
+}
+
+}  // namespace
 
 std::vector<std::string> splitStringAt(const std::string& text, const std::string& separator) {
   std::vector<std::string> pieces;
@@ -29,10 +45,7 @@ std::vector<std::string> splitStringOnceAt(const std::string& text, const std::s
 }
 
 double readNumber(const std::string& text) {
-  // A Java launcher sets the locale of its user, under which plain strtod may expect a comma.
-  static const locale_t classic = newlocale(LC_ALL_MASK, "C", nullptr);
-  return classic != nullptr ? strtod_l(text.c_str(), nullptr, classic)
-                            : strtod(text.c_str(), nullptr);
+  return strtod_l(text.c_str(), nullptr, classicLocale());
 }
 
 std::string textOf(bool value) {
@@ -66,7 +79,17 @@ bool FilterParams::readBool(const std::string& key) const {
 }
 
 float FilterParams::readFloat(const std::string& key) const {
-  return boost::lexical_cast<float>(at(key));
+  // As `boost::lexical_cast` reads it, which would ask the program's locale for the point.
+  const std::string& text = at(key);
+  char* end = nullptr;
+  const float value = strtof_l(text.c_str(), &end, classicLocale());
+  const bool isWhole = end != text.c_str() && end == text.c_str() + text.size();
+  const bool hasDigits = text.find_first_of("0123456789") != std::string::npos;
+  // Leading white space, hexadecimal digits and numbers too large for a float are no numbers here.
+  const bool isNumber = isWhole && text.find_first_of(" \t\n\v\f\rxX") == std::string::npos &&
+                        !(std::isinf(value) && hasDigits);
+  if (!isNumber) throw boost::bad_lexical_cast(typeid(std::string), typeid(float));
+  return value;
 }
 
 }  // namespace pelorin::image_processing

@@ -4,9 +4,12 @@
 #include <gtest/gtest.h>
 
 #include <boost/lexical_cast.hpp>
-#include <clocale>
 #include <cmath>
+#include <sstream>
 #include <stdexcept>
+#include <string>
+
+#include "tests/support/comma_locale.h"
 
 namespace pelorin::image_processing {
 namespace {
@@ -47,15 +50,22 @@ TEST(ReadNumber, TakesTheLongestNumberAtTheStart) {
   EXPECT_TRUE(std::isinf(readNumber("1e999")));
 }
 
-TEST(ReadNumber, ReadsAPointWhateverTheLocale) {
-  const char* const before = std::setlocale(LC_NUMERIC, nullptr);
-  const std::string restored = before;
-  if (std::setlocale(LC_NUMERIC, "de_DE.UTF-8") == nullptr) {
-    GTEST_SKIP() << "no locale with a decimal comma is installed";
-  }
+TEST(ParameterStrings, ReadTheSameUnderALocaleWithADecimalComma) {
+  const test_support::CommaLocale comma;
+  std::ostringstream written;
+  written << std::boolalpha << 1234.5 << true;
+  ASSERT_EQ(written.str(), "1.234,5wahr");  // the locale is at work
+
   EXPECT_EQ(readNumber("0.25"), 0.25);
-  EXPECT_EQ(FilterParams("slider=0.25").readFloat("slider"), 0.25f);
-  std::setlocale(LC_NUMERIC, restored.c_str());
+  EXPECT_EQ(readNumber("1.234,5"), 1.234);
+  const FilterParams params("slider=0.25;whole=1234;comma=0,25;groups=1.234,5;on=true;ein=wahr;");
+  EXPECT_EQ(params.readFloat("slider"), 0.25f);
+  EXPECT_EQ(params.readFloat("whole"), 1234.0f);
+  EXPECT_THROW(params.readFloat("comma"), boost::bad_lexical_cast);
+  EXPECT_THROW(params.readFloat("groups"), boost::bad_lexical_cast);
+  EXPECT_TRUE(params.readBool("on"));
+  EXPECT_FALSE(params.readBool("ein"));
+  EXPECT_EQ(textOf(true), "true");
 }
 
 TEST(FilterParams, HonoursAnItemWithoutATrailingSemicolonUnlikeTheSplitter) {
@@ -96,6 +106,12 @@ TEST(FilterParams, ReadsOnlyTheWordTrueAsTrue) {
   }
 }
 
+TEST(FilterParams, ReadsABooleanAsAStreamDoesWhateverFollowsTheWord) {
+  const FilterParams params("a=truex;b=true x;c=true1;d=falsex;e=xtrue;");
+  for (const char* key : {"a", "b", "c"}) EXPECT_TRUE(params.readBool(key)) << key;
+  for (const char* key : {"d", "e"}) EXPECT_FALSE(params.readBool(key)) << key;
+}
+
 TEST(FilterParams, ReportsAMissingKeyAsMapAt) {
   try {
     FilterParams("slider=0.4;").at("Slider");
@@ -106,10 +122,16 @@ TEST(FilterParams, ReportsAMissingKeyAsMapAt) {
 }
 
 TEST(FilterParams, ReadsAFloatOnlyAsAWhole) {
-  for (const std::string text : {"0.4abc", "", " 0.4", "0.4 ", "abc", "0,4"}) {
+  using namespace std::string_literals;
+  for (const std::string& text :
+       {"0.4abc"s, ""s, " 0.4"s, "\v0.4"s, "0.4 "s, "abc"s, "0,4"s, "0x1"s, "1e"s, "1e+"s, "."s,
+        "-"s, "--1"s, "1e39"s, "-1e39"s, "infinit"s, "0.4\0"s, " inf"s}) {
     const FilterParams params("slider=" + text);
     EXPECT_THROW(params.readFloat("slider"), boost::bad_lexical_cast) << text;
   }
+  EXPECT_EQ(FilterParams("slider=+.5").readFloat("slider"), 0.5f);
+  EXPECT_EQ(FilterParams("slider=5.e0").readFloat("slider"), 5.0f);
+  EXPECT_EQ(FilterParams("slider=1e-50").readFloat("slider"), 0.0f);
   EXPECT_EQ(FilterParams("slider=-1.5e-1").readFloat("slider"), -0.15f);
   EXPECT_TRUE(std::isnan(FilterParams("slider=nan").readFloat("slider")));
   EXPECT_TRUE(std::isinf(FilterParams("slider=-inf").readFloat("slider")));

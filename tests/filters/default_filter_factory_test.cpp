@@ -3,10 +3,12 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <optional>
 #include <string>
 #include <vector>
 
 #include "image_processing/filters/filtered_image.h"
+#include "tests/support/comma_locale.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/looks.h"
 #include "tests/support/pictures.h"
@@ -71,6 +73,26 @@ TEST(DefaultFilterFactory, MakesFiltersThatGiveTheSameBytesInThePlaceOfTheirSour
           << name << " of " << width << " x " << height;
     }
   }
+}
+
+TEST(DefaultFilterFactory, MakesFiltersThatReadTheSameNumbersUnderADecimalComma) {
+  const std::string params =
+      "slider=0.7;s1=0.25;s3=0.75;applyMask=0.5;maskRadius=1.5;maskAlpha=0.625;r=0,0.25,1,;";
+  const auto fingerprints = [&params](bool comma) {
+    std::optional<test_support::CommaLocale> locale;
+    if (comma) locale.emplace();
+    std::vector<std::string> outputs;
+    for (const auto& [name, description] : DefaultFilterFactory::filterFactory()->descriptions) {
+      auto photo = std::make_shared<Image<RGBA8Pixel>>(test_support::photoLikePicture(30, 20, 5));
+      FilteredImage session(photo, {}, "", defaultFilterConfigValue,
+                            DefaultFilterFactory::filterFactory());
+      Image<RGBA8Pixel> output(30, 20);
+      session.applyFilterWithParams(name, params, defaultFilterConfigValue, output);
+      outputs.push_back(name + " " + test_support::fingerprint(output));
+    }
+    return outputs;
+  };
+  EXPECT_EQ(fingerprints(true), fingerprints(false));
 }
 
 TEST(DefaultFilterFactory, HoldsExactlyTenFilters) {
