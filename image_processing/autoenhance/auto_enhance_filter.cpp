@@ -19,6 +19,28 @@ std::shared_ptr<Image<float>> asFloats(const Image<T>& mask) {
 }  // namespace
 
 template <typename TB, typename TL>
+FilterParameters AEFilterT<TB, TL>::parameters() {
+  return {.rows = {{.name = "slider",
+                    .kind = ParameterKind::number,
+                    .description = "Strength of the enhancement",
+                    .lowest = 0.0f,
+                    .highest = 1.0f,
+                    .standard = 0.4f,
+                    .required = true},
+                   {.name = "gtmOnly",
+                    .kind = ParameterKind::boolean,
+                    .description = "One tone curve for the whole picture, without local masks",
+                    .standard = 0.0f},
+                   {.name = "gtmExtraMemory",
+                    .kind = ParameterKind::boolean,
+                    .description = "Memory for the local masks all the same, which stay unused",
+                    .standard = 0.0f,
+                    .onlyWith = "gtmOnly"}},
+          .reader = ParameterReader::filterParams,
+          .readsFaces = true};
+}
+
+template <typename TB, typename TL>
 void AEFilterT<TB, TL>::init(const std::string& params) {
   const Image<RGBA8Pixel>& photo = *state->image;
   const FilterParams options(params);

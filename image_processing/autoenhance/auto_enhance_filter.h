@@ -30,6 +30,8 @@ class AEFilterT : public AbstractFilter, public AEFilterBase {
  public:
   using AbstractFilter::AbstractFilter;
 
+  static FilterParameters parameters();
+
   void init(const std::string& params) override;
   void applyConfig(const std::string& params, const FilterConfig& config,
                    Image<RGBA8Pixel>& output) override;

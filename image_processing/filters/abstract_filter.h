@@ -6,6 +6,7 @@
 
 #include "image_processing/core/image.h"
 #include "image_processing/filters/filter_config.h"
+#include "image_processing/filters/filter_parameter.h"
 #include "image_processing/filters/filtered_image_state.h"
 
 namespace pelorin::image_processing {
@@ -17,6 +18,10 @@ class AbstractFilter {
   virtual ~AbstractFilter() = default;
   AbstractFilter(const AbstractFilter&) = delete;
   AbstractFilter& operator=(const AbstractFilter&) = delete;
+
+  /// What the filter takes beside the photo. A class with keys of its own has a function of this
+  /// name in place of this one, and its description in the registry finds that.
+  static FilterParameters parameters() { return {}; }
 
   /// Prepares the filter from a parameter string ("key=value;" items). Called once, before the
   /// filter is shared between threads. May throw std::bad_alloc.

@@ -20,6 +20,8 @@ class FilterDescription {
   virtual std::unique_ptr<AbstractFilter> makeFilter(
       std::shared_ptr<FilteredImageState>& state) const = 0;
   virtual ~FilterDescription() = default;
+  /// What its filters take beside the photo.
+  virtual FilterParameters parameters() const { return {}; }
 
   const std::string name;         ///< Registry key.
   const std::string displayName;  ///< What users see; several filters may share one.
@@ -36,6 +38,7 @@ class ConcreteDescription : public FilterDescription {
       std::shared_ptr<FilteredImageState>& state) const override {
     return std::make_unique<F>(state);
   }
+  FilterParameters parameters() const override { return F::parameters(); }
 };
 
 }  // namespace pelorin::image_processing

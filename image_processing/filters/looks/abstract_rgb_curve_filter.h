@@ -13,7 +13,8 @@
 namespace pelorin::image_processing {
 
 /// A look: an optional vignette, a channel mix and one tone curve a channel. `T`, the concrete
-/// class, supplies the curves, the vignette's settings and, as `T::channelMix`, the mix.
+/// class, supplies the curves, the vignette's settings and, as `T::channelMix`, the mix; constants
+/// that it does not name are those below.
 ///
 /// Every application may override the curves ("r", "g", "b"), for itself only, and the vignette
 /// ("maskRadius", "maskAlpha", "applyMask"), for itself and all later ones of the same filter.
@@ -22,8 +23,14 @@ template <typename T>
 class AbstractRGBCurveFilter : public AbstractFilter {
  public:
   static constexpr ChannelMix channelMix = ChannelMix::none;
+  static constexpr float maskRadius = 1.0f, maskAlpha = 1.0f;
+  static constexpr bool applyMask = false;
 
   using AbstractFilter::AbstractFilter;
+
+  static FilterParameters parameters() {
+    return lookParameters(T::maskRadius, T::maskAlpha, T::applyMask);
+  }
 
   /// Builds the vignette's table. Reads nothing from the parameters.
   void init(const std::string&) override {
@@ -60,9 +67,9 @@ class AbstractRGBCurveFilter : public AbstractFilter {
                                        float& maskAlpha, bool& applyMask) {
     edge = 0.0f;
     centre = 1.0f;
-    maskRadius = 1.0f;
-    maskAlpha = 1.0f;
-    applyMask = false;
+    maskRadius = T::maskRadius;
+    maskAlpha = T::maskAlpha;
+    applyMask = T::applyMask;
   }
 
  private:

@@ -3,6 +3,8 @@
 #include <string>
 #include <vector>
 
+#include "image_processing/filters/filter_parameter.h"
+
 namespace pelorin::image_processing {
 
 // What every look filter reads from its parameter string of "key=value;" items. An item without its
@@ -19,5 +21,8 @@ void parseRGBCurves(std::vector<float>& red, std::vector<float>& green, std::vec
 /// others keep what they held.
 void parseMaskParameters(float& maskRadius, float& maskAlpha, bool& applyMask,
                          const std::string& params);
+
+/// The rows of these keys for a look whose vignette is set so until a parameter string changes it.
+FilterParameters lookParameters(float maskRadius, float maskAlpha, bool applyMask);
 
 }  // namespace pelorin::image_processing

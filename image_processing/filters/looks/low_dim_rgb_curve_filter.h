@@ -15,6 +15,8 @@ class LowDimRGBCurveFilter : public AbstractRGBCurveFilter<LowDimRGBCurveFilter>
  public:
   using AbstractRGBCurveFilter::AbstractRGBCurveFilter;
 
+  static FilterParameters parameters();
+
   /// Appends 11 samples in 0 ... 255, never decreasing, to each curve. With a NaN parameter the
   /// samples are NaN, which the filter draws as 0.
   void getRGBCurves(std::vector<float>& red, std::vector<float>& green, std::vector<float>& blue,

@@ -14,6 +14,7 @@ template <typename T>
 class PresetLookFilter : public AbstractRGBCurveFilter<T> {
  public:
   using AbstractRGBCurveFilter<T>::AbstractRGBCurveFilter;
+  static constexpr bool applyMask = true;
 
   void getRGBCurves(std::vector<float>& red, std::vector<float>& green, std::vector<float>& blue,
                     const std::string&) override {
@@ -28,7 +29,7 @@ class PresetLookFilter : public AbstractRGBCurveFilter<T> {
     centre = 163.0f / 255.0f;
     maskRadius = T::maskRadius;
     maskAlpha = T::maskAlpha;
-    applyMask = true;
+    applyMask = T::applyMask;
   }
 };
 
