@@ -1,6 +1,11 @@
 #include "cli/frame/faces.h"
 
+#include <fmt/format.h>
+
+#include <algorithm>
 #include <array>
+#include <cmath>
+#include <limits>
 #include <memory>
 #include <string_view>
 
@@ -14,47 +19,78 @@ namespace {
 using image_processing::BoundingBox;
 using image_processing::truncateTo;
 
-FaceFractions readFace(const std::string& text) {
+// No face is twice as far to the right as the picture is wide.
+constexpr float largestFraction = 2.0f;
+
+Face readFace(const std::string& text) {
+  const auto refuse = [&text](const std::string& reason) {
+    throw UsageError("--face: '" + text + "' " + reason);
+  };
   std::array<float, 4> bounds;
   std::string_view rest = text;
   for (std::size_t i = 0; i < bounds.size(); ++i) {
     const std::size_t comma = rest.find(',');
     if ((comma == std::string_view::npos) != (i + 1 == bounds.size())) {
-      throw UsageError("--face: '" + text +
-                       "' is not left,top,right,bottom, for example 0.4,0.1,0.6,0.4");
+      refuse("is not left,top,right,bottom, for example 0.4,0.1,0.6,0.4");
     }
     bounds[i] = readFiniteNumber("--face", rest.substr(0, comma));
     if (comma != std::string_view::npos) rest.remove_prefix(comma + 1);
   }
-  return {bounds[0], bounds[1], bounds[2], bounds[3]};
+  const auto [left, top, right, bottom] = bounds;
+  const bool inPixels = std::ranges::max(bounds) > largestFraction;
+  if (inPixels && !std::ranges::all_of(bounds, [](float b) { return b == std::trunc(b); })) {
+    refuse("is neither fractions of the picture, from 0 to 1, nor whole pixels");
+  }
+  if (left > right) refuse("has its left side right of its right one; it is left,top,right,bottom");
+  if (top > bottom) refuse("has its top below its bottom; it is left,top,right,bottom");
+  const float end = inPixels ? std::numeric_limits<float>::infinity() : 1.0f;
+  if (right < 0.0f || bottom < 0.0f || left >= end || top >= end) {
+    refuse("lies outside the picture");
+  }
+  return {left, top, right, bottom, inPixels};
+}
+
+BoundingBox boxOf(const Face& face, std::uint32_t width, std::uint32_t height, int scale) {
+  // A division by a power of two is exact.
+  const float divisor = static_cast<float>(scale);
+  const float columns = face.inPixels ? 1.0f / divisor : static_cast<float>(width);
+  const float rows = face.inPixels ? 1.0f / divisor : static_cast<float>(height);
+  BoundingBox box = {};
+  box.left = truncateTo<std::int32_t>(face.left * columns);
+  box.right = truncateTo<std::int32_t>(face.right * columns);
+  box.top = truncateTo<std::int32_t>(face.top * rows);
+  box.bottom = truncateTo<std::int32_t>(face.bottom * rows);
+  return box;
 }
 
 }  // namespace
 
 void addFaceOption(Verb verb, std::vector<std::string>& texts) {
   verb.option("--face", texts,
-              "A face as left,top,right,bottom in fractions of the upright picture, "
-              "0,0 its top left corner; may be repeated")
+              "A face as left,top,right,bottom of the upright picture, in fractions (0,0 its top "
+              "left corner, 1,1 the opposite one) or, when a number is above 2, in pixels of its "
+              "full size; may be repeated")
       .oneValueEach()
       .type("L,T,R,B");
 }
 
-std::vector<FaceFractions> readFaces(const std::vector<std::string>& texts) {
-  std::vector<FaceFractions> faces;
+std::vector<Face> readFaces(const std::vector<std::string>& texts) {
+  std::vector<Face> faces;
   for (const std::string& text : texts) faces.push_back(readFace(text));
   return faces;
 }
 
-image_processing::ImageMetadata metadataWithFaces(const std::vector<FaceFractions>& faces,
-                                                  std::uint32_t width, std::uint32_t height) {
+image_processing::ImageMetadata metadataWithFaces(const std::vector<Face>& faces,
+                                                  std::uint32_t width, std::uint32_t height,
+                                                  int scale) {
   image_processing::ImageMetadata metadata;
-  const auto columns = static_cast<float>(width), rows = static_cast<float>(height);
-  for (const FaceFractions& face : faces) {
-    BoundingBox box = {};
-    box.left = truncateTo<std::int32_t>(face.left * columns);
-    box.right = truncateTo<std::int32_t>(face.right * columns);
-    box.top = truncateTo<std::int32_t>(face.top * rows);
-    box.bottom = truncateTo<std::int32_t>(face.bottom * rows);
+  for (const Face& face : faces) {
+    const BoundingBox box = boxOf(face, width, height, scale);
+    if (face.inPixels && (box.left >= static_cast<std::int64_t>(width) ||
+                          box.top >= static_cast<std::int64_t>(height))) {
+      throw FileError(fmt::format("--face {},{},{},{} lies outside the picture", face.left,
+                                  face.top, face.right, face.bottom));
+    }
     metadata.faces.push_back(std::make_shared<BoundingBox>(box));
   }
   return metadata;

@@ -9,20 +9,26 @@
 
 namespace pelorin::cli {
 
-/// A face box as fractions of the upright picture; may lie outside it.
-struct FaceFractions {
+/// A face as the user drew it: a box of which some part may lie outside the upright picture.
+struct Face {
   float left, top, right, bottom;
+  bool inPixels;  ///< Of the picture at its full size; fractions of it otherwise.
 };
 
 /// Adds `--face l,t,r,b`, repeatable; `texts` is for `readFaces`.
 void addFaceOption(Verb verb, std::vector<std::string>& texts);
 
-/// @throws UsageError when a text is not four finite numbers.
-std::vector<FaceFractions> readFaces(const std::vector<std::string>& texts);
+/// Four numbers are pixels when one is above 2, and fractions otherwise.
+/// @throws UsageError when a text is not four finite numbers, when they are pixels and not all whole,
+///         when left is right of right or top below bottom, and for fractions outside the picture.
+std::vector<Face> readFaces(const std::vector<std::string>& texts);
 
-/// The boxes in pixels of a picture of this size: fraction times size in float, truncated, with no
-/// clamping, as the Java natives do it.
-image_processing::ImageMetadata metadataWithFaces(const std::vector<FaceFractions>& faces,
-                                                  std::uint32_t width, std::uint32_t height);
+/// The boxes in pixels of a picture of this size. Fractions are multiplied by it in float and
+/// truncated, with no clamping, as the Java natives do it.
+/// @param scale  how often smaller the picture was decoded than it is.
+/// @throws FileError for a box in pixels that lies outside the picture.
+image_processing::ImageMetadata metadataWithFaces(const std::vector<Face>& faces,
+                                                  std::uint32_t width, std::uint32_t height,
+                                                  int scale = 1);
 
 }  // namespace pelorin::cli

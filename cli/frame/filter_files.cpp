@@ -25,7 +25,7 @@ using image_processing::RGBA8Pixel;
 
 struct Work {
   FilterToApply filter;
-  std::vector<FaceFractions> faces;
+  std::vector<Face> faces;
   PhotoOptions photo;
   int quality;
   bool overwrite;
@@ -37,6 +37,9 @@ struct Done {
 
 Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter) {
   Work work = {filter, readFaces(options.faces), {}, options.quality, options.outputs.overwrite};
+  if (!work.faces.empty() && !filter.filter.parameters().readsFaces) {
+    throw UsageError("--face: has no effect on " + filter.filter.name);
+  }
   if (options.rotate % 90 != 0) throw UsageError("--rotate: must be a multiple of 90");
   work.photo = {options.scale, options.rotate, std::nullopt};
   if (!options.raw.empty()) {
@@ -56,9 +59,11 @@ Done process(const Work& work, const PlannedFile& file) {
   const Done done = {picture.width, picture.height};
   {
     // The session ends before the encoder begins: its masks are several times the picture.
-    FilteredImage session(photo.image, metadataWithFaces(work.faces, done.width, done.height), "",
-                          defaultFilterConfigValue, DefaultFilterFactory::filterFactory());
-    session.applyFilterWithParams(work.filter.filter, work.filter.params, defaultFilterConfigValue,
+    FilteredImage session(photo.image,
+                          metadataWithFaces(work.faces, done.width, done.height, work.photo.scale),
+                          "", defaultFilterConfigValue, DefaultFilterFactory::filterFactory());
+    session.applyFilterWithParams(work.filter.filter.name, work.filter.params,
+                                  defaultFilterConfigValue,
                                   /*output=*/picture);
   }
   stopIfInterrupted();
@@ -118,7 +123,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
     options.outputs.name = raw ? "{stem}_{filter}.rgba" : "{stem}_{filter}.jpg";
   }
   std::map<std::string, std::string> values = filter.values;
-  values["filter"] = filter.filter;
+  values["filter"] = filter.filter.name;
   const std::vector<Input> inputs = expandInputs(options.inputs);
   const std::vector<PlannedFile> plan =
       planOutputs(inputs, options.inputs, options.outputs, values);
@@ -153,7 +158,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
           Json object = describe(file, "done");
           object["width"] = (*attempt.result)->width;
           object["height"] = (*attempt.result)->height;
-          object["filter"] = filter.filter;
+          object["filter"] = filter.filter.name;
           object["params"] = filter.params;
           json.add(object);
         }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <map>
 #include <string>
 #include <vector>
 
@@ -9,6 +10,7 @@
 #include "cli/frame/outputs.h"
 #include "cli/frame/talk.h"
 #include "cli/frame/verb.h"
+#include "image_processing/filters/filter_description.h"
 
 namespace pelorin::cli {
 
@@ -32,7 +34,7 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
 
 /// What to do with every file.
 struct FilterToApply {
-  std::string filter;                         ///< Registry name; must exist.
+  const image_processing::FilterDescription& filter;
   std::string params;                         ///< As the filter reads it; already checked.
   std::map<std::string, std::string> values;  ///< For `--name`, beside {stem} and {filter}.
 };

@@ -32,6 +32,22 @@ const FilterDescription& lookNamed(const std::string& name) {
   throw UsageError(unknownName("look", name, names));
 }
 
+const FilterDescription& filterNamed(const std::string& name) {
+  std::vector<std::string> names;
+  for (const FilterDescription* filter : allFilters()) {
+    if (filter->name == name) return *filter;
+    names.push_back(filter->name);
+  }
+  throw UsageError("--filter: " + unknownName("filter", name, names));
+}
+
+std::vector<const FilterDescription*> allFilters() {
+  std::vector<const FilterDescription*> filters;
+  const auto registry = image_processing::DefaultFilterFactory::filterFactory();
+  for (const auto& [name, filter] : registry->descriptions) filters.push_back(filter);
+  return filters;
+}
+
 std::vector<std::string> othersShownAs(const FilterDescription& look) {
   const auto registry = image_processing::DefaultFilterFactory::filterFactory();
   std::vector<std::string> others;

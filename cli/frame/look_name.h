@@ -12,6 +12,13 @@ namespace pelorin::cli {
 /// @throws UsageError that names the nearest one.
 const image_processing::FilterDescription& lookNamed(const std::string& name);
 
+/// The filter of exactly this registry name.
+/// @throws UsageError that names the nearest one.
+const image_processing::FilterDescription& filterNamed(const std::string& name);
+
+/// Every filter of the registry, in its order.
+std::vector<const image_processing::FilterDescription*> allFilters();
+
 /// The registry names of the other filters with the display name of this one.
 std::vector<std::string> othersShownAs(const image_processing::FilterDescription& look);
 

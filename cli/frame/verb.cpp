@@ -57,8 +57,12 @@ Option Option::excludes(Option other) {
   return *this;
 }
 
+std::string Option::name() const {
+  return option_->get_name();
+}
+
 bool Option::given() const {
-  return option_->count() > 0;
+  return option_ != nullptr && option_->count() > 0;
 }
 
 std::string Option::text() const {

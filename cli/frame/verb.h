@@ -41,6 +41,11 @@ class Option {
   Option needs(Option other);
   Option excludes(Option other);
 
+  /// Whether this speaks of an option at all.
+  bool exists() const { return option_ != nullptr; }
+  /// Its longest name: "--output".
+  std::string name() const;
+  /// Whether the user gave it; false where there is none.
   bool given() const;
   /// What the user gave, the last where it was given often.
   std::string text() const;

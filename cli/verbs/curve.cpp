@@ -38,7 +38,7 @@ struct Curve {
   std::vector<float> samples;
 };
 
-Curve curveOf(const Photo& photo, float slider, const std::vector<FaceFractions>& faces) {
+Curve curveOf(const Photo& photo, float slider, const std::vector<Face>& faces) {
   Curve curve{photo.image->width, photo.image->height, {}, {}};
   image_processing::analyzeImage(*photo.image, metadataWithFaces(faces, curve.width, curve.height),
                                  curve.statistics);
@@ -77,7 +77,7 @@ Json describe(const Curve& curve, const Input& input, float slider) {
 
 ExitCode runCurve(const CurveOptions& options) {
   const float slider = readSlider("--slider", options.slider);
-  const std::vector<FaceFractions> faces = readFaces(options.faces);
+  const std::vector<Face> faces = readFaces(options.faces);
   PhotoOptions photoOptions;
   if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
   const Input input = loneInput(options.input);

@@ -1,11 +1,11 @@
 #include <memory>
 #include <string>
 
-#include "cli/frame/errors.h"
 #include "cli/frame/filter_files.h"
-#include "cli/frame/filter_parameters.h"
-#include "cli/frame/number_text.h"
+#include "cli/frame/filter_options.h"
+#include "cli/frame/look_name.h"
 #include "cli/verbs/verbs.h"
+#include "image_processing/core/parameter_strings.h"
 
 namespace pelorin::cli {
 namespace {
@@ -13,33 +13,19 @@ namespace {
 struct EnhanceOptions {
   FilterFilesOptions files;
   std::string filter = "AE0";
-  std::string slider = "0.4";
-  std::string params;
-  bool globalOnly = false;
-  Option sliderGiven, paramsGiven;
+  FilterOptions parameters;
 };
 
-std::string builtParameters(const EnhanceOptions& options) {
-  if (!isAutoEnhance(options.filter)) {
-    if (!options.sliderGiven.given() && !options.globalOnly) return "";
-    throw UsageError("--filter: " + options.filter + " has no slider; use --params");
-  }
-  readSlider("--slider", options.slider);  // refuses what is none
-  return "slider=" + options.slider + ";" + (options.globalOnly ? "gtmOnly=true;" : "");
-}
-
 ExitCode runEnhance(const EnhanceOptions& options) {
-  requireFilter(options.filter);
-  const bool verbatim = options.paramsGiven.given();
-  if (verbatim && (options.sliderGiven.given() || options.globalOnly)) {
-    throw UsageError("--params: takes the place of --slider and --global-only; give it alone");
-  }
-  const std::string params = verbatim ? options.params : builtParameters(options);
-  const std::vector<std::string> warnings = checkParameters(options.filter, params);
+  const auto& filter = filterNamed(options.filter);
   Talk talk("enhance", options.files.report.quiet, 0);
-  for (const std::string& warning : warnings) talk.note("note: --params: " + warning);
-  return filterFiles("enhance", options.files,
-                     {options.filter, params, {{"slider", verbatim ? "" : options.slider}}});
+  const std::string params = options.parameters.read(filter, talk);
+  std::string slider;
+  if (!options.parameters.verbatim()) {
+    const image_processing::FilterParams given(params);
+    if (given.items().contains("slider")) slider = given.at("slider");
+  }
+  return filterFiles("enhance", options.files, {filter, params, {{"slider", slider}}});
 }
 
 }  // namespace
@@ -58,15 +44,8 @@ void addEnhance(CommandLine& commandLine) {
       [options] { return runEnhance(*options); });
   verb.option("--filter", options->filter, "AE0 unless given; AE08bit needs less memory")
       .type("NAME");
-  options->sliderGiven =
-      verb.option("--slider", options->slider, "Strength from 0 (none) to 1; 0.4 unless given")
-          .type("S");
-  verb.flag("--global-only", options->globalOnly,
-            "One tone curve for the whole picture, without local masks");
-  options->paramsGiven =
-      verb.option("--params", options->params,
-                  "The filter's own parameters in place of --slider and --global-only, "
-                  "for example \"slider=0.4;gtmOnly=true;\"");
+  options->parameters =
+      FilterOptions(verb, {&filterNamed(options->filter)}, "slider=0.4;gtmOnly=true;");
   addFilterFilesOptions(verb, options->files, "{stem}, {filter} and {slider}");
 }
 

@@ -38,8 +38,8 @@ struct Info {
   std::vector<float> curve;
 };
 
-Info inspect(const Input& input, const PhotoOptions& options,
-             const std::vector<FaceFractions>& faces, float slider) {
+Info inspect(const Input& input, const PhotoOptions& options, const std::vector<Face>& faces,
+             float slider) {
   stopIfInterrupted();
   const Photo photo = loadPhoto(input, options);
   Info info = {photo.image->width, photo.image->height, photo.facts, {}, {}};
@@ -120,7 +120,7 @@ void printText(const Input& input, const Info& info, const std::string& slider) 
 
 ExitCode runInfo(const InfoOptions& options) {
   const float slider = readSlider("--slider", options.slider);
-  const std::vector<FaceFractions> faces = readFaces(options.faces);
+  const std::vector<Face> faces = readFaces(options.faces);
   PhotoOptions photo;
   if (!options.raw.empty()) photo.raw = readRawSize(options.raw);
   const std::vector<Input> inputs = expandInputs(options.inputs);

@@ -35,8 +35,7 @@ struct Masks {
   std::shared_ptr<Image<float>> bilateral, ltm;
 };
 
-Masks masksOf(Photo photo, const std::string& filter, const std::vector<FaceFractions>& faces,
-              bool exact) {
+Masks masksOf(Photo photo, const std::string& filter, const std::vector<Face>& faces, bool exact) {
   image_processing::FilterConfig config = image_processing::defaultFilterConfigValue;
   config.useBilateralGrid = exact ? 0 : 1;
   image_processing::FilteredImage session(
@@ -73,7 +72,7 @@ ExitCode runMasks(const MasksOptions& options) {
   if (std::find(filters.begin(), filters.end(), options.filter) == filters.end()) {
     throw UsageError("--filter: " + unknownName("filter with masks", options.filter, filters));
   }
-  const std::vector<FaceFractions> faces = readFaces(options.faces);
+  const std::vector<Face> faces = readFaces(options.faces);
   PhotoOptions photoOptions;
   if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
   const bool raw = photoOptions.raw.has_value();

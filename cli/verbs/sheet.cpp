@@ -50,7 +50,7 @@ struct SheetRow {
 
 struct SheetWork {
   std::vector<SheetColumn> columns;
-  std::vector<FaceFractions> faces;
+  std::vector<Face> faces;
   PhotoOptions photo;
 };
 
@@ -87,7 +87,8 @@ SheetRow makeRow(const SheetWork& work, const Input& input, PictureSize room) {
   Image<RGBA8Pixel> filtered(size.width, size.height);
   for (const SheetColumn& column : work.columns) {
     stopIfInterrupted();
-    session.applyFilterWithParams(column.filter, column.params, defaultFilterConfigValue, filtered);
+    session.applyFilterWithParams(column.filter->name, column.params, defaultFilterConfigValue,
+                                  filtered);
     row.thumbnails.push_back(areaAverage(filtered, small));
   }
   return row;
@@ -106,6 +107,10 @@ SheetPlan planOf(const SheetOptions& options, const SheetWork& work,
 
 ExitCode runSheet(const SheetOptions& options) {
   SheetWork work{sheetColumns(options.columns), readFaces(options.faces), {}};
+  const bool facesMatter = std::ranges::any_of(work.columns, [](const SheetColumn& column) {
+    return column.filter->parameters().readsFaces;
+  });
+  if (!work.faces.empty() && !facesMatter) throw UsageError("--face: has no effect on these looks");
   if (!options.raw.empty()) {
     if (options.inputs.recursive) throw UsageError("--raw: name the files, folders hold JPEG");
     work.photo.raw = readRawSize(options.raw);

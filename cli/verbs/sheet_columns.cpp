@@ -4,9 +4,10 @@
 
 #include <algorithm>
 
+#include "cli/frame/filter_options.h"
 #include "cli/frame/look_name.h"
-#include "cli/frame/number_text.h"
-#include "image_processing/filters/default_filter_factory.h"
+#include "image_processing/core/parameter_strings.h"
+#include "image_processing/filters/parameter_check.h"
 
 namespace pelorin::cli {
 namespace {
@@ -16,8 +17,11 @@ using image_processing::FilterDescription;
 const std::string untouched = "PassThrough";
 const std::string enhancement = "AE0";
 
-std::string sliderParams(float slider) {
-  return fmt::format("slider={:.9g};", slider);
+/// What the filter reads when the user gives `slider` to `option`.
+std::string sliderParams(const FilterDescription& filter, const std::string& option,
+                         const std::string& slider) {
+  if (filter.parameters().find("slider") == nullptr) return requiredParameters(filter.parameters());
+  return parameterItem(filter, "slider", option, slider);
 }
 
 /// The display name, with the registry name behind it when another filter shows the same.
@@ -45,19 +49,21 @@ void addSheetColumnOptions(Verb verb, SheetColumnOptions& options) {
 }
 
 std::vector<SheetColumn> sheetColumns(const SheetColumnOptions& options) {
-  const std::string params = sliderParams(readSlider("--slider", options.slider));
+  const FilterDescription& automatic = filterNamed(enhancement);
+  sliderParams(automatic, "--slider", options.slider);  // refused also when no look reads it
   std::vector<SheetColumn> columns;
   const auto addLook = [&](const FilterDescription& look) {
-    if (look.name != untouched) columns.push_back({labelOf(look), look.name, params});
+    if (look.name == untouched) return;
+    columns.push_back({labelOf(look), &look, sliderParams(look, "--slider", options.slider)});
   };
   if (options.allLooks || (options.looks.empty() && options.sliders.empty())) {
-    const auto registry = image_processing::DefaultFilterFactory::filterFactory();
-    for (const auto& [name, look] : registry->descriptions) addLook(*look);
+    for (const FilterDescription* look : allFilters()) addLook(*look);
   }
   for (const std::string& name : options.looks) addLook(lookNamed(name));
   for (const std::string& text : options.sliders) {
-    const float slider = readSlider("--sliders", text);
-    columns.push_back({fmt::format("slider {:g}", slider), enhancement, sliderParams(slider)});
+    const std::string params = sliderParams(automatic, "--sliders", text);
+    const float slider = image_processing::FilterParams(params).readFloat("slider");
+    columns.push_back({fmt::format("slider {:g}", slider), &automatic, params});
   }
   return columns;
 }
@@ -65,7 +71,7 @@ std::vector<SheetColumn> sheetColumns(const SheetColumnOptions& options) {
 std::string titleOf(const std::vector<SheetColumn>& columns) {
   const bool onlySliders =
       std::all_of(columns.begin(), columns.end(),
-                  [](const SheetColumn& column) { return column.filter == enhancement; });
+                  [](const SheetColumn& column) { return column.filter->name == enhancement; });
   return onlySliders ? "Automatic enhancement" : "Looks";
 }
 

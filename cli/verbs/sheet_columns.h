@@ -4,6 +4,7 @@
 #include <vector>
 
 #include "cli/frame/verb.h"
+#include "image_processing/filters/filter_description.h"
 
 namespace pelorin::cli {
 
@@ -21,7 +22,7 @@ void addSheetColumnOptions(Verb verb, SheetColumnOptions& options);
 /// One way of treating every photo.
 struct SheetColumn {
   std::string label;
-  std::string filter;  ///< Registry name.
+  const image_processing::FilterDescription* filter;
   std::string params;
 };
 

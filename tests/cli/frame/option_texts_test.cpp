@@ -5,7 +5,8 @@
 
 #include "cli/frame/errors.h"
 #include "cli/frame/faces.h"
-#include "cli/frame/filter_parameters.h"
+#include "cli/frame/filter_options.h"
+#include "cli/frame/look_name.h"
 #include "cli/frame/nearest_name.h"
 #include "cli/frame/number_text.h"
 #include "photo/raw/raw_pixels.h"
@@ -55,18 +56,57 @@ TEST(FaceOption, BecomesABoxByTruncation) {
   EXPECT_EQ(metadata.faces[0]->bottom, 180);
 }
 
-TEST(FaceOption, IsNeitherClampedNorOrdered) {
-  const auto metadata = metadataWithFaces(readFaces({"1.5,-0.019,-9e9,9e9"}), 100, 100);
-  EXPECT_EQ(metadata.faces[0]->left, 150);
+TEST(FaceOption, OfFractionsIsNotClamped) {
+  const auto metadata = metadataWithFaces(readFaces({"-9e9,-0.019,1.5,1.019"}), 100, 100);
+  EXPECT_EQ(metadata.faces[0]->left, std::numeric_limits<std::int32_t>::min());
   EXPECT_EQ(metadata.faces[0]->top, -1);
-  EXPECT_EQ(metadata.faces[0]->right, std::numeric_limits<std::int32_t>::min());
-  EXPECT_EQ(metadata.faces[0]->bottom, std::numeric_limits<std::int32_t>::max());
+  EXPECT_EQ(metadata.faces[0]->right, 150);
+  EXPECT_EQ(metadata.faces[0]->bottom, 101);
 }
 
 TEST(FaceOption, NeedsFourNumbers) {
-  for (const char* text : {"", "1", "1,2,3", "1,2,3,4,5", "1,2,3,x", "1,2,3,nan", "1,,3,4"}) {
+  for (const char* text : {"", "1", "0,0,1", "0,0,1,1,1", "0,0,1,x", "0,0,1,nan", "0,,1,1"}) {
     EXPECT_THROW(readFaces({text}), UsageError) << text;
   }
+}
+
+TEST(FaceOption, IsInPixelsWhenANumberIsAboveTwo) {
+  const auto faces = readFaces({"100,50,300,250", "-5,0,1,3", "0,0,2,2"});
+  const auto metadata = metadataWithFaces(faces, 400, 300);
+  EXPECT_EQ(metadata.faces[0]->left, 100);
+  EXPECT_EQ(metadata.faces[0]->top, 50);
+  EXPECT_EQ(metadata.faces[0]->right, 300);
+  EXPECT_EQ(metadata.faces[0]->bottom, 250);
+  EXPECT_EQ(metadata.faces[1]->left, -5);
+  EXPECT_EQ(metadata.faces[1]->right, 1);
+  EXPECT_EQ(metadata.faces[2]->right, 800);  // fractions still
+
+  const auto scaled = metadataWithFaces(readFaces({"101,50,300,251"}), 100, 75, /*scale=*/4);
+  EXPECT_EQ(scaled.faces[0]->left, 25);
+  EXPECT_EQ(scaled.faces[0]->top, 12);
+  EXPECT_EQ(scaled.faces[0]->right, 75);
+  EXPECT_EQ(scaled.faces[0]->bottom, 62);
+}
+
+TEST(FaceOption, IsRefusedWhereItWouldBeIgnored) {
+  for (const char* text : {
+           "0.6,0.1,0.4,0.4",   // left of 0.4 is right of 0.6
+           "0.4,0.4,0.6,0.1",   // upside down
+           "300,50,100,250",    // the same in pixels
+           "0.4,0.1,300,250",   // neither
+           "100.5,50,300,250",  // no pixel
+           "1,0,1.5,0.5",       // beside the picture
+           "0,1.2,0.5,1.5",     // below it
+           "-0.5,0,-0.1,1",     // left of it
+           "-30,-20,-10,250",   // the same in pixels
+       }) {
+    EXPECT_THROW(readFaces({text}), UsageError) << text;
+  }
+  const auto beside = readFaces({"400,50,500,250"}), below = readFaces({"0,300,500,350"});
+  EXPECT_NO_THROW(metadataWithFaces(beside, 401, 300));
+  EXPECT_THROW(metadataWithFaces(beside, 400, 300), FileError);
+  EXPECT_THROW(metadataWithFaces(below, 400, 300), FileError);
+  EXPECT_THROW(metadataWithFaces(beside, 100, 75, /*scale=*/4), FileError);
 }
 
 TEST(RawOption, IsTwoWholeNumbers) {
@@ -78,61 +118,25 @@ TEST(RawOption, IsTwoWholeNumbers) {
   }
 }
 
-TEST(FilterParameters, OfAnAutoEnhancementNeedASlider) {
-  EXPECT_TRUE(checkParameters("AE0", "slider=0.4;gtmOnly=true;").empty());
-  for (const char* params : {"", ";;", "gtmOnly=true;", "slider", "slider=", "slider=0.4x"}) {
-    EXPECT_THROW(checkParameters("AE0", params), UsageError) << params;
+TEST(FilterOptions, AreCalledAsTheirKeys) {
+  EXPECT_EQ(optionFor("slider"), "--slider");
+  EXPECT_EQ(optionFor("maskRadius"), "--mask-radius");
+  EXPECT_EQ(optionFor("gtmExtraMemory"), "--gtm-extra-memory");
+  EXPECT_EQ(optionFor("applyMask"), "--mask");
+}
+
+TEST(FilterOptions, RefuseATextThatTheFilterWouldTakeOtherwise) {
+  const auto& filter = filterNamed("WinterRGB");
+  EXPECT_EQ(parameterItem(filter, "maskAlpha", "--x", "0.5"), "maskAlpha=0.5;");
+  for (const char* text : {"", "2", "nan", "0.5x", "0;1", "0.5;r=0,1,"}) {
+    EXPECT_THROW(parameterItem(filter, "maskAlpha", "--x", text), UsageError) << text;
   }
-}
-
-TEST(FilterParameters, ThatAreUnknownNameTheNearest) {
-  try {
-    checkParameters("AE08bit", "slider=0.4;gmtonly=true;");
-    FAIL() << "accepted";
-  } catch (const UsageError& error) {
-    EXPECT_STREQ(error.what(), "--params: unknown parameter 'gmtonly'; did you mean 'gtmOnly'?");
-  }
-  EXPECT_THROW(checkParameters("PassThrough", "slider=0.4;"), UsageError);
-}
-
-TEST(FilterParameters, ThatReadOtherwiseThanTheyLookAreWarnedOf) {
-  EXPECT_EQ(checkParameters("AE0", "slider=nan;gtmOnly=1;").size(), 2u);
-  EXPECT_TRUE(checkParameters("PassThrough", "").empty());
-}
-
-TEST(FilterParameters, OfALookAreItsCurvesAndItsMask) {
-  EXPECT_TRUE(checkParameters("WinterRGB", "").empty());
-  EXPECT_TRUE(checkParameters("WinterRGB", "r=0,0.5,1,;applyMask=0;").empty());
-  EXPECT_TRUE(checkParameters("LowDimRGBCurve", "s1=0.3;s4=1;").empty());
-  EXPECT_EQ(checkParameters("LowDimRGBCurve", "s1=0.3").size(), 1u);  // ends without a ';'
-  EXPECT_THROW(checkParameters("WinterRGB", "s1=0.3;"), UsageError);
-  EXPECT_THROW(checkParameters("WinterRGB", "slider=0.3;"), UsageError);
-}
-
-TEST(FilterParameters, OfALookThatReadOtherwiseThanTheyLookAreWarnedOf) {
-  const std::vector<std::pair<const char*, std::string>> cases = {
-      {"applyMask=true;", "applyMask: 'true' counts as 0"},
-      {"maskAlpha=0.4abc;", "maskAlpha: '0.4abc' counts as 0.4"},
-      {"maskRadius=nan;", "maskRadius: 'nan' counts as nan"},
-      {"maskAlpha;", "maskAlpha: '' counts as 0"},
-      {"s1=1.5;", "s1: 1.5 is not between 0 and 1"},
-      {"r=0,128,255,;", "r: 128 is not between 0 and 1"},
-      {"g=0,x,;", "g: 'x' counts as 0"},
-      {"b=0,0.5,1;", "b: '1' is ignored without a ',' after it"},
-      {"r=0.5,;r=0,1,;", "r: a curve of fewer than 2 numbers is ignored"},
-      {"g=;", "g: a curve of fewer than 2 numbers is ignored"},
-      {"s1=0.3;b=0", "what follows the last ';' is ignored: end every parameter with one"},
-  };
-  for (const auto& [params, warning] : cases) {
-    EXPECT_EQ(checkParameters("LowDimRGBCurve", params), std::vector{warning}) << params;
-  }
-  EXPECT_TRUE(checkParameters("LowDimRGBCurve", "maskRadius=2.5;applyMask=2;;").empty());
 }
 
 TEST(Filters, AreFoundByTheirExactNameOnly) {
-  EXPECT_NO_THROW(requireFilter("AE0"));
+  EXPECT_EQ(filterNamed("AE0").name, "AE0");
   for (const char* name : {"ae0", "Auto", "Original", "", "AE0 "}) {
-    EXPECT_THROW(requireFilter(name), UsageError) << name;
+    EXPECT_THROW(filterNamed(name), UsageError) << name;
   }
 }
 

@@ -45,7 +45,7 @@ TEST(Enhance, WritesWhatTheEngineGives) {
       {{"--slider", "0.85"}, enhancedDirectly(file, "AE0", "slider=0.85;")},
       {{"--filter", "AE08bit"}, enhancedDirectly(file, "AE08bit", "slider=0.4;")},
       {{"--global-only"}, enhancedDirectly(file, "AE0", "slider=0.4;gtmOnly=true;")},
-      {{"--params", "slider=1.5;"}, enhancedDirectly(file, "AE0", "slider=1.5;")},
+      {{"--params", "slider=1.5;", "-q"}, enhancedDirectly(file, "AE0", "slider=1.5;")},
       {{"--filter", "PassThrough"}, enhancedDirectly(file, "PassThrough", "")},
       {{"--quality", "50"}, enhancedDirectly(file, "AE0", "slider=0.4;", 50)},
       {{"--scale", "2"}, enhancedDirectly(file, "AE0", "slider=0.4;", 90, 2)},
@@ -150,7 +150,8 @@ TEST(Enhance, WarnsOfParametersThatReadOtherwiseThanTheyLook) {
   const Finished run =
       quenby({"enhance", in, "-o", folder / "b.jpg", "--params", "slider=0.4;gtmOnly=1;"});
   EXPECT_EQ(run.exitCode, 0);
-  EXPECT_THAT(run.errors, HasSubstr("gtmOnly=1 counts as false"));
+  EXPECT_THAT(run.errors,
+              HasSubstr("note: --params: gtmOnly of AE0 wants true or false; '1' counts as false"));
   EXPECT_EQ(folder.read("b.jpg"), enhancedDirectly(folder.read("a.jpg"), "AE0", "slider=0.4;"));
 }
 

@@ -73,6 +73,10 @@ TEST(LookVerb, HandsItsSettingsToTheEngine) {
        "applyMask=1;maskAlpha=0.5;maskRadius=2;"},
       {"starfish", "LowDimRGBCurve", {"--no-mask", "--b", "0,1"}, "b=0,1,;"},
       {"ae08BIT", "AE08bit", {"--slider", "0.9"}, "slider=0.9;"},
+      {"ae0",
+       "AE0",
+       {"--global-only", "--gtm-extra-memory"},
+       "slider=0.4;gtmOnly=true;gtmExtraMemory=true;"},
       {"summer", "SummerRGB", {"--params", "maskAlpha=7;r=0,2,;"}, "maskAlpha=7;r=0,2,;"},
       {"summer", "SummerRGB", {"--params", ""}, ""},
       {"Auto", "AE0", {"--params", "slider=0.4;gtmOnly=true;"}, "slider=0.4;gtmOnly=true;"},
@@ -143,14 +147,15 @@ TEST(LookVerb, NamesTheNearestOfAnUnknownLook) {
 TEST(LookVerb, WarnsOfACurveOfOneSampleAndIgnoresIt) {
   const Image<RGBA8Pixel> picture = photoLikePicture(31, 20, 1);
   const Bytes expected = filteredDirectly(picture, "FallRGB", "");
+  const std::string wanted = " wants 2 or more numbers from 0 to 1, a comma after each; ";
   for (const auto& [options, warning] : std::vector<std::pair<Options, std::string>>{
-           {{"--r", "0.5"}, "note: r: a curve of fewer than 2 numbers is ignored\n"},
-           {{"--b", "1,"}, "note: b: a curve of fewer than 2 numbers is ignored\n"},
+           {{"--r", "0.5"}, "note: r of FallRGB" + wanted + "a shorter list is ignored\n"},
+           {{"--b", "1,"}, "note: b of FallRGB" + wanted + "a shorter list is ignored\n"},
            {{"--params", "g=0.5,;"},
-            "note: --params: g: a curve of fewer than 2 numbers is ignored\n"},
+            "note: --params: g of FallRGB" + wanted + "a shorter list is ignored\n"},
            {{"--params", "g=0,1;"},
-            "note: --params: g: '1' is ignored without a ',' after it\n"
-            "note: --params: g: a curve of fewer than 2 numbers is ignored\n"}}) {
+            "note: --params: g of FallRGB" + wanted + "'1' has no comma and is ignored\n" +
+                "note: --params: g of FallRGB" + wanted + "a shorter list is ignored\n"}}) {
     const Finished run = lookOf(picture, "fall", options);
     EXPECT_EQ(run.exitCode, 0);
     EXPECT_EQ(run.errors, warning);
@@ -163,19 +168,20 @@ TEST(LookVerb, RefusesSettingsWithoutEffect) {
       {"winter", {"--s1", "0.5"}, "--s1: has no effect on WinterRGB"},
       {"winter", {"--slider", "0.5"}, "--slider: has no effect on WinterRGB"},
       {"winter", {"--face", "0,0,1,1"}, "--face: has no effect on WinterRGB"},
+      {"auto", {"--gtm-extra-memory"}, "has no effect on AE0 without --global-only"},
       {"auto", {"--no-mask"}, "--no-mask: has no effect on AE0"},
       {"auto", {"--s4", "1"}, "--s4: has no effect on AE0"},
       {"original", {"--r", "0,1"}, "--r: has no effect on PassThrough"},
-      {"starfish", {"--mask-radius", "2"}, "LowDimRGBCurve has no vignette; add --mask"},
-      {"starfish", {"--mask-alpha", "1"}, "LowDimRGBCurve has no vignette; add --mask"},
+      {"starfish", {"--mask-radius", "2"}, "has no effect on LowDimRGBCurve without --mask"},
+      {"starfish", {"--mask-alpha", "1"}, "has no effect on LowDimRGBCurve without --mask"},
       {"winter", {"--no-mask", "--mask-radius", "2"}, "--mask-radius"},
       {"winter", {"--no-mask", "--mask"}, "--mask"},
       {"winter", {"--params", "r=0,1,;", "--mask"}, "--params: takes the place of --mask"},
-      {"winter", {"--params", "s1=0.4;"}, "unknown parameter 's1'"},
-      {"winter", {"--params", "maskradius=1;"}, "did you mean 'maskRadius'?"},
-      {"winter", {"--params", "mask;"}, "unknown parameter 'mask'"},
+      {"winter", {"--params", "s1=0.4;"}, "WinterRGB has no parameter 's1'"},
+      {"winter", {"--params", "maskradius=1;"}, "'maskradius'; it takes maskRadius, "},
+      {"winter", {"--params", "mask;"}, "WinterRGB has no parameter 'mask'"},
       {"original", {"--params", "r=0,1,;"}, "PassThrough takes no parameters"},
-      {"auto", {"--params", "gtmOnly=true;"}, "needs a slider"},
+      {"auto", {"--params", "gtmOnly=true;"}, "AE0 needs slider, a number from 0 to 1"},
   };
   for (const auto& [look, options, message] : cases) {
     const Finished run = refused(look, options);

@@ -24,6 +24,7 @@ TEST(RawPixels, PipedThroughEqualTheEnginesByteForByte) {
       {{}, filteredDirectly(source, "AE0", "slider=0.4;")},
       {{"--slider", "1"}, filteredDirectly(source, "AE0", "slider=1;")},
       {{"--face", "0.25,0.1,0.75,0.75"}, filteredDirectly(source, "AE0", "slider=0.4;", faces)},
+      {{"--face", "40,12,120,90"}, filteredDirectly(source, "AE0", "slider=0.4;", faces)},
       {{"--filter", "AE08bit", "--face", "0.25,0.1,0.75,0.75"},
        filteredDirectly(source, "AE08bit", "slider=0.4;", faces)},
       {{"--filter", "PassThrough"}, rawBytes(source)},
