@@ -1,8 +1,10 @@
 #include <cstdlib>
 #include <memory>
 #include <new>
+#include <optional>
 #include <stdexcept>
 #include <string>
+#include <system_error>
 
 #include "image_processing/filters/default_filter_factory.h"
 #include "jni/add_faceboxes.h"
@@ -10,8 +12,10 @@
 #include "jni/java_string.h"
 #include "jni/log.h"
 #include "jni/natives.h"
+#include "jni/rotated_copy.h"
 #include "platform/pn/jni_lookup.h"
 #include "platform/pn_imgproc/native_image_processor.h"
+#include "platform/pnjni/exceptions.h"
 
 namespace pelorin::quenby {
 
@@ -24,6 +28,7 @@ using image_processing::RGBA8Pixel;
 using imgproc::ColorSpace;
 using imgproc::NativeImageProcessor;
 using imgproc::Stream;
+using jni::throwCppExceptionIf;
 
 namespace {
 
@@ -33,19 +38,25 @@ void logUnreadable(const char* path) {
   pn_printLog(logError, logTag, "image decoding/scaling failed for %s", path);
 }
 
-void rotate(JNIEnv* env, jstring inputPath, jstring outputPath, int rotation) {
-  const JavaCharacters path(env, inputPath);
-  Stream out(env, outputPath, "w");
+void rotate(JNIEnv* env, jstring inputPath, jstring copyPath, int rotation) {
+  const JavaCharacters input(env, inputPath);
+  bool opened = false;
   try {
     Stream in(env, inputPath, "r");
+    opened = true;
+    Stream out(env, copyPath, "w");
     NativeImageProcessor::rotateJpeg(env, in, out, rotation);
   } catch (const std::bad_alloc&) {
     throw;
+  } catch (const std::system_error&) {
+    if (!opened) logUnreadable(input.get());  // otherwise the copy cannot be written
+    throw;
   } catch (const std::exception&) {
-    logUnreadable(path.get());
+    logUnreadable(input.get());
     throw;
   }
-  out.close();
+  // Closing may have raised an exception.
+  throwCppExceptionIf(env->ExceptionCheck());
 }
 
 }  // namespace
@@ -57,12 +68,17 @@ jboolean applyAutoEnhanceFilterToJpegFile(JNIEnv* env, jobject, jstring inputPat
   if (outputPath == nullptr) throw std::invalid_argument("outputPath is null");
   bool decoded = false;
   try {
-    if (rotation != 0) rotate(env, inputPath, outputPath, rotation);
     const JavaCharacters path(env, rotation != 0 ? outputPath : inputPath);
+    std::optional<RotatedCopy> copy;
+    if (rotation != 0) {
+      copy.emplace(env, outputPath, path.get());
+      rotate(env, inputPath, copy->javaPath(), rotation);
+    }
     std::uint8_t* pixels = nullptr;
     int width = 0, height = 0;
-    NativeImageProcessor::decodeJpeg(env, path.get(), &pixels, &width, &height,
-                                     ColorSpace::RGBA_8888, decodeScale);
+    NativeImageProcessor::decodeJpeg(env, copy ? copy->path() : path.get(), &pixels, &width,
+                                     &height, ColorSpace::RGBA_8888, decodeScale);
+    copy.reset();
     if (pixels == nullptr) {
       logUnreadable(path.get());
       return JNI_FALSE;
@@ -83,11 +99,14 @@ jboolean applyAutoEnhanceFilterToJpegFile(JNIEnv* env, jobject, jstring inputPat
     Image<RGBA8Pixel> output(image->width, image->height);
     filterOrCopy(filteredImage, *image, name, parameters, output);
 
-    Stream out(env, outputPath, "w");
-    NativeImageProcessor::encodeJpeg(env, reinterpret_cast<const std::uint8_t*>(output.data.get()),
-                                     width, height, ColorSpace::RGBA_8888, outputQuality, out);
-    out.close();
-    return JNI_TRUE;
+    {
+      Stream out(env, outputPath, "w");
+      NativeImageProcessor::encodeJpeg(env,
+                                       reinterpret_cast<const std::uint8_t*>(output.data.get()),
+                                       width, height, ColorSpace::RGBA_8888, outputQuality, out);
+    }
+    // Closing may have raised an exception.
+    return env->ExceptionCheck() ? JNI_FALSE : JNI_TRUE;
   } catch (const std::bad_alloc&) {
     throwOutOfMemoryError(env, "QuenbyLib JPEG filtering ran out of memory");
     return decoded ? JNI_TRUE : JNI_FALSE;

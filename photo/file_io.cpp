@@ -7,7 +7,6 @@
 #include <atomic>
 #include <cerrno>
 #include <filesystem>
-#include <optional>
 #include <string>
 #include <system_error>
 #include <utility>
@@ -33,8 +32,8 @@ class Descriptor {
   ~Descriptor() {
     if (descriptor_ >= 0) ::close(descriptor_);
   }
-  Descriptor(const Descriptor&) = delete;
-  Descriptor& operator=(const Descriptor&) = delete;
+  Descriptor(Descriptor&& other) noexcept : descriptor_(other.release()) {}
+  Descriptor& operator=(Descriptor&&) = delete;
 
   int get() const { return descriptor_; }
   int release() { return std::exchange(descriptor_, -1); }
@@ -67,50 +66,28 @@ fs::path linkTarget(fs::path path) {
   return path;
 }
 
-// A new empty file in the folder of `target`, removed with this unless it has replaced it.
-class Replacement {
- public:
-  Replacement(const fs::path& target, mode_t mode) : path_(nextName(target)) {
-    for (;;) {
-      try {
-        file_.emplace(path_, O_WRONLY | O_CREAT | O_EXCL, mode);
-        return;
-      } catch (const std::system_error& error) {
-        if (error.code() != std::errc::file_exists) throw;
-        path_ = nextName(target);
-      }
+// Owner and permissions as those of the file to replace; the owner as far as we may.
+void takeAfter(const struct stat& old, const Descriptor& file, const std::string& path) {
+  const bool keepsOwner = ::fchown(file.get(), old.st_uid, old.st_gid) == 0;
+  const mode_t permissions = old.st_mode & (keepsOwner ? 07777 : 0777);
+  if (::fchmod(file.get(), permissions) != 0) throwError(errno, path);
+}
+
+// A new empty file in `folder`, whose path `path` gets.
+Descriptor makeTemporary(const fs::path& folder, mode_t mode, std::string& path) {
+  static std::atomic<unsigned> counter = 0;
+  for (;;) {
+    std::string name = folder / (".quenby-" + std::to_string(::getpid()) + "-" +
+                                 std::to_string(counter++) + ".tmp");
+    try {
+      Descriptor file(name, O_WRONLY | O_CREAT | O_EXCL, mode);
+      path = std::move(name);
+      return file;
+    } catch (const std::system_error& error) {
+      if (error.code() != std::errc::file_exists) throw;
     }
   }
-  ~Replacement() {
-    if (!path_.empty()) ::unlink(path_.c_str());
-  }
-  Replacement(const Replacement&) = delete;
-  Replacement& operator=(const Replacement&) = delete;
-
-  // Owner and permissions as those of the file to replace; the owner as far as we may.
-  void takeAfter(const struct stat& old) {
-    const bool keepsOwner = ::fchown(file_->get(), old.st_uid, old.st_gid) == 0;
-    const mode_t permissions = old.st_mode & (keepsOwner ? 07777 : 0777);
-    if (::fchmod(file_->get(), permissions) != 0) throwError(errno, path_);
-  }
-
-  void write(std::span<const std::uint8_t> bytes) { writeAll(*file_, path_, bytes); }
-
-  void replace(const fs::path& target) {
-    if (::rename(path_.c_str(), target.c_str()) != 0) throwError(errno, target);
-    path_.clear();
-  }
-
- private:
-  static std::string nextName(const fs::path& target) {
-    static std::atomic<unsigned> counter = 0;
-    return target.parent_path() /
-           (".quenby-" + std::to_string(::getpid()) + "-" + std::to_string(counter++) + ".tmp");
-  }
-
-  std::string path_;
-  std::optional<Descriptor> file_;
-};
+}
 
 }  // namespace
 
@@ -136,21 +113,39 @@ std::vector<std::uint8_t> readFile(const std::string& path) {
   return bytes;
 }
 
-void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes) {
+// Delegates, so that the destructor also runs when this throws.
+Replacement::Replacement(const std::string& path, std::span<const std::uint8_t> bytes)
+    : Replacement() {
   struct stat old = {};
   const bool exists = ::stat(path.c_str(), &old) == 0;
-  if (exists && !S_ISREG(old.st_mode)) {
-    // Renaming over a device would put an ordinary file in its place.
-    Descriptor file(path, O_WRONLY);
-    return writeAll(file, path, bytes);
+  if (exists && (!S_ISREG(old.st_mode) || old.st_nlink == 0)) {
+    // Renaming over a device would put an ordinary file in its place; a file without a name, reached
+    // through its descriptor, has none to take over.
+    Descriptor file(path, O_WRONLY | O_TRUNC);
+    writeAll(file, path, bytes);
+    return;
   }
   // The rename needs only the folder; a protected file stays protected all the same.
   if (exists && ::faccessat(AT_FDCWD, path.c_str(), W_OK, AT_EACCESS) != 0) throwError(errno, path);
   const fs::path target = linkTarget(path);
-  Replacement replacement(target, exists ? 0600 : 0666);
-  if (exists) replacement.takeAfter(old);
-  replacement.write(bytes);
-  replacement.replace(target);
+  target_ = target;
+  Descriptor file = makeTemporary(target.parent_path(), exists ? 0600 : 0666, temporary_);
+  if (exists) takeAfter(old, file, temporary_);
+  writeAll(file, temporary_, bytes);
+}
+
+Replacement::~Replacement() {
+  if (!temporary_.empty()) ::unlink(temporary_.c_str());
+}
+
+void Replacement::replace() {
+  if (temporary_.empty()) return;
+  if (::rename(temporary_.c_str(), target_.c_str()) != 0) throwError(errno, target_);
+  temporary_.clear();
+}
+
+void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes) {
+  Replacement(path, bytes).replace();
 }
 
 }  // namespace pelorin::imgproc

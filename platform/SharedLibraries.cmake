@@ -39,11 +39,14 @@ platform_library(
 platform_library(jnigraphics SOURCES jnigraphics/bitmap.cpp jnigraphics/desktop_bitmap.cpp
                  DEPENDS pelorin_bitmap_header)
 
+# Which bytes a Java path stands for, for whoever opens files; no library of a device's.
+pelorin_library(utf8_path SOURCES pn_imgproc/utf8_path.cpp)
+
 # Where no JPEG library is packaged for the target, tests bring a codec of their own.
 set(PELORIN_JPEG_CODEC pelorin_jpeg_codec CACHE STRING
     "The target that implements photo/jpeg/jpeg_codec.h")
 mark_as_advanced(PELORIN_JPEG_CODEC)
 platform_library(
   pn_imgproc SOURCES pn_imgproc/native_image_processor.cpp pn_imgproc/stream.cpp
-                     pn_imgproc/utf8_path.cpp
-  DEPENDS pn PRIVATE ${PELORIN_JPEG_CODEC})
+                     pn_imgproc/stream_file.cpp
+  DEPENDS pn PRIVATE pnjni pelorin_utf8_path ${PELORIN_JPEG_CODEC})

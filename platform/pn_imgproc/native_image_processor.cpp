@@ -5,12 +5,13 @@
 
 #include "photo/jpeg/jpeg_codec.h"
 #include "platform/pn/log.h"
+#include "platform/pn_imgproc/stream_file.h"
 #include "platform/pn_imgproc/utf8_path.h"
 
 namespace pelorin::imgproc {
 
 void NativeImageProcessor::rotateJpeg(JNIEnv*, Stream& in, Stream& out, int rotation) {
-  out.bytes = imgproc::rotateJpeg(in.bytes, rotation);
+  out.file_->write(imgproc::rotateJpeg(in.file_->content(), rotation));
 }
 
 void NativeImageProcessor::decodeJpeg(JNIEnv*, const char* path, std::uint8_t** pixels, int* width,
@@ -31,8 +32,8 @@ void NativeImageProcessor::decodeJpeg(JNIEnv*, const char* path, std::uint8_t** 
 
 void NativeImageProcessor::encodeJpeg(JNIEnv*, const std::uint8_t* pixels, int width, int height,
                                       ColorSpace, int quality, Stream& out) {
-  out.bytes = imgproc::encodeJpeg(pixels, static_cast<std::uint32_t>(width),
-                                  static_cast<std::uint32_t>(height), quality);
+  out.file_->write(imgproc::encodeJpeg(pixels, static_cast<std::uint32_t>(width),
+                                       static_cast<std::uint32_t>(height), quality));
 }
 
 }  // namespace pelorin::imgproc

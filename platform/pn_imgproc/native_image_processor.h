@@ -10,7 +10,8 @@ namespace pelorin::imgproc {
 
 enum class ColorSpace { RGBA_8888 };
 
-/// JPEG files for the natives. Stateless; std::bad_alloc passes through.
+/// JPEG files for the natives. Stateless; std::bad_alloc passes through, and std::system_error when
+/// an output cannot be written.
 class NativeImageProcessor {
  public:
   /// Turns the JPEG file `in` clockwise into `out`, without loss.

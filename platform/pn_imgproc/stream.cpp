@@ -4,8 +4,9 @@
 #include <stdexcept>
 #include <string_view>
 
-#include "photo/file_io.h"
+#include "platform/pn_imgproc/stream_file.h"
 #include "platform/pn_imgproc/utf8_path.h"
+#include "platform/pnjni/exceptions.h"
 
 namespace pelorin::imgproc {
 namespace {
@@ -24,17 +25,23 @@ std::string pathOf(JNIEnv* env, jstring path) {
   return utf8Path(held.characters);
 }
 
+StreamFile::Mode modeOf(std::string_view mode) {
+  if (mode == "r") return StreamFile::Mode::read;
+  if (mode == "w") return StreamFile::Mode::write;
+  throw std::invalid_argument("a stream's mode is \"r\" or \"w\"");
+}
+
 }  // namespace
 
 Stream::Stream(JNIEnv* env, jstring path, const char* mode)
-    : path_(pathOf(env, path)), writes_(mode == std::string_view("w")) {
-  if (!writes_ && mode != std::string_view("r"))
-    throw std::invalid_argument("a stream's mode is \"r\" or \"w\"");
-  if (!writes_) bytes = readFile(path_);
-}
+    : file_(std::make_unique<StreamFile>(pathOf(env, path), modeOf(mode))) {}
 
-void Stream::close() {
-  if (writes_) writeFileAtomically(path_, bytes);
+Stream::~Stream() {
+  try {
+    file_->close();
+  } catch (...) {
+    jni::translatePendingCppExceptionToJavaException();
+  }
 }
 
 }  // namespace pelorin::imgproc

@@ -2,32 +2,29 @@
 
 #include <jni.h>
 
-#include <cstdint>
-#include <string>
-#include <vector>
+#include <memory>
 
 namespace pelorin::imgproc {
 
-/// A file of a Java path, whole in memory. For one thread.
+class StreamFile;
+
+/// A file of a Java path, for one thread. It is closed when it is destroyed: what a codec wrote into
+/// it then takes the place of the file, in one step. When nothing was written to the end, as when an
+/// exception passes, the file stays as it was.
 class Stream {
  public:
-  /// @param mode  "r" reads the file; "w" touches nothing before `close`.
+  /// @param mode  "r" reads the file; "w" touches nothing yet.
   /// @throws std::invalid_argument for a null path or another mode, std::system_error when the file
-  ///         cannot be read.
+  ///         cannot be read, std::bad_alloc.
   Stream(JNIEnv* env, jstring path, const char* mode);
+  /// A failure to close leaves a java.io.IOException pending, unless there is one already.
+  ~Stream();
   Stream(const Stream&) = delete;
   Stream& operator=(const Stream&) = delete;
 
-  /// Puts what was written in place of the file, in one step. A stream that is destroyed without
-  /// it, as when an exception passes, leaves the file as it was. Nothing to do for mode "r".
-  /// @throws std::system_error when the file cannot be written.
-  void close();
-
-  std::vector<std::uint8_t> bytes;  ///< The file's content.
-
  private:
-  std::string path_;
-  bool writes_;
+  friend class NativeImageProcessor;
+  std::unique_ptr<StreamFile> file_;
 };
 
 }  // namespace pelorin::imgproc

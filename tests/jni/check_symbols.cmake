@@ -49,8 +49,8 @@ set(fromDevice
     pelorin::jni::throwCppExceptionIf pelorin::jni::translatePendingCppExceptionToJavaException
     pelorin::imgproc::NativeImageProcessor::decodeJpeg
     pelorin::imgproc::NativeImageProcessor::encodeJpeg
-    pelorin::imgproc::NativeImageProcessor::rotateJpeg pelorin::imgproc::Stream::close
-    pelorin::imgproc::Stream::Stream)
+    pelorin::imgproc::NativeImageProcessor::rotateJpeg pelorin::imgproc::Stream::Stream
+    pelorin::imgproc::Stream::~Stream)
 set(linkerTools _ITM_deregisterTMCloneTable _ITM_registerTMCloneTable __gmon_start__)
 run(undefined ${NM} -D -C --undefined-only ${LIBRARY})
 foreach(line IN LISTS undefined)

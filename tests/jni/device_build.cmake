@@ -1,5 +1,5 @@
 # Builds libpn_quenby.so as for a device, whose four libraries are taken from a folder, and looks at
-# its symbols. Another build's libraries play the device's.
+# its symbols. Stand-ins that have what the natives may ask for, and nothing else, play the device's.
 #   cmake -DSOURCE=... -DLIBRARIES=... -DSCRATCH=... -DTOOLCHAIN=... -DGENERATOR=... -DFLAGS=...
 #         -DHEADERS=... -DNM=... -DREADELF=... -DCHECK=... -P device_build.cmake
 cmake_minimum_required(VERSION 3.25)

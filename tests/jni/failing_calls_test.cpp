@@ -76,9 +76,17 @@ TEST_F(FailingCalls, OfApplyAutoEnhanceFilter) {
 TEST_F(FailingCalls, OfApplyAutoEnhanceFilterToJpegFile) {
   failEachCall(
       [&] { natives.applyToFile(run.input, run.file, 90, run.faces, 1, run.filter, run.params); },
-      // Both paths for the rotation, one more for its messages, the copy's path, two names, two
-      // faces, the output's path.
-      3 + 1 + 2 + 2 + 1);
+      // The copy's path, the input's for messages, both for the rotation, two names, two faces, the
+      // output's path.
+      1 + 1 + 2 + 2 + 2 + 1);
+}
+
+TEST_F(FailingCalls, OfApplyAutoEnhanceFilterToJpegFileTurnedInMemory) {
+  FakeString nowhere("/dev/null");
+  failEachCall(
+      [&] { natives.applyToFile(run.input, nowhere, 90, run.faces, 1, run.filter, run.params); },
+      // And the memory's path.
+      9 + 1);
 }
 
 TEST_F(FailingCalls, OfSimilarityScore) {

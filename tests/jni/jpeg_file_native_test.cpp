@@ -1,7 +1,11 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <sys/inotify.h>
+#include <sys/stat.h>
 #include <unistd.h>
+
+#include <filesystem>
+#include <future>
 
 #include "photo/jpeg/jpeg_codec.h"
 #include "tests/jni/support/natives_fixture.h"
@@ -137,6 +141,45 @@ TEST_F(JpegFileNative, RaisesIllegalArgumentForANullPath) {
   EXPECT_EQ(env.takeException(), "java/lang/IllegalArgumentException: inputPath is null");
   EXPECT_FALSE(natives.applyToFile(input, nullptr, 90, noFaces, 1, ae, slider));
   EXPECT_EQ(env.takeException(), "java/lang/IllegalArgumentException: outputPath is null");
+  EXPECT_THAT(takeLogLines(), IsEmpty());
+}
+
+TEST_F(JpegFileNative, TurnsInMemoryWhereTheOutputGivesNothingBack) {
+  ASSERT_EQ(mkfifo(output.text.c_str(), 0600), 0);
+  std::filesystem::create_symlink("out.jpg", folder.file("link.jpg"));
+  const std::vector<std::uint8_t> turned = imgproc::rotateJpeg(contentOf(input.text), 90);
+  alarm(60);  // a hang ends the test
+  for (const std::string& name : {output.text, folder.file("link.jpg")}) {
+    FakeString path(name);
+    auto reader = std::async(std::launch::async, [&] { return contentOf(path.text); });
+    EXPECT_TRUE(natives.applyToFile(input, path, 90, noFaces, 1, ae, slider));
+    EXPECT_EQ(reader.get(), expected(turned, 1, "AE0", "slider=0.4;"));
+    EXPECT_THAT(takeLogLines(), ElementsAre("3 QuenbyLib: applyToJpegFile: " + path.text +
+                                            " [32x48:90] AE0 slider=0.4;"));
+  }
+  FakeString nowhere("/dev/null");
+  EXPECT_TRUE(natives.applyToFile(input, nowhere, 90, noFaces, 1, ae, slider));
+  EXPECT_TRUE(std::filesystem::is_character_file("/dev/null"));
+  EXPECT_FALSE(natives.applyToFile(input, nowhere, 90, noFaces, 1, ae, empty));
+  EXPECT_EQ(env.takeException(), "java/lang/IllegalArgumentException: map::at");
+  EXPECT_FALSE(natives.applyToFile(input, nowhere, 45, noFaces, 1, ae, slider));
+  EXPECT_THAT(env.takeException(), StartsWith("java/lang/RuntimeException: "));
+  alarm(0);
+  EXPECT_THAT(folder.names(), ElementsAre("in.jpg", "link.jpg", "out.jpg"));
+}
+
+TEST_F(JpegFileNative, SaysThatAFolderIsNoOutput) {
+  FakeString itself(folder.file(""));
+  for (const int rotation : {0, 90}) {
+    EXPECT_FALSE(natives.applyToFile(input, itself, rotation, noFaces, 1, ae, slider));
+    EXPECT_THAT(env.takeException(), StartsWith("java/io/IOException: " + itself.text));
+  }
+}
+
+TEST_F(JpegFileNative, BlamesTheInputOnlyForWhatIsWrongWithIt) {
+  FakeString nowhere(folder.file("no such folder/out.jpg"));
+  EXPECT_FALSE(natives.applyToFile(input, nowhere, 90, noFaces, 1, ae, slider));
+  EXPECT_THAT(env.takeException(), StartsWith("java/io/IOException: "));
   EXPECT_THAT(takeLogLines(), IsEmpty());
 }
 

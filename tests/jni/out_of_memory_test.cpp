@@ -71,12 +71,12 @@ class OutOfMemory : public NativesTest {
     printf("%ld injected faults, %ld of them made up for\n", faults, unnoticed);
   }
 
-  void failEachAllocationOfTheFileCall(jstring input, int rotation) {
+  void failEachAllocationOfTheFileCall(jstring input, FakeString& output, int rotation) {
     const auto call = [&] {
-      return natives.applyToFile(input, run.file, rotation, run.faces, 1, run.filter, run.params);
+      return natives.applyToFile(input, output, rotation, run.faces, 1, run.filter, run.params);
     };
     EXPECT_TRUE(call());
-    const std::vector<std::uint8_t> expected = contentOf(run.file.text);
+    const std::vector<std::uint8_t> expected = contentOf(output.text);
     const std::vector<std::string> names = run.folder.names();
     bool decodingCanFail = false;
     failEachAllocation<bool>(
@@ -90,7 +90,7 @@ class OutOfMemory : public NativesTest {
         "QuenbyLib JPEG filtering ran out of memory");
     EXPECT_TRUE(decodingCanFail);
     EXPECT_TRUE(call());
-    EXPECT_EQ(contentOf(run.file.text), expected);
+    EXPECT_EQ(contentOf(output.text), expected);
     EXPECT_EQ(run.folder.names(), names);
   }
 
@@ -175,18 +175,23 @@ TEST_F(OutOfMemory, InApplyAutoEnhanceFilterWithAPreparedFilter) {
 }
 
 TEST_F(OutOfMemory, InApplyAutoEnhanceFilterToJpegFile) {
-  failEachAllocationOfTheFileCall(run.input, 0);
+  failEachAllocationOfTheFileCall(run.input, run.file, 0);
 }
 
 TEST_F(OutOfMemory, InApplyAutoEnhanceFilterToJpegFileTurned) {
-  failEachAllocationOfTheFileCall(run.input, 90);
+  failEachAllocationOfTheFileCall(run.input, run.file, 90);
+}
+
+TEST_F(OutOfMemory, InApplyAutoEnhanceFilterToJpegFileTurnedInMemory) {
+  FakeString nowhere("/dev/null");
+  failEachAllocationOfTheFileCall(run.input, nowhere, 90);
 }
 
 TEST_F(OutOfMemory, InApplyAutoEnhanceFilterToJpegFileTurnedByItsPixels) {
   FakeString strip(run.folder.file("strip.jpg"));
   writePicture(strip.text, photoLikePicture(40, 5, 3));
   if (contentOf(strip.text)[0] == 'R') GTEST_SKIP() << "the tests' own codec knows no blocks";
-  failEachAllocationOfTheFileCall(strip, 90);
+  failEachAllocationOfTheFileCall(strip, run.file, 90);
 }
 
 TEST_F(OutOfMemory, InSimilarityScore) {

@@ -1,5 +1,6 @@
 #include "photo/file_io.h"
 
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
@@ -228,6 +229,30 @@ TEST_F(FileIo, LeavesAnotherHardLinkWithTheOldContents) {
   fs::create_hard_link(path("file"), path("other"));
   writeFileAtomically(path("file"), countingBytes(9));
   EXPECT_EQ(readFile(path("other")), countingBytes(3));
+}
+
+TEST_F(FileIo, WritesAFileWithoutANameDirectly) {
+  const std::string name = path("gone");
+  const int descriptor = ::open(name.c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0600);
+  fs::remove(name);
+  const std::string way = "/proc/self/fd/" + std::to_string(descriptor);
+  for (const std::size_t size : {100, 7}) {
+    writeFileAtomically(way, countingBytes(size));
+    EXPECT_EQ(readFile(way), countingBytes(size));
+  }
+  EXPECT_EQ(entries(), 0u);
+  ::close(descriptor);
+}
+
+TEST_F(FileIo, LeavesTheOldFileUntilTheReplacementTakesItsPlace) {
+  writeFileAtomically(path("a"), countingBytes(3));
+  { const Replacement dropped(path("a"), countingBytes(9)); }
+  EXPECT_EQ(entries(), 1u);
+  Replacement replacement(path("a"), countingBytes(9));
+  EXPECT_EQ(readFile(path("a")), countingBytes(3));
+  replacement.replace();
+  EXPECT_EQ(readFile(path("a")), countingBytes(9));
+  EXPECT_EQ(entries(), 1u);
 }
 
 TEST_F(FileIo, LeavesOneWholeFileWhenSeveralThreadsWriteIt) {

@@ -157,6 +157,14 @@ struct FakeFunctions {
     return JNI_OK;
   }
 
+  static jstring newStringUTF(JNIEnv* env, const char* characters) {
+    FakeEnvironment& fake = of(env);
+    fake.checkNothingPending("NewStringUTF");
+    if (fake.shouldFail("NewStringUTF")) return nullptr;
+    fake.string_.text.assign(characters);
+    return static_cast<jstring>(fake.newLocal(&fake.string_, "NewStringUTF"));
+  }
+
   static const char* getStringUTFChars(JNIEnv* env, jstring text, jboolean*) {
     FakeEnvironment& fake = of(env);
     fake.checkNothingPending("GetStringUTFChars");
@@ -257,6 +265,7 @@ struct FakeFunctions {
       made.CallVoidMethodV = callVoidMethod;
       made.GetDirectBufferAddress = getDirectBufferAddress;
       made.RegisterNatives = registerNatives;
+      made.NewStringUTF = newStringUTF;
       made.GetStringUTFChars = getStringUTFChars;
       made.ReleaseStringUTFChars = releaseStringUTFChars;
       made.GetArrayLength = getArrayLength;
@@ -278,7 +287,9 @@ struct FakeFunctions {
 FakeEnvironment::FakeEnvironment() {
   functions = FakeFunctions::table();
   classes();
-  // Room for any exception, so that catching one allocates nothing.
+  // Room for any exception or string, so that none of them allocates.
+  string_.className = "java/lang/String";
+  string_.text.reserve(sizeof(pendingMessage_));
   exception_.className.reserve(sizeof(pendingClass_));
   exception_.text.reserve(sizeof(pendingMessage_));
   currentEnvironment = this;

@@ -89,7 +89,7 @@ class FakeEnvironment : public JNIEnv {
   std::array<FakeObject*, 64> locals_{};
   char pendingClass_[128] = "", pendingMessage_[1100] = "";
   char violations_[600] = "";
-  FakeObject exception_;
+  FakeObject exception_, string_;
 };
 
 }  // namespace pelorin::test_support
