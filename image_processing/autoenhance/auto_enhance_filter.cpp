@@ -42,17 +42,27 @@ FilterParameters AEFilterT<TB, TL>::parameters() {
 
 template <typename TB, typename TL>
 void AEFilterT<TB, TL>::init(const std::string& params) {
+  masks_ = {};
+  try {
+    prepare(FilterParams(params));
+  } catch (...) {
+    // Statistics come first and outlive what fails after them; they wait for the masks only because
+    // both are found from the photo's lightness.
+    masks_ = {};
+    analyzeImage(*state->image, state->metadata, statistics_);
+    throw;
+  }
+}
+
+template <typename TB, typename TL>
+void AEFilterT<TB, TL>::prepare(const FilterParams& options) {
   const Image<RGBA8Pixel>& photo = *state->image;
-  const FilterParams options(params);
   if (!options.readBool("gtmOnly")) {
     prepareImage(photo, state->metadata, state->config, statistics_, masks_);
     return;
   }
   analyzeImage(photo, state->metadata, statistics_);
-  if (options.readBool("gtmExtraMemory")) {
-    masks_.ltmMask = makeSharedImage<TL>(photo.width, photo.height);
-    masks_.bilateralMask = makeSharedImage<TB>(photo.width, photo.height);
-  }
+  if (options.readBool("gtmExtraMemory")) allocateImageMasks(photo, masks_);
 }
 
 template <typename TB, typename TL>
@@ -67,13 +77,13 @@ void AEFilterT<TB, TL>::applyConfig(const std::string& params, const FilterConfi
 
 template <typename TB, typename TL>
 std::shared_ptr<Image<float>> AEFilterT<TB, TL>::getBilateralMask() const {
-  if (!masks_.computed) throw std::logic_error("the bilateral mask was never computed");
+  if (!masks_.present()) throw std::logic_error("the bilateral mask was never computed");
   return asFloats(*masks_.bilateralMask);
 }
 
 template <typename TB, typename TL>
 std::shared_ptr<Image<float>> AEFilterT<TB, TL>::getLtmMask() const {
-  if (!masks_.computed) throw std::logic_error("the LTM mask was never computed");
+  if (!masks_.present()) throw std::logic_error("the LTM mask was never computed");
   return asFloats(*masks_.ltmMask);
 }
 

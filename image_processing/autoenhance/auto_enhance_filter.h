@@ -9,6 +9,8 @@
 
 namespace pelorin::image_processing {
 
+class FilterParams;
+
 /// Access to the masks of an auto-enhance filter, for looking at them.
 class AEFilterBase {
  public:
@@ -32,6 +34,8 @@ class AEFilterT : public AbstractFilter, public AEFilterBase {
 
   static FilterParameters parameters();
 
+  /// Starts anew: what an earlier `init` prepared is gone. When it throws, there are no masks, but
+  /// unless memory ran out for them too there are statistics, so that global applications work.
   void init(const std::string& params) override;
   void applyConfig(const std::string& params, const FilterConfig& config,
                    Image<RGBA8Pixel>& output) override;
@@ -39,6 +43,8 @@ class AEFilterT : public AbstractFilter, public AEFilterBase {
   std::shared_ptr<Image<float>> getLtmMask() const override;
 
  private:
+  void prepare(const FilterParams& options);
+
   ImageStatistics statistics_;
   ImageMasks<TB, TL> masks_;
 };

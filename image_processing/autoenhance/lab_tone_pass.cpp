@@ -17,7 +17,7 @@ void imageVibranceLabAndToneCurve(const Image<RGBA8Pixel>& source, Image<RGBA8Pi
                                   const FilterConfig& config, const std::vector<float>& curve,
                                   float scale, const ImageMasks<TB, TL>& masks) {
   const TonePass pass(curve, scale, config.vibrance, config.ltmBlend, config.detailGain);
-  const bool useMasks = config.detailGainHigh != 0.0f && masks.computed;
+  const bool useMasks = config.detailGainHigh != 0.0f && masks.present();
   const TB* const bilateral = useMasks ? masks.bilateralMask->data.get() : nullptr;
   const TL* const ltm = useMasks ? masks.ltmMask->data.get() : nullptr;
   enhanceRow(pass, source.data.get(), bilateral, ltm, output.data.get(),

@@ -77,6 +77,23 @@ TYPED_TEST(AutoEnhance, NeverReadsMasksThatWereAllocatedButNotComputed) {
   EXPECT_THROW(filter.getBilateralMask(), std::logic_error);
 }
 
+TYPED_TEST(AutoEnhance, BeginsWithoutMasksAtASecondInit) {
+  const auto photo = photoLikePicture(60, 45, 3);
+  TypeParam filter(stateOf(photo));
+  filter.init("");
+  filter.init("gtmOnly=true;");
+  EXPECT_THROW(filter.getBilateralMask(), std::logic_error);
+  EXPECT_THROW(filter.getLtmMask(), std::logic_error);
+  Image<RGBA8Pixel> output(60, 45);
+  filter.applyConfig("slider=0.5;", defaultFilterConfigValue, output);
+  EXPECT_EQ(fingerprint(output),
+            fingerprint(this->enhanced(photo, "gtmOnly=true;", "slider=0.5;gtmOnly=true;")));
+
+  filter.init("");
+  filter.applyConfig("slider=0.5;", defaultFilterConfigValue, output);
+  EXPECT_EQ(fingerprint(output), fingerprint(this->enhanced(photo, "", "slider=0.5;")));
+}
+
 TYPED_TEST(AutoEnhance, FailsWithoutASliderAndLeavesTheOutput) {
   const auto photo = photoLikePicture(20, 20, 4);
   TypeParam filter(stateOf(photo));

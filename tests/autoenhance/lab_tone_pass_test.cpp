@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
+#include <string>
 #include <vector>
 
 #include "image_processing/autoenhance/colour/lab.h"
@@ -92,6 +93,49 @@ TEST(LabTonePass, TreatsMasksThatWereNeverComputedAsOff) {
                                unwritten);
   EXPECT_EQ(fingerprint(empty), fingerprint(off));
   EXPECT_EQ(fingerprint(allocated), fingerprint(off));
+}
+
+TEST(LabTonePass, UsesMasksThatACallerFilled) {
+  const auto photo = photoLikePicture(20, 20, 5);
+  ImageMasks<float, float> computed;
+  computeImageMasks(photo, {}, defaultFilterConfigValue, computed);
+  const auto enhanced = [&photo](const ImageMasks<float, float>& masks) {
+    Image<RGBA8Pixel> output(20, 20);
+    imageVibranceLabAndToneCurve(photo, output, defaultFilterConfigValue, identityCurve(), 100.0f,
+                                 masks);
+    return fingerprint(output);
+  };
+  const std::string expected = enhanced(computed);
+  EXPECT_NE(expected, enhanced({}));
+  const ImageMasks<float, float> byHand{computed.bilateralMask, computed.ltmMask};
+  EXPECT_EQ(enhanced(byHand), expected);
+
+  ImageMasks<float, float> inPlaceOfUnwritten;
+  computeImageMasks(photo, {}, withoutMasks(), inPlaceOfUnwritten);
+  inPlaceOfUnwritten.bilateralMask = computed.bilateralMask;
+  inPlaceOfUnwritten.ltmMask = computed.ltmMask;
+  EXPECT_EQ(enhanced(inPlaceOfUnwritten), expected);
+
+  ImageMasks<float, float> written;
+  computeImageMasks(photo, {}, withoutMasks(), written);
+  std::copy_n(computed.bilateralMask->data.get(), 400, written.bilateralMask->data.get());
+  std::copy_n(computed.ltmMask->data.get(), 400, written.ltmMask->data.get());
+  written.unwritten = nullptr;
+  EXPECT_EQ(enhanced(written), expected);
+}
+
+TEST(LabTonePass, TreatsHalfARecordOfMasksAsOff) {
+  const auto photo = photoLikePicture(20, 20, 5);
+  ImageMasks<float, float> masks;
+  computeImageMasks(photo, {}, defaultFilterConfigValue, masks);
+  Image<RGBA8Pixel> off(20, 20), output(20, 20);
+  imageVibranceLabAndToneCurve(photo, off, withoutMasks(), identityCurve(), 100.0f, masks);
+  for (const auto& half : {ImageMasks<float, float>{masks.bilateralMask, nullptr},
+                           ImageMasks<float, float>{nullptr, masks.ltmMask}}) {
+    imageVibranceLabAndToneCurve(photo, output, defaultFilterConfigValue, identityCurve(), 100.0f,
+                                 half);
+    EXPECT_EQ(fingerprint(output), fingerprint(off));
+  }
 }
 
 TEST(LabTonePass, StopsWhereTheShorterImageEnds) {

@@ -3,9 +3,9 @@
 #include <functional>
 
 #include "jni/session_table.h"
-#include "tests/jni/support/allocation_faults.h"
 #include "tests/jni/support/natives_fixture.h"
 #include "tests/jni/support/whole_run.h"
+#include "tests/support/allocation_faults.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::test_support {

@@ -55,9 +55,7 @@ template <typename TB, typename TL>
 bool computeMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                   const FilterConfig& config, ImageMasks<TB, TL>& masks,
                   LightnessCounter& counter) {
-  masks.computed = false;
-  masks.ltmMask = makeSharedImage<TL>(photo.width, photo.height);
-  masks.bilateralMask = makeSharedImage<TB>(photo.width, photo.height);
+  allocateImageMasks(photo, masks);
   if (config.detailGainHigh == 0.0f) return false;
   const bool byGrid = config.useBilateralGrid != 0;
   if (byGrid) {
@@ -65,11 +63,19 @@ bool computeMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
   } else {
     computeMasksExactly(photo, metadata, config, *masks.bilateralMask, *masks.ltmMask);
   }
-  masks.computed = true;
+  masks.unwritten = nullptr;
   return byGrid;
 }
 
 }  // namespace
+
+template <typename TB, typename TL>
+void allocateImageMasks(const Image<RGBA8Pixel>& photo, ImageMasks<TB, TL>& masks) {
+  masks = {};
+  masks.ltmMask = makeSharedImage<TL>(photo.width, photo.height);
+  masks.unwritten = masks.ltmMask;
+  masks.bilateralMask = makeSharedImage<TB>(photo.width, photo.height);
+}
 
 template <typename TB, typename TL>
 void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
@@ -128,6 +134,8 @@ void computeLtmMask(const ImageMetadata& metadata, const Image<RGBA8Pixel>& phot
   blendFacesIntoMask(metadata, photo, mask);
 }
 
+template void allocateImageMasks(const Image<RGBA8Pixel>&, ImageMasks<float, float>&);
+template void allocateImageMasks(const Image<RGBA8Pixel>&, ImageMasks<Quantized, Quantized>&);
 template void computeMasksByGrid(const Image<RGBA8Pixel>&, const ImageMetadata&,
                                  const FilterConfig&, Image<float>&, Image<float>&,
                                  LightnessCounter&);

@@ -9,25 +9,38 @@
 
 namespace pelorin::image_processing {
 
-/// The two masks of one photo, each of the photo's size with values in [0, 1]. Copies share them.
+/// The two masks of one photo, each of the photo's size with values in [0, 1]. Copies share them. A
+/// caller may fill a record by hand.
 template <typename TB, typename TL>
 struct ImageMasks {
   std::shared_ptr<Image<TB>> bilateralMask;  ///< Lightness / 100, smoothed with its edges kept.
   std::shared_ptr<Image<TL>> ltmMask;        ///< Local flatness, drawn toward 0.5 on faces' skin.
-  /// False until every pixel of both has been written; the pixels are not to be read before.
-  bool computed = false;
+  /// The LTM mask whose pixels, and those of the bilateral mask beside it, were allocated and never
+  /// written. Who writes them afterwards empties this.
+  std::shared_ptr<const Image<TL>> unwritten = nullptr;
+
+  /// Whether there are masks to read.
+  bool present() const {
+    return bilateralMask != nullptr && ltmMask != nullptr && ltmMask != unwritten;
+  }
 };
+
+/// Allocates both masks, whatever the record held, and writes no pixel: they are not `present`.
+/// @throws std::bad_alloc.
+///
+/// Keeps no state. For (float, float) and (QuantizedFloat<unsigned char>, the same), as the next.
+template <typename TB, typename TL>
+void allocateImageMasks(const Image<RGBA8Pixel>& photo, ImageMasks<TB, TL>& masks);
 
 /// Makes both masks new, whatever the record held. With `detailGainHigh` 0 they are allocated and
 /// not computed.
-/// @throws std::bad_alloc; the record then counts as not computed.
-///
-/// Keeps no state. For (float, float) and (QuantizedFloat<unsigned char>, the same), as the next.
+/// @throws std::bad_alloc; no masks are present then.
 template <typename TB, typename TL>
 void computeImageMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                        const FilterConfig& config, ImageMasks<TB, TL>& masks);
 
 /// `analyzeImage` and `computeImageMasks` in one: the photo's lightness is found once for both.
+/// @throws std::bad_alloc; the statistics may be there all the same.
 template <typename TB, typename TL>
 void prepareImage(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                   const FilterConfig& config, ImageStatistics& statistics,

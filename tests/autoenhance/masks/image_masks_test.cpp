@@ -51,7 +51,7 @@ TEST(ImageMasks, AreAllocatedAndNotComputedWithoutDetailGain) {
   FilterConfig config = defaultFilterConfigValue;
   config.detailGainHigh = 0.0f;
   const FloatMasks masks = masksOf(photoLikePicture(30, 20, 1), {}, config);
-  EXPECT_FALSE(masks.computed);
+  EXPECT_FALSE(masks.present());
   ASSERT_NE(masks.bilateralMask, nullptr);
   ASSERT_NE(masks.ltmMask, nullptr);
   EXPECT_EQ(masks.bilateralMask->width, 30u);
@@ -69,7 +69,7 @@ TEST(ImageMasks, ReplaceWhatTheRecordHeld) {
 
 TEST(ImageMasks, HaveThePhotosSizeAndUsualRange) {
   const FloatMasks masks = masksOf(photoLikePicture(97, 61, 3));
-  EXPECT_TRUE(masks.computed);
+  EXPECT_TRUE(masks.present());
   for (const auto& mask : {masks.bilateralMask, masks.ltmMask}) {
     ASSERT_EQ(mask->pixelCount(), 97u * 61u);
     for (std::size_t i = 0; i < mask->pixelCount(); ++i) {
@@ -104,7 +104,7 @@ TEST(ImageMasks, TakeASpatialExtentOfAtLeastOnePixel) {
 
 TEST(ImageMasks, OfAnEmptyPhotoAreEmpty) {
   const FloatMasks masks = masksOf(Image<RGBA8Pixel>(0, 9), withFaces({{0, 5, 5, 0}}));
-  EXPECT_TRUE(masks.computed);
+  EXPECT_TRUE(masks.present());
   EXPECT_EQ(masks.ltmMask->pixelCount(), 0u);
 }
 
@@ -212,7 +212,7 @@ void expectTheDefinition(const Image<RGBA8Pixel>& photo, const FilterConfig& con
         ImageStatistics statistics;
         ImageMasks<T, T> masks;
         prepareImage(photo, metadata, config, statistics, masks);
-        ASSERT_TRUE(masks.computed);
+        ASSERT_TRUE(masks.present());
         ASSERT_EQ(fingerprint(*masks.bilateralMask), fingerprint(expected.bilateral));
         ASSERT_EQ(fingerprint(*masks.ltmMask), fingerprint(expected.ltm));
         ASSERT_EQ(statistics.cdf, expectedCdf);
@@ -292,7 +292,7 @@ TYPED_TEST(PrepareImage, CountsAlsoWhenNoMasksAreComputed) {
   ImageStatistics statistics;
   ImageMasks<TypeParam, TypeParam> masks;
   prepareImage(photo, {}, config, statistics, masks);
-  EXPECT_FALSE(masks.computed);
+  EXPECT_FALSE(masks.present());
   EXPECT_EQ(statistics.cdf, cdfByDefinition(photo));
 }
 
@@ -303,7 +303,7 @@ TYPED_TEST(PrepareImage, OfAnEmptyPhotoIsEmpty) {
     ImageMasks<TypeParam, TypeParam> masks;
     prepareImage(photo, {}, defaultFilterConfigValue, statistics, masks);
     analyzeImage(photo, {}, alone);
-    EXPECT_TRUE(masks.computed);
+    EXPECT_TRUE(masks.present());
     EXPECT_EQ(statistics.cdf, alone.cdf);
     EXPECT_EQ(statistics.faceMedianBin, -1);
   }

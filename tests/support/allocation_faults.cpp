@@ -1,4 +1,4 @@
-#include "tests/jni/support/allocation_faults.h"
+#include "tests/support/allocation_faults.h"
 
 #include <atomic>
 #include <cerrno>
