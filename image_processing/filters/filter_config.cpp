@@ -2,6 +2,8 @@
 
 namespace pelorin::image_processing {
 
+constinit const FilterConfig defaultFilterConfigValue{};
+
 void updateFilterConfigForSliderValue(float slider, FilterConfig* config) {
   FilterConfig& c = *config;
   c.slider = slider;

@@ -2,6 +2,8 @@
 
 #include <cstdint>
 
+#include "image_processing/core/export.h"
+
 namespace pelorin::image_processing {
 
 /// The tuning values every filter receives with an application. A plain record of sixteen 32-bit
@@ -28,8 +30,9 @@ struct FilterConfig {
 };
 static_assert(sizeof(FilterConfig) == 16 * 4);
 
-/// What an application without wishes of its own passes.
-inline constexpr FilterConfig defaultFilterConfigValue{};
+/// What an application without wishes of its own passes: every field as above. There before any code
+/// runs.
+PELORIN_EXPORT extern const FilterConfig defaultFilterConfigValue;
 
 /// Rewrites the five slider-driven fields of `config`. Below 0.3 the whole effect fades in from
 /// neutral, above it only grows stronger. `slider` is meant in [0, 1] and is not clamped: the two

@@ -15,30 +15,42 @@ macro(complain)
   math(EXPR failures "${failures} + 1")
 endmacro()
 
-# The toolkit: quality, corners, descriptors, the grey image of the duplicate score.
-set(toolkit
-    niqeMetric computeQuality buildBlock computeBlockFeatures computeImageStructure
-    computeImageStructure_fast mean imHalve ggdParams imageMakeGrayscale computeBriefDescriptors
-    brief operator<<)
-list(JOIN toolkit "|" toolkit)
+# The load function, the default configuration, and the toolkit: quality, corners, descriptors, the
+# grey image of the duplicate score.
+set(wanted JNI_OnLoad nonmax_suppression)
+foreach(arc 9 10 11 12)
+  list(APPEND wanted fast${arc}_detect fast${arc}_score fast${arc}_corner_score
+                     fast${arc}_detect_nonmax)
+endforeach()
+foreach(name defaultFilterConfigValue niqeMetric mean computeQuality imHalve buildBlock ggdParams
+             computeImageStructure computeImageStructure_fast computeBlockFeatures
+             imageMakeGrayscale computeBriefDescriptors brief
+             "operator<<(std::ostream&, xy const&)"
+             "operator<<(std::ostream&, pelorin::image_processing::BriefDescriptor const&)"
+             "operator<<(std::ostream&, std::vector<BriefDescriptor> const&)")
+  list(APPEND wanted "pelorin::image_processing::${name}")
+endforeach()
+
 run(defined ${NM} -D -C --defined-only ${LIBRARY})
-set(exported 0)
+list(LENGTH defined exported)
 foreach(line IN LISTS defined)
   string(REGEX REPLACE "^[0-9a-f]+ . " "" name "${line}")
-  math(EXPR exported "${exported} + 1")
-  if(NOT name STREQUAL "JNI_OnLoad"
-     AND NOT name MATCHES "^pelorin::image_processing::(${toolkit})(\\[abi:[a-z0-9]+\\])?\\("
-     AND NOT name MATCHES "^(fast(9|10|11|12)_[a-z_]+|nonmax_suppression)(\\(|$)")
-    complain("exported and should not be: ${name}")
+  string(REGEX REPLACE "\\[abi:[a-z0-9]+\\]" "" name "${name}")
+  if(name MATCHES "operator<<")
+    # As the sources write it.
+    string(REGEX REPLACE "std::basic_ostream<[^>]*> >" "std::ostream" name "${name}")
+    string(REGEX REPLACE "std::vector<pelorin::image_processing::BriefDescriptor.*> const&"
+                         "std::vector<BriefDescriptor> const&" name "${name}")
+  else()
+    string(REGEX REPLACE "\\(.*" "" name "${name}")
   endif()
+  if(NOT name IN_LIST wanted)
+    complain("exported and should not be: ${line}")
+  endif()
+  list(REMOVE_ITEM wanted "${name}")
 endforeach()
-foreach(wanted JNI_OnLoad pelorin::image_processing::imageMakeGrayscale
-               pelorin::image_processing::niqeMetric pelorin::image_processing::brief
-               pelorin::image_processing::computeBriefDescriptors fast9_detect_nonmax
-               fast12_detect_nonmax nonmax_suppression)
-  if(NOT "${defined}" MATCHES " T ${wanted}")
-    complain("not exported: ${wanted}")
-  endif()
+foreach(name IN LISTS wanted)
+  complain("not exported: ${name}")
 endforeach()
 
 # Without the versions that the system's libraries have, a symbol is one of the device's.
