@@ -25,12 +25,12 @@ void check(const std::string& params, const Image<RGBA8Pixel>& picture) {
 
   std::vector<float> red, green, blue;
   filter.getRGBCurves(red, green, blue, params);
-  parseRGBCurves(red, green, blue, params);
+  replaceCurves(red, green, blue, params);
   Look look{{LookCurve(red), LookCurve(green), LookCurve(blue)}, Filter::channelMix};
   float edge, centre;
   bool applyMask;
   filter.getRadialMaskParameters(edge, centre, look.maskRadius, look.maskAlpha, applyMask);
-  parseMaskParameters(look.maskRadius, look.maskAlpha, applyMask, params);
+  replaceMaskSettings(look.maskRadius, look.maskAlpha, applyMask, params);
   const CubicRadialMask mask(edge, centre, 400);
   if (applyMask) look.vignette = &mask;
   Image<RGBA8Pixel> expected(picture.width, picture.height);

@@ -57,6 +57,18 @@ class AbstractRGBCurveFilter : public AbstractFilter {
     applyLook(look, *state->image, output);
   }
 
+  /// Replaces the curves that the parameters name, as `replaceCurves` says.
+  void parseRGBCurves(std::vector<float>& red, std::vector<float>& green, std::vector<float>& blue,
+                      const std::string& params) const {
+    replaceCurves(red, green, blue, params);
+  }
+
+  /// Replaces the vignette's settings that the parameters name, as `replaceMaskSettings` says.
+  void parseMaskParameters(float& maskRadius, float& maskAlpha, bool& applyMask,
+                           const std::string& params) const {
+    replaceMaskSettings(maskRadius, maskAlpha, applyMask, params);
+  }
+
   /// Appends the samples of each curve (at least 2, in 0 ... 255) to an empty vector.
   virtual void getRGBCurves(std::vector<float>& red, std::vector<float>& green,
                             std::vector<float>& blue, const std::string& params) = 0;

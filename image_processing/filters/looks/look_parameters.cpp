@@ -44,8 +44,8 @@ FilterParameters lookParameters(float maskRadius, float maskAlpha, bool applyMas
           .reader = ParameterReader::splitStrings};
 }
 
-void parseRGBCurves(std::vector<float>& red, std::vector<float>& green, std::vector<float>& blue,
-                    const std::string& params) {
+void replaceCurves(std::vector<float>& red, std::vector<float>& green, std::vector<float>& blue,
+                   const std::string& params) {
   for (const std::string& item : splitStringAt(params, ";")) {
     const std::vector<std::string> keyAndValue = splitStringOnceAt(item, "=");
     const std::string& key = keyAndValue[0];
@@ -62,7 +62,7 @@ void parseRGBCurves(std::vector<float>& red, std::vector<float>& green, std::vec
   }
 }
 
-void parseMaskParameters(float& maskRadius, float& maskAlpha, bool& applyMask,
+void replaceMaskSettings(float& maskRadius, float& maskAlpha, bool& applyMask,
                          const std::string& params) {
   for (const std::string& item : splitStringAt(params, ";")) {
     const std::vector<std::string> keyAndValue = splitStringOnceAt(item, "=");

@@ -14,12 +14,12 @@ namespace pelorin::image_processing {
 /// Replaces the curves named by the keys "r", "g" and "b": numbers in 0 ... 1 over equal steps of
 /// the input range, each ended by a comma ("r=0,0.5,1,;"). A list of fewer than 2 numbers is
 /// ignored; values outside 0 ... 1 are kept.
-void parseRGBCurves(std::vector<float>& red, std::vector<float>& green, std::vector<float>& blue,
-                    const std::string& params);
+void replaceCurves(std::vector<float>& red, std::vector<float>& green, std::vector<float>& blue,
+                   const std::string& params);
 
 /// Replaces the values named by "maskRadius", "maskAlpha" and "applyMask" (true when not 0); the
 /// others keep what they held.
-void parseMaskParameters(float& maskRadius, float& maskAlpha, bool& applyMask,
+void replaceMaskSettings(float& maskRadius, float& maskAlpha, bool& applyMask,
                          const std::string& params);
 
 /// The rows of these keys for a look whose vignette is set so until a parameter string changes it.

@@ -38,6 +38,22 @@ TEST(RGBCurveFilter, LeavesThePictureAloneWithStraightCurvesAndNoVignette) {
   EXPECT_TRUE(samePixels(applied<StraightFilter>(picture), picture));
 }
 
+TEST(RGBCurveFilter, ParsesCurvesAndMaskSettingsAsItsMembers) {
+  const StraightFilter filter(stateOf(flatPicture(1, 1, {1, 2, 3, 4})));
+  std::vector<float> red{1.0f, 2.0f}, green{3.0f, 4.0f}, blue{5.0f, 6.0f};
+  const std::string params = "g=1,0,;maskRadius=1.5;maskAlpha=0.25;applyMask=1;";
+  filter.parseRGBCurves(red, green, blue, params);
+  EXPECT_EQ(red, (std::vector{1.0f, 2.0f}));
+  EXPECT_EQ(green, (std::vector{255.0f, 0.0f}));
+  EXPECT_EQ(blue, (std::vector{5.0f, 6.0f}));
+  float radius = 1.0f, alpha = 1.0f;
+  bool apply = false;
+  filter.parseMaskParameters(radius, alpha, apply, params);
+  EXPECT_EQ(radius, 1.5f);
+  EXPECT_EQ(alpha, 0.25f);
+  EXPECT_TRUE(apply);
+}
+
 TEST(RGBCurveFilter, LooksUpNoMaskWithoutTheVignette) {
   // A radius of NaN would be felt in every look-up.
   const Image<RGBA8Pixel> picture = photoLikePicture(61, 47, 1);
