@@ -9,7 +9,8 @@ namespace pelorin::image_processing {
 
 /// Smooths a lightness image and keeps its edges, through a coarse grid over y, x and lightness
 /// that is blurred and read back by trilinear interpolation.
-/// @param lightness   values in [0, 1] (Lab lightness / 100).
+/// @param lightness   values in [0, 1] (Lab lightness / 100). Others, infinities and NaN included,
+///                    make no error and give what the definition gives.
 /// @param sigmaRange  lightness difference that counts as an edge, in (0, 1]; below 1/32 the range
 ///                    kernel is empty and the output is all 0.
 /// @param spatial     cell size in pixels, truncated; meant from 1 to the shorter side. Outside of
@@ -24,6 +25,11 @@ namespace pelorin::image_processing {
 template <typename T>
 void bilateralFilterGridApproximation(Image<float> lightness, float sigmaRange, float spatial,
                                       Image<T> smoothed);
+
+/// The definition of `bilateralFilterGridApproximation`.
+template <typename T>
+void bilateralFilterGridApproximationScalar(const Image<float>& lightness, float sigmaRange,
+                                            float spatial, Image<T>& smoothed);
 
 /// Side in pixels, a whole number, of the grid's cells for a smoothing extent.
 float gridCellSize(float spatial);

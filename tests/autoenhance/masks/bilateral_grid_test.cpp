@@ -7,7 +7,9 @@
 #include <limits>
 #include <utility>
 
+#include "tests/support/fingerprint.h"
 #include "tests/support/float_images.h"
+#include "tests/support/instruction_sets.h"
 #include "tests/support/mask_types.h"
 
 namespace pelorin::image_processing {
@@ -16,6 +18,7 @@ namespace {
 using test_support::Quantized;
 
 using test_support::constantImage;
+using test_support::fingerprint;
 using test_support::randomImage;
 
 Image<float> gridSmoothed(const Image<float>& image, float sigmaRange, float spatial) {
@@ -106,6 +109,28 @@ TEST(BilateralGrid, TakesAnySizeAndCell) {
         ASSERT_LE(smoothed.data.get()[i], 1.001f);
       }
     }
+  }
+}
+
+template <typename T>
+class BilateralGridOf : public testing::Test {};
+TYPED_TEST_SUITE(BilateralGridOf, test_support::MaskTypes);
+
+TYPED_TEST(BilateralGridOf, ExtraordinaryLightnessIsItsDefinition) {
+  constexpr float infinity = std::numeric_limits<float>::infinity();
+  for (const float odd : {std::nanf(""), -std::nanf(""), infinity, -infinity, 3e38f, -3e38f, 1e30f,
+                          1e20f, -0.5f, -0.0f, 7.0f}) {
+    SCOPED_TRACE(odd);
+    const Image<float> image = randomImage(67, 45, 9);
+    for (const std::uint32_t at : {0u, 700u, 701u, 1500u, 67u * 45u - 1}) {
+      image.data.get()[at] = odd;
+    }
+    Image<TypeParam> expected(67, 45), smoothed(67, 45);
+    bilateralFilterGridApproximationScalar(image, 0.7f, 4.0f, expected);
+    test_support::onEveryInstructionSet([&] {
+      bilateralFilterGridApproximation(image, 0.7f, 4.0f, smoothed);
+      ASSERT_EQ(fingerprint(smoothed), fingerprint(expected));
+    });
   }
 }
 
