@@ -54,7 +54,7 @@ struct Block {
 
 /// The steps of Lab's companding that a pixel's X, Y and Z fall on.
 HWY_NOINLINE void findSteps(const RGBA8Pixel* in, std::size_t count, Block& block) {
-  const float* const linear = colourTables().linear.data();
+  const float* const linear = sRGBToLinearTable.data();
   const auto byte = hn::Set(Words(), 0xFFu);
   for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
     prefetchAhead(in + i);

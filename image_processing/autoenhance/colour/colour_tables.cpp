@@ -3,7 +3,8 @@
 namespace pelorin::image_processing {
 
 const ColourTables& colourTables() {
-  static const ColourTables tables;
+  // Never destroyed: threads may still filter while the process ends.
+  static const ColourTables& tables = *new ColourTables;
   return tables;
 }
 

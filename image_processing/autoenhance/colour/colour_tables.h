@@ -11,7 +11,6 @@ namespace pelorin::image_processing {
 /// Every table that auto-enhance shares between photos. Built together, in one place, because
 /// tables of several files would be built in an order that the linker chooses.
 struct ColourTables {
-  std::array<float, 256> linear = makeSRGBToLinearTable();
   XYZ2labTable xyzToLab{10000};
   Lab2xzTable labToXz{1000};
   Lab2yTable labToY{1000};
@@ -22,8 +21,9 @@ struct ColourTables {
   Power flatness{0.0f, 1.0f, 512, 1.5f};              ///< Shapes the share of flat neighbours.
 };
 
-/// The process's tables, built when the library is loaded and never written afterwards, so any
-/// thread may read them. A loop over pixels asks once, before it starts.
+/// The process's tables, built when the library is loaded, never written afterwards and never
+/// destroyed, so any thread may read them until the process is gone. A loop over pixels asks once,
+/// before it starts.
 const ColourTables& colourTables();
 
 }  // namespace pelorin::image_processing

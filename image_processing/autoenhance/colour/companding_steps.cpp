@@ -20,9 +20,9 @@ std::array<float, compandingStepCount> makeLightness(float divisor) {
 void compandingStepsScalar(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t count) {
   const ColourTables& tables = colourTables();
   for (std::size_t i = 0; i < count; ++i) {
-    const float R = tables.linear[pixels[i].r];
-    const float G = tables.linear[pixels[i].g];
-    const float B = tables.linear[pixels[i].b];
+    const float R = sRGBToLinearTable[pixels[i].r];
+    const float G = sRGBToLinearTable[pixels[i].g];
+    const float B = sRGBToLinearTable[pixels[i].b];
     const float Y = 0.2126729f * R + 0.7151522f * G + 0.072175f * B;
     steps[i] = static_cast<std::uint16_t>(tables.xyzToLab.indexOf(Y));
   }

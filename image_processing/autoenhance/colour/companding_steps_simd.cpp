@@ -8,7 +8,7 @@
 #include <array>
 #include <bit>
 
-#include "image_processing/autoenhance/colour/colour_tables.h"
+#include "image_processing/autoenhance/colour/srgb.h"
 #include "image_processing/core/prefetch.h"
 #include "image_processing/core/simd.h"
 
@@ -27,11 +27,10 @@ struct Shares {
   float red[256], green[256], blue[256];
 
   Shares() {
-    const auto& linear = colourTables().linear;
     for (int code = 0; code < 256; ++code) {
-      red[code] = 0.2126729f * linear[code];
-      green[code] = 0.7151522f * linear[code];
-      blue[code] = 0.072175f * linear[code];
+      red[code] = 0.2126729f * sRGBToLinearTable[code];
+      green[code] = 0.7151522f * sRGBToLinearTable[code];
+      blue[code] = 0.072175f * sRGBToLinearTable[code];
     }
   }
 };

@@ -14,7 +14,7 @@ struct Lab {
 
 /// 8-bit sRGB to Lab. The matrix is sRGB to XYZ with the white point divided out.
 inline Lab rgbToLab(const ColourTables& tables, std::uint8_t r, std::uint8_t g, std::uint8_t b) {
-  const float R = tables.linear[r], G = tables.linear[g], B = tables.linear[b];
+  const float R = sRGBToLinearTable[r], G = sRGBToLinearTable[g], B = sRGBToLinearTable[b];
   const float fx = tables.xyzToLab(0.43394995f * R + 0.3762098f * G + 0.1898403f * B);
   const float fy = tables.xyzToLab(0.2126729f * R + 0.7151522f * G + 0.072175f * B);
   const float fz = tables.xyzToLab(0.017756583f * R + 0.10946796f * G + 0.87277544f * B);

@@ -8,9 +8,9 @@
 
 namespace pelorin::image_processing {
 
-/// Linear light, 0 ... 1, of each 8-bit sRGB code (IEC 61966-2-1), formed in double and rounded
-/// once.
-std::array<float, 256> makeSRGBToLinearTable();
+/// Linear light, 0 ... 1, of each 8-bit sRGB code (IEC 61966-2-1): the formula in double, rounded
+/// once. Checked by SRGBToLinearTable.IsTheFormulaRoundedOnce. There before any code runs.
+extern const std::array<float, 256> sRGBToLinearTable;
 
 /// Encodes linear light as 8-bit sRGB through 1024 steps. Entries are truncated, not rounded, so
 /// only the last is 255. Read-only, so any thread may look up.

@@ -2,7 +2,9 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
 #include <cmath>
+#include <type_traits>
 
 #include "image_processing/autoenhance/colour/colour_tables.h"
 
@@ -28,11 +30,15 @@ TEST(SRGBEncoder, HasTheSameCodesInFloats) {
   }
 }
 
-TEST(SRGBDecoding, RunsFromZeroToOne) {
-  const auto& linear = colourTables().linear;
-  EXPECT_EQ(linear[0], 0.0f);
-  EXPECT_EQ(linear[255], 1.0f);
-  for (int code = 1; code < 256; ++code) EXPECT_GT(linear[code], linear[code - 1]);
+TEST(SRGBToLinearTable, IsTheFormulaRoundedOnce) {
+  static_assert(std::is_same_v<decltype(sRGBToLinearTable), const std::array<float, 256>>);
+  for (int code = 0; code < 256; ++code) {
+    const double c = code / 255.0;
+    const double linear = c <= 0.04045 ? c / 12.92 : std::pow((c + 0.055) / 1.055, 2.4);
+    EXPECT_EQ(sRGBToLinearTable[code], static_cast<float>(linear)) << code;
+  }
+  EXPECT_EQ(sRGBToLinearTable[0], 0.0f);
+  EXPECT_EQ(sRGBToLinearTable[255], 1.0f);
 }
 
 }  // namespace
