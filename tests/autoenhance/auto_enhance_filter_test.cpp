@@ -12,8 +12,10 @@
 
 #include "image_processing/autoenhance/enhance_row.h"
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
+#include "tests/support/faces.h"
 #include "tests/support/filter_state.h"
 #include "tests/support/fingerprint.h"
+#include "tests/support/new_memory.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {
@@ -94,6 +96,44 @@ TYPED_TEST(AutoEnhance, BeginsWithoutMasksAtASecondInit) {
   EXPECT_EQ(fingerprint(output), fingerprint(this->enhanced(photo, "", "slider=0.5;")));
 }
 
+TYPED_TEST(AutoEnhance, TakesNoMemoryForMasksWhenGlobalOnlyUnlessAskedTo) {
+  const auto photo = flatPicture(400, 300, {224, 172, 140, 255});
+  const auto state = stateOf(photo, test_support::withFaces({{100, 300, 250, 50}}));
+  {
+    const test_support::NewMemory images(photo.pixelCount());
+    TypeParam(state).init("gtmOnly=true;");
+    EXPECT_EQ(images.blocks(), 0);
+  }
+  const test_support::NewMemory images(photo.pixelCount());
+  TypeParam filter(state);
+  filter.init("gtmOnly=true;gtmExtraMemory=true;");
+  EXPECT_EQ(images.blocks(), 2);
+  EXPECT_TRUE(images.untouched());
+}
+
+TYPED_TEST(AutoEnhance, AppliesTheConfigurationItIsGivenAndPreparesByItsSessions) {
+  const auto photo = photoLikePicture(60, 45, 11);
+  // One field for the curve and one for the masks, which the slider leaves alone.
+  FilterConfig other = defaultFilterConfigValue;
+  other.histogramClipHigh = 1.1f;
+  other.bilateralRange = 0.1f;
+  const auto made = [&](const FilterConfig& ofSession, const FilterConfig& given) {
+    TypeParam filter(stateOf(photo, {}, ofSession));
+    filter.init("");
+    Image<RGBA8Pixel> output(60, 45);
+    filter.applyConfig("slider=0.6;", given, output);
+    return fingerprint(output);
+  };
+  FilterConfig otherCurve = defaultFilterConfigValue, otherMasks = defaultFilterConfigValue;
+  otherCurve.histogramClipHigh = other.histogramClipHigh;
+  otherMasks.bilateralRange = other.bilateralRange;
+  const std::string plain = made(defaultFilterConfigValue, defaultFilterConfigValue);
+  EXPECT_EQ(made(defaultFilterConfigValue, other), made(defaultFilterConfigValue, otherCurve));
+  EXPECT_EQ(made(other, defaultFilterConfigValue), made(otherMasks, defaultFilterConfigValue));
+  EXPECT_NE(made(defaultFilterConfigValue, other), plain);
+  EXPECT_NE(made(other, defaultFilterConfigValue), plain);
+}
+
 TYPED_TEST(AutoEnhance, FailsWithoutASliderAndLeavesTheOutput) {
   const auto photo = photoLikePicture(20, 20, 4);
   TypeParam filter(stateOf(photo));
@@ -140,9 +180,13 @@ TYPED_TEST(AutoEnhance, HandsOutCopiesOfItsMasks) {
   const std::string before = fingerprint(*bilateral);
   EXPECT_EQ(bilateral->width, 40u);
   EXPECT_EQ(bilateral->height, 30u);
+  const auto ltm = filter.getLtmMask();
+  const std::string ltmBefore = fingerprint(*ltm);
+  EXPECT_NE(ltmBefore, before);
   bilateral->set(0.0f);
+  ltm->set(0.0f);
   EXPECT_EQ(fingerprint(*filter.getBilateralMask()), before);
-  EXPECT_NE(fingerprint(*filter.getLtmMask()), before);
+  EXPECT_EQ(fingerprint(*filter.getLtmMask()), ltmBefore);
 }
 
 TYPED_TEST(AutoEnhance, TakesEverySize) {

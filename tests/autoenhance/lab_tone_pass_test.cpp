@@ -80,6 +80,26 @@ TEST(LabTonePass, ClampsLightnessOnlyWithMasks) {
   }
 }
 
+TEST(LabTonePass, DoesNotClampLightnessWithoutMasks) {
+  // A curve to half as much again as white: a green pixel's a is far from 0, and the colour it
+  // becomes depends on L beyond 100.
+  const RGBA8Pixel green{20, 250, 30, 7};
+  std::vector<float> curve = identityCurve();
+  for (float& sample : curve) sample *= 1.5f;
+  Image<RGBA8Pixel> output(1, 1);
+  imageVibranceLabAndToneCurve(flatPicture(1, 1, green), output, withoutMasks(), curve, 100.0f,
+                               ImageMasks<float, float>{});
+  const Lab lab = rgbToLab(green.r, green.g, green.b);
+  const auto atLightness = [&](float L) {
+    RGBA8Pixel pixel = green;
+    labToRgb({L, lab.a, lab.b}, pixel.r, pixel.g, pixel.b);
+    vibranceInRGB(1.0f, pixel.r, pixel.g, pixel.b);
+    return pixel;
+  };
+  EXPECT_EQ(output.row(0)[0], atLightness(1.5f * lab.L));
+  EXPECT_NE(output.row(0)[0], atLightness(100.0f)) << "the test could not tell the difference";
+}
+
 TEST(LabTonePass, TreatsMasksThatWereNeverComputedAsOff) {
   const auto photo = photoLikePicture(20, 20, 5);
   Image<RGBA8Pixel> off(20, 20), empty(20, 20), allocated(20, 20);

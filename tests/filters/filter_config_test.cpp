@@ -14,6 +14,27 @@ FilterConfig atSlider(float slider) {
   return config;
 }
 
+TEST(FilterConfig, HasItsDefaults) {
+  for (const FilterConfig& config : {FilterConfig{}, defaultFilterConfigValue}) {
+    EXPECT_EQ(config.vibrance, 1.0f);
+    EXPECT_EQ(config.slider, 0.0f);
+    EXPECT_EQ(config.faceTarget, -1.0f);
+    EXPECT_EQ(config.histogramClipLow, 0.75f);
+    EXPECT_EQ(config.histogramClipHigh, 8.0f);
+    EXPECT_EQ(config.detailGain, 0.2f);
+    EXPECT_EQ(config.ltmBlend, 0.0f);
+    EXPECT_EQ(config.detailGainLow, 0.2f);
+    EXPECT_EQ(config.detailGainHigh, 1.0f);
+    EXPECT_EQ(config.bilateralRange, 0.7f);
+    EXPECT_EQ(config.bilateralSpatialFraction, 0.025f);
+    EXPECT_EQ(config.useBilateralGrid, 1);
+    EXPECT_EQ(config.ltmMaskAmount, 1.0f);
+    EXPECT_EQ(config.ltmMaskRadius, 8);
+    EXPECT_EQ(config.ltmBlendLow, 0.5f);
+    EXPECT_EQ(config.ltmBlendHigh, 0.7f);
+  }
+}
+
 TEST(SliderMapping, IsNeutralAtZeroAndKeepsTheOtherFields) {
   FilterConfig expected = defaultFilterConfigValue;
   expected.vibrance = 1.0f;

@@ -5,7 +5,9 @@
 
 #include <atomic>
 #include <boost/lexical_cast.hpp>
+#include <chrono>
 #include <cstring>
+#include <future>
 #include <mutex>
 #include <stdexcept>
 #include <thread>
@@ -13,6 +15,7 @@
 #include <vector>
 
 #include "image_processing/filters/default_filter_factory.h"
+#include "image_processing/filters/pass_through.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/pictures.h"
 
@@ -160,6 +163,71 @@ TEST_F(FilteredImageTest, MakesAtLeastOneFilterAndCachesOneWhenThreadsMissTogeth
   for (std::thread& thread : threads) thread.join();
   for (const auto& output : outputs) EXPECT_EQ(fingerprint(output), fingerprint(*image));
   EXPECT_EQ(session.setupFilter("PassThrough", ""), session.setupFilter("PassThrough", ""));
+}
+
+/// Asks its session for another filter, from another thread, while it is made, initialised and
+/// applied. A session that kept its lock would answer when that is over.
+class AskingFilter : public AbstractFilter {
+ public:
+  explicit AskingFilter(std::shared_ptr<FilteredImageState> state)
+      : AbstractFilter(std::move(state)) {
+    ask("make");
+  }
+  void init(const std::string&) override { ask("init"); }
+  void applyConfig(const std::string&, const FilterConfig&, Image<RGBA8Pixel>&) override {
+    ask("apply");
+  }
+
+  static inline FilteredImage* session = nullptr;
+  static inline std::vector<std::string> answered = {}, unanswered = {};
+
+ private:
+  void ask(const std::string& when) {
+    auto asked = std::async(std::launch::async, [] { session->setupFilter("PassThrough", ""); });
+    const bool inTime = asked.wait_for(std::chrono::seconds(10)) == std::future_status::ready;
+    (inTime ? answered : unanswered).push_back(when);
+    threads_.push_back(std::move(asked));
+  }
+
+  std::vector<std::future<void>> threads_;
+};
+
+TEST_F(FilteredImageTest, AnswersOthersWhileAFilterIsMadeInitialisedAndApplied) {
+  ConcreteDescription<AskingFilter> asking("Asking", "", "");
+  ConcreteDescription<PassThrough> passThrough("PassThrough", "", "");
+  factory->addFilterDescription(&asking);
+  factory->addFilterDescription(&passThrough);
+  FilteredImage session(image, {}, "", defaultFilterConfigValue, factory);
+  AskingFilter::session = &session;
+  Image<RGBA8Pixel> output(8, 6);
+  EXPECT_TRUE(session.applyFilterWithParams("Asking", "", {}, output));
+  EXPECT_THAT(AskingFilter::answered, ElementsAre("make", "init", "apply"));
+  EXPECT_THAT(AskingFilter::unanswered, IsEmpty());
+}
+
+/// The first of these has its session make another of the same name while it is initialised, as a
+/// second thread would that misses it in the cache.
+class RivalFilter : public PassThrough {
+ public:
+  using PassThrough::PassThrough;
+  void init(const std::string&) override {
+    if (rival != nullptr) return;
+    rival = this;  // stands for one that is still to come
+    rival = session->setupFilter("Rival", "").get();
+  }
+
+  static inline FilteredImage* session = nullptr;
+  static inline const AbstractFilter* rival = nullptr;
+};
+
+TEST_F(FilteredImageTest, KeepsTheFilterStoredLastOfTwoThatMissedTogether) {
+  ConcreteDescription<RivalFilter> description("Rival", "", "");
+  factory->addFilterDescription(&description);
+  FilteredImage session(image, {}, "", defaultFilterConfigValue, factory);
+  RivalFilter::session = &session;
+  const auto later = session.setupFilter("Rival", "");
+  EXPECT_NE(later.get(), RivalFilter::rival) << "each gets its own";
+  EXPECT_EQ(session.setupFilter("Rival", ""), later);
 }
 
 TEST(FilteredImage, PassThroughGivesACopyOfTheSource) {

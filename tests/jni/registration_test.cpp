@@ -3,6 +3,10 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <string>
+#include <utility>
+#include <vector>
+
 #include "jni/load_time_cache.h"
 #include "platform/pn/jni_lookup.h"
 #include "tests/jni/support/fake_environment.h"
@@ -35,6 +39,40 @@ TEST_F(Registration, NamesTheSixNatives) {
                   "init(Landroid/graphics/Bitmap;)J", "preprocess([Landroid/graphics/RectF;J)V",
                   "releaseSession(J)V",
                   "similarityScore(Landroid/graphics/Bitmap;DILandroid/graphics/Bitmap;DI)F"));
+}
+
+/// What one call to RegisterNatives gave, in order: the class, then names and signatures.
+std::vector<std::vector<std::string>> tablesGiven;
+jint (*registerInFake)(JNIEnv*, jclass, const JNINativeMethod*, jint);
+
+jint JNICALL recordTable(JNIEnv* env, jclass owner, const JNINativeMethod* methods, jint count) {
+  const auto* const object = static_cast<FakeEnvironment*>(env)->resolve(owner, "the test");
+  std::vector<std::string>& table = tablesGiven.emplace_back(1, object->text);
+  for (jint i = 0; i < count; ++i) {
+    table.push_back(std::string(methods[i].name) + methods[i].signature);
+  }
+  return registerInFake(env, owner, methods, count);
+}
+
+TEST_F(Registration, GivesEachClassItsTableInOrder) {
+  JNINativeInterface_ recording = *env.functions;
+  registerInFake = std::exchange(recording.RegisterNatives, recordTable);
+  env.functions = &recording;
+  tablesGiven.clear();
+  ASSERT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_VERSION_1_6);
+  using testing::ElementsAre;
+  EXPECT_THAT(
+      tablesGiven,
+      ElementsAre(
+          ElementsAre("com/pelorin/photos/quenby/autoenhance/QuenbyEngine",
+                      "init(Landroid/graphics/Bitmap;)J", "preprocess([Landroid/graphics/RectF;J)V",
+                      "releaseSession(J)V",
+                      "applyAutoEnhanceFilter(JLandroid/graphics/Bitmap;Ljava/lang/String;"
+                      "Ljava/lang/String;)V",
+                      "applyAutoEnhanceFilterToJpegFile(Ljava/lang/String;Ljava/lang/String;I"
+                      "[Landroid/graphics/RectF;ILjava/lang/String;Ljava/lang/String;)Z"),
+          ElementsAre("com/pelorin/photos/quenby/autoenhance/ImageDupeDetector",
+                      "similarityScore(Landroid/graphics/Bitmap;DILandroid/graphics/Bitmap;DI)F")));
 }
 
 TEST_F(Registration, ReadsTheErrorValueOfTheJavaClass) {

@@ -55,6 +55,31 @@ TEST(ImageStatistics, ReportAMedianInTheLastEntryAsNone) {
             -1);
 }
 
+TEST(ImageStatistics, FindTheMedianWhereTheCdfReachesOneHalf) {
+  // One dark and one bright pixel: the CDF is exactly one half behind the dark one's bin.
+  Image<RGBA8Pixel> two(2, 1);
+  two.row(0)[0] = {20, 20, 20, 255};
+  two.row(0)[1] = {200, 200, 200, 255};
+  const auto behind = [](int code) {
+    return static_cast<int>(49.0f * rgbToLab(code, code, code).L / 100.0f) + 1;
+  };
+  ASSERT_LT(behind(20), behind(200));
+  EXPECT_EQ(statisticsOf(two, withFaces({{0, 1, 0, 0}})).faceMedianBin, behind(20));
+}
+
+TEST(ImageStatistics, AreTheSameHoweverTheyAreAskedFor) {
+  for (std::uint64_t seed = 0; seed < 3; ++seed) {
+    const auto photo = photoLikePicture(90, 70, seed);
+    const ImageMetadata metadata = withFaces({{20, 50, 60, 10}, {-5, 8, 90, 40}});
+    const ImageStatistics expected = statisticsOf(photo, metadata);
+    ImageStatistics statistics;
+    computeImageStatistics(photo, metadata, 50, 100.0f, statistics);
+    EXPECT_EQ(statistics.cdf, expected.cdf);
+    EXPECT_EQ(statistics.faceMedianBin, expected.faceMedianBin);
+    EXPECT_GT(expected.faceMedianBin, 0);
+  }
+}
+
 TEST(ImageStatistics, CountAPixelOncePerBoxWithoutMovingTheMedian) {
   const auto photo = photoLikePicture(50, 40, 3);
   const BoundingBox whole{0, 49, 39, 0};

@@ -48,6 +48,23 @@ TEST(FaceBlend, AffectsTheClampedPartOfAFaceWhoseCentreIsOutside) {
   EXPECT_EQ(mask.row(20)[13], 1.0f);
 }
 
+TEST(FaceBlend, TruncatesTheCentreTowardZero) {
+  const auto photo = flatPicture(40, 40, skin);
+  Image<float> mask(40, 40);
+  mask.set(1.0f);
+  blendFaceIntoMask({10, 15, 30, 10}, photo, mask);  // 12 and not 12.5: columns 7 ... 17
+  EXPECT_LT(mask.row(20)[8], 0.9f);
+  EXPECT_LT(mask.row(20)[16], 0.9f);
+  EXPECT_EQ(mask.row(20)[18], 1.0f);
+
+  mask.set(1.0f);
+  blendFaceIntoMask({-8, 7, 30, 10}, photo, mask);  // 0 and not -1: columns 0 ... 15
+  EXPECT_LT(mask.row(20)[14], 0.95f);
+  mask.set(1.0f);
+  blendFaceIntoMask({10, 30, 7, -8}, photo, mask);  // rows likewise
+  EXPECT_LT(mask.row(14)[20], 0.95f);
+}
+
 TEST(FaceBlend, SkipsARegionWithoutWidthOrHeight) {
   const auto photo = flatPicture(40, 40, skin);
   for (const BoundingBox& box :

@@ -21,6 +21,7 @@
 #include "tests/support/fingerprint.h"
 #include "tests/support/instruction_sets.h"
 #include "tests/support/mask_types.h"
+#include "tests/support/new_memory.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::image_processing {
@@ -307,6 +308,39 @@ TYPED_TEST(PrepareImage, OfAnEmptyPhotoIsEmpty) {
     EXPECT_EQ(statistics.cdf, alone.cdf);
     EXPECT_EQ(statistics.faceMedianBin, -1);
   }
+}
+
+template <typename T>
+class ImageMasksOf : public testing::Test {};
+TYPED_TEST_SUITE(ImageMasksOf, test_support::MaskTypes);
+
+TYPED_TEST(ImageMasksOf, AreTwoImagesThatNobodyWritesWithoutDetailGain) {
+  const auto photo = flatPicture(400, 300, skin);
+  FilterConfig config = defaultFilterConfigValue;
+  config.detailGainHigh = 0.0f;
+  for (const std::int32_t grid : {0, 1}) {
+    config.useBilateralGrid = grid;
+    // Whatever has a value for each pixel: two masks, and no lightness.
+    const test_support::NewMemory images(photo.pixelCount());
+    ImageMasks<TypeParam, TypeParam> masks;
+    computeImageMasks(photo, withFaces({{100, 300, 250, 50}}), config, masks);
+    EXPECT_EQ(images.blocks(), 2);
+    EXPECT_TRUE(images.untouched());
+  }
+}
+
+TYPED_TEST(ImageMasksOf, ComeFromTheGridForAnyNumberButZero) {
+  const auto photo = photoLikePicture(60, 40, 11);
+  FilterConfig config = defaultFilterConfigValue;
+  config.bilateralSpatialFraction = 0.1f;
+  const auto bilateral = [&](std::int32_t useBilateralGrid) {
+    config.useBilateralGrid = useBilateralGrid;
+    return fingerprint(*masksOf<ImageMasks<TypeParam, TypeParam>>(photo, {}, config).bilateralMask);
+  };
+  for (const std::int32_t any : {-1, 2, 256, -2147483647 - 1}) {
+    EXPECT_EQ(bilateral(any), bilateral(1)) << any;
+  }
+  EXPECT_NE(bilateral(0), bilateral(1));
 }
 
 }  // namespace
