@@ -48,11 +48,20 @@ function(pelorin_compile_as_test target)
   target_precompile_headers(${target} REUSE_FROM pelorin_test_headers)
 endfunction()
 
-# The shared libraries stand in one folder and find each other there, wherever it goes.
+# The shared libraries stand in one folder and find each other there, wherever it goes; pages of 16 KiB
+# load them, too.
 function(pelorin_place_beside_each_other target)
   set_target_properties(
     ${target} PROPERTIES LIBRARY_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/lib
                          INSTALL_RPATH $ORIGIN BUILD_WITH_INSTALL_RPATH ON)
+  target_link_options(${target} PRIVATE -Wl,-z,max-page-size=16384)
+  if(PELORIN_SELF_CONTAINED)
+    # What is linked in is nobody else's: two copies in one process must not mix.
+    target_sources(${target} PRIVATE $<TARGET_OBJECTS:pelorin_older_glibc>)
+    target_link_options(
+      ${target} PRIVATE -static-libstdc++ -Wl,--gc-sections -Wl,--strip-all
+                        -Wl,--exclude-libs,libstdc++.a:libhwy.a:libjpeg.a:liblcms2.a)
+  endif()
 endfunction()
 
 # The longest tests start first: begun last, one of them would run alone.

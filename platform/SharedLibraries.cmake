@@ -12,6 +12,9 @@ if(NOT PELORIN_DEVICE_LIBRARIES)
                              INTERFACE ${PROJECT_SOURCE_DIR}/platform/jnigraphics/include)
 endif()
 
+add_library(pelorin_older_glibc OBJECT EXCLUDE_FROM_ALL older_glibc.cpp)
+target_compile_options(pelorin_older_glibc PRIVATE -ffunction-sections)
+
 # platform_library(<name> SOURCES ... [DEPENDS ...] [PRIVATE ...]): lib<name>.so, or the device's.
 function(platform_library name)
   cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "SOURCES;DEPENDS;PRIVATE")
@@ -25,8 +28,10 @@ function(platform_library name)
   endif()
   add_library(${name} SHARED ${arg_SOURCES})
   target_link_libraries(${name} PUBLIC ${arg_DEPENDS} PRIVATE ${arg_PRIVATE})
-  # Interfaces are what these libraries are for.
+  # Interfaces are what these libraries are for; the C++ library's templates are not.
   set_target_properties(${name} PROPERTIES CXX_VISIBILITY_PRESET default)
+  target_link_options(
+    ${name} PRIVATE -Wl,--version-script=${PROJECT_SOURCE_DIR}/jni/exported_symbols.map)
   pelorin_place_beside_each_other(${name})
 endfunction()
 

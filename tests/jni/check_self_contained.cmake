@@ -1,0 +1,60 @@
+# What the five libraries in a folder ask of a Linux machine: the C library from glibc 2.28 on, with
+# the compiler's runtime that belongs to every such system, and pages of up to 16 KiB.
+#   cmake -DFOLDER=<folder> -DREADELF=<readelf> -P check_self_contained.cmake
+cmake_minimum_required(VERSION 3.25)
+set(newest 2.28)
+
+set(failures 0)
+macro(complain)
+  message("${ARGN}")
+  math(EXPR failures "${failures} + 1")
+endmacro()
+
+set(found "")
+foreach(name libpn libpnjni libpn_imgproc libjnigraphics libpn_quenby)
+  set(library ${FOLDER}/${name}.so)
+  execute_process(COMMAND ${READELF} --wide --dynamic --version-info --program-headers ${library}
+                  OUTPUT_VARIABLE facts COMMAND_ERROR_IS_FATAL ANY)
+
+  string(REGEX MATCHALL "\\(NEEDED\\)[^\n]*" lines "${facts}")
+  foreach(line IN LISTS lines)
+    if(NOT line MATCHES "\\[(lib(pn|pnjni|pn_imgproc|jnigraphics)\\.so|lib(c|m)\\.so\\.6)\\]"
+       AND NOT line MATCHES "\\[(libgcc_s\\.so\\.1|ld-linux[-a-z0-9_]*\\.so\\.[0-9])\\]")
+      complain("${library}: ${line}")
+    endif()
+  endforeach()
+
+  string(REGEX MATCHALL "GLIBC_[0-9.]+" versions "${facts}")
+  if(NOT versions)
+    complain("${library}: no versions to compare")
+  endif()
+  foreach(version IN LISTS versions)
+    string(REPLACE GLIBC_ "" version ${version})
+    list(APPEND found ${version})
+    if(version VERSION_GREATER newest)
+      complain("${library}: asks for glibc ${version}")
+    endif()
+  endforeach()
+
+  string(REGEX MATCHALL " LOAD [^\n]* 0x([0-9a-f]+)\n" segments "${facts}\n")
+  if(NOT segments)
+    complain("${library}: no segments to load")
+  endif()
+  foreach(segment IN LISTS segments)
+    string(REGEX REPLACE ".* (0x[0-9a-f]+)\n" "\\1" alignment "${segment}")
+    math(EXPR pages "${alignment} % 0x4000")
+    if(NOT pages EQUAL 0)
+      complain("${library}: a segment is aligned to ${alignment}")
+    endif()
+  endforeach()
+  if(facts MATCHES "GNU_STACK[^\n]*RWE")
+    complain("${library}: an executable stack")
+  endif()
+endforeach()
+
+if(failures)
+  message(FATAL_ERROR "${failures} demands that a machine may not meet, in ${FOLDER}")
+endif()
+list(SORT found COMPARE NATURAL ORDER DESCENDING)
+list(GET found 0 version)
+message("The libraries in ${FOLDER} need glibc ${version} or newer, and nothing else.")
