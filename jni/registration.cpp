@@ -41,10 +41,10 @@ void cacheRectF(JNIEnv* env) {
   loadTimeCache.top = getFieldIdOrThrow(env, rectF.get(), "top", "F");
   loadTimeCache.right = getFieldIdOrThrow(env, rectF.get(), "right", "F");
   loadTimeCache.bottom = getFieldIdOrThrow(env, rectF.get(), "bottom", "F");
-  const auto global = static_cast<jclass>(env->NewGlobalRef(rectF.get()));
-  throwCppExceptionIf(global == nullptr);
-  const jclass previous = std::exchange(loadTimeCache.rectF, global);
-  if (previous != nullptr) env->DeleteGlobalRef(previous);
+  const jweak weak = env->NewWeakGlobalRef(rectF.get());
+  throwCppExceptionIf(weak == nullptr);
+  forgetJava(env);
+  loadTimeCache.rectF = weak;
 }
 
 }  // namespace
@@ -78,6 +78,11 @@ void registerImageDupeDetectorNatives() {
   const jfieldID field = env->GetStaticFieldID(owner.get(), "SIMILARITY_ERROR", "F");
   throwCppExceptionIf(field == nullptr);
   loadTimeCache.similarityError = env->GetStaticFloatField(owner.get(), field);
+}
+
+void forgetJava(JNIEnv* env) {
+  const jweak rectF = std::exchange(loadTimeCache.rectF, nullptr);
+  if (rectF != nullptr) env->DeleteWeakGlobalRef(rectF);
 }
 
 }  // namespace pelorin::quenby

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <jni.h>
+
 namespace pelorin::quenby {
 
 /// Fills the load-time cache with what is known of RectF and registers the natives of QuenbyEngine.
@@ -9,5 +11,8 @@ void registerQuenbyFilterNatives();
 
 /// Registers the native of ImageDupeDetector and reads its SIMILARITY_ERROR; throws likewise.
 void registerImageDupeDetectorNatives();
+
+/// Gives up the references that registering made.
+void forgetJava(JNIEnv* env);
 
 }  // namespace pelorin::quenby

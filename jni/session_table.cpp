@@ -59,6 +59,12 @@ void SessionTable::release(jlong handle) {
   logUnknown(handle);
 }
 
+void SessionTable::releaseAll() {
+  decltype(sessions_) sessions;  // freed after the lock
+  const std::lock_guard lock(mutex_);
+  sessions.swap(sessions_);
+}
+
 std::size_t SessionTable::size() const {
   const std::lock_guard lock(mutex_);
   return sessions_.size();

@@ -15,9 +15,9 @@ macro(complain)
   math(EXPR failures "${failures} + 1")
 endmacro()
 
-# The load function, the default configuration, and the toolkit: quality, corners, descriptors, the
+# The load functions, the default configuration, and the toolkit: quality, corners, descriptors, the
 # grey image of the duplicate score.
-set(wanted JNI_OnLoad nonmax_suppression)
+set(wanted JNI_OnLoad JNI_OnUnload nonmax_suppression)
 foreach(arc 9 10 11 12)
   list(APPEND wanted fast${arc}_detect fast${arc}_score fast${arc}_corner_score
                      fast${arc}_detect_nonmax)

@@ -8,10 +8,13 @@
 #include <vector>
 
 #include "jni/load_time_cache.h"
+#include "jni/session_table.h"
 #include "platform/pn/jni_lookup.h"
 #include "tests/jni/support/fake_environment.h"
+#include "tests/support/pictures.h"
 
 extern "C" jint JNI_OnLoad(JavaVM* vm, void* reserved);
+extern "C" void JNI_OnUnload(JavaVM* vm, void* reserved);
 
 namespace pelorin::quenby {
 namespace {
@@ -86,11 +89,26 @@ TEST(LoadTimeCache, HasAnErrorValueBeforeJavaIsAsked) {
   EXPECT_EQ(LoadTimeCache().similarityError, -2222.0f);
 }
 
-TEST_F(Registration, HoldsOneGlobalReferenceHoweverOftenItRuns) {
+TEST_F(Registration, HoldsOneWeakReferenceHoweverOftenItRuns) {
+  for (int i = 0; i < 3; ++i) {
+    ASSERT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_VERSION_1_6);
+    if (i == 0) env.weakReferences = 1;  // another test's may have been given up
+    EXPECT_EQ(env.weakReferences, 1);
+    EXPECT_EQ(env.globalReferences, 0);
+  }
+}
+
+TEST_F(Registration, IsUndoneWhenTheLibraryGoes) {
   ASSERT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_VERSION_1_6);
-  env.globalReferences = 1;
-  ASSERT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_VERSION_1_6);
-  EXPECT_EQ(env.globalReferences, 1);
+  env.weakReferences = 1;
+  const jlong handle = openSessions().open(
+      std::make_shared<QuenbySession>(test_support::flatPicture(2, 2, {1, 2, 3, 4})));
+  const std::weak_ptr<QuenbySession> forgotten = openSessions().find(handle);
+  for (int i = 0; i < 2; ++i) {
+    JNI_OnUnload(FakeEnvironment::machine(), nullptr);
+    EXPECT_EQ(env.weakReferences, 0);
+    EXPECT_TRUE(forgotten.expired());
+  }
 }
 
 TEST_F(Registration, FailsForAMissingClassOrMember) {
@@ -122,15 +140,15 @@ TEST_F(Registration, FailsWithWhateverCallFails) {
   env.failCall(0);
   ASSERT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_VERSION_1_6);
   const int calls = env.fallibleCalls();
-  // RectF and its fields, a global reference, then find and register twice, then find and look up.
+  // RectF and its fields, a weak reference, then find and register twice, then find and look up.
   EXPECT_EQ(calls, 6 + 2 + 2 + 2);
   for (int call = 1; call <= calls; ++call) {
     for (const Failure failure : {Failure::withException, Failure::withoutException}) {
-      const int references = env.globalReferences;
+      const int references = env.weakReferences;
       env.failCall(call, failure);
       EXPECT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_ERR) << call;
       EXPECT_NE(env.takeException(), "") << call;
-      EXPECT_EQ(env.globalReferences, references) << call;
+      EXPECT_EQ(env.weakReferences, references) << call;
     }
   }
 }

@@ -231,6 +231,16 @@ struct FakeFunctions {
 
   static void deleteGlobalRef(JNIEnv* env, jobject) { --of(env).globalReferences; }
 
+  static jweak newWeakGlobalRef(JNIEnv* env, jobject object) {
+    FakeEnvironment& fake = of(env);
+    fake.checkNothingPending("NewWeakGlobalRef");
+    if (fake.shouldFail("NewWeakGlobalRef")) return nullptr;
+    ++fake.weakReferences;
+    return reinterpret_cast<jweak>(fake.resolve(object, "NewWeakGlobalRef"));
+  }
+
+  static void deleteWeakGlobalRef(JNIEnv* env, jweak) { --of(env).weakReferences; }
+
   static void deleteLocalRef(JNIEnv* env, jobject reference) {
     FakeEnvironment& fake = of(env);
     if (reference == nullptr) return;
@@ -277,6 +287,8 @@ struct FakeFunctions {
       made.ExceptionCheck = exceptionCheck;
       made.NewGlobalRef = newGlobalRef;
       made.DeleteGlobalRef = deleteGlobalRef;
+      made.NewWeakGlobalRef = newWeakGlobalRef;
+      made.DeleteWeakGlobalRef = deleteWeakGlobalRef;
       made.DeleteLocalRef = deleteLocalRef;
       return made;
     }();

@@ -69,6 +69,7 @@ class FakeEnvironment : public JNIEnv {
   jobject newLocal(FakeObject* object, const char* function);
 
   int globalReferences = 0;
+  int weakReferences = 0;
   int charactersInUse = 0;
   int localReferences = 0;
   int mostLocalReferences = 0;
