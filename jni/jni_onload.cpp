@@ -1,7 +1,7 @@
 #include <jni.h>
 
+#include "image_processing/core/never_destroyed.h"
 #include "jni/registration.h"
-#include "jni/session_table.h"
 #include "platform/pnjni/environment.h"
 
 /// Called by the virtual machine when the library is loaded: registers all natives. JNI_ERR, with a
@@ -13,9 +13,10 @@ extern "C" JNIEXPORT jint JNICALL JNI_OnLoad(JavaVM* vm, void*) {
   });
 }
 
-/// Called when the class loader that loaded the library is gone, so nobody can use a handle any more.
+/// Called when the class loader that loaded the library is gone. The library goes next, with the
+/// sessions that nobody released.
 extern "C" JNIEXPORT void JNICALL JNI_OnUnload(JavaVM* vm, void*) {
-  pelorin::quenby::openSessions().releaseAll();
+  pelorin::image_processing::libraryIsUnloaded = true;
   void* env = nullptr;
   if (vm->GetEnv(&env, JNI_VERSION_1_6) == JNI_OK)
     pelorin::quenby::forgetJava(static_cast<JNIEnv*>(env));

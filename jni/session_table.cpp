@@ -5,6 +5,7 @@
 #include <random>
 #include <utility>
 
+#include "image_processing/core/never_destroyed.h"
 #include "jni/log.h"
 
 namespace pelorin::quenby {
@@ -59,20 +60,13 @@ void SessionTable::release(jlong handle) {
   logUnknown(handle);
 }
 
-void SessionTable::releaseAll() {
-  decltype(sessions_) sessions;  // freed after the lock
-  const std::lock_guard lock(mutex_);
-  sessions.swap(sessions_);
-}
-
 std::size_t SessionTable::size() const {
   const std::lock_guard lock(mutex_);
   return sessions_.size();
 }
 
 SessionTable& openSessions() {
-  // Never destroyed: Java threads may still run while the process ends.
-  static auto* const table = new SessionTable;
+  static const image_processing::NeverDestroyed<SessionTable> table;
   return *table;
 }
 

@@ -25,8 +25,6 @@ class SessionTable {
   /// Takes the session out of the table; a line in the log when it is not there.
   void release(jlong handle);
 
-  void releaseAll();
-
   std::size_t size() const;
 
  private:

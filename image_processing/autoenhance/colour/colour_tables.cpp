@@ -1,11 +1,12 @@
 #include "image_processing/autoenhance/colour/colour_tables.h"
 
+#include "image_processing/core/never_destroyed.h"
+
 namespace pelorin::image_processing {
 
 const ColourTables& colourTables() {
-  // Never destroyed: threads may still filter while the process ends.
-  static const ColourTables& tables = *new ColourTables;
-  return tables;
+  static const NeverDestroyed<ColourTables> tables;
+  return *tables;
 }
 
 namespace {
