@@ -21,16 +21,17 @@ if(PELORIN_SANITIZE)
   add_link_options(-fsanitize=${PELORIN_SANITIZE})
 endif()
 
-# pelorin_library(<name> SOURCES ... [DEPENDS ...]): the library pelorin_<name> of one folder.
+# pelorin_library(<name> SOURCES ... [DEPENDS ...] [PRIVATE ...]): the library pelorin_<name> of one
+# folder; PRIVATE is what only its sources include.
 function(pelorin_library name)
-  cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "SOURCES;DEPENDS")
+  cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "SOURCES;DEPENDS;PRIVATE")
   set(target pelorin_${name})
   add_library(${target} STATIC ${arg_SOURCES})
   target_include_directories(
     ${target} PUBLIC $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}>
                      $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}/quenby>)
   target_compile_features(${target} PUBLIC cxx_std_20)
-  target_link_libraries(${target} PUBLIC ${arg_DEPENDS})
+  target_link_libraries(${target} PUBLIC ${arg_DEPENDS} PRIVATE ${arg_PRIVATE})
 endfunction()
 
 # For code that is compiled far more often than it runs. Sanitizers triple what an optimiser costs on

@@ -8,7 +8,7 @@
 #include "photo/metadata/exif_orientation.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
-  using namespace pelorin::cli;
+  using namespace pelorin::photo;
   // Random bytes hardly ever begin as Exif does, so the bytes also stand behind such a beginning.
   const std::vector<std::uint8_t> bytes(data, data + size);
   for (const char* beginning : {"", "II\x2A\0", "MM\0\x2A"}) {

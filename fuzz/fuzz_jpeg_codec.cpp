@@ -9,7 +9,7 @@
 
 namespace {
 
-using namespace pelorin::imgproc;
+using namespace pelorin::photo;
 
 constexpr DecodeLimits limits = {.pixels = 1 << 18, .scans = 20};
 
@@ -24,12 +24,12 @@ void readEveryWay(const std::vector<std::uint8_t>& file, int scale) {
     check(picture.width <= header.width && picture.height <= header.height);
     const std::size_t count = std::size_t{picture.width} * picture.height;
     for (std::size_t i = 0; i < count; ++i) check(picture.pixels.get()[i * 4 + 3] == 255);
-  } catch (const JpegError&) {
+  } catch (const PhotoError&) {
   }
   for (const int degrees : {0, 90, 180}) {
     try {
       readJpegHeader(rotateJpeg(file, degrees, limits));
-    } catch (const JpegError&) {
+    } catch (const PhotoError&) {
     }
   }
 }

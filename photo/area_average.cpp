@@ -4,7 +4,11 @@
 #include <array>
 #include <vector>
 
-namespace pelorin::cli {
+namespace pelorin::photo {
+
+using image_processing::Image;
+using image_processing::RGBA8Pixel;
+
 namespace {
 
 /// Red, green and blue, summed with weights.
@@ -82,4 +86,4 @@ Image<RGBA8Pixel> areaAverage(const Image<RGBA8Pixel>& picture, PictureSize size
   return result;
 }
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -1,19 +1,9 @@
 #pragma once
 
-#include <cstdint>
-
 #include "image_processing/core/image.h"
+#include "photo/picture_size.h"
 
-namespace pelorin::cli {
-
-using image_processing::Image;
-using image_processing::RGBA8Pixel;
-
-struct PictureSize {
-  std::uint32_t width, height;
-
-  friend bool operator==(const PictureSize&, const PictureSize&) = default;
-};
+namespace pelorin::photo {
 
 /// The largest size of the picture's shape that fits the box; a picture smaller than the box keeps
 /// its own. Both sides of the result are at least 1, however thin the picture.
@@ -25,6 +15,7 @@ PictureSize fitWithin(PictureSize picture, PictureSize box);
 /// @param picture  at least one pixel.
 /// @param size     both sides at least 1; meant to be smaller than the picture.
 /// @throws std::bad_alloc when the result does not fit into memory.
-Image<RGBA8Pixel> areaAverage(const Image<RGBA8Pixel>& picture, PictureSize size);
+image_processing::Image<image_processing::RGBA8Pixel> areaAverage(
+    const image_processing::Image<image_processing::RGBA8Pixel>& picture, PictureSize size);
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -13,7 +13,7 @@
 
 namespace fs = std::filesystem;
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 constexpr std::uint64_t largestFile = std::uint64_t{1} << 31;
@@ -148,4 +148,4 @@ void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> 
   Replacement(path, bytes).replace();
 }
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 
 /// A whole file in memory; pipes and devices are read to their end.
 /// @throws std::system_error when it cannot be opened or read (a directory included), or is over
@@ -43,4 +43,4 @@ class Replacement {
 ///         is left behind.
 void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes);
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

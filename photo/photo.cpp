@@ -1,72 +1,103 @@
 #include "photo/photo.h"
 
+#include <string>
 #include <utility>
 
-#include "cli/frame/errors.h"
-#include "cli/frame/file_bytes.h"
-#include "cli/frame/interrupt.h"
+#include "photo/jpeg/jpeg_codec.h"
 #include "photo/metadata/exif_orientation.h"
 #include "photo/metadata/kept_metadata.h"
-#include "photo/turn.h"
+#include "photo/png/png_file.h"
+#include "photo/raw/raw_pixels.h"
+#include "photo/turned_image.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 using image_processing::Image;
 using image_processing::RGBA8Pixel;
 
-std::shared_ptr<Image<RGBA8Pixel>> decodedImage(std::span<const std::uint8_t> file, int scale,
-                                                SparePixels& spare) {
+namespace {
+
+void stopIfAsked(const std::stop_token& stop) {
+  if (stop.stop_requested()) throw Stopped();
+}
+
+std::shared_ptr<Image<RGBA8Pixel>> decodedImage(std::span<const std::uint8_t> file,
+                                                const OpenOptions& options, SparePixels& spare) {
   std::shared_ptr<Image<RGBA8Pixel>> image;
   const auto makeRoom = [&](std::uint32_t width, std::uint32_t height) {
     image = spare.picture(width, height);
     return reinterpret_cast<std::uint8_t*>(image->data.get());
   };
-  imgproc::decodeJpegInto(makeRoom, file, scale);
+  decodeJpegInto(makeRoom, file, options.scale, options.limits);
   return image;
 }
 
-JpegFacts readFacts(const imgproc::JpegHeader& header) {
-  JpegFacts facts = {header.width, header.height, header.components, header.progressive, 1, {}};
-  if (const imgproc::MetadataSegment* exif = firstExif(header.metadata)) {
+PhotoFacts factsOf(const JpegHeader& header) {
+  PhotoFacts facts = {.format = "JPEG",
+                      .width = header.width,
+                      .height = header.height,
+                      .channels = header.components,
+                      .progressive = header.progressive};
+  if (const MetadataSegment* exif = firstExif(header.metadata)) {
     facts.orientation = exifOrientation(exif->payload);
     facts.captureTime = exifCaptureTime(exif->payload);
   }
   return facts;
 }
 
-Photo loadPhoto(const Input& input, const PhotoOptions& options) {
-  SparePixels none;
-  return loadPhoto(input, options, none);
+void refuseEmpty(std::span<const std::uint8_t> file) {
+  if (file.empty()) throw PhotoError(PhotoError::Kind::empty, "is empty, not a JPEG file");
 }
 
-Photo loadPhoto(const Input& input, const PhotoOptions& options, SparePixels& spare) {
+}  // namespace
+
+PhotoFacts readFacts(std::span<const std::uint8_t> file) {
+  refuseEmpty(file);
+  return factsOf(readJpegHeader(file));
+}
+
+Photo open(std::span<const std::uint8_t> file, const OpenOptions& options, SparePixels* spare) {
+  stopIfAsked(options.stop);
   Photo photo;
-  Turn turn;
   if (options.raw) {
-    photo.image = readRawPixels(input, *options.raw);
+    photo.facts = {.format = "raw pixels",
+                   .width = options.raw->width,
+                   .height = options.raw->height,
+                   .channels = 4};
+    photo.image = readRawPixels(file, *options.raw);
   } else {
-    const std::vector<std::uint8_t> file = readInput(input);
-    stopIfInterrupted();
-    if (file.empty()) throw FileError("is empty, not a JPEG file");
-    imgproc::JpegHeader header = imgproc::readJpegHeader(file);
-    photo.facts = readFacts(header);
-    photo.metadata = keptMetadata(std::move(header));
-    photo.image = decodedImage(file, options.scale, spare);
-    turn = uprightTurn(photo.facts->orientation);
+    refuseEmpty(file);
+    JpegHeader header = readJpegHeader(file);
+    photo.facts = factsOf(header);
+    photo.metadata.segments = keptMetadata(std::move(header.metadata), header.components);
+    SparePixels none;
+    photo.image = decodedImage(file, options, spare != nullptr ? *spare : none);
   }
-  stopIfInterrupted();
-  photo.image = turned(photo.image, turnedFurther(turn, options.rotate));
+  stopIfAsked(options.stop);
+  if (options.upright) {
+    const Turn turn = turnedFurther(uprightTurn(photo.facts.orientation), options.rotate);
+    photo.image = turned(photo.image, turn);
+  }
   return photo;
 }
 
-void savePicture(const std::string& path, const Image<RGBA8Pixel>& picture, bool raw, int quality,
-                 const std::vector<imgproc::MetadataSegment>& metadata) {
+std::vector<std::uint8_t> save(const Image<RGBA8Pixel>& picture, std::string_view format,
+                               const Metadata& metadata, const SaveOptions& options) {
+  stopIfAsked(options.stop);
   const auto* pixels = reinterpret_cast<const std::uint8_t*>(picture.data.get());
-  if (raw) return writeOutput(path, {pixels, picture.byteSize()});
-  const std::vector<std::uint8_t> file =
-      imgproc::encodeJpeg(pixels, picture.width, picture.height, quality, metadata);
-  stopIfInterrupted();
-  writeOutput(path, file);
+  std::vector<std::uint8_t> file;
+  if (format == "JPEG") {
+    file = encodeJpeg(pixels, picture.width, picture.height, options.quality, metadata.segments);
+  } else if (format == "PNG") {
+    file = encodePng(picture);
+  } else if (format == "raw pixels") {
+    file.assign(pixels, pixels + picture.byteSize());
+  } else {
+    throw PhotoError(PhotoError::Kind::invalidRequest,
+                     "'" + std::string(format) + "' is no format that can be written");
+  }
+  stopIfAsked(options.stop);
+  return file;
 }
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -4,58 +4,61 @@
 #include <memory>
 #include <optional>
 #include <span>
+#include <stop_token>
+#include <string_view>
 #include <vector>
 
-#include "cli/frame/inputs.h"
 #include "image_processing/core/image.h"
-#include "photo/jpeg/jpeg_codec.h"
-#include "photo/metadata/capture_time.h"
-#include "photo/raw/raw_pixels.h"
+#include "photo/decode_limits.h"
+#include "photo/metadata/metadata.h"
+#include "photo/photo_error.h"
+#include "photo/photo_facts.h"
+#include "photo/picture_size.h"
 #include "photo/spare_pixels.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
-/// What a JPEG file says of itself; the size is the stored one, before scaling and turning.
-struct JpegFacts {
-  std::uint32_t width, height;
-  int components;
-  bool progressive;
-  int orientation;  ///< EXIF, 1 ... 8.
-  std::optional<CaptureTime> captureTime;
-};
+// Whole photos: bytes in, bytes out. Nothing here keeps state, prints or looks at the process, so
+// any thread may call. Errors are PhotoError and std::bad_alloc.
 
-/// A decoded picture, upright.
+/// A decoded picture, upright, and what its file says.
 struct Photo {
   std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> image;
-  std::optional<JpegFacts> facts;                  ///< None for raw pixels.
-  std::vector<imgproc::MetadataSegment> metadata;  ///< What a file made of it keeps.
+  PhotoFacts facts;
+  Metadata metadata;  ///< What a file made of it keeps.
 };
 
-struct PhotoOptions {
-  int scale = 1;               ///< 1, 2, 4 or 8: the decoder's divisor.
-  int rotate = 0;              ///< Degrees clockwise beyond upright, a multiple of 90.
-  std::optional<RawSize> raw;  ///< The input is raw pixels of this size.
+struct OpenOptions {
+  int scale = 1;                        ///< 1, 2, 4 or 8: what its sides are divided by.
+  int rotate = 0;                       ///< Degrees clockwise beyond upright, a multiple of 90.
+  bool upright = true;                  ///< Else the picture is as it is stored, and `rotate` idle.
+  std::optional<PictureSize> raw = {};  ///< The bytes are raw pixels of this size.
+  DecodeLimits limits = {};
+  std::stop_token stop = {};  ///< Asked between steps; the default never stops.
 };
 
-/// Reads a photo, decodes it and turns it upright.
-/// @param spare  where the pixels of a decoded one may come from.
-/// @throws what reading and decoding throw, for `explain`; Interrupted on Ctrl-C.
-Photo loadPhoto(const Input& input, const PhotoOptions& options, SparePixels& spare);
-Photo loadPhoto(const Input& input, const PhotoOptions& options);
+/// Decodes a photo and turns it upright.
+/// @param spare  where the pixels of a decoded one may come from; may be null.
+/// @throws PhotoError when the bytes are no photo, or damaged, or beyond the limits: never half a
+///         picture. Stopped when `options.stop` says so.
+Photo open(std::span<const std::uint8_t> file, const OpenOptions& options = {},
+           SparePixels* spare = nullptr);
 
-/// The picture of a JPEG file at 1/`scale` of its size, as it is stored.
-/// @param spare  where its pixels may come from.
-/// @throws what decoding throws.
-std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> decodedImage(
-    std::span<const std::uint8_t> file, int scale, SparePixels& spare);
+/// What a file says before its picture data, without decoding.
+/// @throws PhotoError as `open`.
+PhotoFacts readFacts(std::span<const std::uint8_t> file);
 
-/// What the header alone tells, without decoding.
-JpegFacts readFacts(const imgproc::JpegHeader& header);
+struct SaveOptions {
+  int quality = 90;           ///< 1 ... 100, for formats that lose something.
+  std::stop_token stop = {};  ///< Asked between steps; the default never stops.
+};
 
-/// Writes a picture to a file or standard output, as JPEG or, with `raw`, as raw pixels.
-/// @throws what encoding and writing throw; an old file is then as it was.
-void savePicture(const std::string& path,
-                 const image_processing::Image<image_processing::RGBA8Pixel>& picture, bool raw,
-                 int quality, const std::vector<imgproc::MetadataSegment>& metadata);
+/// The bytes of a file with this picture.
+/// @param format    a name in the table of formats: "JPEG".
+/// @param metadata  what goes with it, as far as the format can hold it.
+/// @throws PhotoError when the format cannot hold such a picture, or is none; Stopped.
+std::vector<std::uint8_t> save(const image_processing::Image<image_processing::RGBA8Pixel>& picture,
+                               std::string_view format, const Metadata& metadata = {},
+                               const SaveOptions& options = {});
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

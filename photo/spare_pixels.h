@@ -6,7 +6,7 @@
 
 #include "image_processing/core/image.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 /// The pixels of the last picture, for a next one of as many: the system clears every page of
 /// memory that it gives anew. Are they more or fewer, they are freed. For one thread.
@@ -31,4 +31,4 @@ class SparePixels {
   Picture spare_{0, 0};
 };
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

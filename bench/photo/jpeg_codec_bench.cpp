@@ -4,7 +4,7 @@
 #include "photo/jpeg/jpeg_codec.h"
 #include "tests/support/pictures.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 constexpr std::uint32_t width = 4000, height = 3000;
@@ -56,4 +56,4 @@ void rotate(benchmark::State& state) {
 BENCHMARK(rotate)->Unit(benchmark::kMillisecond);
 
 }  // namespace
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

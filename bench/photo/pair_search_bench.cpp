@@ -6,7 +6,7 @@
 #include "photo/collection/pair_search.h"
 #include "tests/photo/collection/synthetic_shots.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 // One library after the other, each with as many photos an hour as any.
@@ -41,4 +41,4 @@ BENCHMARK(findPairsOfALibrary)
     ->Complexity(benchmark::oNLogN);
 
 }  // namespace
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -23,13 +23,13 @@ namespace pelorin::bench {
 namespace {
 
 std::string textOf(const std::string& path) {
-  const std::vector<std::uint8_t> bytes = imgproc::readFile(path);
+  const std::vector<std::uint8_t> bytes = photo::readFile(path);
   return {bytes.begin(), bytes.end()};
 }
 
 void write(const std::string& path, const auto& bytes) {
-  imgproc::writeFileAtomically(path,
-                               {reinterpret_cast<const std::uint8_t*>(bytes.data()), bytes.size()});
+  photo::writeFileAtomically(path,
+                             {reinterpret_cast<const std::uint8_t*>(bytes.data()), bytes.size()});
 }
 
 /// Replaces what stands between the marks of a part.
@@ -59,8 +59,8 @@ std::string machine() {
 
 std::string scale(const std::string& folder) {
   const Scale measured = measureScale(QUENBY_COMMAND);
-  write(folder + "/performance_time.png", cli::encodePng(cli::drawPlot(measured.time)));
-  write(folder + "/performance_memory.png", cli::encodePng(cli::drawPlot(measured.memory)));
+  write(folder + "/performance_time.png", photo::encodePng(cli::drawPlot(measured.time)));
+  write(folder + "/performance_memory.png", photo::encodePng(cli::drawPlot(measured.memory)));
   return measured.tables;
 }
 

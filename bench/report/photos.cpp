@@ -34,8 +34,8 @@ PhotoFiles::PhotoFiles(PhotoSize size, int count)
   inChild([&] {
     Image<RGBA8Pixel> picture(size.width, size.height);
     fillWithPhoto(picture);
-    imgproc::writeFileAtomically(
-        first(), imgproc::encodeJpeg(&picture.data.get()->r, size.width, size.height, 90));
+    photo::writeFileAtomically(
+        first(), photo::encodeJpeg(&picture.data.get()->r, size.width, size.height, 90));
     return Spent{};
   });
   for (int i = 1; i < count; ++i) {

@@ -30,7 +30,7 @@ double fastest(const std::vector<double>& seconds) {
 
 std::string wholeFileTable(const std::string& command, const std::string& avx2Only) {
   const PhotoFiles files(size, photosInARun);
-  const std::vector<std::uint8_t> bytes = imgproc::readFile(files.first());
+  const std::vector<std::uint8_t> bytes = photo::readFile(files.first());
   CodecFloor floor(bytes, size.width, size.height);
   floor.run();
 

@@ -11,13 +11,12 @@
 
 #include "cli/frame/errors.h"
 #include "cli/frame/number_text.h"
-#include "image_processing/core/float_to_integer.h"
 
 namespace pelorin::cli {
-namespace {
 
 using image_processing::BoundingBox;
-using image_processing::truncateTo;
+
+namespace {
 
 // No face is twice as far to the right as the picture is wide.
 constexpr float largestFraction = 2.0f;
@@ -55,12 +54,7 @@ BoundingBox boxOf(const Face& face, std::uint32_t width, std::uint32_t height, i
   const float divisor = static_cast<float>(scale);
   const float columns = face.inPixels ? 1.0f / divisor : static_cast<float>(width);
   const float rows = face.inPixels ? 1.0f / divisor : static_cast<float>(height);
-  BoundingBox box = {};
-  box.left = truncateTo<std::int32_t>(face.left * columns);
-  box.right = truncateTo<std::int32_t>(face.right * columns);
-  box.top = truncateTo<std::int32_t>(face.top * rows);
-  box.bottom = truncateTo<std::int32_t>(face.bottom * rows);
-  return box;
+  return boxInPixels({face.left, face.top, face.right, face.bottom}, columns, rows);
 }
 
 }  // namespace

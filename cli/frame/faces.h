@@ -5,6 +5,7 @@
 #include <vector>
 
 #include "cli/frame/verb.h"
+#include "image_processing/core/face_fractions.h"
 #include "image_processing/core/image_metadata.h"
 
 namespace pelorin::cli {

@@ -12,7 +12,7 @@
 
 #include "cli/frame/errors.h"
 #include "cli/frame/interrupt.h"
-#include "photo/jpeg/jpeg_codec.h"
+#include "photo/file_io.h"
 
 namespace fs = std::filesystem;
 
@@ -55,7 +55,7 @@ void writeSpecialFile(const std::string& path, std::span<const std::uint8_t> byt
 }  // namespace
 
 std::vector<std::uint8_t> readInput(const Input& input) {
-  return input.isStandardInput() ? readStandardInput() : imgproc::readFile(input.path);
+  return input.isStandardInput() ? readStandardInput() : photo::readFile(input.path);
 }
 
 void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes) {
@@ -66,7 +66,7 @@ void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes) {
     } else if (fs::is_other(fs::status(path, ignored))) {
       writeSpecialFile(path, bytes);
     } else {
-      imgproc::writeFileAtomically(path, bytes);
+      photo::writeFileAtomically(path, bytes);
     }
   } catch (const std::system_error& error) {
     throw FileError((path == "-" ? "standard output" : path) +

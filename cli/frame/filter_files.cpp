@@ -9,10 +9,11 @@
 #include "cli/frame/interrupt.h"
 #include "cli/frame/jobs.h"
 #include "cli/frame/json_output.h"
+#include "cli/frame/photo_files.h"
+#include "cli/frame/raw_option.h"
 #include "cli/frame/recycled_memory.h"
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/filtered_image.h"
-#include "photo/photo.h"
 
 namespace pelorin::cli {
 namespace {
@@ -26,7 +27,7 @@ using image_processing::RGBA8Pixel;
 struct Work {
   FilterToApply filter;
   std::vector<Face> faces;
-  PhotoOptions photo;
+  photo::OpenOptions photo;
   int quality;
   bool overwrite;
 };
@@ -41,7 +42,7 @@ Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter)
     throw UsageError("--face: has no effect on " + filter.filter.name);
   }
   if (options.rotate % 90 != 0) throw UsageError("--rotate: must be a multiple of 90");
-  work.photo = {options.scale, options.rotate, std::nullopt};
+  work.photo = {.scale = options.scale, .rotate = options.rotate};
   if (!options.raw.empty()) {
     if (options.scale != 1) throw UsageError("--scale: raw pixels are read at their full size");
     if (options.inputs.recursive) throw UsageError("--raw: name the files, folders hold JPEG");
@@ -52,8 +53,8 @@ Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter)
 
 Done process(const Work& work, const PlannedFile& file) {
   stopIfInterrupted();
-  thread_local SparePixels spare;  // each worker's own
-  Photo photo = loadPhoto(file.input, work.photo, spare);
+  thread_local photo::SparePixels spare;  // each worker's own
+  photo::Photo photo = loadPhoto(file.input, work.photo, &spare);
   stopIfInterrupted();
   Image<RGBA8Pixel>& picture = *photo.image;
   const Done done = {picture.width, picture.height};

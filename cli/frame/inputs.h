@@ -17,14 +17,18 @@ struct InputOptions {
 /// Adds the positional IN... and `-r` to a verb.
 void addInputOptions(Verb verb, InputOptions& options);
 
+/// What messages call an input.
+inline std::string shownName(const std::string& path) {
+  return path == "-" ? "standard input" : path;
+}
+
 /// One file to work on.
 struct Input {
   std::string path;                 ///< As given or found; "-" is standard input.
   std::filesystem::path subfolder;  ///< Where in the named folder it was found; mostly empty.
 
   bool isStandardInput() const { return path == "-"; }
-  /// For messages.
-  std::string shownName() const { return isStandardInput() ? "standard input" : path; }
+  std::string shownName() const { return cli::shownName(path); }
 };
 
 /// The files behind the names, in order: a file stands for itself, a folder (only with `-r`) for

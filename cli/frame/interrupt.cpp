@@ -2,16 +2,14 @@
 
 #include <signal.h>
 
-#include <atomic>
-
 namespace pelorin::cli {
 namespace {
 
-std::atomic<bool> requested = false;
-static_assert(std::atomic<bool>::is_always_lock_free);
+std::stop_source source;
 
+// Nobody registers a callback with the token, so that this is a change of one lock-free number.
 void onSignal(int) {
-  requested = true;
+  source.request_stop();
 }
 
 }  // namespace
@@ -23,12 +21,16 @@ void installInterruptHandler() {
   sigaction(SIGTERM, &action, nullptr);
 }
 
+std::stop_token interruptToken() {
+  return source.get_token();
+}
+
 bool interruptRequested() {
-  return requested;
+  return source.stop_requested();
 }
 
 void stopIfInterrupted() {
-  if (requested) throw Interrupted();
+  if (interruptRequested()) throw Interrupted();
 }
 
 }  // namespace pelorin::cli

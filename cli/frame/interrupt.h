@@ -1,17 +1,19 @@
 #pragma once
 
-#include <exception>
+#include <stop_token>
+
+#include "photo/photo_error.h"
 
 namespace pelorin::cli {
 
 /// Thrown by work that stops because of Ctrl-C.
-class Interrupted : public std::exception {
- public:
-  const char* what() const noexcept override { return "interrupted"; }
-};
+using Interrupted = photo::Stopped;
 
 /// From here on SIGINT and SIGTERM only set a mark, so that no file is left half-written.
 void installInterruptHandler();
+
+/// The mark, for work that is asked to stop by a token.
+std::stop_token interruptToken();
 
 /// Whether the command was asked to stop. Any thread may ask.
 bool interruptRequested();

@@ -10,6 +10,10 @@
 #include "photo/area_average.h"
 
 namespace pelorin::cli {
+
+using image_processing::Image;
+using image_processing::RGBA8Pixel;
+
 namespace {
 
 // Lengths in pixels.
@@ -21,10 +25,11 @@ constexpr TextStyle labelStyle{14, {0.20, 0.21, 0.24}};
 constexpr TextStyle tickStyle{13, {0.33, 0.35, 0.39}};
 constexpr Colour background{0.955, 0.957, 0.962}, frame{0.45, 0.47, 0.50};
 
-PictureSize shownSize(PictureSize photo) {
+photo::PictureSize shownSize(photo::PictureSize photo) {
   const std::uint32_t longer = std::max(photo.width, photo.height);
   const std::uint32_t factor = longer >= enlargedTo ? 1 : (enlargedTo + longer - 1) / longer;
-  return fitWithin({photo.width * factor, photo.height * factor}, {longestShown, longestShown});
+  return photo::fitWithin({photo.width * factor, photo.height * factor},
+                          {longestShown, longestShown});
 }
 
 std::uint32_t canvasSide(double shown, double around) {
@@ -46,9 +51,9 @@ Image<RGBA8Pixel> muted(const Image<RGBA8Pixel>& picture) {
   return result;
 }
 
-void paintPhoto(cairo_t* c, const Image<RGBA8Pixel>& photo, PictureSize shown) {
+void paintPhoto(cairo_t* c, const Image<RGBA8Pixel>& photo, photo::PictureSize shown) {
   const bool shrunk = shown.width < photo.width || shown.height < photo.height;
-  const Image<RGBA8Pixel> picture = muted(shrunk ? areaAverage(photo, shown) : photo);
+  const Image<RGBA8Pixel> picture = muted(shrunk ? photo::areaAverage(photo, shown) : photo);
   Canvas pixels(picture.width, picture.height);
   pixels.paste(picture, 0, 0);
   cairo_save(c);

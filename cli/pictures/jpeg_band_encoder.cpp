@@ -11,7 +11,7 @@ using image_processing::Image;
 using image_processing::RGBA8Pixel;
 
 struct JpegBandEncoder::State {
-  imgproc::LibjpegErrors errors;
+  photo::LibjpegErrors errors;
   jpeg_compress_struct jpeg = {};
   unsigned char* file = nullptr;
   unsigned long fileSize = 0;
@@ -26,7 +26,8 @@ struct JpegBandEncoder::State {
 
 JpegBandEncoder::JpegBandEncoder(std::uint32_t width, std::uint32_t height, int quality) {
   if (width == 0 || height == 0 || width > largestSide || height > largestSide) {
-    throw imgproc::JpegError("a JPEG file is 1 to 65500 pixels wide and high");
+    throw photo::PhotoError(photo::PhotoError::Kind::invalidRequest,
+                            "a JPEG file is 1 to 65500 pixels wide and high");
   }
   state_ = std::make_unique<State>();
   State& s = *state_;

@@ -15,13 +15,13 @@ class JpegBandEncoder {
   static constexpr std::uint32_t largestSide = 65500;  ///< What JPEG files are read up to.
 
   /// @param quality  1 ... 100.
-  /// @throws imgproc::JpegError when a side is 0 or above `largestSide`, and std::bad_alloc.
+  /// @throws photo::PhotoError when a side is 0 or above `largestSide`, and std::bad_alloc.
   JpegBandEncoder(std::uint32_t width, std::uint32_t height, int quality);
   ~JpegBandEncoder();
 
   /// Adds the next rows; alpha is ignored. The band is `width` wide and no higher than what is
   /// still missing.
-  /// @throws imgproc::JpegError when the compressed bytes do not fit into memory.
+  /// @throws photo::PhotoError when the compressed bytes do not fit into memory.
   void add(const image_processing::Image<image_processing::RGBA8Pixel>& band);
 
   /// The whole file; called once, when all rows were added.

@@ -8,6 +8,10 @@
 #include "cli/pictures/text.h"
 
 namespace pelorin::cli {
+
+using image_processing::Image;
+using image_processing::RGBA8Pixel;
+
 namespace {
 
 // Lengths in pixels.
@@ -27,7 +31,7 @@ void paintBackground(cairo_t* c) {
 }  // namespace
 
 SheetPainter::SheetPainter(SheetPlan plan) : plan_(std::move(plan)), columnWidth_(narrowestColumn) {
-  for (const PictureSize& size : plan_.thumbnailSizes)
+  for (const photo::PictureSize& size : plan_.thumbnailSizes)
     columnWidth_ = std::max<std::uint64_t>(columnWidth_, size.width);
 }
 
@@ -70,8 +74,8 @@ Image<RGBA8Pixel> SheetPainter::row(std::size_t index, std::string_view label,
   cairo_t* c = canvas.context();
   paintBackground(c);
   const double room = static_cast<double>(width()) - 2 * margin;
-  const PictureSize cell{static_cast<std::uint32_t>(columnWidth_),
-                         plan_.thumbnailSizes[index].height};
+  const photo::PictureSize cell{static_cast<std::uint32_t>(columnWidth_),
+                                plan_.thumbnailSizes[index].height};
   drawText(c, shortenedToWidth(c, label, nameStyle, room), margin, nameBand - 10, nameStyle);
   if (thumbnails.empty()) {
     setColour(c, emptyCell);

@@ -11,9 +11,10 @@ namespace pelorin::cli {
 
 /// What stands on a sheet of small pictures: one row a photo, one column a way of treating it.
 struct SheetPlan {
-  std::string title;                        ///< May be empty; the heading is then left out.
-  std::vector<std::string> columnLabels;    ///< At least one.
-  std::vector<PictureSize> thumbnailSizes;  ///< Of each row's pictures, both sides at least 1.
+  std::string title;                      ///< May be empty; the heading is then left out.
+  std::vector<std::string> columnLabels;  ///< At least one.
+  std::vector<photo::PictureSize>
+      thumbnailSizes;  ///< Of each row's pictures, both sides at least 1.
 };
 
 /// Draws a sheet band by band, so that it never has to be in memory as a whole: the heading first,
@@ -31,18 +32,19 @@ class SheetPainter {
   bool fits() const;
 
   /// What the plan says of row `index`.
-  PictureSize thumbnailSize(std::size_t index) const { return plan_.thumbnailSizes[index]; }
+  photo::PictureSize thumbnailSize(std::size_t index) const { return plan_.thumbnailSizes[index]; }
 
   /// Title and upper margin.
-  Image<RGBA8Pixel> heading() const;
+  image_processing::Image<image_processing::RGBA8Pixel> heading() const;
 
   /// A photo's name over its pictures, the column's label under each of them.
   /// @param index       the row, from 0; gives the height.
   /// @param thumbnails  one a column, none larger than the plan says; or none at all, when the
   ///                    photo could not be read: `note` then stands in their place.
-  Image<RGBA8Pixel> row(std::size_t index, std::string_view label,
-                        const std::vector<Image<RGBA8Pixel>>& thumbnails,
-                        std::string_view note = {}) const;
+  image_processing::Image<image_processing::RGBA8Pixel> row(
+      std::size_t index, std::string_view label,
+      const std::vector<image_processing::Image<image_processing::RGBA8Pixel>>& thumbnails,
+      std::string_view note = {}) const;
 
  private:
   std::uint32_t headingHeight() const;

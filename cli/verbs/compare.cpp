@@ -8,13 +8,14 @@
 #include "cli/frame/interrupt.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/number_text.h"
+#include "cli/frame/photo_files.h"
+#include "cli/frame/raw_option.h"
 #include "cli/frame/talk.h"
 #include "cli/verbs/dupes/report.h"
 #include "cli/verbs/verbs.h"
 #include "image_processing/dupe/cdf_distance.h"
 #include "photo/collection/pair_search.h"
 #include "photo/collection/photo_record.h"
-#include "photo/photo.h"
 
 namespace pelorin::cli {
 namespace {
@@ -27,19 +28,17 @@ struct CompareOptions {
   ReportOptions report;
 };
 
-Shot readShot(const std::string& path, const std::string& raw, int scale) {
+photo::Shot readShot(const std::string& path, const std::string& raw, int scale) {
   const Input input = {path, {}};
   try {
-    PhotoOptions options;
+    photo::OpenOptions options;
     options.scale = scale;
     if (!raw.empty()) options.raw = readRawSize(raw);
-    const Photo photo = loadPhoto(input, options);
-    Shot shot;
+    const photo::Photo photo = loadPhoto(input, options);
+    photo::Shot shot;
     image_processing::computeGreenCDF(*photo.image, shot.cdf);
-    if (photo.facts) {
-      shot.orientation = photo.facts->orientation;
-      if (photo.facts->captureTime) shot.time = shotTime(*photo.facts->captureTime);
-    }
+    shot.orientation = photo.facts.orientation;
+    if (photo.facts.captureTime) shot.time = photo::shotTime(*photo.facts.captureTime);
     return shot;
   } catch (const UsageError&) {
     throw;
@@ -61,20 +60,21 @@ ExitCode runCompare(const CompareOptions& options) {
   std::optional<float> givenSeconds;
   if (!options.dt.empty()) givenSeconds = readFiniteNumber("--dt", options.dt);
 
-  Shot a = readShot(options.a, options.raw, options.scale);
-  Shot b = readShot(options.b, options.raw2.empty() ? options.raw : options.raw2, options.scale);
+  photo::Shot a = readShot(options.a, options.raw, options.scale);
+  photo::Shot b =
+      readShot(options.b, options.raw2.empty() ? options.raw : options.raw2, options.scale);
   const char* timeSource = a.time && b.time ? "camera" : "unknown";
   if (givenSeconds) {
     timeSource = "given";
-    a.time = ShotTime{0.0, std::nullopt};
-    b.time = ShotTime{*givenSeconds, std::nullopt};
+    a.time = photo::ShotTime{0.0, std::nullopt};
+    b.time = photo::ShotTime{*givenSeconds, std::nullopt};
   }
   if (!options.sameOrientation.empty()) {
     a.orientation = 1;
     b.orientation = options.sameOrientation == "yes" ? 1 : 2;
   }
 
-  const ShotPair pair = compareShots(a, b);
+  const photo::ShotPair pair = photo::compareShots(a, b);
   const float gainAB = image_processing::matchCDFDomain(a.cdf, b.cdf);
   const float gainBA = image_processing::matchCDFDomain(b.cdf, a.cdf);
   JsonOutput json(options.report, /*singleFile=*/true);

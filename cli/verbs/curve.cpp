@@ -10,12 +10,13 @@
 #include "cli/frame/json_output.h"
 #include "cli/frame/lone_files.h"
 #include "cli/frame/number_text.h"
+#include "cli/frame/photo_files.h"
+#include "cli/frame/raw_option.h"
 #include "cli/pictures/tone_curve_plot.h"
 #include "cli/verbs/verbs.h"
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
 #include "image_processing/autoenhance/lightness/image_statistics.h"
 #include "image_processing/filters/filter_config.h"
-#include "photo/photo.h"
 #include "photo/png/png_file.h"
 
 namespace pelorin::cli {
@@ -38,7 +39,7 @@ struct Curve {
   std::vector<float> samples;
 };
 
-Curve curveOf(const Photo& photo, float slider, const std::vector<Face>& faces) {
+Curve curveOf(const photo::Photo& photo, float slider, const std::vector<Face>& faces) {
   Curve curve{photo.image->width, photo.image->height, {}, {}};
   image_processing::analyzeImage(*photo.image, metadataWithFaces(faces, curve.width, curve.height),
                                  curve.statistics);
@@ -78,7 +79,7 @@ Json describe(const Curve& curve, const Input& input, float slider) {
 ExitCode runCurve(const CurveOptions& options) {
   const float slider = readSlider("--slider", options.slider);
   const std::vector<Face> faces = readFaces(options.faces);
-  PhotoOptions photoOptions;
+  photo::OpenOptions photoOptions;
   if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
   const Input input = loneInput(options.input);
   const std::string& output = options.outputs.output;
@@ -99,7 +100,7 @@ ExitCode runCurve(const CurveOptions& options) {
   const bool done = succeeds(talk, input.shownName(), [&] {
     curve = curveOf(loadPhoto(input, photoOptions), slider, faces);
     if (!plotted) return;
-    writeOutput(output, encodePng(drawPlot(plotOf(curve, input, slider, faces.size()))));
+    writeOutput(output, photo::encodePng(drawPlot(plotOf(curve, input, slider, faces.size()))));
   });
   if (!done) return ExitCode::someFailed;
   if (options.text) {

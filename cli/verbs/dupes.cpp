@@ -15,11 +15,11 @@
 #include "cli/frame/talk.h"
 #include "cli/verbs/dupes/html_report.h"
 #include "cli/verbs/dupes/report.h"
+#include "cli/verbs/dupes/scan_photos.h"
+#include "cli/verbs/dupes/thumbnail.h"
 #include "cli/verbs/verbs.h"
 #include "photo/collection/pair_search.h"
-#include "photo/collection/photo_library.h"
 #include "photo/collection/photo_score.h"
-#include "photo/collection/thumbnail.h"
 
 namespace pelorin::cli {
 namespace {
@@ -40,12 +40,12 @@ struct DupesOptions {
 constexpr const char* verbName = "dupes";
 
 // A few hundred pieces: enough to share among cores and to show how far the search is.
-bool searchPairs(const std::vector<Shot>& shots, float threshold, const DupesOptions& options,
-                 std::vector<ShotPair>& pairs) {
-  const PairSearch search(shots, threshold);
+bool searchPairs(const std::vector<photo::Shot>& shots, float threshold,
+                 const DupesOptions& options, std::vector<photo::ShotPair>& pairs) {
+  const photo::PairSearch search(shots, threshold);
   const std::size_t pieces = std::min<std::size_t>(search.stepCount(), 400);
   Talk talk(verbName, options.report.quiet, pieces);
-  std::vector<std::vector<ShotPair>> found(pieces);
+  std::vector<std::vector<photo::ShotPair>> found(pieces);
   const bool finished = runJobs(
       pieces, options.jobs,
       [&](std::size_t piece) {
@@ -60,40 +60,43 @@ bool searchPairs(const std::vector<Shot>& shots, float threshold, const DupesOpt
         found[piece] = {};
         talk.fileDone();
       });
-  sortPairs(pairs);
+  photo::sortPairs(pairs);
   return finished;
 }
 
 // Reads the photos whose score decides once more, unless the cache knows it.
-bool scorePhotos(const DupesOptions& options, PhotoCache* cache, std::string& cacheTrouble,
+bool scorePhotos(const DupesOptions& options, photo::PhotoCache* cache, std::string& cacheTrouble,
                  DupeReport& report) {
   struct Unscored {
     std::size_t photo;
-    std::optional<FileStamp> stamp;  // taken before the file is read
+    std::optional<photo::FileStamp> stamp;  // taken before the file is read
   };
   std::vector<Unscored> unscored;
-  for (const std::size_t i : photosToScore(report.groups, report.photos)) {
-    ScannedPhoto& photo = report.photos[i];
-    if (photo.input.isStandardInput()) continue;  // cannot be read twice
-    const std::optional<FileStamp> stamp = stampOf(photo.input);
-    if (cache != nullptr && stamp) photo.niqe = cache->findScore(photo.input.path, *stamp);
+  for (const std::size_t i : photo::photosToScore(report.groups, report.photos)) {
+    photo::ScannedPhoto& photo = report.photos[i];
+    if (photo.path == "-") continue;  // cannot be read twice
+    const std::optional<photo::FileStamp> stamp = photo::stampOf(photo.path);
+    if (cache != nullptr && stamp) photo.niqe = cache->findScore(photo.path, *stamp);
     if (!photo.niqe) unscored.push_back({i, stamp});
   }
   Talk talk(verbName, options.report.quiet, unscored.size());
   return attemptJobs<float>(
       unscored.size(), options.jobs,
-      [&](std::size_t job) { return scoreOf(report.photos[unscored[job].photo].input); },
+      [&](std::size_t job) {
+        const std::string& path = report.photos[unscored[job].photo].path;
+        return photo::scoreOf(readInput({path, {}}), interruptToken());
+      },
       [&](std::size_t job, const Attempt<float>& attempt) {
         const auto& [i, stamp] = unscored[job];
-        const Input& input = report.photos[i].input;
+        const std::string& path = report.photos[i].path;
         report.photos[i].niqe = attempt.result;
         if (!attempt.result) {
-          report.failed.push_back({input, "no score of it: " + attempt.error});
-          talk.error(input.shownName(), report.failed.back().reason);
+          report.failed.push_back({path, "no score of it: " + attempt.error});
+          talk.error(shownName(path), report.failed.back().reason);
         } else if (cache != nullptr && stamp && cacheTrouble.empty()) {
           try {
-            cache->storeScore(input.path, *stamp, *attempt.result);
-          } catch (const CacheError& error) {
+            cache->storeScore(path, *stamp, *attempt.result);
+          } catch (const photo::CacheError& error) {
             cacheTrouble = error.what();
           }
         }
@@ -104,9 +107,9 @@ bool scorePhotos(const DupesOptions& options, PhotoCache* cache, std::string& ca
 // Reads the photos of all groups once more, for their pictures.
 bool writeHtml(const DupesOptions& options, DupeReport& report) {
   std::vector<std::size_t> shown;
-  for (const DupeGroup& group : report.groups) {
+  for (const photo::DupeGroup& group : report.groups) {
     for (const std::size_t photo : group.photos) {
-      if (!report.photos[photo].input.isStandardInput()) shown.push_back(photo);
+      if (report.photos[photo].path != "-") shown.push_back(photo);
     }
   }
   std::vector<std::vector<std::uint8_t>> thumbnails(report.photos.size());
@@ -120,9 +123,9 @@ bool writeHtml(const DupesOptions& options, DupeReport& report) {
           if (attempt.result) {
             thumbnails[shown[job]] = *attempt.result;
           } else {
-            const Input& input = report.photos[shown[job]].input;
-            report.failed.push_back({input, "no picture of it: " + attempt.error});
-            talk.error(input.shownName(), report.failed.back().reason);
+            const std::string& path = report.photos[shown[job]].path;
+            report.failed.push_back({path, "no picture of it: " + attempt.error});
+            talk.error(shownName(path), report.failed.back().reason);
           }
           talk.fileDone();
         });
@@ -139,20 +142,20 @@ void printReport(const DupesOptions& options, const DupeReport& report) {
                      {"photos", report.photos.size()},
                      {"groups", Json::array()},
                      {"failed", Json::array()}};
-    for (const DupeGroup& group : report.groups) {
+    for (const photo::DupeGroup& group : report.groups) {
       document["groups"].push_back(groupAsJson(report, group));
     }
-    for (const FailedPhoto& failed : report.failed) {
+    for (const photo::FailedPhoto& failed : report.failed) {
       document["failed"].push_back(failureAsJson(failed));
     }
     JsonOutput(options.report, /*singleFile=*/true).add(document);
   } else if (options.report.jsonLines) {
     JsonOutput json(options.report, /*singleFile=*/false);
-    for (const DupeGroup& group : report.groups) json.add(groupAsJson(report, group));
-    for (const FailedPhoto& failed : report.failed) json.add(failureAsJson(failed));
+    for (const photo::DupeGroup& group : report.groups) json.add(groupAsJson(report, group));
+    for (const photo::FailedPhoto& failed : report.failed) json.add(failureAsJson(failed));
   } else if (options.html != "-") {
     std::size_t number = 0;
-    for (const DupeGroup& group : report.groups) {
+    for (const photo::DupeGroup& group : report.groups) {
       fmt::print("{}", groupAsText(report, group, ++number));
     }
   }
@@ -170,9 +173,9 @@ void checkHtml(const DupesOptions& options) {
 
 // Time tells more than light: without it, photos that are only a little alike reach threshold 0.
 void noteUntimed(const DupeReport& report, Talk& talk) {
-  const auto untimed =
-      std::count_if(report.photos.begin(), report.photos.end(),
-                    [](const ScannedPhoto& photo) { return photo.timeSource == TimeSource::none; });
+  const auto untimed = std::count_if(
+      report.photos.begin(), report.photos.end(),
+      [](const photo::ScannedPhoto& photo) { return photo.timeSource == photo::TimeSource::none; });
   if (untimed == 0) return;
   talk.note(
       fmt::format("{} of {} photos tell no time and were compared as if taken with every "
@@ -188,27 +191,29 @@ ExitCode runDupes(const DupesOptions& options) {
     Talk(verbName, options.report.quiet, 0).note("no photos found");
     return ExitCode::nothingToDo;
   }
-  std::unique_ptr<PhotoCache> cache;
-  if (!options.cache.empty()) cache = std::make_unique<PhotoCache>(options.cache);
+  std::unique_ptr<photo::PhotoCache> cache;
+  if (!options.cache.empty()) cache = std::make_unique<photo::PhotoCache>(options.cache);
 
-  PhotoLibrary library;
+  ScanResult scan;
   {
     Talk talk(verbName, options.report.quiet, inputs.size());
-    library = scanPhotos(
+    scan = scanPhotos(
         inputs,
-        {options.scale == "auto" ? automaticScale : std::stoi(options.scale), options.jobs,
+        {options.scale == "auto" ? photo::automaticScale : std::stoi(options.scale), options.jobs,
          options.assumeFileTime, cache.get()},
-        [&](const FailedPhoto& failed) { talk.error(failed.input.shownName(), failed.reason); },
+        [&](const photo::FailedPhoto& failed) {
+          talk.error(shownName(failed.path), failed.reason);
+        },
         [&] { talk.fileDone(); });
   }
-  if (library.interrupted) return ExitCode::interrupted;
-  std::vector<ShotPair> pairs;
-  if (!searchPairs(library.shots, threshold, options, pairs)) return ExitCode::interrupted;
+  if (scan.interrupted) return ExitCode::interrupted;
+  std::vector<photo::ShotPair> pairs;
+  if (!searchPairs(scan.library.shots, threshold, options, pairs)) return ExitCode::interrupted;
 
   DupeReport report = {
-      threshold, std::move(library.photos), {}, std::move(library.failed), !options.keep.empty()};
-  report.groups = groupPairs(report.photos.size(), pairs);
-  if (report.rank && !scorePhotos(options, cache.get(), library.cacheTrouble, report)) {
+      threshold, std::move(scan.library.photos), {}, std::move(scan.failed), !options.keep.empty()};
+  report.groups = photo::groupPairs(report.photos.size(), pairs);
+  if (report.rank && !scorePhotos(options, cache.get(), scan.cacheTrouble, report)) {
     return ExitCode::interrupted;
   }
   if (!options.html.empty() && !writeHtml(options, report)) return ExitCode::interrupted;
@@ -217,10 +222,10 @@ ExitCode runDupes(const DupesOptions& options) {
   Talk talk(verbName, options.report.quiet, 0);
   noteUntimed(report, talk);
   talk.note(summaryOf(report));
-  if (!library.cacheTrouble.empty()) {
-    fmt::print(stderr, "quenby {}: {}\n", verbName, library.cacheTrouble);
+  if (!scan.cacheTrouble.empty()) {
+    fmt::print(stderr, "quenby {}: {}\n", verbName, scan.cacheTrouble);
   }
-  const bool trouble = !report.failed.empty() || !library.cacheTrouble.empty();
+  const bool trouble = !report.failed.empty() || !scan.cacheTrouble.empty();
   return trouble ? ExitCode::someFailed : ExitCode::allDone;
 }
 

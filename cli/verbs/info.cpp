@@ -11,10 +11,11 @@
 #include "cli/frame/jobs.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/number_text.h"
+#include "cli/frame/photo_files.h"
+#include "cli/frame/raw_option.h"
 #include "cli/verbs/verbs.h"
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
 #include "image_processing/autoenhance/lightness/cdf.h"
-#include "photo/photo.h"
 
 namespace pelorin::cli {
 namespace {
@@ -33,16 +34,17 @@ struct InfoOptions {
 
 struct Info {
   std::uint32_t width, height;
-  std::optional<JpegFacts> facts;
+  std::optional<photo::PhotoFacts> facts;
   ImageStatistics statistics;
   std::vector<float> curve;
 };
 
-Info inspect(const Input& input, const PhotoOptions& options, const std::vector<Face>& faces,
+Info inspect(const Input& input, const photo::OpenOptions& options, const std::vector<Face>& faces,
              float slider) {
   stopIfInterrupted();
-  const Photo photo = loadPhoto(input, options);
-  Info info = {photo.image->width, photo.image->height, photo.facts, {}, {}};
+  const photo::Photo photo = loadPhoto(input, options);
+  Info info = {photo.image->width, photo.image->height, std::nullopt, {}, {}};
+  if (!options.raw) info.facts = photo.facts;
   image_processing::analyzeImage(*photo.image, metadataWithFaces(faces, info.width, info.height),
                                  info.statistics);
   FilterConfig config = image_processing::defaultFilterConfigValue;
@@ -72,7 +74,7 @@ Json jsonOf(const Input& input, const Info& info, float slider) {
   if (info.facts) {
     object["storedWidth"] = info.facts->width;
     object["storedHeight"] = info.facts->height;
-    object["components"] = info.facts->components;
+    object["components"] = info.facts->channels;
     object["progressive"] = info.facts->progressive;
     object["orientation"] = info.facts->orientation;
     object["captureTime"] = info.facts->captureTime ? Json(info.facts->captureTime->text) : Json();
@@ -92,9 +94,9 @@ const char* kindOf(int components) {
 void printFacts(const Info& info) {
   fmt::print("  size         {} x {} (upright)\n", info.width, info.height);
   if (!info.facts) return;
-  const JpegFacts& facts = *info.facts;
-  fmt::print("  stored       {} x {}, {}, {}\n", facts.width, facts.height,
-             kindOf(facts.components), facts.progressive ? "progressive" : "baseline");
+  const photo::PhotoFacts& facts = *info.facts;
+  fmt::print("  stored       {} x {}, {}, {}\n", facts.width, facts.height, kindOf(facts.channels),
+             facts.progressive ? "progressive" : "baseline");
   fmt::print("  orientation  {}\n", facts.orientation);
   fmt::print("  taken        {}\n", facts.captureTime ? facts.captureTime->text : "unknown");
 }
@@ -121,7 +123,7 @@ void printText(const Input& input, const Info& info, const std::string& slider) 
 ExitCode runInfo(const InfoOptions& options) {
   const float slider = readSlider("--slider", options.slider);
   const std::vector<Face> faces = readFaces(options.faces);
-  PhotoOptions photo;
+  photo::OpenOptions photo;
   if (!options.raw.empty()) photo.raw = readRawSize(options.raw);
   const std::vector<Input> inputs = expandInputs(options.inputs);
 

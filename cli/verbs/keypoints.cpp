@@ -9,11 +9,12 @@
 #include "cli/frame/errors.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/lone_files.h"
+#include "cli/frame/photo_files.h"
+#include "cli/frame/raw_option.h"
 #include "cli/pictures/corner_picture.h"
 #include "cli/verbs/corners.h"
 #include "cli/verbs/verbs.h"
 #include "image_processing/dupe/grayscale.h"
-#include "photo/photo.h"
 #include "photo/png/png_file.h"
 
 namespace pelorin::cli {
@@ -38,7 +39,7 @@ std::string countText(std::size_t count, const CornerSearch& search) {
                      search.arc, search.threshold, search.suppressed ? "" : ", not suppressed");
 }
 
-std::vector<std::uint8_t> drawingOf(const Photo& photo, const Input& input,
+std::vector<std::uint8_t> drawingOf(const photo::Photo& photo, const Input& input,
                                     const std::vector<Corner>& corners,
                                     const CornerSearch& search) {
   std::vector<MarkedPixel> marks;
@@ -50,8 +51,9 @@ std::vector<std::uint8_t> drawingOf(const Photo& photo, const Input& input,
                                : std::filesystem::path(input.path).filename().string();
   const std::string about = fmt::format("{} \xC3\x97 {} pixels, {}", photo.image->width,
                                         photo.image->height, countText(corners.size(), search));
-  return encodePng(drawCorners(*photo.image, std::move(marks), "Corners of " + name, about,
-                               "Score: the largest threshold at which it is still a corner"));
+  return photo::encodePng(
+      drawCorners(*photo.image, std::move(marks), "Corners of " + name, about,
+                  "Score: the largest threshold at which it is still a corner"));
 }
 
 Json jsonOf(const Input& input, const Keypoints& keypoints, const CornerSearch& search) {
@@ -97,7 +99,7 @@ void printSummary(const Input& input, const Keypoints& keypoints, const CornerSe
 }
 
 ExitCode runKeypoints(const KeypointsOptions& options) {
-  PhotoOptions photoOptions;
+  photo::OpenOptions photoOptions;
   if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
   CornerSearch search = options.search;
   search.suppressed = !options.unsuppressed;
@@ -114,7 +116,7 @@ ExitCode runKeypoints(const KeypointsOptions& options) {
 
   Keypoints keypoints;
   const bool done = succeeds(talk, input.shownName(), [&] {
-    const Photo photo = loadPhoto(input, photoOptions);
+    const photo::Photo photo = loadPhoto(input, photoOptions);
     keypoints = {photo.image->width, photo.image->height,
                  findCorners(image_processing::imageMakeGrayscale(*photo.image), search)};
     if (!drawing.empty()) {

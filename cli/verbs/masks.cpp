@@ -9,12 +9,13 @@
 #include "cli/frame/json_output.h"
 #include "cli/frame/lone_files.h"
 #include "cli/frame/nearest_name.h"
+#include "cli/frame/photo_files.h"
+#include "cli/frame/raw_option.h"
 #include "cli/pictures/grey_picture.h"
 #include "cli/verbs/verbs.h"
 #include "image_processing/autoenhance/auto_enhance_filter.h"
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/filtered_image.h"
-#include "photo/photo.h"
 #include "photo/png/png_file.h"
 
 namespace pelorin::cli {
@@ -35,7 +36,8 @@ struct Masks {
   std::shared_ptr<Image<float>> bilateral, ltm;
 };
 
-Masks masksOf(Photo photo, const std::string& filter, const std::vector<Face>& faces, bool exact) {
+Masks masksOf(photo::Photo photo, const std::string& filter, const std::vector<Face>& faces,
+              bool exact) {
   image_processing::FilterConfig config = image_processing::defaultFilterConfigValue;
   config.useBilateralGrid = exact ? 0 : 1;
   image_processing::FilteredImage session(
@@ -50,7 +52,7 @@ void writeMask(const std::string& path, const Image<float>& mask, bool raw) {
   if (raw) {
     writeOutput(path, {reinterpret_cast<const std::uint8_t*>(mask.data.get()), mask.byteSize()});
   } else {
-    writeOutput(path, encodePng(greyPicture(mask)));
+    writeOutput(path, photo::encodePng(greyPicture(mask)));
   }
 }
 
@@ -73,7 +75,7 @@ ExitCode runMasks(const MasksOptions& options) {
     throw UsageError("--filter: " + unknownName("filter with masks", options.filter, filters));
   }
   const std::vector<Face> faces = readFaces(options.faces);
-  PhotoOptions photoOptions;
+  photo::OpenOptions photoOptions;
   if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
   const bool raw = photoOptions.raw.has_value();
 

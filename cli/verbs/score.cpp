@@ -13,11 +13,12 @@
 #include "cli/frame/lone_files.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/outputs.h"
+#include "cli/frame/photo_files.h"
+#include "cli/frame/raw_option.h"
 #include "cli/pictures/heat_map.h"
 #include "cli/verbs/score_output.h"
 #include "cli/verbs/verbs.h"
 #include "image_processing/quality/block_features.h"
-#include "photo/photo.h"
 #include "photo/png/png_file.h"
 
 namespace pelorin::cli {
@@ -35,7 +36,7 @@ struct ScoreOptions {
   int jobs = 1;
 };
 
-std::vector<std::uint8_t> heatMapOf(const Photo& photo, const Input& input,
+std::vector<std::uint8_t> heatMapOf(const photo::Photo& photo, const Input& input,
                                     const ScoredPhoto& scored) {
   const std::string name = input.isStandardInput()
                                ? input.shownName()
@@ -44,15 +45,15 @@ std::vector<std::uint8_t> heatMapOf(const Photo& photo, const Input& input,
   const std::string about =
       fmt::format("NIQE {:.2f}, {} \xC3\x97 {} pixels, {} \xC3\x97 {} blocks", niqe.score,
                   scored.width, scored.height, niqe.blockColumns, niqe.blockRows);
-  return encodePng(drawHeatMap(
+  return photo::encodePng(drawHeatMap(
       *photo.image, {niqeBlockSize, niqe.blockColumns, niqe.blockRows, niqe.blockDistances},
       "Quality of " + name, about, "Distance of each block from natural photos; lower is better"));
 }
 
 /// @param map  where the heat map goes; null for none.
-ScoredPhoto score(const Input& input, const PhotoOptions& options, const PlannedFile* map) {
+ScoredPhoto score(const Input& input, const photo::OpenOptions& options, const PlannedFile* map) {
   stopIfInterrupted();
-  const Photo photo = loadPhoto(input, options);
+  const photo::Photo photo = loadPhoto(input, options);
   stopIfInterrupted();
   ScoredPhoto scored = {photo.image->width, photo.image->height,
                         image_processing::analyzeNiqe(*photo.image)};
@@ -86,7 +87,7 @@ struct Tally {
 ExitCode runScore(const ScoreOptions& options) {
   std::optional<float> limit;
   if (options.failAbove) limit = readFiniteNumber("--fail-above", *options.failAbove);
-  PhotoOptions photoOptions;
+  photo::OpenOptions photoOptions;
   if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
   const std::vector<Input> inputs = expandInputs(options.inputs);
   const std::vector<PlannedFile> maps = planMaps(options, inputs);

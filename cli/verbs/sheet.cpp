@@ -13,6 +13,8 @@
 #include "cli/frame/jobs.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/lone_files.h"
+#include "cli/frame/photo_files.h"
+#include "cli/frame/raw_option.h"
 #include "cli/pictures/canvas.h"
 #include "cli/pictures/jpeg_band_encoder.h"
 #include "cli/pictures/sheet_painter.h"
@@ -21,10 +23,13 @@
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/filtered_image.h"
 #include "photo/area_average.h"
-#include "photo/photo.h"
 #include "photo/turn.h"
 
 namespace pelorin::cli {
+
+using image_processing::Image;
+using image_processing::RGBA8Pixel;
+
 namespace {
 
 using image_processing::defaultFilterConfigValue;
@@ -51,20 +56,22 @@ struct SheetRow {
 struct SheetWork {
   std::vector<SheetColumn> columns;
   std::vector<Face> faces;
-  PhotoOptions photo;
+  photo::OpenOptions photo;
 };
 
 /// Room for the photo's thumbnails. What cannot be known before the photo is decoded (standard
 /// input can be read only once) gets a whole cell, and what cannot be read at all a low strip.
-PictureSize roomFor(const Input& input, const PhotoOptions& options, std::uint32_t cell) {
-  const PictureSize box{cell, cell};
-  if (options.raw) return fitWithin({options.raw->width, options.raw->height}, box);
+photo::PictureSize roomFor(const Input& input, const photo::OpenOptions& options,
+                           std::uint32_t cell) {
+  const photo::PictureSize box{cell, cell};
+  if (options.raw) return photo::fitWithin({options.raw->width, options.raw->height}, box);
   if (input.isStandardInput()) return box;
   try {
-    const JpegFacts facts = readFacts(imgproc::readJpegHeader(readInput(input)));
-    const bool onItsSide = uprightTurn(facts.orientation).quarters % 2 != 0;
-    const PictureSize stored{facts.width, facts.height};
-    return fitWithin(onItsSide ? PictureSize{stored.height, stored.width} : stored, box);
+    const photo::PhotoFacts facts = photo::readFacts(readInput(input));
+    const bool onItsSide = photo::uprightTurn(facts.orientation).quarters % 2 != 0;
+    const photo::PictureSize stored{facts.width, facts.height};
+    return photo::fitWithin(onItsSide ? photo::PictureSize{stored.height, stored.width} : stored,
+                            box);
   } catch (const Interrupted&) {
     throw;
   } catch (const std::exception&) {
@@ -72,15 +79,15 @@ PictureSize roomFor(const Input& input, const PhotoOptions& options, std::uint32
   }
 }
 
-SheetRow makeRow(const SheetWork& work, const Input& input, PictureSize room) {
-  Photo photo = loadPhoto(input, work.photo);
-  const PictureSize size{photo.image->width, photo.image->height};
-  const PictureSize small = fitWithin(size, room);
+SheetRow makeRow(const SheetWork& work, const Input& input, photo::PictureSize room) {
+  photo::Photo photo = loadPhoto(input, work.photo);
+  const photo::PictureSize size{photo.image->width, photo.image->height};
+  const photo::PictureSize small = photo::fitWithin(size, room);
   const std::string name = input.isStandardInput()
                                ? input.shownName()
                                : std::filesystem::path(input.path).filename().string();
   SheetRow row{fmt::format("{}  \xC2\xB7  {} \xC3\x97 {}", name, size.width, size.height), {}};
-  row.thumbnails.push_back(areaAverage(*photo.image, small));
+  row.thumbnails.push_back(photo::areaAverage(*photo.image, small));
   image_processing::FilteredImage session(
       photo.image, metadataWithFaces(work.faces, size.width, size.height), "",
       defaultFilterConfigValue, image_processing::DefaultFilterFactory::filterFactory());
@@ -89,7 +96,7 @@ SheetRow makeRow(const SheetWork& work, const Input& input, PictureSize room) {
     stopIfInterrupted();
     session.applyFilterWithParams(column.filter->name, column.params, defaultFilterConfigValue,
                                   filtered);
-    row.thumbnails.push_back(areaAverage(filtered, small));
+    row.thumbnails.push_back(photo::areaAverage(filtered, small));
   }
   return row;
 }

@@ -6,7 +6,7 @@
 #include <limits>
 #include <tuple>
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 std::string megapixels(const ScannedPhoto& photo) {
@@ -87,4 +87,4 @@ std::vector<Ranked> rankGroup(const DupeGroup& group, const std::vector<ScannedP
   return ranking;
 }
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

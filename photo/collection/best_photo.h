@@ -7,7 +7,7 @@
 #include "photo/collection/grouping.h"
 #include "photo/collection/scanned_photo.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 /// A photo's place in its group, the best first, and why it stands there.
 struct Ranked {
@@ -19,4 +19,4 @@ struct Ranked {
 /// file, then by the order of the list. The first is the one to keep; nothing is done to any file.
 std::vector<Ranked> rankGroup(const DupeGroup& group, const std::vector<ScannedPhoto>& photos);
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <numeric>
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 // Disjoint sets; the first photo of a set stands for it.
@@ -52,4 +52,4 @@ std::vector<DupeGroup> groupPairs(std::size_t photoCount, const std::vector<Shot
   return groups;
 }
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

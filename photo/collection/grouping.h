@@ -5,7 +5,7 @@
 
 #include "photo/collection/pair_search.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 /// Photos that pairs tie together, directly or through others.
 struct DupeGroup {
@@ -16,4 +16,4 @@ struct DupeGroup {
 /// The groups that `pairs` make of `photoCount` photos, by their first photo.
 std::vector<DupeGroup> groupPairs(std::size_t photoCount, const std::vector<ShotPair>& pairs);
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

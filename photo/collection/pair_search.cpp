@@ -6,7 +6,7 @@
 #include "image_processing/dupe/cdf_distance.h"
 #include "image_processing/dupe/dupe_score.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 ShotPair compareShots(const Shot& a, const Shot& b) {
   ShotPair pair{};
@@ -101,4 +101,4 @@ std::vector<ShotPair> findPairs(std::span<const Shot> shots, float threshold) {
   return pairs;
 }
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

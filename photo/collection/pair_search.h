@@ -6,7 +6,7 @@
 
 #include "photo/collection/shot.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 /// Two shots and what they have in common.
 struct ShotPair {
@@ -65,4 +65,4 @@ std::vector<ShotPair> findPairs(std::span<const Shot> shots, float threshold);
 /// Brings pairs into the order of `findPairs`.
 void sortPairs(std::vector<ShotPair>& pairs);
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

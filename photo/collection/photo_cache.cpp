@@ -12,7 +12,7 @@
 
 #include "image_processing/quality/niqe.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 using image_processing::niqeModelId;
@@ -175,9 +175,9 @@ void PhotoCache::prepareTables() {
     }
     execute("COMMIT");
   }
-  if (number("PRAGMA application_id") != applicationId) refuse("is not a cache of this command");
+  if (number("PRAGMA application_id") != applicationId) refuse("is not a cache of photos");
   if (number("PRAGMA user_version") != layoutVersion) {
-    refuse("was made by another version of this command");
+    refuse("was made by another version");
   }
   // With a log, storing waits for no disk and readers for no writer. Where it cannot be had, the
   // cache is only slower.
@@ -256,19 +256,18 @@ bool PhotoCache::step(sqlite3_stmt* statement) {
 }
 
 void PhotoCache::fail(int code) {
-  if (code == SQLITE_NOTADB) refuse("is not a cache of this command");
+  if (code == SQLITE_NOTADB) refuse("is not a cache of photos");
   // A table that is not there or not as it was made.
   if (code == SQLITE_CORRUPT || code == SQLITE_ERROR) refuse("is damaged");
   if (code == SQLITE_BUSY) {
-    throw CacheError(file_ + ": is in use by another run; wait for it or name another --cache");
+    throw CacheError(file_ + ": is in use by another run; wait for it or name another file");
   }
   throw CacheError(fmt::format("{}: cannot be used as a cache: {}; check the path and the disk",
                                file_, sqlite3_errstr(code)));
 }
 
 void PhotoCache::refuse(const std::string& why) {
-  throw CacheError(
-      fmt::format("{}: {}; delete the file or name another one with --cache", file_, why));
+  throw CacheError(fmt::format("{}: {}; delete the file or name another one", file_, why));
 }
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -10,7 +10,7 @@
 struct sqlite3;
 struct sqlite3_stmt;
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 /// The cache cannot be used; `what()` names the file and says what to do.
 class CacheError : public std::runtime_error {
@@ -66,4 +66,4 @@ class PhotoCache {
   Statement find_, store_, findScore_, storeScore_;
 };
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

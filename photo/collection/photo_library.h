@@ -1,40 +1,26 @@
 #pragma once
 
-#include <functional>
+#include <optional>
+#include <string>
 #include <vector>
 
-#include "photo/collection/photo_cache.h"
+#include "photo/collection/photo_record.h"
 #include "photo/collection/scanned_photo.h"
 #include "photo/collection/shot.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
-struct ScanOptions {
-  int scale = automaticScale;
-  int jobs = 1;                 ///< As for `runJobs`.
-  bool assumeFileTime = false;  ///< Photos without a capture time take that of their file.
-  PhotoCache* cache = nullptr;
-};
-
-/// The photos of a search and those that could not be read.
+/// The photos of a search: what is compared, and what is reported.
 struct PhotoLibrary {
   std::vector<ScannedPhoto> photos;
   std::vector<Shot> shots;  ///< One for each photo.
-  std::vector<FailedPhoto> failed;
-  std::string cacheTrouble;  ///< Why the cache could no longer be written; mostly empty.
-  bool interrupted = false;
+
+  /// Adds a photo.
+  /// @param path            how it is called; only for reports.
+  /// @param stamp           of its file, where there is one.
+  /// @param assumeFileTime  whether one without a capture time takes that of its file.
+  void add(const std::string& path, const PhotoRecord& record,
+           const std::optional<FileStamp>& stamp, bool assumeFileTime);
 };
 
-/// Reduces every input to what the search needs, each decoded at most once, or taken from the
-/// cache. A file that cannot be read is listed and stops nothing.
-/// @param onFailure  called at once for each such file, on the calling thread.
-/// @param onDone     called for each input, on the calling thread.
-/// @throws CacheError when the cache cannot be read.
-PhotoLibrary scanPhotos(const std::vector<Input>& inputs, const ScanOptions& options,
-                        const std::function<void(const FailedPhoto&)>& onFailure,
-                        const std::function<void()>& onDone);
-
-/// The inputs without those that name the same path again.
-std::vector<Input> withoutRepetitions(const std::vector<Input>& inputs);
-
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -3,13 +3,11 @@
 #include <sys/stat.h>
 
 #include <ctime>
+#include <utility>
 
-#include "cli/frame/errors.h"
-#include "cli/frame/file_bytes.h"
-#include "cli/frame/interrupt.h"
 #include "photo/photo.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 int scaleFor(std::uint32_t width, std::uint32_t height) {
   // One of so many pixels moves the distribution by less than a fiftieth of what a photo's
@@ -20,22 +18,18 @@ int scaleFor(std::uint32_t width, std::uint32_t height) {
   return scale;
 }
 
-PhotoRecord readPhotoRecord(const Input& input, int scale) {
-  const std::vector<std::uint8_t> file = readInput(input);
-  stopIfInterrupted();
-  if (file.empty()) throw FileError("is empty, not a JPEG file");
-  const JpegFacts facts = readFacts(imgproc::readJpegHeader(file));
+PhotoRecord readPhotoRecord(std::span<const std::uint8_t> file, int scale, std::stop_token stop) {
+  const PhotoFacts facts = readFacts(file);
   if (scale == automaticScale) scale = scaleFor(facts.width, facts.height);
   PhotoRecord record{facts.width, facts.height, facts.orientation, facts.captureTime, {}};
-  SparePixels none;
-  computeGreenCDF(*decodedImage(file, scale, none), record.cdf);
+  const Photo photo = open(file, {.scale = scale, .upright = false, .stop = std::move(stop)});
+  computeGreenCDF(*photo.image, record.cdf);
   return record;
 }
 
-std::optional<FileStamp> stampOf(const Input& input) {
+std::optional<FileStamp> stampOf(const std::string& path) {
   struct stat status;
-  if (input.isStandardInput() || stat(input.path.c_str(), &status) != 0) return std::nullopt;
-  if (!S_ISREG(status.st_mode)) return std::nullopt;
+  if (stat(path.c_str(), &status) != 0 || !S_ISREG(status.st_mode)) return std::nullopt;
   return FileStamp{static_cast<std::uint64_t>(status.st_size),
                    std::int64_t{status.st_mtim.tv_sec} * 1'000'000'000 + status.st_mtim.tv_nsec};
 }
@@ -53,4 +47,4 @@ ShotTime shotTime(const CaptureTime& time) {
   return {time.seconds + time.zoneSeconds, time.seconds};
 }
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

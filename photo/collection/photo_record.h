@@ -1,15 +1,16 @@
 #pragma once
 
 #include <cstdint>
-#include <filesystem>
 #include <optional>
+#include <span>
+#include <stop_token>
+#include <string>
 
-#include "cli/frame/inputs.h"
 #include "image_processing/dupe/green_cdf.h"
 #include "photo/collection/shot.h"
 #include "photo/metadata/capture_time.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 /// What a photo is reduced to, and what the cache keeps of it.
 struct PhotoRecord {
@@ -26,9 +27,10 @@ constexpr int automaticScale = 0;
 /// megapixels on.
 int scaleFor(std::uint32_t width, std::uint32_t height);
 
-/// Reads and decodes a photo once.
-/// @throws what reading and decoding throw, for `explain`; Interrupted on Ctrl-C.
-PhotoRecord readPhotoRecord(const Input& input, int scale);
+/// Decodes a photo once; its pixels are counted as they are stored, not turned.
+/// @throws PhotoError as `open`, Stopped when `stop` says so.
+PhotoRecord readPhotoRecord(std::span<const std::uint8_t> file, int scale = automaticScale,
+                            std::stop_token stop = {});
 
 /// What tells a changed file from the one that was read.
 struct FileStamp {
@@ -38,8 +40,8 @@ struct FileStamp {
   friend bool operator==(const FileStamp&, const FileStamp&) = default;
 };
 
-/// Empty for what is no file that can be looked at, standard input included.
-std::optional<FileStamp> stampOf(const Input& input);
+/// Empty for what is no regular file that can be looked at.
+std::optional<FileStamp> stampOf(const std::string& path);
 
 /// The moment a file was last changed; its wall clock is this machine's.
 ShotTime fileTime(const FileStamp& stamp);
@@ -47,4 +49,4 @@ ShotTime fileTime(const FileStamp& stamp);
 /// The moment a camera stated.
 ShotTime shotTime(const CaptureTime& time);
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

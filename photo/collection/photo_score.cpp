@@ -2,12 +2,12 @@
 
 #include <cstdint>
 #include <map>
+#include <utility>
 
-#include "cli/frame/interrupt.h"
 #include "image_processing/quality/niqe.h"
 #include "photo/photo.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 std::vector<std::size_t> photosToScore(const std::vector<DupeGroup>& groups,
                                        const std::vector<ScannedPhoto>& photos) {
@@ -22,11 +22,8 @@ std::vector<std::size_t> photosToScore(const std::vector<DupeGroup>& groups,
   return needed;
 }
 
-float scoreOf(const Input& input) {
-  stopIfInterrupted();
-  const Photo photo = loadPhoto(input, {});
-  stopIfInterrupted();
-  return image_processing::niqeMetric(*photo.image);
+float scoreOf(std::span<const std::uint8_t> file, std::stop_token stop) {
+  return image_processing::niqeMetric(*open(file, {.stop = std::move(stop)}).image);
 }
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

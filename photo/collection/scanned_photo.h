@@ -5,19 +5,17 @@
 #include <optional>
 #include <string>
 
-#include "cli/frame/inputs.h"
-
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 /// Where a photo's time comes from.
 enum class TimeSource { none, camera, file };
 
 /// What is reported of a photo; its shot stands at the same place of a list of its own.
 struct ScannedPhoto {
-  Input input;
+  std::string path;             ///< How the caller calls it.
   std::uint32_t width, height;  ///< As stored in the file.
   int orientation;
-  std::optional<std::uint64_t> bytes;  ///< Size of the file; none for standard input.
+  std::optional<std::uint64_t> bytes;  ///< Size of the file; none without a file.
   TimeSource timeSource;
   std::string time;  ///< For reading; empty where there is none.
   /// How natural the full-size picture looks, lower is better; NaN when it is too small to tell and
@@ -30,12 +28,8 @@ struct ScannedPhoto {
 
 /// A photo that could not be read.
 struct FailedPhoto {
-  Input input;
+  std::string path;
   std::string reason;
 };
 
-/// "2024-05-01T12:30:45+02:00", followed by " (file)" where it is only the time of the file, or
-/// "time not known".
-std::string timeText(const ScannedPhoto& photo);
-
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -5,7 +5,7 @@
 
 #include "image_processing/dupe/green_cdf.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 /// When a photo was taken, in seconds; both clocks count from the same midnight.
 struct ShotTime {
@@ -26,4 +26,4 @@ inline double secondsBetween(const ShotTime& a, const ShotTime& b) {
   return std::fabs(a.utc && b.utc ? *a.utc - *b.utc : a.wallClock - b.wallClock);
 }
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

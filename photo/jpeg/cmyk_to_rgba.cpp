@@ -6,7 +6,7 @@
 #include <memory>
 #include <type_traits>
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 struct CloseProfile {
@@ -60,4 +60,4 @@ void cmykToRgba(std::uint8_t* pixels, std::uint32_t width, std::uint32_t height,
   }
 }
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -3,7 +3,7 @@
 #include <cstdint>
 #include <span>
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 
 /// Turns CMYK pixels into RGBA in place, alpha 255.
 /// @param pixels    `width` x `height` x 4 bytes, rows back to back.
@@ -14,4 +14,4 @@ namespace pelorin::imgproc {
 void cmykToRgba(std::uint8_t* pixels, std::uint32_t width, std::uint32_t height, bool inverted,
                 std::span<const std::uint8_t> profile);
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -6,29 +6,16 @@
 #include <functional>
 #include <memory>
 #include <span>
-#include <stdexcept>
 #include <vector>
 
-#include "photo/file_io.h"  // IWYU pragma: export
+#include "photo/decode_limits.h"              // IWYU pragma: export
+#include "photo/metadata/metadata_segment.h"  // IWYU pragma: export
+#include "photo/photo_error.h"                // IWYU pragma: export
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 
 // JPEG files as plain C++: whole files in memory in, whole files in memory out. Nothing here keeps
 // state, so any thread may call; std::bad_alloc passes through everywhere.
-
-/// Why a JPEG file could not be read or made; `what()` is one clause for a user, without the file's
-/// name: "truncated: the picture data ends early".
-class JpegError : public std::runtime_error {
- public:
-  using std::runtime_error::runtime_error;
-};
-
-/// One APPn or COM segment: `marker` 0xE0 ... 0xEF or 0xFE, `payload` what follows its length.
-/// Metadata longer than a segment (large profiles, extended XMP) comes as several of them.
-struct MetadataSegment {
-  std::uint8_t marker;
-  std::vector<std::uint8_t> payload;
-};
 
 /// What a JPEG file says before its picture data.
 struct JpegHeader {
@@ -42,12 +29,6 @@ struct JpegHeader {
   std::vector<MetadataSegment> metadata;
 };
 
-/// How much work a file may ask for; checked before anything of the picture's size is allocated.
-struct DecodeLimits {
-  std::uint64_t pixels = 268'435'456;  ///< As the file stores them, before any scaling.
-  int scans = 100;                     ///< Of progressive and other files of several scans.
-};
-
 /// RGBA pixels, rows back to back, alpha 255; released with `free`.
 struct DecodedPicture {
   struct Free {
@@ -57,14 +38,14 @@ struct DecodedPicture {
   std::uint32_t width, height;
 };
 
-/// @throws JpegError when the bytes are no JPEG file or end within the header.
+/// @throws PhotoError when the bytes are no JPEG file or end within the header.
 JpegHeader readJpegHeader(std::span<const std::uint8_t> file);
 
 /// Decodes to RGBA, grey and CMYK/YCCK included. CMYK becomes sRGB through the profile in the file
 /// where there is a usable one, otherwise each channel is the light that ink and black let through.
 /// @param scale  1 or less is full size, otherwise the divisor, rounded down to a power of two, at
 ///               most 8; sizes are rounded up.
-/// @throws JpegError when the file is damaged, truncated, of an unsupported kind (lossless, more
+/// @throws PhotoError when the file is damaged, truncated, of an unsupported kind (lossless, more
 ///         than 8 bits, two or five channels) or beyond the limits: there is no half-grey picture.
 ///         What a file holds after its end mark is no concern, and neither are stray bytes between
 ///         complete scans.
@@ -83,7 +64,7 @@ void decodeJpegInto(
 /// @param quality   1 ... 100; what lies outside counts as the nearer end.
 /// @param metadata  written as it is, in this order. A JFIF segment is added in front when it has
 ///                  neither a JFIF nor an Exif one.
-/// @throws JpegError when a side is 0 or above 65500, or a segment is over 65533 bytes or neither
+/// @throws PhotoError when a side is 0 or above 65500, or a segment is over 65533 bytes or neither
 ///         APPn nor COM.
 std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t width,
                                      std::uint32_t height, int quality,
@@ -93,8 +74,8 @@ std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t wid
 /// trimmed from the edge; where that would leave nothing, the picture is decoded and encoded again
 /// at quality 100. A progressive file stays one. APPn and COM segments are kept byte for byte.
 /// @param degrees  a multiple of 90, taken modulo 360; 0 gives the bytes of `file`.
-/// @throws JpegError for other angles and for what decodeJpeg refuses.
+/// @throws PhotoError for other angles and for what decodeJpeg refuses.
 std::vector<std::uint8_t> rotateJpeg(std::span<const std::uint8_t> file, int degrees,
                                      const DecodeLimits& limits = {});
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

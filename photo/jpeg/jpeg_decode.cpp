@@ -9,7 +9,7 @@
 #include "photo/jpeg/jpeg_limits.h"
 #include "photo/jpeg/libjpeg_reader.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 constexpr int profileMarker = JPEG_APP0 + 2;
@@ -40,7 +40,7 @@ void chooseOutput(jpeg_decompress_struct& codec, int scale) {
       codec.out_color_space = JCS_CMYK;  // four bytes a pixel too, so it is converted in place
       break;
     default:
-      throw JpegError("unsupported: neither grey, colour nor CMYK");
+      throw PhotoError(PhotoError::Kind::unsupported, "unsupported: neither grey, colour nor CMYK");
   }
   codec.scale_num = 1;
   codec.scale_denom = divisorFor(scale);
@@ -104,4 +104,4 @@ void decodeJpegInto(
   reader.run([&] { jpeg_finish_decompress(&codec); });
 }
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

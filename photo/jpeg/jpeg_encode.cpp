@@ -6,7 +6,7 @@
 #include "photo/jpeg/jpeg_codec.h"
 #include "photo/jpeg/libjpeg_writer.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 constexpr std::size_t longestPayload = 65533;
@@ -24,9 +24,11 @@ bool tellsTheFileFormat(const MetadataSegment& segment) {
 
 void checkSegment(const MetadataSegment& segment) {
   const bool isApp = segment.marker >= JPEG_APP0 && segment.marker <= JPEG_APP0 + 15;
-  if (!isApp && segment.marker != JPEG_COM) throw JpegError("metadata must be APPn or COM");
+  if (!isApp && segment.marker != JPEG_COM)
+    throw PhotoError(PhotoError::Kind::invalidRequest, "metadata must be APPn or COM");
   if (segment.payload.size() > longestPayload) {
-    throw JpegError("a metadata segment is over " + std::to_string(longestPayload) + " bytes");
+    throw PhotoError(PhotoError::Kind::invalidRequest,
+                     "a metadata segment is over " + std::to_string(longestPayload) + " bytes");
   }
 }
 
@@ -50,8 +52,9 @@ std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t wid
                                      std::uint32_t height, int quality,
                                      std::span<const MetadataSegment> metadata) {
   if (width < 1 || height < 1 || width > JPEG_MAX_DIMENSION || height > JPEG_MAX_DIMENSION) {
-    throw JpegError("a JPEG file cannot be " + std::to_string(width) + " x " +
-                    std::to_string(height) + " pixels, only 1 to 65500 each way");
+    throw PhotoError(PhotoError::Kind::invalidRequest,
+                     "a JPEG file cannot be " + std::to_string(width) + " x " +
+                         std::to_string(height) + " pixels, only 1 to 65500 each way");
   }
   for (const MetadataSegment& segment : metadata) checkSegment(segment);
 
@@ -76,4 +79,4 @@ std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t wid
   return writer.takeFile();
 }
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -3,7 +3,7 @@
 #include "photo/jpeg/jpeg_codec.h"
 #include "photo/jpeg/libjpeg_reader.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 bool isAdobe(const jpeg_marker_struct& segment) {
@@ -33,4 +33,4 @@ JpegHeader readJpegHeader(std::span<const std::uint8_t> file) {
   return header;
 }
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

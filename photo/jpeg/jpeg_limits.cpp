@@ -3,7 +3,7 @@
 #include <cstring>
 #include <string>
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 constexpr std::uint8_t markerPrefix = 0xFF, endOfImage = 0xD9, startOfScan = 0xDA;
@@ -42,16 +42,18 @@ void checkLimits(LibjpegReader& reader, const DecodeLimits& limits) {
   jpeg_decompress_struct& codec = reader.codec();
   const std::uint64_t pixels = std::uint64_t{codec.image_width} * codec.image_height;
   if (pixels > limits.pixels) {
-    throw JpegError("too large: " + std::to_string(codec.image_width) + " x " +
-                    std::to_string(codec.image_height) + " pixels, at most " +
-                    std::to_string(limits.pixels) + " can be read");
+    throw PhotoError(PhotoError::Kind::tooLarge,
+                     "too large: " + std::to_string(codec.image_width) + " x " +
+                         std::to_string(codec.image_height) + " pixels, at most " +
+                         std::to_string(limits.pixels) + " can be read");
   }
   if (!jpeg_has_multiple_scans(&codec)) return;
   // readHeader has consumed the first scan's start.
   const std::span rest(codec.src->next_input_byte, codec.src->bytes_in_buffer);
   if (1 + countScans(rest, limits.scans) > limits.scans) {
-    throw JpegError("too many scans: at most " + std::to_string(limits.scans) + " can be read");
+    throw PhotoError(PhotoError::Kind::tooLarge,
+                     "too many scans: at most " + std::to_string(limits.scans) + " can be read");
   }
 }
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -3,10 +3,10 @@
 #include "photo/jpeg/jpeg_codec.h"
 #include "photo/jpeg/libjpeg_reader.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 
 /// After readHeader and before anything else: whether the file stays within `limits`.
-/// @throws JpegError when it does not.
+/// @throws PhotoError when it does not.
 void checkLimits(LibjpegReader& reader, const DecodeLimits& limits);
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

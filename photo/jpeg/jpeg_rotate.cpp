@@ -5,27 +5,20 @@
 
 #include "photo/jpeg/jpeg_codec.h"
 #include "photo/jpeg/jpeg_limits.h"
-#include "photo/jpeg/jpeg_turn.h"
+#include "photo/jpeg/jpeg_turn_pixels.h"
 #include "photo/jpeg/libjpeg_reader.h"
 #include "photo/jpeg/libjpeg_writer.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 Turn turnBy(int degrees) {
-  switch ((degrees % 360 + 360) % 360) {
-    case 0:
-      return {false, false, false};
-    case 90:
-      return {true, false, true};
-    case 180:
-      return {true, true, false};
-    case 270:
-      return {false, true, true};
-    default:
-      throw JpegError("a JPEG file turns by multiples of 90 degrees, not by " +
-                      std::to_string(degrees));
+  if (degrees % 90 != 0) {
+    throw PhotoError(
+        PhotoError::Kind::invalidRequest,
+        "a JPEG file turns by multiples of 90 degrees, not by " + std::to_string(degrees));
   }
+  return turnedFurther({}, degrees);
 }
 
 /// What becomes of a block of cosine coefficients. A cosine of odd frequency changes its sign when
@@ -34,9 +27,9 @@ struct BlockTurn {
   explicit BlockTurn(const Turn& turn) {
     for (int i = 0; i < DCTSIZE2; ++i) {
       int row = i / DCTSIZE, column = i % DCTSIZE;
-      if (turn.swapsAxes) std::swap(row, column);
-      const bool rowNegates = turn.reversesRows && row % 2 != 0;
-      const bool columnNegates = turn.reversesColumns && column % 2 != 0;
+      if (turn.swapsAxes()) std::swap(row, column);
+      const bool rowNegates = turn.reversesRows() && row % 2 != 0;
+      const bool columnNegates = turn.reversesColumns() && column % 2 != 0;
       source[i] = row * DCTSIZE + column;
       sign[i] = rowNegates != columnNegates ? -1 : 1;
     }
@@ -73,14 +66,14 @@ struct Sampling {
 // From the parameters of the picture as it was to those of the turned one. The last unit comes
 // first in a reversed direction, and there it has to be whole.
 void turnParameters(jpeg_compress_struct& codec, const Sampling& sampling, const Turn& turn) {
-  if (turn.reversesColumns) codec.image_width -= codec.image_width % sampling.unitWidth;
-  if (turn.reversesRows) codec.image_height -= codec.image_height % sampling.unitHeight;
-  if (turn.swapsAxes) std::swap(codec.image_width, codec.image_height);
+  if (turn.reversesColumns()) codec.image_width -= codec.image_width % sampling.unitWidth;
+  if (turn.reversesRows()) codec.image_height -= codec.image_height % sampling.unitHeight;
+  if (turn.swapsAxes()) std::swap(codec.image_width, codec.image_height);
   for (int i = 0; i < codec.num_components; ++i) {
     jpeg_component_info& channel = codec.comp_info[i];
     channel.h_samp_factor /= sampling.commonAcross;
     channel.v_samp_factor /= sampling.commonDown;
-    if (turn.swapsAxes) std::swap(channel.h_samp_factor, channel.v_samp_factor);
+    if (turn.swapsAxes()) std::swap(channel.h_samp_factor, channel.v_samp_factor);
   }
   const BlockTurn turnBlock(turn);
   for (JQUANT_TBL* table : codec.quant_tbl_ptrs) {
@@ -97,7 +90,7 @@ jvirt_barray_ptr requestBlocks(jpeg_compress_struct& codec, const jpeg_component
   };
   JDIMENSION across = padded(before.width_in_blocks, before.h_samp_factor);
   JDIMENSION down = padded(before.height_in_blocks, before.v_samp_factor);
-  if (turn.swapsAxes) std::swap(across, down);
+  if (turn.swapsAxes()) std::swap(across, down);
   return codec.mem->request_virt_barray(reinterpret_cast<j_common_ptr>(&codec), JPOOL_IMAGE,
                                         /*pre_zero=*/TRUE, across, down,
                                         static_cast<JDIMENSION>(channel.v_samp_factor));
@@ -113,11 +106,11 @@ void turnBlocks(jpeg_decompress_struct& source, jvirt_barray_ptr before,
                 const jpeg_component_info& channel, const Turn& turn) {
   const BlockTurn turnBlock(turn);
   JDIMENSION rows = channel.height_in_blocks, columns = channel.width_in_blocks;
-  if (turn.swapsAxes) std::swap(rows, columns);
+  if (turn.swapsAxes()) std::swap(rows, columns);
   for (JDIMENSION y = 0; y < channel.height_in_blocks; ++y) {
     const JBLOCKROW turned = blockRow(target, after, y, true);
     for (JDIMENSION x = 0; x < channel.width_in_blocks; ++x) {
-      const Place from = turn.sourceOf({y, x}, rows, columns);
+      const Turn::Place from = turn.sourceOf({y, x}, rows, columns);
       turnBlock(blockRow(source, before, from.row, false)[from.column], turned[x]);
     }
   }
@@ -136,10 +129,10 @@ std::vector<std::uint8_t> rotateJpeg(std::span<const std::uint8_t> file, int deg
   jvirt_barray_ptr* before = nullptr;
   reader.run([&] { before = jpeg_read_coefficients(&source); });
   reader.checkEveryChannelCame();
-  if (degrees % 360 == 0) return {file.begin(), file.end()};
+  if (turn == Turn{}) return {file.begin(), file.end()};
   const Sampling sampling(source);
-  if ((turn.reversesColumns && source.image_width < sampling.unitWidth) ||
-      (turn.reversesRows && source.image_height < sampling.unitHeight))
+  if ((turn.reversesColumns() && source.image_width < sampling.unitWidth) ||
+      (turn.reversesRows() && source.image_height < sampling.unitHeight))
     return turnPixels(file, turn);
 
   LibjpegWriter writer(file.size());
@@ -164,4 +157,4 @@ std::vector<std::uint8_t> rotateJpeg(std::span<const std::uint8_t> file, int deg
   return writer.takeFile();
 }
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

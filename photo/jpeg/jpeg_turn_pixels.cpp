@@ -1,10 +1,11 @@
+#include "photo/jpeg/jpeg_turn_pixels.h"
+
 #include <cstring>
 
-#include "photo/jpeg/jpeg_turn.h"
 #include "photo/jpeg/libjpeg_reader.h"
 #include "photo/jpeg/libjpeg_writer.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 struct Samples {
@@ -39,11 +40,11 @@ Samples decode(LibjpegReader& reader) {
 }
 
 Samples turned(Samples samples, const Turn& turn) {
-  Samples result = turn.swapsAxes ? samplesOf(samples.height, samples.width, samples.channels)
-                                  : samplesOf(samples.width, samples.height, samples.channels);
+  Samples result = turn.swapsAxes() ? samplesOf(samples.height, samples.width, samples.channels)
+                                    : samplesOf(samples.width, samples.height, samples.channels);
   for (std::uint32_t y = 0; y < result.height; ++y) {
     for (std::uint32_t x = 0; x < result.width; ++x) {
-      const Place from = turn.sourceOf({y, x}, samples.height, samples.width);
+      const Turn::Place from = turn.sourceOf({y, x}, samples.height, samples.width);
       std::memcpy(result.at(y, x), samples.at(from.row, from.column), samples.channels);
     }
   }
@@ -83,4 +84,4 @@ std::vector<std::uint8_t> turnPixels(std::span<const std::uint8_t> file, const T
   return writer.takeFile();
 }
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -8,7 +8,7 @@
 
 #include "photo/jpeg/jpeg_codec.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 // Warnings after which every sample is still the one the file holds.
@@ -25,30 +25,31 @@ bool isHarmless(int warning) {
   }
 }
 
-std::string explain(int code, std::string_view message) {
+PhotoError errorOf(int code, std::string_view message) {
+  using Kind = PhotoError::Kind;
   switch (code) {
     case JERR_INPUT_EMPTY:
     case JERR_NO_SOI:
-      return "not a JPEG file";
+      return {Kind::notAPhoto, "not a JPEG file"};
     case JERR_NO_IMAGE:
-      return "a JPEG file without a picture";
+      return {Kind::damaged, "a JPEG file without a picture"};
     case JWRN_JPEG_EOF:
-      return "truncated: the picture data ends early";
+      return {Kind::truncated, "truncated: the picture data ends early"};
     case JERR_IMAGE_TOO_BIG:
-      return "a side is over 65500 pixels";
+      return {Kind::unsupported, "a side is over 65500 pixels"};
     case JERR_BAD_PRECISION:
-      return "unsupported: only 8 bits a sample can be read";
+      return {Kind::unsupported, "unsupported: only 8 bits a sample can be read"};
     case JERR_SOF_UNSUPPORTED:
-      return "unsupported: neither a baseline nor a progressive JPEG file";
+      return {Kind::unsupported, "unsupported: neither a baseline nor a progressive JPEG file"};
     case JERR_BAD_MCU_SIZE:
     case JERR_MISMATCHED_QUANT_TABLE:
-      return "unsupported: " + std::string(message);
+      return {Kind::unsupported, "unsupported: " + std::string(message)};
     default:
       break;
   }
   constexpr std::string_view prefix = "Corrupt JPEG data: ";
   if (message.starts_with(prefix)) message.remove_prefix(prefix.size());
-  return "damaged: " + std::string(message);
+  return {Kind::damaged, "damaged: " + std::string(message)};
 }
 
 }  // namespace
@@ -76,7 +77,7 @@ void LibjpegErrors::throwError() {
   codec.err = &state_.base;
   char message[JMSG_LENGTH_MAX];
   state_.base.format_message(&codec, message);
-  throw JpegError(explain(code, message));
+  throw errorOf(code, message);
 }
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

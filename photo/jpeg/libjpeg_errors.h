@@ -8,7 +8,7 @@
 // clang-format on
 #include <csetjmp>
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 
 /// Turns libjpeg's errors into exceptions. libjpeg must not return from an error and is C, which
 /// an exception may not cross: an error jumps back into `run`, and `run` throws.
@@ -23,7 +23,7 @@ class LibjpegErrors {
 
   /// Calls `body`, which calls libjpeg. No object in it or below it may need its destructor: the
   /// jump skips them. What it owns belongs to the caller.
-  /// @throws JpegError or std::bad_alloc when libjpeg reports an error or a warning that picture
+  /// @throws PhotoError or std::bad_alloc when libjpeg reports an error or a warning that picture
   ///         data is missing or wrong.
   template <typename Body>
   void run(const Body& body) {
@@ -44,4 +44,4 @@ class LibjpegErrors {
   State state_;
 };
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

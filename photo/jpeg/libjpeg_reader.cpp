@@ -2,7 +2,7 @@
 
 #include "photo/jpeg/jpeg_codec.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 
 LibjpegReader::LibjpegReader(std::span<const std::uint8_t> file) : file_(file) {
   codec_.err = errors_.manager();
@@ -35,9 +35,9 @@ void LibjpegReader::checkEveryChannelCame() const {
   for (int i = 0; i < codec_.num_components; ++i) {
     // Set when the channel's first scan begins.
     if (codec_.comp_info[i].quant_table == nullptr) {
-      throw JpegError("truncated: a colour channel is missing");
+      throw PhotoError(PhotoError::Kind::truncated, "truncated: a colour channel is missing");
     }
   }
 }
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

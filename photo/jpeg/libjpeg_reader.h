@@ -5,7 +5,7 @@
 
 #include "photo/jpeg/libjpeg_errors.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 
 /// A libjpeg decompressor over a file in memory, and what its errors become.
 class LibjpegReader {
@@ -35,7 +35,7 @@ class LibjpegReader {
 
   /// After the picture data. A file of several scans may end, without a warning, before each
   /// channel had one.
-  /// @throws JpegError when a channel is missing.
+  /// @throws PhotoError when a channel is missing.
   void checkEveryChannelCame() const;
 
  private:
@@ -44,4 +44,4 @@ class LibjpegReader {
   jpeg_decompress_struct codec_ = {};
 };
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -4,7 +4,7 @@
 
 #include <exception>
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 
 LibjpegWriter::LibjpegWriter(std::size_t expectedSize) {
   destination_.bytes.reserve(expectedSize);
@@ -59,4 +59,4 @@ void LibjpegWriter::end(j_compress_ptr codec) {
   append(codec, destination.block.size() - destination.base.free_in_buffer);
 }
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -8,7 +8,7 @@
 
 #include "photo/jpeg/libjpeg_errors.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 
 /// A libjpeg compressor into a vector, and what its errors become.
 class LibjpegWriter {
@@ -53,4 +53,4 @@ class LibjpegWriter {
   Destination destination_;
 };
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

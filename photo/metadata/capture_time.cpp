@@ -10,7 +10,7 @@
 #include <cstdlib>
 #include <memory>
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 struct Unref {
@@ -99,4 +99,4 @@ std::optional<CaptureTime> exifCaptureTime(std::span<const std::uint8_t> payload
   return std::nullopt;
 }
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -5,7 +5,7 @@
 #include <span>
 #include <string>
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 /// When a photo was taken, as its camera wrote it.
 struct CaptureTime {
@@ -20,4 +20,4 @@ struct CaptureTime {
 /// none that is a date.
 std::optional<CaptureTime> exifCaptureTime(std::span<const std::uint8_t> payload);
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

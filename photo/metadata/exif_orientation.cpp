@@ -5,7 +5,7 @@
 #include <cstddef>
 #include <vector>
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 constexpr std::array<std::uint8_t, 6> exifMark = {'E', 'x', 'i', 'f', 0, 0};
@@ -85,4 +85,4 @@ void setExifOrientationUpright(std::span<std::uint8_t> payload) {
   }
 }
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -3,7 +3,7 @@
 #include <cstdint>
 #include <span>
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 /// Whether the payload of an APP1 segment begins as Exif does.
 bool isExif(std::span<const std::uint8_t> payload);
@@ -17,4 +17,4 @@ int exifOrientation(std::span<const std::uint8_t> payload);
 /// else, and nothing at all in a segment that states none.
 void setExifOrientationUpright(std::span<std::uint8_t> payload);
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -3,16 +3,17 @@
 #include <span>
 #include <vector>
 
-#include "photo/jpeg/jpeg_codec.h"
+#include "photo/metadata/metadata_segment.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 /// The Exif segment that counts, which is the first; null without one.
-const imgproc::MetadataSegment* firstExif(std::span<const imgproc::MetadataSegment> metadata);
+const MetadataSegment* firstExif(std::span<const MetadataSegment> metadata);
 
-/// The segments that an upright picture made of this file keeps: all of them, byte for byte but for
-/// an orientation of 1. Colour profiles of grey and CMYK files are left out, since they do not
+/// The segments that an upright picture made of a JPEG file keeps: all of them, byte for byte but
+/// for an orientation of 1. Colour profiles of grey and CMYK files are left out, since they do not
 /// describe RGB pixels.
-std::vector<imgproc::MetadataSegment> keptMetadata(imgproc::JpegHeader header);
+/// @param channels  of the file.
+std::vector<MetadataSegment> keptMetadata(std::vector<MetadataSegment> segments, int channels);
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

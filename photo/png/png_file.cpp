@@ -5,7 +5,7 @@
 #include <memory>
 #include <string>
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 using image_processing::Image;
@@ -19,17 +19,18 @@ class PngImage {
   PngImage(const PngImage&) = delete;
   PngImage& operator=(const PngImage&) = delete;
 
-  [[noreturn]] void fail() const { throw PngError(image.message); }
+  [[noreturn]] void fail() const { throw PhotoError(PhotoError::Kind::damaged, image.message); }
 
   png_image image;
 };
 
 void checkSize(std::uint64_t width, std::uint64_t height, std::uint64_t bytesPerPixel) {
-  if (width == 0 || height == 0) throw PngError("a picture without pixels");
+  if (width == 0 || height == 0)
+    throw PhotoError(PhotoError::Kind::invalidRequest, "a picture without pixels");
   // libpng's own macros count bytes in 32 bits.
   constexpr std::uint64_t largest = std::uint64_t{1} << 31;
   if (width > largest || height > largest || width * height > largest / bytesPerPixel)
-    throw PngError("more than 2 GB of pixels");
+    throw PhotoError(PhotoError::Kind::tooLarge, "more than 2 GB of pixels");
 }
 
 std::vector<std::uint8_t> encode(const void* pixels, std::uint32_t width, std::uint32_t height,
@@ -66,4 +67,4 @@ Image<RGBA8Pixel> decodePng(std::span<const std::uint8_t> file) {
   return picture;
 }
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -2,22 +2,15 @@
 
 #include <cstdint>
 #include <span>
-#include <stdexcept>
 #include <vector>
 
 #include "image_processing/core/image.h"
+#include "photo/photo_error.h"
 
-namespace pelorin::cli {
-
-/// Why a PNG file could not be read or made; `what()` is one clause for a user, without the file's
-/// name.
-class PngError : public std::runtime_error {
- public:
-  using std::runtime_error::runtime_error;
-};
+namespace pelorin::photo {
 
 /// The bytes of a PNG file with exactly these pixels, alpha included and not multiplied in.
-/// @throws PngError when a side is 0 or the pixels are more than 2 GB, and std::bad_alloc.
+/// @throws PhotoError when a side is 0 or the pixels are more than 2 GB, and std::bad_alloc.
 std::vector<std::uint8_t> encodePng(
     const image_processing::Image<image_processing::RGBA8Pixel>& picture);
 
@@ -25,8 +18,8 @@ std::vector<std::uint8_t> encodePng(
 std::vector<std::uint8_t> encodePng(const image_processing::Image<unsigned char>& grey);
 
 /// The pixels of a PNG file of any kind, as 8-bit RGBA.
-/// @throws PngError when the bytes are no PNG file or are damaged or more than 2 GB of pixels, and
+/// @throws PhotoError when the bytes are no PNG file or are damaged or more than 2 GB of pixels, and
 ///         std::bad_alloc.
 image_processing::Image<image_processing::RGBA8Pixel> decodePng(std::span<const std::uint8_t> file);
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -2,28 +2,16 @@
 
 #include <cstdint>
 #include <memory>
-#include <string>
+#include <span>
 
-#include "cli/frame/inputs.h"
-#include "cli/frame/verb.h"
 #include "image_processing/core/image.h"
+#include "photo/picture_size.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
-/// Size of pictures given as packed RGBA bytes, rows back to back.
-struct RawSize {
-  std::uint32_t width, height;
-};
-
-/// Adds `--raw WxH`; `text` is for `readRawSize`.
-void addRawOption(Verb verb, std::string& text);
-
-/// @throws UsageError when `text` is not like "640x480" with both sides above 0.
-RawSize readRawSize(const std::string& text);
-
-/// @throws FileError when there are more or fewer bytes than the size needs,
-///         std::system_error when they cannot be read.
+/// A picture of packed RGBA bytes, rows back to back.
+/// @throws PhotoError when there are more or fewer bytes than the size needs, and std::bad_alloc.
 std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> readRawPixels(
-    const Input& input, RawSize size);
+    std::span<const std::uint8_t> bytes, PictureSize size);
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

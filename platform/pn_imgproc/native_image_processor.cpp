@@ -3,6 +3,7 @@
 #include <exception>
 #include <new>
 
+#include "photo/file_io.h"
 #include "photo/jpeg/jpeg_codec.h"
 #include "platform/pn/log.h"
 #include "platform/pn_imgproc/stream_file.h"
@@ -11,14 +12,14 @@
 namespace pelorin::imgproc {
 
 void NativeImageProcessor::rotateJpeg(JNIEnv*, Stream& in, Stream& out, int rotation) {
-  out.file_->write(imgproc::rotateJpeg(in.file_->content(), rotation));
+  out.file_->write(photo::rotateJpeg(in.file_->content(), rotation));
 }
 
 void NativeImageProcessor::decodeJpeg(JNIEnv*, const char* path, std::uint8_t** pixels, int* width,
                                       int* height, ColorSpace, int scale) {
   *pixels = nullptr;
   try {
-    DecodedPicture picture = imgproc::decodeJpeg(readFile(utf8Path(path)), scale);
+    photo::DecodedPicture picture = photo::decodeJpeg(photo::readFile(utf8Path(path)), scale);
     *width = static_cast<int>(picture.width);
     *height = static_cast<int>(picture.height);
     *pixels = picture.pixels.release();
@@ -32,8 +33,8 @@ void NativeImageProcessor::decodeJpeg(JNIEnv*, const char* path, std::uint8_t** 
 
 void NativeImageProcessor::encodeJpeg(JNIEnv*, const std::uint8_t* pixels, int width, int height,
                                       ColorSpace, int quality, Stream& out) {
-  out.file_->write(imgproc::encodeJpeg(pixels, static_cast<std::uint32_t>(width),
-                                       static_cast<std::uint32_t>(height), quality));
+  out.file_->write(photo::encodeJpeg(pixels, static_cast<std::uint32_t>(width),
+                                     static_cast<std::uint32_t>(height), quality));
 }
 
 }  // namespace pelorin::imgproc

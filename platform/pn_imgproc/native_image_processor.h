@@ -16,7 +16,7 @@ class NativeImageProcessor {
  public:
   /// Turns the JPEG file `in` clockwise into `out`, without loss.
   /// @param rotation  degrees, a multiple of 90, taken modulo 360.
-  /// @throws JpegError for another angle or a damaged file.
+  /// @throws photo::PhotoError for another angle or a damaged file.
   static void rotateJpeg(JNIEnv* env, Stream& in, Stream& out, int rotation);
 
   /// Decodes the file at `path` (modified UTF-8). A null buffer says that it cannot be read or is
@@ -29,7 +29,7 @@ class NativeImageProcessor {
 
   /// Encodes width x height pixels into `out`.
   /// @param quality  1 ... 100.
-  /// @throws JpegError when no JPEG file can hold such a picture.
+  /// @throws photo::PhotoError when no JPEG file can hold such a picture.
   static void encodeJpeg(JNIEnv* env, const std::uint8_t* pixels, int width, int height,
                          ColorSpace colorSpace, int quality, Stream& out);
 };

@@ -5,7 +5,7 @@
 namespace pelorin::imgproc {
 
 StreamFile::StreamFile(std::string path, Mode mode) : path_(std::move(path)) {
-  if (mode == Mode::read) content_ = readFile(path_);
+  if (mode == Mode::read) content_ = photo::readFile(path_);
 }
 
 void StreamFile::write(std::span<const std::uint8_t> bytes) {

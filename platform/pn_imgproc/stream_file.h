@@ -33,7 +33,7 @@ class StreamFile {
  private:
   std::string path_;
   std::vector<std::uint8_t> content_;
-  std::optional<Replacement> written_;
+  std::optional<photo::Replacement> written_;
 };
 
 }  // namespace pelorin::imgproc

@@ -93,10 +93,10 @@ class TiffWriter {
 
 }  // namespace
 
-Bytes jpegOf(const Image<RGBA8Pixel>& picture,
-             const std::vector<imgproc::MetadataSegment>& metadata, int quality) {
-  return imgproc::encodeJpeg(reinterpret_cast<const std::uint8_t*>(picture.data.get()),
-                             picture.width, picture.height, quality, metadata);
+Bytes jpegOf(const Image<RGBA8Pixel>& picture, const std::vector<photo::MetadataSegment>& metadata,
+             int quality) {
+  return photo::encodeJpeg(reinterpret_cast<const std::uint8_t*>(picture.data.get()), picture.width,
+                           picture.height, quality, metadata);
 }
 
 Bytes smallJpeg(std::uint64_t seed) {
@@ -104,10 +104,10 @@ Bytes smallJpeg(std::uint64_t seed) {
 }
 
 Bytes cmykJpeg(std::uint32_t width, std::uint32_t height,
-               const std::vector<imgproc::MetadataSegment>& metadata) {
+               const std::vector<photo::MetadataSegment>& metadata) {
   Compressor compressor(width, height, 4, JCS_CMYK);
   jpeg_start_compress(&compressor.info, TRUE);
-  for (const imgproc::MetadataSegment& segment : metadata) {
+  for (const photo::MetadataSegment& segment : metadata) {
     jpeg_write_marker(&compressor.info, segment.marker, segment.payload.data(),
                       static_cast<unsigned>(segment.payload.size()));
   }
@@ -155,7 +155,7 @@ Bytes withHeaderSize(Bytes file, std::uint16_t width, std::uint16_t height) {
 }
 
 Image<RGBA8Pixel> decoded(const Bytes& file) {
-  const imgproc::DecodedPicture picture = imgproc::decodeJpeg(file);
+  const photo::DecodedPicture picture = photo::decodeJpeg(file);
   Image<RGBA8Pixel> image(picture.width, picture.height);
   std::memcpy(image.data.get(), picture.pixels.get(), image.byteSize());
   return image;

@@ -15,14 +15,14 @@ using image_processing::RGBA8Pixel;
 
 /// A picture as a JPEG file.
 Bytes jpegOf(const Image<RGBA8Pixel>& picture,
-             const std::vector<imgproc::MetadataSegment>& metadata = {}, int quality = 90);
+             const std::vector<photo::MetadataSegment>& metadata = {}, int quality = 90);
 
 /// A small photo-like JPEG file.
 Bytes smallJpeg(std::uint64_t seed = 1);
 
 /// A CMYK file (Adobe's, inverted) with these segments.
 Bytes cmykJpeg(std::uint32_t width, std::uint32_t height,
-               const std::vector<imgproc::MetadataSegment>& metadata = {});
+               const std::vector<photo::MetadataSegment>& metadata = {});
 
 /// A valid progressive grey file of 505 scans, each the refinement of one coefficient by one bit.
 Bytes jpegOf505Scans();

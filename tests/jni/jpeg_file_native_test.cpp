@@ -7,6 +7,7 @@
 #include <filesystem>
 #include <future>
 
+#include "photo/file_io.h"
 #include "photo/jpeg/jpeg_codec.h"
 #include "tests/jni/support/natives_fixture.h"
 #include "tests/jni/support/picture_files.h"
@@ -27,11 +28,11 @@ class JpegFileNative : public NativesTest {
   /// What the file at `path` should be after `filter` on `source`, a file's bytes.
   static std::vector<std::uint8_t> expected(const std::vector<std::uint8_t>& source, int scale,
                                             const std::string& filter, const std::string& params) {
-    const imgproc::DecodedPicture decoded = imgproc::decodeJpeg(source, scale);
+    const photo::DecodedPicture decoded = photo::decodeJpeg(source, scale);
     Image<RGBA8Pixel> photo(decoded.width, decoded.height);
     std::copy_n(decoded.pixels.get(), photo.byteSize(), &photo.data.get()->r);
     const std::vector<std::uint8_t> pixels = engineResult(photo, filter, params);
-    return imgproc::encodeJpeg(pixels.data(), photo.width, photo.height, 90);
+    return photo::encodeJpeg(pixels.data(), photo.width, photo.height, 90);
   }
 
   TemporaryFolder folder;
@@ -66,7 +67,7 @@ TEST_F(JpegFileNative, NeverOpensTheInputForWritingWithoutRotation) {
 TEST_F(JpegFileNative, MayWriteOverItsInput) {
   for (const int rotation : {0, 90}) {
     const std::vector<std::uint8_t> before = contentOf(input.text);
-    const std::vector<std::uint8_t> turned = imgproc::rotateJpeg(before, rotation);
+    const std::vector<std::uint8_t> turned = photo::rotateJpeg(before, rotation);
     EXPECT_TRUE(natives.applyToFile(input, input, rotation, noFaces, 1, ae, slider));
     EXPECT_EQ(contentOf(input.text), expected(turned, 1, "AE0", "slider=0.4;"));
   }
@@ -75,7 +76,7 @@ TEST_F(JpegFileNative, MayWriteOverItsInput) {
 TEST_F(JpegFileNative, TurnsFirstAndFiltersTheTurnedPicture) {
   for (const int rotation : {90, 180, 270, 360, -90}) {
     EXPECT_TRUE(natives.applyToFile(input, output, rotation, noFaces, 1, passThrough, empty));
-    const std::vector<std::uint8_t> turned = imgproc::rotateJpeg(contentOf(input.text), rotation);
+    const std::vector<std::uint8_t> turned = photo::rotateJpeg(contentOf(input.text), rotation);
     EXPECT_EQ(contentOf(output.text), expected(turned, 1, "PassThrough", "")) << rotation;
   }
   EXPECT_THAT(takeLogLines()[0], HasSubstr(output.text + " [32x48:90] PassThrough"));
@@ -102,10 +103,10 @@ TEST_F(JpegFileNative, IsFalseWithALineForAMissingInput) {
 TEST_F(JpegFileNative, IsFalseForADamagedFileAndKeepsTheOldOutput) {
   std::vector<std::uint8_t> damaged = contentOf(input.text);
   const std::vector<std::uint8_t> old = {1, 2, 3};
-  imgproc::writeFileAtomically(output.text, old);
+  photo::writeFileAtomically(output.text, old);
   for (const std::size_t size :
        {damaged.size() - 1, damaged.size() / 2, std::size_t{9}, std::size_t{0}}) {
-    imgproc::writeFileAtomically(input.text, std::span(damaged).first(size));
+    photo::writeFileAtomically(input.text, std::span(damaged).first(size));
     EXPECT_FALSE(natives.applyToFile(input, output, 0, noFaces, 1, ae, slider)) << size;
     EXPECT_THAT(takeLogLines(),
                 testing::Contains("6 QuenbyLib: image decoding/scaling failed for " + input.text));
@@ -133,7 +134,7 @@ TEST_F(JpegFileNative, RaisesAnIOExceptionForAnOutputThatCannotBeWritten) {
 TEST_F(JpegFileNative, LeavesTheRotatedCopyWhenAFilterFails) {
   EXPECT_FALSE(natives.applyToFile(input, output, 90, noFaces, 1, ae, empty));
   EXPECT_EQ(env.takeException(), "java/lang/IllegalArgumentException: map::at");
-  EXPECT_EQ(contentOf(output.text), imgproc::rotateJpeg(contentOf(input.text), 90));
+  EXPECT_EQ(contentOf(output.text), photo::rotateJpeg(contentOf(input.text), 90));
 }
 
 TEST_F(JpegFileNative, RaisesIllegalArgumentForANullPath) {
@@ -147,7 +148,7 @@ TEST_F(JpegFileNative, RaisesIllegalArgumentForANullPath) {
 TEST_F(JpegFileNative, TurnsInMemoryWhereTheOutputGivesNothingBack) {
   ASSERT_EQ(mkfifo(output.text.c_str(), 0600), 0);
   std::filesystem::create_symlink("out.jpg", folder.file("link.jpg"));
-  const std::vector<std::uint8_t> turned = imgproc::rotateJpeg(contentOf(input.text), 90);
+  const std::vector<std::uint8_t> turned = photo::rotateJpeg(contentOf(input.text), 90);
   alarm(60);  // a hang ends the test
   for (const std::string& name : {output.text, folder.file("link.jpg")}) {
     FakeString path(name);

@@ -6,9 +6,11 @@
 
 #include "tests/support/pictures.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
+using image_processing::Image;
+using image_processing::RGBA8Pixel;
 using test_support::flatPicture;
 using test_support::noisePicture;
 
@@ -102,4 +104,4 @@ TEST(AreaAverage, DoesNotOverflowOnTheLargestSides) {
 }
 
 }  // namespace
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -13,7 +13,7 @@
 #include <system_error>
 #include <thread>
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 namespace fs = std::filesystem;
@@ -269,4 +269,4 @@ TEST_F(FileIo, LeavesOneWholeFileWhenSeveralThreadsWriteIt) {
 }
 
 }  // namespace
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -2,7 +2,7 @@
 
 #include <gtest/gtest.h>
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 TEST(SparePixels, ServeTheNextPictureOfAsManyPixels) {
@@ -46,4 +46,4 @@ TEST(SparePixels, ServeOnePictureOnly) {
 }
 
 }  // namespace
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -1,10 +1,10 @@
-#include "photo/turn.h"
-
 #include <gtest/gtest.h>
 
 #include <string>
 
-namespace pelorin::cli {
+#include "photo/turned_image.h"
+
+namespace pelorin::photo {
 namespace {
 
 using image_processing::Image;
@@ -87,4 +87,4 @@ TEST(Turn, FourTimesGivesTheSamePictureAtEverySize) {
 }
 
 }  // namespace
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -74,9 +74,9 @@ std::string base64(const std::vector<std::uint8_t>& bytes) {
   return text;
 }
 
-std::string figure(const ScannedPhoto& photo, const std::vector<std::uint8_t>& thumbnail,
-                   const Ranked* ranked, bool keep) {
-  const std::string name = escaped(photo.input.shownName());
+std::string figure(const photo::ScannedPhoto& photo, const std::vector<std::uint8_t>& thumbnail,
+                   const photo::Ranked* ranked, bool keep) {
+  const std::string name = escaped(shownName(photo.path));
   std::string html = keep ? "<figure class=\"keep\">\n" : "<figure>\n";
   html += thumbnail.empty() ? std::string("<div class=\"none\">no picture</div>\n")
                             : fmt::format("<img alt=\"{}\" src=\"data:image/jpeg;base64,{}\">\n",
@@ -89,15 +89,15 @@ std::string figure(const ScannedPhoto& photo, const std::vector<std::uint8_t>& t
   return html + "</figcaption>\n</figure>\n";
 }
 
-std::string pairTable(const DupeReport& report, const DupeGroup& group) {
+std::string pairTable(const DupeReport& report, const photo::DupeGroup& group) {
   std::string html =
       "<table>\n<tr><th>Photo</th><th>Photo</th><th>Score</th><th>Seconds apart</th>"
       "<th>Distance</th><th>Orientation</th></tr>\n";
-  for (const ShotPair& pair : group.pairs) {
+  for (const photo::ShotPair& pair : group.pairs) {
     html += fmt::format(
         "<tr><td>{}</td><td>{}</td><td>{:.2f}</td><td>{}</td><td>{:.4f}</td><td>{}</td></tr>\n",
-        escaped(report.photos[pair.first].input.shownName()),
-        escaped(report.photos[pair.second].input.shownName()), pair.score,
+        escaped(shownName(report.photos[pair.first].path)),
+        escaped(shownName(report.photos[pair.second].path)), pair.score,
         pair.timesKnown ? fmt::format("{:.2f}", pair.seconds)
                         : std::string("not known, taken as 0"),
         pair.distance, pair.sameOrientation ? "same" : "different");
@@ -112,23 +112,23 @@ std::string htmlReport(const DupeReport& report,
   std::string html(head);
   html += fmt::format("<p>{}, threshold {}.</p>\n", summaryOf(report), report.threshold);
   for (std::size_t g = 0; g < report.groups.size(); ++g) {
-    const DupeGroup& group = report.groups[g];
-    const std::vector<Ranked> ranking =
-        report.rank ? rankGroup(group, report.photos) : std::vector<Ranked>{};
-    std::map<std::size_t, const Ranked*> rankedOf;
-    for (const Ranked& ranked : ranking) rankedOf[ranked.photo] = &ranked;
+    const photo::DupeGroup& group = report.groups[g];
+    const std::vector<photo::Ranked> ranking =
+        report.rank ? photo::rankGroup(group, report.photos) : std::vector<photo::Ranked>{};
+    std::map<std::size_t, const photo::Ranked*> rankedOf;
+    for (const photo::Ranked& ranked : ranking) rankedOf[ranked.photo] = &ranked;
     html += fmt::format("<section>\n<h2>Group {}</h2>\n<div class=\"photos\">\n", g + 1);
     for (const std::size_t i : group.photos) {
-      const Ranked* ranked = report.rank ? rankedOf[i] : nullptr;
+      const photo::Ranked* ranked = report.rank ? rankedOf[i] : nullptr;
       html += figure(report.photos[i], thumbnails[i], ranked,
                      ranked != nullptr && ranked == ranking.data());
     }
     html += "</div>\n" + pairTable(report, group) + "</section>\n";
   }
   if (!report.failed.empty()) html += "<section>\n<h2>Not read</h2>\n<ul>\n";
-  for (const FailedPhoto& failed : report.failed) {
+  for (const photo::FailedPhoto& failed : report.failed) {
     html +=
-        fmt::format("<li>{}: {}</li>\n", escaped(failed.input.shownName()), escaped(failed.reason));
+        fmt::format("<li>{}: {}</li>\n", escaped(shownName(failed.path)), escaped(failed.reason));
   }
   if (!report.failed.empty()) html += "</ul>\n</section>\n";
   return html + "</body>\n</html>\n";

@@ -9,20 +9,20 @@
 namespace pelorin::cli {
 namespace {
 
-const char* nameOf(TimeSource source) {
+const char* nameOf(photo::TimeSource source) {
   switch (source) {
-    case TimeSource::camera:
+    case photo::TimeSource::camera:
       return "camera";
-    case TimeSource::file:
+    case photo::TimeSource::file:
       return "file";
-    case TimeSource::none:
+    case photo::TimeSource::none:
       break;
   }
   return "none";
 }
 
-Json photoAsJson(const ScannedPhoto& photo) {
-  return {{"file", photo.input.path},
+Json photoAsJson(const photo::ScannedPhoto& photo) {
+  return {{"file", photo.path},
           {"width", photo.width},
           {"height", photo.height},
           {"bytes", photo.bytes ? Json(*photo.bytes) : Json()},
@@ -33,19 +33,19 @@ Json photoAsJson(const ScannedPhoto& photo) {
 
 }  // namespace
 
-std::string timeText(const ScannedPhoto& photo) {
-  if (photo.timeSource == TimeSource::none) return "time not known";
-  return photo.time + (photo.timeSource == TimeSource::file ? " (file)" : "");
+std::string timeText(const photo::ScannedPhoto& photo) {
+  if (photo.timeSource == photo::TimeSource::none) return "time not known";
+  return photo.time + (photo.timeSource == photo::TimeSource::file ? " (file)" : "");
 }
 
-std::string pairAsText(const ShotPair& pair) {
+std::string pairAsText(const photo::ShotPair& pair) {
   return fmt::format("score {:.2f}, {}, distance {:.4f}, {} orientation", pair.score,
                      pair.timesKnown ? fmt::format("{:.2f} s apart", pair.seconds)
                                      : std::string("time apart not known, taken as 0"),
                      pair.distance, pair.sameOrientation ? "same" : "different");
 }
 
-Json pairAsJson(const ShotPair& pair) {
+Json pairAsJson(const photo::ShotPair& pair) {
   return {{"score", nineDigits(pair.score)},
           {"timeDifference", pair.seconds},
           {"timesKnown", pair.timesKnown},
@@ -53,42 +53,42 @@ Json pairAsJson(const ShotPair& pair) {
           {"sameOrientation", pair.sameOrientation}};
 }
 
-std::string groupAsText(const DupeReport& report, const DupeGroup& group, std::size_t number) {
+std::string groupAsText(const DupeReport& report, const photo::DupeGroup& group,
+                        std::size_t number) {
   std::string text = fmt::format("Group {}\n", number);
   for (const std::size_t i : group.photos) {
-    const ScannedPhoto& photo = report.photos[i];
-    text += fmt::format("  {}  {} x {}, {}\n", photo.input.shownName(), photo.width, photo.height,
+    const photo::ScannedPhoto& photo = report.photos[i];
+    text += fmt::format("  {}  {} x {}, {}\n", shownName(photo.path), photo.width, photo.height,
                         timeText(photo));
   }
-  for (const ShotPair& pair : group.pairs) {
-    text += fmt::format("  {} + {}: {}\n", report.photos[pair.first].input.shownName(),
-                        report.photos[pair.second].input.shownName(), pairAsText(pair));
+  for (const photo::ShotPair& pair : group.pairs) {
+    text += fmt::format("  {} + {}: {}\n", shownName(report.photos[pair.first].path),
+                        shownName(report.photos[pair.second].path), pairAsText(pair));
   }
   if (!report.rank) return text;
   const char* verdict = "keep";
-  for (const Ranked& ranked : rankGroup(group, report.photos)) {
-    text += fmt::format("  {} {}: {}\n", verdict, report.photos[ranked.photo].input.shownName(),
+  for (const photo::Ranked& ranked : photo::rankGroup(group, report.photos)) {
+    text += fmt::format("  {} {}: {}\n", verdict, shownName(report.photos[ranked.photo].path),
                         ranked.reason);
     verdict = "rather not";
   }
   return text;
 }
 
-Json groupAsJson(const DupeReport& report, const DupeGroup& group) {
+Json groupAsJson(const DupeReport& report, const photo::DupeGroup& group) {
   Json object = {{"photos", Json::array()}, {"pairs", Json::array()}};
   for (const std::size_t i : group.photos)
     object["photos"].push_back(photoAsJson(report.photos[i]));
-  for (const ShotPair& pair : group.pairs) {
-    Json entry = {{"a", report.photos[pair.first].input.path},
-                  {"b", report.photos[pair.second].input.path}};
+  for (const photo::ShotPair& pair : group.pairs) {
+    Json entry = {{"a", report.photos[pair.first].path}, {"b", report.photos[pair.second].path}};
     entry.update(pairAsJson(pair));
     object["pairs"].push_back(std::move(entry));
   }
   if (report.rank) {
     Json& ranking = object["ranking"] = Json::array();
-    for (const Ranked& ranked : rankGroup(group, report.photos)) {
-      const ScannedPhoto& photo = report.photos[ranked.photo];
-      ranking.push_back({{"file", photo.input.path},
+    for (const photo::Ranked& ranked : photo::rankGroup(group, report.photos)) {
+      const photo::ScannedPhoto& photo = report.photos[ranked.photo];
+      ranking.push_back({{"file", photo.path},
                          {"keep", ranking.empty()},
                          {"niqe", photo.isScored() ? Json(nineDigits(*photo.niqe)) : Json()},
                          {"reason", ranked.reason}});
@@ -97,13 +97,13 @@ Json groupAsJson(const DupeReport& report, const DupeGroup& group) {
   return object;
 }
 
-Json failureAsJson(const FailedPhoto& failed) {
-  return {{"file", failed.input.path}, {"error", failed.reason}};
+Json failureAsJson(const photo::FailedPhoto& failed) {
+  return {{"file", failed.path}, {"error", failed.reason}};
 }
 
 std::string summaryOf(const DupeReport& report) {
   std::size_t grouped = 0;
-  for (const DupeGroup& group : report.groups) grouped += group.photos.size();
+  for (const photo::DupeGroup& group : report.groups) grouped += group.photos.size();
   if (grouped == 0) {
     return fmt::format("no near-duplicates among {} photos", report.photos.size());
   }

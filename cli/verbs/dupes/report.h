@@ -3,6 +3,7 @@
 #include <string>
 #include <vector>
 
+#include "cli/frame/inputs.h"
 #include "cli/frame/json_output.h"
 #include "photo/collection/best_photo.h"
 #include "photo/collection/grouping.h"
@@ -13,28 +14,33 @@ namespace pelorin::cli {
 /// What a search for duplicates has found.
 struct DupeReport {
   float threshold;
-  std::vector<ScannedPhoto> photos;
-  std::vector<DupeGroup> groups;
-  std::vector<FailedPhoto> failed;
+  std::vector<photo::ScannedPhoto> photos;
+  std::vector<photo::DupeGroup> groups;
+  std::vector<photo::FailedPhoto> failed;
   bool rank;  ///< Whether each group is ranked by what to keep.
 };
 
+/// "2024-05-01T12:30:45+02:00", followed by " (file)" where it is only the time of the file, or
+/// "time not known".
+std::string timeText(const photo::ScannedPhoto& photo);
+
 /// One group in a few lines, for a terminal; `number` counts from 1.
-std::string groupAsText(const DupeReport& report, const DupeGroup& group, std::size_t number);
+std::string groupAsText(const DupeReport& report, const photo::DupeGroup& group,
+                        std::size_t number);
 
 /// One group as an object.
-Json groupAsJson(const DupeReport& report, const DupeGroup& group);
+Json groupAsJson(const DupeReport& report, const photo::DupeGroup& group);
 
 /// A file that could not be read as an object.
-Json failureAsJson(const FailedPhoto& failed);
+Json failureAsJson(const photo::FailedPhoto& failed);
 
 /// "2 groups with 5 of 120 photos".
 std::string summaryOf(const DupeReport& report);
 
 /// "score 2.41, 0.8 s apart, distance 0.0123, same orientation"; says where the time is not known.
-std::string pairAsText(const ShotPair& pair);
+std::string pairAsText(const photo::ShotPair& pair);
 
 /// The numbers of a pair as members of an object, floats to nine significant digits.
-Json pairAsJson(const ShotPair& pair);
+Json pairAsJson(const photo::ShotPair& pair);
 
 }  // namespace pelorin::cli

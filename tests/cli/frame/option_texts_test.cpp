@@ -9,7 +9,7 @@
 #include "cli/frame/look_name.h"
 #include "cli/frame/nearest_name.h"
 #include "cli/frame/number_text.h"
-#include "photo/raw/raw_pixels.h"
+#include "cli/frame/raw_option.h"
 
 namespace pelorin::cli {
 namespace {

@@ -32,7 +32,7 @@ TEST(JpegBandEncoder, MakesAFileThatShowsThePicture) {
   const auto picture = test_support::photoLikePicture(64, 48, 5);
   JpegBandEncoder encoder(64, 48, 95);
   encoder.add(picture);
-  const auto decoded = imgproc::decodeJpeg(encoder.finish());
+  const auto decoded = photo::decodeJpeg(encoder.finish());
   ASSERT_EQ(decoded.width, 64u);
   ASSERT_EQ(decoded.height, 48u);
   double difference = 0;
@@ -46,17 +46,17 @@ TEST(JpegBandEncoder, TakesThinPictures) {
     const std::uint32_t width = wide ? 65500 : 1, height = wide ? 1 : 65500;
     JpegBandEncoder encoder(width, height, 90);
     encoder.add(test_support::noisePicture(width, height, 1));
-    const auto header = imgproc::readJpegHeader(encoder.finish());
+    const auto header = photo::readJpegHeader(encoder.finish());
     EXPECT_EQ(header.width, width);
     EXPECT_EQ(header.height, height);
   }
 }
 
 TEST(JpegBandEncoder, RefusesSizesAJpegFileCannotHave) {
-  EXPECT_THROW(JpegBandEncoder(0, 1, 90), imgproc::JpegError);
-  EXPECT_THROW(JpegBandEncoder(1, 0, 90), imgproc::JpegError);
-  EXPECT_THROW(JpegBandEncoder(65501, 1, 90), imgproc::JpegError);
-  EXPECT_THROW(JpegBandEncoder(1, 4294967295u, 90), imgproc::JpegError);
+  EXPECT_THROW(JpegBandEncoder(0, 1, 90), photo::PhotoError);
+  EXPECT_THROW(JpegBandEncoder(1, 0, 90), photo::PhotoError);
+  EXPECT_THROW(JpegBandEncoder(65501, 1, 90), photo::PhotoError);
+  EXPECT_THROW(JpegBandEncoder(1, 4294967295u, 90), photo::PhotoError);
 }
 
 TEST(JpegBandEncoder, IsLetGoOfHalfWay) {
@@ -67,7 +67,7 @@ TEST(JpegBandEncoder, IsLetGoOfHalfWay) {
 TEST(JpegBandEncoder, RefusesToFinishEarly) {
   JpegBandEncoder encoder(100, 100, 90);
   encoder.add(test_support::noisePicture(100, 10, 1));
-  EXPECT_THROW(encoder.finish(), imgproc::JpegError);
+  EXPECT_THROW(encoder.finish(), photo::PhotoError);
 }
 
 }  // namespace

@@ -9,6 +9,8 @@
 namespace pelorin::cli {
 namespace {
 
+using image_processing::Image;
+using image_processing::RGBA8Pixel;
 using test_support::flatPicture;
 
 constexpr RGBA8Pixel red{255, 0, 0, 255}, blue{0, 0, 255, 255};
@@ -102,7 +104,7 @@ TEST(SheetPainter, KeepsLongNamesOfAnyBytesInside) {
 TEST(SheetPainter, KnowsWhatDoesNotFit) {
   EXPECT_TRUE(SheetPainter({"", {"Original"}, {{320, 240}}}).fits());
   EXPECT_FALSE(SheetPainter({"", std::vector<std::string>(100, "a"), {{320, 240}}}).fits());
-  EXPECT_FALSE(SheetPainter({"", {"a"}, std::vector<PictureSize>(300, {320, 240})}).fits());
+  EXPECT_FALSE(SheetPainter({"", {"a"}, std::vector<photo::PictureSize>(300, {320, 240})}).fits());
   EXPECT_FALSE(SheetPainter({"", {"a", "b"}, {{4294967295u, 4294967295u}}}).fits());
 }
 

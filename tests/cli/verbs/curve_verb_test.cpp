@@ -104,7 +104,7 @@ TEST_F(CurveVerb, IsPlottedAndPrintedAtOnce) {
   const Finished finished = run({"-o", folder / "curve.png", "--text"});
   EXPECT_EQ(finished.exitCode, 0);
   EXPECT_EQ(floatsIn(finished.output).size(), 51u);
-  const auto plot = cli::decodePng(folder.read("curve.png"));
+  const auto plot = photo::decodePng(folder.read("curve.png"));
   EXPECT_EQ(plot.width, 1440u);
   // Every curve starts in the lower left corner of the axes, in the line's red.
   const cli::PlotArea area = cli::plotArea();
@@ -123,7 +123,7 @@ TEST_F(CurveVerb, IsPlottedToStandardOutput) {
   const Finished finished = quenby({"curve", "-", "-o", "-"}, smallJpeg());
   EXPECT_EQ(finished.exitCode, 0) << finished.errors;
   const auto* first = reinterpret_cast<const std::uint8_t*>(finished.output.data());
-  EXPECT_EQ(cli::decodePng({first, finished.output.size()}).height, 1320u);
+  EXPECT_EQ(photo::decodePng({first, finished.output.size()}).height, 1320u);
 }
 
 TEST_F(CurveVerb, OfAThinPictureIsPlotted) {

@@ -22,7 +22,7 @@ using testing::IsEmpty;
 // What the command should write: decoded, filtered by the engine itself, encoded.
 Bytes enhancedDirectly(const Bytes& file, const std::string& filter, const std::string& params,
                        int quality = 90, int scale = 1) {
-  const imgproc::DecodedPicture picture = imgproc::decodeJpeg(file, scale);
+  const photo::DecodedPicture picture = photo::decodeJpeg(file, scale);
   auto image = std::make_shared<Image<RGBA8Pixel>>(picture.width, picture.height);
   std::memcpy(image->data.get(), picture.pixels.get(), image->byteSize());
   Image<RGBA8Pixel> result(picture.width, picture.height);

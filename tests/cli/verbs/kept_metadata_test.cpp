@@ -7,7 +7,7 @@
 namespace pelorin::test_support {
 namespace {
 
-using imgproc::MetadataSegment;
+using photo::MetadataSegment;
 
 Bytes bytesOf(const std::string& text) {
   return Bytes(text.begin(), text.end());
@@ -32,7 +32,7 @@ bool operator==(const MetadataSegment& a, const MetadataSegment& b) {
 }
 
 void expectSegments(const Bytes& file, const std::vector<MetadataSegment>& expected) {
-  const std::vector<MetadataSegment> found = imgproc::readJpegHeader(file).metadata;
+  const std::vector<MetadataSegment> found = photo::readJpegHeader(file).metadata;
   ASSERT_EQ(found.size(), expected.size());
   for (std::size_t i = 0; i < found.size(); ++i) EXPECT_TRUE(found[i] == expected[i]) << i;
 }

@@ -8,7 +8,7 @@
 #include "image_processing/features/brief.h"
 #include "image_processing/features/fast.h"
 #include "photo/png/png_file.h"
-#include "photo/turn.h"
+#include "photo/turned_image.h"
 #include "tests/cli/jpeg_files.h"
 #include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
@@ -217,7 +217,7 @@ TEST_F(Keypoints, AreThoseOfTheUprightPicture) {
   const Bytes exif = exifPayload({6, "", "", ""}, false);
   const Bytes file = jpegOf(picture, {{0xE1, exif}});
   const auto upright =
-      cli::turned(std::make_shared<Image<RGBA8Pixel>>(decoded(file)), cli::uprightTurn(6));
+      photo::turned(std::make_shared<Image<RGBA8Pixel>>(decoded(file)), photo::uprightTurn(6));
   const Finished run = quenby({"keypoints", "--text", "-"}, file);
   EXPECT_EQ(run.exitCode, 0) << run.errors;
   EXPECT_EQ(run.output, engineText(*upright, 9, 20, true));
@@ -225,7 +225,7 @@ TEST_F(Keypoints, AreThoseOfTheUprightPicture) {
 
 TEST_F(Keypoints, AreDrawnOverThePhoto) {
   const auto colourful = [&](const std::string& name) {
-    const Image<RGBA8Pixel> drawing = cli::decodePng(folder.read(name));
+    const Image<RGBA8Pixel> drawing = photo::decodePng(folder.read(name));
     int pixels = 0;
     for (std::uint32_t y = 90; y + 120 < drawing.height; ++y) {
       for (std::uint32_t x = 0; x < drawing.width; ++x) {
@@ -252,7 +252,7 @@ TEST_F(Keypoints, AreDrawnOverAnOldFileOnlyWhenAsked) {
   EXPECT_THAT(kept.errors, HasSubstr("old.png: exists already; add --overwrite"));
   EXPECT_EQ(folder.read("old.png").size(), 3u);
   EXPECT_EQ(onRaw(picture, {"--draw", drawing, "--overwrite"}).exitCode, 0);
-  EXPECT_GT(cli::decodePng(folder.read("old.png")).width, 0u);
+  EXPECT_GT(photo::decodePng(folder.read("old.png")).width, 0u);
 }
 
 TEST_F(Keypoints, OfABadFileAreOneLineAndLeaveNothing) {

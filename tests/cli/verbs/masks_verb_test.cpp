@@ -120,7 +120,7 @@ TEST_F(MasksVerb, OfAJpegFileArePicturesOfItsSize) {
   ASSERT_EQ(run.exitCode, 0) << run.errors;
   const auto expected = masksOf<float>(decoded(file), noFaces);
   const auto expectGrey = [&](const std::string& name, const Image<float>& mask) {
-    const auto shown = cli::decodePng(folder.read(name));
+    const auto shown = photo::decodePng(folder.read(name));
     const auto grey = cli::greyPicture(mask);
     ASSERT_EQ(shown.width, mask.width);
     ASSERT_EQ(shown.height, mask.height);

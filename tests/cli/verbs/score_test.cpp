@@ -5,7 +5,7 @@
 #include "cli/frame/number_text.h"
 #include "image_processing/quality/niqe.h"
 #include "photo/png/png_file.h"
-#include "photo/turn.h"
+#include "photo/turned_image.h"
 #include "tests/cli/jpeg_files.h"
 #include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
@@ -172,7 +172,7 @@ TEST_F(Score, IsThatOfTheUprightFullSizePicture) {
   const Bytes exif = exifPayload({6, "", "", ""}, false);
   const Bytes file = jpegOf(picture, {{0xE1, exif}});
   const auto upright =
-      cli::turned(std::make_shared<Image<RGBA8Pixel>>(decoded(file)), cli::uprightTurn(6));
+      photo::turned(std::make_shared<Image<RGBA8Pixel>>(decoded(file)), photo::uprightTurn(6));
   const Finished run = quenby({"score", "--json", "-"}, file);
   ASSERT_EQ(run.exitCode, 0) << run.errors;
   const nlohmann::json score = parsed(run);
@@ -204,7 +204,7 @@ TEST_F(Score, ShowsItsBlocksAsAHeatMap) {
   const std::string map = folder / "heat.png";
   const Finished run = quenby({"score", "--raw", "192x96", "-", "--map", map}, rawBytes(photo));
   ASSERT_EQ(run.exitCode, 0) << run.errors;
-  const Image<RGBA8Pixel> shown = cli::decodePng(folder.read("heat.png"));
+  const Image<RGBA8Pixel> shown = photo::decodePng(folder.read("heat.png"));
   const auto warmth = [&](std::uint32_t from, std::uint32_t to) {
     double sum = 0;
     for (std::uint32_t y = shown.height / 3; y < shown.height / 2; ++y) {
@@ -238,7 +238,7 @@ TEST_F(Score, ReplacesAHeatMapOnlyWhenAsked) {
   EXPECT_THAT(kept.output, HasSubstr(good));
   EXPECT_EQ(folder.read("heat.png").size(), 3u);
   EXPECT_EQ(quenby({"score", good, "--map", map, "--overwrite"}).exitCode, 0);
-  EXPECT_GT(cli::decodePng(folder.read("heat.png")).width, 0u);
+  EXPECT_GT(photo::decodePng(folder.read("heat.png")).width, 0u);
 }
 
 TEST_F(Score, RefusesWhatItCannotMean) {

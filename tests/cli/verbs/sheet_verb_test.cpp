@@ -68,12 +68,12 @@ TEST_F(SheetVerb, ShowsThePhotoAndThenEverySlider) {
   ASSERT_EQ(finished.exitCode, 0) << finished.errors;
   EXPECT_EQ(finished.output, "");
   const auto picture = decoded(file), shown = sheet();
-  const cli::PictureSize size{160, 120};
+  const photo::PictureSize size{160, 120};
   EXPECT_EQ(shown.width, 2 * left + 3 * cell + 2 * columnGap);
   const auto at = [](std::uint32_t column) { return left + column * (cell + columnGap); };
-  EXPECT_LT(difference(shown, at(0), firstTop, cli::areaAverage(picture, size)), 3);
-  const auto low = cli::areaAverage(enhanced(picture, "slider=0.3;"), size);
-  const auto high = cli::areaAverage(enhanced(picture, "slider=1;"), size);
+  EXPECT_LT(difference(shown, at(0), firstTop, photo::areaAverage(picture, size)), 3);
+  const auto low = photo::areaAverage(enhanced(picture, "slider=0.3;"), size);
+  const auto high = photo::areaAverage(enhanced(picture, "slider=1;"), size);
   EXPECT_LT(difference(shown, at(1), firstTop, low), 3);
   EXPECT_LT(difference(shown, at(2), firstTop, high), 3);
   EXPECT_GT(difference(shown, at(2), firstTop, low), 5);
@@ -88,7 +88,7 @@ TEST_F(SheetVerb, TurnsPhotosUpright) {
   for (std::uint32_t y = 0; y < 400; ++y) {
     for (std::uint32_t x = 0; x < 300; ++x) upright.row(y)[x] = picture.row(299 - x)[y];
   }
-  EXPECT_LT(difference(sheet(), left, firstTop, cli::areaAverage(upright, {120, 160})), 4);
+  EXPECT_LT(difference(sheet(), left, firstTop, photo::areaAverage(upright, {120, 160})), 4);
 }
 
 TEST_F(SheetVerb, HasARowForEveryPhotoInTheirOrder) {

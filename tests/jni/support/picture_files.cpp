@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <stdexcept>
 
+#include "photo/file_io.h"
 #include "photo/jpeg/jpeg_codec.h"
 
 namespace pelorin::test_support {
@@ -30,12 +31,12 @@ std::vector<std::string> TemporaryFolder::names() const {
 
 void writePicture(const std::string& path,
                   const image_processing::Image<image_processing::RGBA8Pixel>& picture) {
-  imgproc::writeFileAtomically(
-      path, imgproc::encodeJpeg(&picture.data.get()->r, picture.width, picture.height, 95));
+  photo::writeFileAtomically(
+      path, photo::encodeJpeg(&picture.data.get()->r, picture.width, picture.height, 95));
 }
 
 std::vector<std::uint8_t> contentOf(const std::string& path) {
-  return imgproc::readFile(path);
+  return photo::readFile(path);
 }
 
 }  // namespace pelorin::test_support

@@ -6,7 +6,7 @@
 // A codec for tests where no JPEG library is at hand: a file is "RAW", one more byte, width and
 // height in two bytes each, and RGBA pixels. What the natives do around a codec does not depend on
 // how it codes.
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 constexpr std::size_t headerSize = 8;
@@ -18,13 +18,13 @@ struct Raw {
 
 Raw parse(std::span<const std::uint8_t> file) {
   if (file.size() < headerSize || std::memcmp(file.data(), "RAW", 3) != 0)
-    throw JpegError("no picture");
+    throw PhotoError(PhotoError::Kind::notAPhoto, "no picture");
   const auto twoBytes = [&](int i) {
     return std::uint32_t{file[i]} | std::uint32_t{file[i + 1]} << 8;
   };
   const Raw raw{twoBytes(4), twoBytes(6), file.data() + headerSize};
   if (file.size() != headerSize + std::size_t{raw.width} * raw.height * 4)
-    throw JpegError("truncated: the picture data ends early");
+    throw PhotoError(PhotoError::Kind::truncated, "truncated: the picture data ends early");
   return raw;
 }
 
@@ -61,7 +61,8 @@ DecodedPicture decodeJpeg(std::span<const std::uint8_t> file, int scale, const D
 std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t width,
                                      std::uint32_t height, int quality,
                                      std::span<const MetadataSegment>) {
-  if (width == 0 || height == 0) throw JpegError("a picture without pixels");
+  if (width == 0 || height == 0)
+    throw PhotoError(PhotoError::Kind::invalidRequest, "a picture without pixels");
   std::vector<std::uint8_t> file = makeFile(width, height);
   file[3] = static_cast<std::uint8_t>(quality);
   std::memcpy(file.data() + headerSize, rgba, file.size() - headerSize);
@@ -70,7 +71,8 @@ std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t wid
 
 std::vector<std::uint8_t> rotateJpeg(std::span<const std::uint8_t> file, int degrees,
                                      const DecodeLimits&) {
-  if (degrees % 90 != 0) throw JpegError("the angle is no multiple of 90 degrees");
+  if (degrees % 90 != 0)
+    throw PhotoError(PhotoError::Kind::invalidRequest, "the angle is no multiple of 90 degrees");
   const Raw raw = parse(file);
   std::vector<std::uint8_t> turned(file.begin(), file.end());
   std::uint32_t width = raw.width, height = raw.height;
@@ -86,4 +88,4 @@ std::vector<std::uint8_t> rotateJpeg(std::span<const std::uint8_t> file, int deg
   return turned;
 }
 
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

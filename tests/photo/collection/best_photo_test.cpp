@@ -7,13 +7,13 @@
 
 #include "photo/collection/photo_score.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 using testing::HasSubstr;
 
 ScannedPhoto photoOf(std::uint32_t width, std::uint32_t height, std::uint64_t bytes) {
-  return {{"a.jpg", {}}, width, height, 1, bytes, TimeSource::none, ""};
+  return {"a.jpg", width, height, 1, bytes, TimeSource::none, ""};
 }
 
 ScannedPhoto photoOf(std::uint32_t width, std::uint32_t height, std::uint64_t bytes, float niqe) {
@@ -115,4 +115,4 @@ TEST(BestPhoto, IsTheFirstOfEquals) {
 }
 
 }  // namespace
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

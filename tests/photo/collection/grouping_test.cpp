@@ -2,7 +2,7 @@
 
 #include <gtest/gtest.h>
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 ShotPair pairOf(std::size_t first, std::size_t second) {
@@ -44,4 +44,4 @@ TEST(Grouping, TakesALongChain) {
 }
 
 }  // namespace
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

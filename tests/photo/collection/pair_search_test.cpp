@@ -9,7 +9,7 @@
 #include "tests/dupe/synthetic_cdfs.h"
 #include "tests/photo/collection/synthetic_shots.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 using test_support::LibraryKind;
@@ -127,4 +127,4 @@ TEST(PairSearch, ComparesOnlyWhatIsNearInTime) {
 }
 
 }  // namespace
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

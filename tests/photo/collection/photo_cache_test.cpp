@@ -12,7 +12,7 @@
 #include "tests/cli/temporary_folder.h"
 #include "tests/dupe/synthetic_cdfs.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 using test_support::Bytes;
@@ -141,7 +141,7 @@ TEST(PhotoCache, RefusesADatabaseOfAnotherProgramAndLeavesItAsItWas) {
   const TemporaryFolder folder;
   changeDatabase(folder / "other.db", "CREATE TABLE photos (id INTEGER)");
   const Bytes before = folder.read("other.db");
-  EXPECT_THAT(refusalOf(folder / "other.db"), HasSubstr("is not a cache of this command"));
+  EXPECT_THAT(refusalOf(folder / "other.db"), HasSubstr("is not a cache of photos"));
   EXPECT_EQ(folder.read("other.db"), before);
 }
 
@@ -227,4 +227,4 @@ TEST(PhotoCache, ServesSeveralRunsAtOnce) {
 }
 
 }  // namespace
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -7,15 +7,15 @@
 
 namespace pelorin::test_support {
 
-std::vector<cli::Shot> syntheticShots(std::size_t count, const LibraryKind& kind,
-                                      std::uint64_t seed) {
+std::vector<photo::Shot> syntheticShots(std::size_t count, const LibraryKind& kind,
+                                        std::uint64_t seed) {
   Random random(seed);
   const auto happens = [&](std::uint32_t share) { return random.below(1000) < share; };
-  std::vector<cli::Shot> shots(count);
+  std::vector<photo::Shot> shots(count);
   double now = 1.7e9;
   image_processing::GreenCDF scene{};
   std::uint32_t left = 0;
-  for (cli::Shot& shot : shots) {
+  for (photo::Shot& shot : shots) {
     if (left == 0) {
       left = 1 + random.below(6);
       now += kind.secondsBetweenScenes * random.nextFloat();
@@ -27,7 +27,7 @@ std::vector<cli::Shot> syntheticShots(std::size_t count, const LibraryKind& kind
     shot.orientation = happens(kind.turned) ? 6 : 1;
     const double offset = 3600.0 * (1 + random.below(2));
     if (happens(kind.withoutTime)) continue;
-    shot.time = cli::ShotTime{now + offset, now};
+    shot.time = photo::ShotTime{now + offset, now};
     if (happens(kind.withoutZone)) shot.time->utc.reset();
   }
   for (std::size_t i = count; i > 1; --i) {

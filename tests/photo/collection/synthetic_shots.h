@@ -18,7 +18,7 @@ struct LibraryKind {
 
 /// `count` shots of scenes of one to six each, seconds apart, in no order. One seed gives the same
 /// shots everywhere.
-std::vector<cli::Shot> syntheticShots(std::size_t count, const LibraryKind& kind,
-                                      std::uint64_t seed);
+std::vector<photo::Shot> syntheticShots(std::size_t count, const LibraryKind& kind,
+                                        std::uint64_t seed);
 
 }  // namespace pelorin::test_support

@@ -3,7 +3,7 @@
 
 #include "tests/photo/jpeg/jpeg_files.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 using test_support::Bytes;
@@ -144,4 +144,4 @@ TEST(DecodeCmyk, MayBeProgressive) {
 }
 
 }  // namespace
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -6,7 +6,7 @@
 
 #include "tests/photo/jpeg/jpeg_files.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 using test_support::Bytes;
@@ -33,10 +33,10 @@ TEST(DamagedJpeg, FailsWhenCutAtAnyByte) {
     for (std::size_t size = 0; size < file.size(); ++size) {
       // A copy of its own, so that a sanitizer sees a read past the cut.
       const Bytes cut(file.begin(), file.begin() + static_cast<std::ptrdiff_t>(size));
-      ASSERT_THROW(decodeJpeg(cut), JpegError) << size << " of " << file.size() << " bytes";
-      ASSERT_THROW(decodeJpeg(cut, 8), JpegError) << size << " of " << file.size() << " bytes";
-      ASSERT_THROW(rotateJpeg(cut, 90), JpegError) << size << " of " << file.size() << " bytes";
-      ASSERT_THROW(rotateJpeg(cut, 0), JpegError) << size << " of " << file.size() << " bytes";
+      ASSERT_THROW(decodeJpeg(cut), PhotoError) << size << " of " << file.size() << " bytes";
+      ASSERT_THROW(decodeJpeg(cut, 8), PhotoError) << size << " of " << file.size() << " bytes";
+      ASSERT_THROW(rotateJpeg(cut, 90), PhotoError) << size << " of " << file.size() << " bytes";
+      ASSERT_THROW(rotateJpeg(cut, 0), PhotoError) << size << " of " << file.size() << " bytes";
     }
   }
 }
@@ -70,8 +70,8 @@ TEST(DamagedJpeg, FailsWhenARestartMarkIsMissing) {
   const std::size_t mark = findSegment(file, 0xD1);
   file.erase(file.begin() + static_cast<std::ptrdiff_t>(mark),
              file.begin() + static_cast<std::ptrdiff_t>(mark) + 2);
-  EXPECT_THROW(decodeJpeg(file), JpegError);
-  EXPECT_THROW(rotateJpeg(file, 90), JpegError);
+  EXPECT_THROW(decodeJpeg(file), PhotoError);
+  EXPECT_THROW(rotateJpeg(file, 90), PhotoError);
 }
 
 TEST(DamagedJpeg, MayHoldAnythingAfterItsEnd) {
@@ -114,7 +114,7 @@ TEST(DamagedJpeg, GivesAnErrorOrAPictureWhateverBytesChange) {
         for (std::size_t i = 3; i < pixels.size(); i += 4) ASSERT_EQ(pixels[i], 255);
         rotateJpeg(changed, 90, limits);
         ++read;
-      } catch (const JpegError& error) {
+      } catch (const PhotoError& error) {
         ASSERT_STRNE(error.what(), "");
         ++refused;
       }
@@ -125,4 +125,4 @@ TEST(DamagedJpeg, GivesAnErrorOrAPictureWhateverBytesChange) {
 }
 
 }  // namespace
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -5,7 +5,7 @@
 
 #include "tests/photo/jpeg/jpeg_files.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 using test_support::Bytes;
@@ -105,7 +105,7 @@ TEST(DecodeJpegInto, AsksForNoRoomBeyondTheLimits) {
     throw std::bad_alloc();
   };
   const Bytes file = makeJpeg({.width = 32, .height = 24});
-  EXPECT_THROW(decodeJpegInto(never, file, 1, {.pixels = 32 * 24 - 1}), JpegError);
+  EXPECT_THROW(decodeJpegInto(never, file, 1, {.pixels = 32 * 24 - 1}), PhotoError);
 }
 
 TEST(DecodeJpeg, ReadsThePhotoLikePictureItWasGiven) {
@@ -163,7 +163,7 @@ TEST(DecodeJpeg, ChecksTheClaimedSizeBeforeAnything) {
 TEST(DecodeJpeg, TakesTheLimitAsTheLargestSizeThatPasses) {
   const Bytes file = makeJpeg({.width = 32, .height = 24});
   EXPECT_NO_THROW(decodeJpeg(file, 1, {.pixels = 32 * 24}));
-  EXPECT_THROW(decodeJpeg(file, 1, {.pixels = 32 * 24 - 1}), JpegError);
+  EXPECT_THROW(decodeJpeg(file, 1, {.pixels = 32 * 24 - 1}), PhotoError);
 }
 
 TEST(DecodeJpeg, ReadsThinPictures) {
@@ -209,4 +209,4 @@ TEST(DecodeJpeg, RefusesTwoChannels) {
 }
 
 }  // namespace
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -6,7 +6,7 @@
 
 #include "tests/photo/jpeg/jpeg_files.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 using test_support::Bytes;
@@ -129,4 +129,4 @@ TEST(EncodeJpeg, WritesTheLongestThinPictures) {
 }
 
 }  // namespace
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -33,7 +33,7 @@ Bytes photoSamples(const JpegRecipe& recipe) {
 }  // namespace
 
 Bytes makeJpeg(const JpegRecipe& recipe, const Bytes& pixels) {
-  imgproc::LibjpegErrors errors;
+  photo::LibjpegErrors errors;
   jpeg_compress_struct codec = {};
   codec.err = errors.manager();
   unsigned char* output = nullptr;
@@ -63,7 +63,7 @@ Bytes makeJpeg(const JpegRecipe& recipe, const Bytes& pixels) {
       codec.num_scans = static_cast<int>(recipe.scans.size());
     }
     jpeg_start_compress(&codec, TRUE);
-    for (const imgproc::MetadataSegment& segment : recipe.metadata) {
+    for (const photo::MetadataSegment& segment : recipe.metadata) {
       jpeg_write_marker(&codec, segment.marker, segment.payload.data(),
                         static_cast<unsigned>(segment.payload.size()));
     }
@@ -140,7 +140,7 @@ double meanDifference(const std::uint8_t* a, const std::uint8_t* b, std::size_t 
   return sum / (3.0 * static_cast<double>(pixels));
 }
 
-Bytes rgbaBytes(const imgproc::DecodedPicture& picture) {
+Bytes rgbaBytes(const photo::DecodedPicture& picture) {
   return {picture.pixels.get(),
           picture.pixels.get() + std::size_t{picture.width} * picture.height * 4};
 }

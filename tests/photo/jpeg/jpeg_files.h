@@ -24,7 +24,7 @@ struct JpegRecipe {
   bool arithmetic = false;
   std::optional<bool> adobe = {};  ///< Adobe segment; libjpeg's choice when not set.
   std::vector<jpeg_scan_info> scans = {};
-  std::vector<imgproc::MetadataSegment> metadata = {};
+  std::vector<photo::MetadataSegment> metadata = {};
   Bytes profile = {};  ///< Written in ICC segments of at most 65519 bytes.
 };
 
@@ -58,7 +58,7 @@ template <typename Action>
 std::string jpegErrorOf(const Action& action) {
   try {
     action();
-  } catch (const imgproc::JpegError& error) {
+  } catch (const photo::PhotoError& error) {
     return error.what();
   }
   return "";
@@ -67,6 +67,6 @@ std::string jpegErrorOf(const Action& action) {
 /// Mean absolute difference of red, green and blue over two pictures of one size.
 double meanDifference(const std::uint8_t* a, const std::uint8_t* b, std::size_t pixels);
 
-Bytes rgbaBytes(const imgproc::DecodedPicture& picture);
+Bytes rgbaBytes(const photo::DecodedPicture& picture);
 
 }  // namespace pelorin::test_support

@@ -6,7 +6,7 @@
 
 #include "tests/photo/jpeg/jpeg_files.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 using test_support::Bytes;
@@ -73,7 +73,7 @@ TEST(JpegHeader, NeedsOnlyTheBytesBeforeThePictureData) {
   const std::size_t scan = findSegment(file, 0xDA);
   const std::size_t end = scan + 2 + file[scan + 3];
   for (std::size_t size = 0; size < end; ++size) {
-    EXPECT_THROW(readJpegHeader(std::span(file).first(size)), JpegError) << size << " bytes";
+    EXPECT_THROW(readJpegHeader(std::span(file).first(size)), PhotoError) << size << " bytes";
   }
   EXPECT_EQ(readJpegHeader(std::span(file).first(end)).width, 32u);
 }
@@ -100,4 +100,4 @@ TEST(JpegHeader, SaysInOneClauseWhatIsWrong) {
 }
 
 }  // namespace
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -7,7 +7,7 @@
 
 #include "tests/photo/jpeg/jpeg_files.h"
 
-namespace pelorin::imgproc {
+namespace pelorin::photo {
 namespace {
 
 using test_support::Bytes;
@@ -190,7 +190,7 @@ TEST(RotateJpeg, HonoursTheLimits) {
               "too many scans: at most 100 can be read");
     const Bytes huge = test_support::withSize(makeJpeg({}), 65500, 65500);
     EXPECT_THAT(jpegErrorOf([&] { rotateJpeg(huge, degrees); }), testing::StartsWith("too large"));
-    EXPECT_THROW(rotateJpeg(makeJpeg({}), degrees, {.pixels = 100}), JpegError);
+    EXPECT_THROW(rotateJpeg(makeJpeg({}), degrees, {.pixels = 100}), PhotoError);
   }
 }
 
@@ -207,4 +207,4 @@ TEST(RotateJpeg, TakesCommonSamplingFactorsForNone) {
 }
 
 }  // namespace
-}  // namespace pelorin::imgproc
+}  // namespace pelorin::photo

@@ -4,7 +4,7 @@
 
 #include "tests/cli/jpeg_files.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 using test_support::Bytes;
@@ -58,4 +58,4 @@ TEST(CaptureTime, IsAbsentWithoutATimeOrWithoutExif) {
 }
 
 }  // namespace
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

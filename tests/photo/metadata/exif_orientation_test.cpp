@@ -6,7 +6,7 @@
 #include "tests/cli/jpeg_files.h"
 #include "tests/support/pictures.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 using test_support::Bytes;
@@ -109,4 +109,4 @@ TEST(ExifOrientation, IsUprightForWhatIsNoExif) {
 }
 
 }  // namespace
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -6,7 +6,7 @@
 
 #include "tests/support/pictures.h"
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 namespace {
 
 using image_processing::Image;
@@ -35,31 +35,31 @@ TEST(PngFile, GivesBackEveryGrey) {
 }
 
 TEST(PngFile, RefusesPicturesWithoutPixels) {
-  EXPECT_THROW(encodePng(Image<RGBA8Pixel>(0, 0)), PngError);
-  EXPECT_THROW(encodePng(Image<RGBA8Pixel>(0, 5)), PngError);
-  EXPECT_THROW(encodePng(Image<unsigned char>(5, 0)), PngError);
+  EXPECT_THROW(encodePng(Image<RGBA8Pixel>(0, 0)), PhotoError);
+  EXPECT_THROW(encodePng(Image<RGBA8Pixel>(0, 5)), PhotoError);
+  EXPECT_THROW(encodePng(Image<unsigned char>(5, 0)), PhotoError);
 }
 
 TEST(PngFile, RefusesSizesBeyondWhatTheLibraryCounts) {
   // Nothing is read from the pixels of a picture that is refused.
   const auto pixel = std::make_shared<RGBA8Pixel>();
-  EXPECT_THROW(encodePng(Image<RGBA8Pixel>(65500, 65500, pixel)), PngError);
-  EXPECT_THROW(encodePng(Image<RGBA8Pixel>(4294967295u, 1, pixel)), PngError);
+  EXPECT_THROW(encodePng(Image<RGBA8Pixel>(65500, 65500, pixel)), PhotoError);
+  EXPECT_THROW(encodePng(Image<RGBA8Pixel>(4294967295u, 1, pixel)), PhotoError);
 }
 
 TEST(PngFile, RefusesBytesThatAreNoPng) {
-  EXPECT_THROW(decodePng({}), PngError);
+  EXPECT_THROW(decodePng({}), PhotoError);
   const std::vector<std::uint8_t> text(100, 'x');
-  EXPECT_THROW(decodePng(text), PngError);
+  EXPECT_THROW(decodePng(text), PhotoError);
 }
 
 TEST(PngFile, RefusesAFileCutBeforeItsPixelsEnd) {
   const auto file = encodePng(noisePicture(9, 9, 5));
   const std::size_t endMarker = 12, checksums = 8;  // behind the last pixel
   for (std::size_t length = 0; length < file.size() - endMarker - checksums; ++length) {
-    EXPECT_THROW(decodePng(std::span(file).first(length)), PngError) << length;
+    EXPECT_THROW(decodePng(std::span(file).first(length)), PhotoError) << length;
   }
 }
 
 }  // namespace
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

@@ -196,7 +196,7 @@ TEST(DupesCommand, ScoresAsTheEngineDoes) {
   const Json pair = pairOf(holiday, holiday.json({"--scale", "2"}), "burst/1.jpg", "burst/3.jpg");
   std::vector<GreenCDF> cdfs;
   for (const char* name : {"burst/1.jpg", "burst/3.jpg"}) {
-    const imgproc::DecodedPicture decoded = imgproc::decodeJpeg(holiday.folder.read(name), 2);
+    const photo::DecodedPicture decoded = photo::decodeJpeg(holiday.folder.read(name), 2);
     Image<RGBA8Pixel> picture(decoded.width, decoded.height);
     std::copy_n(decoded.pixels.get(), picture.byteSize(),
                 reinterpret_cast<std::uint8_t*>(picture.data.get()));
@@ -321,8 +321,8 @@ TEST(DupesCommand, SaysWhatToDoAboutAForeignCache) {
   const Finished run = holiday.dupes({"--cache", elsewhere / "letter.txt"});
   EXPECT_EQ(run.exitCode, 1);
   EXPECT_EQ(run.output, "");
-  EXPECT_THAT(run.errors, HasSubstr("letter.txt: is not a cache of this command; delete the file "
-                                    "or name another one with --cache"));
+  EXPECT_THAT(run.errors, HasSubstr("letter.txt: is not a cache of photos; delete the file "
+                                    "or name another one"));
   EXPECT_EQ(elsewhere.read("letter.txt"), Bytes(letter.begin(), letter.end()));
 }
 
@@ -508,13 +508,13 @@ TEST(DupesCommand, TellsTheScaleInItsHelp) {
 }
 
 TEST(ScaleFor, LeavesEnoughPixels) {
-  EXPECT_EQ(cli::scaleFor(4000, 3000), 8);
-  EXPECT_EQ(cli::scaleFor(2400, 1600), 8);
-  EXPECT_EQ(cli::scaleFor(2000, 1500), 4);
-  EXPECT_EQ(cli::scaleFor(640, 480), 2);
-  EXPECT_EQ(cli::scaleFor(320, 240), 1);
-  EXPECT_EQ(cli::scaleFor(1, 65500), 1);
-  EXPECT_EQ(cli::scaleFor(4294967295u, 4294967295u), 8);
+  EXPECT_EQ(photo::scaleFor(4000, 3000), 8);
+  EXPECT_EQ(photo::scaleFor(2400, 1600), 8);
+  EXPECT_EQ(photo::scaleFor(2000, 1500), 4);
+  EXPECT_EQ(photo::scaleFor(640, 480), 2);
+  EXPECT_EQ(photo::scaleFor(320, 240), 1);
+  EXPECT_EQ(photo::scaleFor(1, 65500), 1);
+  EXPECT_EQ(photo::scaleFor(4294967295u, 4294967295u), 8);
 }
 
 }  // namespace

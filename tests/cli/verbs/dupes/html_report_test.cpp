@@ -12,13 +12,13 @@ using testing::Not;
 DupeReport smallReport() {
   DupeReport report = {0.5f, {}, {}, {}, true};
   for (const char* name : {"one.jpg", "<b>&\"two\".jpg", "three.jpg"}) {
-    report.photos.push_back({{name, {}}, 400, 300, 1, 1000, TimeSource::none, ""});
+    report.photos.push_back({name, 400, 300, 1, 1000, photo::TimeSource::none, ""});
   }
-  ShotPair pair{};
+  photo::ShotPair pair{};
   pair.second = 1;
   pair.score = 2.345f;
   report.groups = {{{0, 1}, {pair}}};
-  report.failed = {{{"broken.jpg", {}}, "is <empty>"}};
+  report.failed = {{"broken.jpg", "is <empty>"}};
   return report;
 }
 

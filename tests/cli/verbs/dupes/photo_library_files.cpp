@@ -33,7 +33,7 @@ Image<RGBA8Pixel> sceneShot(int scene, int exposure, std::uint32_t width, std::u
 
 Bytes sceneJpeg(int scene, int exposure, const ExifFields& exif, std::uint32_t width,
                 std::uint32_t height) {
-  std::vector<imgproc::MetadataSegment> metadata;
+  std::vector<photo::MetadataSegment> metadata;
   if (exif.orientation != 0 || !exif.dateTime.empty()) {
     metadata.push_back({0xE1, exifPayload(exif, /*littleEndian=*/true)});
   }

@@ -1,25 +1,13 @@
-#include "photo/turn.h"
+#include "photo/turned_image.h"
 
 #include <algorithm>
-#include <array>
 #include <cstddef>
 
-namespace pelorin::cli {
+namespace pelorin::photo {
 
 using image_processing::Image;
 using image_processing::makeSharedImage;
 using image_processing::RGBA8Pixel;
-
-Turn uprightTurn(int orientation) {
-  static constexpr std::array<Turn, 8> turns = {
-      {{false, 0}, {true, 0}, {false, 2}, {true, 2}, {true, 3}, {false, 1}, {true, 1}, {false, 3}}};
-  return orientation >= 1 && orientation <= 8 ? turns[orientation - 1] : Turn{};
-}
-
-Turn turnedFurther(Turn first, int degrees) {
-  const int quarters = (degrees / 90 % 4 + 4) % 4;
-  return {first.mirrored, (first.quarters + quarters) % 4};
-}
 
 std::shared_ptr<Image<RGBA8Pixel>> turned(const std::shared_ptr<Image<RGBA8Pixel>>& picture,
                                           Turn turn) {
@@ -60,4 +48,4 @@ std::shared_ptr<Image<RGBA8Pixel>> turned(const std::shared_ptr<Image<RGBA8Pixel
   return result;
 }
 
-}  // namespace pelorin::cli
+}  // namespace pelorin::photo

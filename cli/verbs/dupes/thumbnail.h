@@ -8,7 +8,7 @@
 namespace pelorin::cli {
 
 /// A small upright JPEG picture of a photo, at most 256 pixels on its longer side.
-/// @throws what reading, decoding and encoding throw, for `explain`.
-std::vector<std::uint8_t> thumbnailOf(const ScannedPhoto& photo);
+/// @throws what reading, decoding and encoding throw, for `explain`; Interrupted on Ctrl-C.
+std::vector<std::uint8_t> thumbnailOf(const photo::ScannedPhoto& photo);
 
 }  // namespace pelorin::cli

@@ -1,0 +1,26 @@
+#include "cli/frame/raw_option.h"
+
+#include <string_view>
+
+#include "cli/frame/errors.h"
+#include "cli/frame/number_text.h"
+
+namespace pelorin::cli {
+
+void addRawOption(Verb verb, std::string& text) {
+  verb.option("--raw", text, "Read and write packed RGBA bytes of this size instead of JPEG files")
+      .type("WxH")
+      .group("Raw pixels");
+}
+
+photo::PictureSize readRawSize(const std::string& text) {
+  const std::size_t x = text.find('x');
+  if (x == std::string::npos) {
+    throw UsageError("--raw: '" + text + "' is not a size, for example 640x480");
+  }
+  const std::string_view sides = text;
+  return {readPositiveInteger("--raw", sides.substr(0, x)),
+          readPositiveInteger("--raw", sides.substr(x + 1))};
+}
+
+}  // namespace pelorin::cli

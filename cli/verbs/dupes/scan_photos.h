@@ -1,0 +1,39 @@
+#pragma once
+
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "cli/frame/inputs.h"
+#include "photo/collection/photo_cache.h"
+#include "photo/collection/photo_library.h"
+
+namespace pelorin::cli {
+
+struct ScanOptions {
+  int scale = photo::automaticScale;
+  int jobs = 1;                 ///< As for `runJobs`.
+  bool assumeFileTime = false;  ///< Photos without a capture time take that of their file.
+  photo::PhotoCache* cache = nullptr;
+};
+
+struct ScanResult {
+  photo::PhotoLibrary library;
+  std::vector<photo::FailedPhoto> failed;
+  std::string cacheTrouble;  ///< Why the cache could no longer be written; mostly empty.
+  bool interrupted = false;
+};
+
+/// Reduces every input to what the search needs, each decoded at most once, or taken from the
+/// cache. A file that cannot be read is listed and stops nothing.
+/// @param onFailure  called at once for each such file, on the calling thread.
+/// @param onDone     called for each input, on the calling thread.
+/// @throws CacheError when the cache cannot be read.
+ScanResult scanPhotos(const std::vector<Input>& inputs, const ScanOptions& options,
+                      const std::function<void(const photo::FailedPhoto&)>& onFailure,
+                      const std::function<void()>& onDone);
+
+/// The inputs without those that name the same path again.
+std::vector<Input> withoutRepetitions(const std::vector<Input>& inputs);
+
+}  // namespace pelorin::cli
