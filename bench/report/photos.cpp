@@ -6,6 +6,7 @@
 #include <filesystem>
 
 #include "bench/report/child.h"
+#include "photo/file_io.h"
 #include "photo/jpeg/jpeg_codec.h"
 #include "tests/support/pictures.h"
 
