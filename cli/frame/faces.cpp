@@ -54,7 +54,8 @@ BoundingBox boxOf(const Face& face, std::uint32_t width, std::uint32_t height, i
   const float divisor = static_cast<float>(scale);
   const float columns = face.inPixels ? 1.0f / divisor : static_cast<float>(width);
   const float rows = face.inPixels ? 1.0f / divisor : static_cast<float>(height);
-  return boxInPixels({face.left, face.top, face.right, face.bottom}, columns, rows);
+  return image_processing::boxInPixels({face.left, face.top, face.right, face.bottom}, columns,
+                                       rows);
 }
 
 }  // namespace
