@@ -28,7 +28,7 @@ class StreamTest : public testing::Test {
  protected:
   StreamTest() {
     jni::initialize(FakeEnvironment::machine(), [] {});
-    writeFileAtomically(output.text, old);
+    photo::writeFileAtomically(output.text, old);
   }
   ~StreamTest() override {
     EXPECT_EQ(env.takeException(), "");
