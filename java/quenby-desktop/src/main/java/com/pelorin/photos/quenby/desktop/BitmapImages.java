@@ -2,32 +2,31 @@ package com.pelorin.photos.quenby.desktop;
 
 import android.graphics.Bitmap;
 import java.awt.image.BufferedImage;
-import java.nio.ByteBuffer;
+import java.awt.image.WritableRaster;
 
 /** Turns the images of Java's desktop into bitmaps and back. Stateless; any thread may call. */
 public final class BitmapImages {
     private BitmapImages() {}
 
     /**
-     * Copies an image of any kind into a new bitmap of {@link Bitmap.Config#ARGB_8888}.
+     * Copies an image of any kind into a new bitmap of {@link Bitmap.Config#ARGB_8888}, which is
+     * premultiplied, and opaque when the image is of an opaque kind.
      *
      * @param image its colours are taken as sRGB, its alpha is kept
-     * @return the bitmap
+     * @return the bitmap, mutable
      */
     public static Bitmap toBitmap(BufferedImage image) {
         int width = image.getWidth();
-        int height = image.getHeight();
-        Bitmap bitmap = Bitmap.createBitmap(width, height, Bitmap.Config.ARGB_8888);
-        ByteBuffer bytes = ByteBuffer.allocate(bitmap.getByteCount());
+        Bitmap bitmap = Bitmap.createBitmap(width, image.getHeight(), Bitmap.Config.ARGB_8888);
+        ColorRows rows = ColorRows.of(image);
+        bitmap.setHasAlpha(image.getColorModel().hasAlpha());
+        bitmap.setPremultiplied(!rows.premultiplied()); // what is, is stored as it is
         int[] row = new int[width];
-        for (int y = 0; y < height; ++y) {
-            image.getRGB(0, y, width, 1, row, 0, width);
-            for (int color : row) {
-                bytes.putInt(Integer.rotateLeft(color, 8));
-            }
+        for (int y = 0; y < image.getHeight(); ++y) {
+            rows.read(y, row);
+            bitmap.setPixels(row, 0, width, 0, y, width, 1);
         }
-        bytes.flip();
-        bitmap.copyPixelsFromBuffer(bytes);
+        bitmap.setPremultiplied(true);
         return bitmap;
     }
 
@@ -48,7 +47,7 @@ public final class BitmapImages {
      * writers want it.
      *
      * @param bitmap not recycled; rows may be padded
-     * @return an image of {@link BufferedImage#TYPE_INT_RGB}
+     * @return an image of {@link BufferedImage#TYPE_INT_RGB}, of the colours without their alpha
      * @throws IllegalStateException    when the bitmap is recycled
      * @throws IllegalArgumentException when it is of another configuration
      */
@@ -62,15 +61,17 @@ public final class BitmapImages {
         }
         int width = bitmap.getWidth();
         int height = bitmap.getHeight();
-        ByteBuffer bytes = ByteBuffer.allocate(bitmap.getByteCount());
-        bitmap.copyPixelsToBuffer(bytes);
         BufferedImage image = new BufferedImage(width, height, type);
+        WritableRaster raster = image.getRaster();
         int[] row = new int[width];
         for (int y = 0; y < height; ++y) {
-            for (int x = 0; x < width; ++x) {
-                row[x] = Integer.rotateRight(bytes.getInt(y * bitmap.getRowBytes() + x * 4), 8);
+            bitmap.getPixels(row, 0, width, 0, y, width, 1);
+            if (type == BufferedImage.TYPE_INT_RGB) {
+                for (int x = 0; x < width; ++x) {
+                    row[x] &= 0xFFFFFF;
+                }
             }
-            image.setRGB(0, y, width, 1, row, 0, width);
+            raster.setDataElements(0, y, width, 1, row);
         }
         return image;
     }

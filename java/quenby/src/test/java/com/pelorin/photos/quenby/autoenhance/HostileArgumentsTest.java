@@ -91,11 +91,11 @@ class HostileArgumentsTest {
         Bitmap recycled = Pictures.photo(3, 3, 0);
         recycled.recycle();
         Object[] bitmaps = {null, photo, recycled, Pictures.sameSize(photo),
-            Bitmap.createBitmap(0, 0, Bitmap.Config.ARGB_8888),
-            Bitmap.createBitmap(0, 9, Bitmap.Config.ARGB_8888),
             Bitmap.createBitmap(1, 1, Bitmap.Config.ARGB_8888),
             Bitmap.createBitmap(20, 16, Bitmap.Config.RGB_565),
             Bitmap.createBitmap(20, 16, Bitmap.Config.ALPHA_8),
+            Bitmap.createBitmap(20, 16, Bitmap.Config.RGBA_F16),
+            photo.copy(Bitmap.Config.HARDWARE, false),
             Bitmap.createBitmap(20, 16, Bitmap.Config.ARGB_8888, 99)};
         long open = engine.init(photo);
         engine.preprocess(null, open);

@@ -84,10 +84,11 @@ class QuenbyEngineTest {
     void bitmapsThatCannotBeReadOpenNothing() {
         assertEquals(0, engine.init(null));
         for (Bitmap.Config config : Bitmap.Config.values()) {
-            if (config != Bitmap.Config.ARGB_8888) {
+            if (config != Bitmap.Config.ARGB_8888 && config != Bitmap.Config.HARDWARE) {
                 assertEquals(0, engine.init(Bitmap.createBitmap(4, 4, config)));
             }
         }
+        assertEquals(0, engine.init(photo.copy(Bitmap.Config.HARDWARE, false)));
         photo.recycle();
         assertEquals(0, engine.init(photo));
     }
