@@ -4,7 +4,9 @@
 #include <utility>
 
 #include "photo/jpeg/jpeg_codec.h"
+#include "photo/jpeg/jpeg_end.h"
 #include "photo/metadata/exif_orientation.h"
+#include "photo/metadata/first_exif.h"
 #include "photo/metadata/kept_metadata.h"
 #include "photo/png/png_file.h"
 #include "photo/raw/raw_pixels.h"
@@ -45,6 +47,17 @@ PhotoFacts factsOf(const JpegHeader& header) {
   return facts;
 }
 
+// What a JPEG file has beside its pixels; a profile for grey or CMYK does not describe RGB.
+Metadata metadataOf(std::span<const std::uint8_t> file, JpegHeader header,
+                    const PhotoFacts& facts) {
+  if (header.components != 3) removeColourProfile(header.metadata);
+  const auto tail = file.subspan(jpegEnd(file));
+  return {.segments = std::move(header.metadata),
+          .tail = {tail.begin(), tail.end()},
+          .storedSize = {facts.width, facts.height},
+          .orientation = facts.orientation};
+}
+
 void refuseEmpty(std::span<const std::uint8_t> file) {
   if (file.empty()) throw PhotoError(PhotoError::Kind::empty, "is empty, not a JPEG file");
 }
@@ -69,25 +82,30 @@ Photo open(std::span<const std::uint8_t> file, const OpenOptions& options, Spare
     refuseEmpty(file);
     JpegHeader header = readJpegHeader(file);
     photo.facts = factsOf(header);
-    photo.metadata.segments = keptMetadata(std::move(header.metadata), header.components);
+    photo.metadata = metadataOf(file, std::move(header), photo.facts);
     SparePixels none;
     photo.image = decodedImage(file, options, spare != nullptr ? *spare : none);
   }
   stopIfAsked(options.stop);
   if (options.upright) {
-    const Turn turn = turnedFurther(uprightTurn(photo.facts.orientation), options.rotate);
-    photo.image = turned(photo.image, turn);
+    photo.metadata.turn = turnedFurther(uprightTurn(photo.facts.orientation), options.rotate);
+    photo.image = turned(photo.image, photo.metadata.turn);
   }
   return photo;
 }
 
 std::vector<std::uint8_t> save(const Image<RGBA8Pixel>& picture, std::string_view format,
-                               const Metadata& metadata, const SaveOptions& options) {
+                               const Metadata& metadata, const SaveOptions& options,
+                               std::vector<Loss>* losses) {
   stopIfAsked(options.stop);
   const auto* pixels = reinterpret_cast<const std::uint8_t*>(picture.data.get());
   std::vector<std::uint8_t> file;
+  std::vector<Loss> lost;
   if (format == "JPEG") {
-    file = encodeJpeg(pixels, picture.width, picture.height, options.quality, metadata.segments);
+    KeptMetadata kept = keptMetadata(picture, metadata, options.keep);
+    file = encodeJpeg(pixels, picture.width, picture.height, options.quality, kept.segments);
+    appendTail(file, kept.tail);
+    lost = std::move(kept.lost);
   } else if (format == "PNG") {
     file = encodePng(picture);
   } else if (format == "raw pixels") {
@@ -96,6 +114,7 @@ std::vector<std::uint8_t> save(const Image<RGBA8Pixel>& picture, std::string_vie
     throw PhotoError(PhotoError::Kind::invalidRequest,
                      "'" + std::string(format) + "' is no format that can be written");
   }
+  if (losses != nullptr) *losses = std::move(lost);
   stopIfAsked(options.stop);
   return file;
 }

@@ -10,6 +10,7 @@
 
 #include "image_processing/core/image.h"
 #include "photo/decode_limits.h"
+#include "photo/metadata/kept_metadata.h"
 #include "photo/metadata/metadata.h"
 #include "photo/photo_error.h"
 #include "photo/photo_facts.h"
@@ -25,7 +26,7 @@ namespace pelorin::photo {
 struct Photo {
   std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> image;
   PhotoFacts facts;
-  Metadata metadata;  ///< What a file made of it keeps.
+  Metadata metadata;  ///< For a file made of it.
 };
 
 struct OpenOptions {
@@ -51,14 +52,16 @@ PhotoFacts readFacts(std::span<const std::uint8_t> file);
 struct SaveOptions {
   int quality = 90;           ///< 1 ... 100, for formats that lose something.
   std::stop_token stop = {};  ///< Asked between steps; the default never stops.
+  KeepOptions keep = {};      ///< Of the metadata.
 };
 
 /// The bytes of a file with this picture.
 /// @param format    a name in the table of formats: "JPEG".
 /// @param metadata  what goes with it, as far as the format can hold it.
+/// @param lost      where to tell what of the metadata is not in the file; may be null.
 /// @throws PhotoError when the format cannot hold such a picture, or is none; Stopped.
 std::vector<std::uint8_t> save(const image_processing::Image<image_processing::RGBA8Pixel>& picture,
                                std::string_view format, const Metadata& metadata = {},
-                               const SaveOptions& options = {});
+                               const SaveOptions& options = {}, std::vector<Loss>* lost = nullptr);
 
 }  // namespace pelorin::photo

@@ -59,8 +59,11 @@ void decodeJpegInto(
     const std::function<std::uint8_t*(std::uint32_t width, std::uint32_t height)>& makeRoom,
     std::span<const std::uint8_t> file, int scale = 1, const DecodeLimits& limits = {});
 
-/// Encodes RGBA pixels (alpha is ignored) as a baseline file, 4:2:0 with the standard Huffman
-/// tables: tables of its own would save a few percent and more than double the time.
+/// How many samples of colour a file has: as many as of brightness, or half as many each way.
+enum class Chroma { whole, halved };
+
+/// Encodes RGBA pixels (alpha is ignored) as a baseline file with the standard Huffman tables:
+/// tables of its own would save a few percent and more than double the time.
 /// @param quality   1 ... 100; what lies outside counts as the nearer end.
 /// @param metadata  written as it is, in this order. A JFIF segment is added in front when it has
 ///                  neither a JFIF nor an Exif one.
@@ -68,7 +71,8 @@ void decodeJpegInto(
 ///         APPn nor COM.
 std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t width,
                                      std::uint32_t height, int quality,
-                                     std::span<const MetadataSegment> metadata = {});
+                                     std::span<const MetadataSegment> metadata = {},
+                                     Chroma chroma = Chroma::halved);
 
 /// Turns a JPEG file clockwise without decoding its blocks. Partial blocks that cannot be moved are
 /// trimmed from the edge; where that would leave nothing, the picture is decoded and encoded again

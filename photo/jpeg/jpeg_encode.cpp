@@ -50,7 +50,7 @@ void writeRows(jpeg_compress_struct& codec, const std::uint8_t* rgba) {
 
 std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t width,
                                      std::uint32_t height, int quality,
-                                     std::span<const MetadataSegment> metadata) {
+                                     std::span<const MetadataSegment> metadata, Chroma chroma) {
   if (width < 1 || height < 1 || width > JPEG_MAX_DIMENSION || height > JPEG_MAX_DIMENSION) {
     throw PhotoError(PhotoError::Kind::invalidRequest,
                      "a JPEG file cannot be " + std::to_string(width) + " x " +
@@ -67,6 +67,8 @@ std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t wid
     codec.in_color_space = JCS_EXT_RGBA;
     jpeg_set_defaults(&codec);
     jpeg_set_quality(&codec, quality, TRUE);
+    if (chroma == Chroma::whole)
+      codec.comp_info[0].h_samp_factor = codec.comp_info[0].v_samp_factor = 1;
     codec.write_JFIF_header = std::none_of(metadata.begin(), metadata.end(), tellsTheFileFormat);
     jpeg_start_compress(&codec, TRUE);
     for (const MetadataSegment& segment : metadata) {

@@ -13,8 +13,4 @@ bool isExif(std::span<const std::uint8_t> payload);
 ///                 segment states nothing.
 int exifOrientation(std::span<const std::uint8_t> payload);
 
-/// Makes the segment state orientation 1 wherever `exifOrientation` could read one. Changes nothing
-/// else, and nothing at all in a segment that states none.
-void setExifOrientationUpright(std::span<std::uint8_t> payload);
-
 }  // namespace pelorin::photo

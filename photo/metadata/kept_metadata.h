@@ -1,19 +1,45 @@
 #pragma once
 
-#include <span>
 #include <vector>
 
-#include "photo/metadata/metadata_segment.h"
+#include "image_processing/core/image.h"
+#include "photo/metadata/jpeg_tail.h"
+#include "photo/metadata/loss.h"
+#include "photo/metadata/metadata.h"
 
 namespace pelorin::photo {
 
-/// The Exif segment that counts, which is the first; null without one.
-const MetadataSegment* firstExif(std::span<const MetadataSegment> metadata);
+/// What a file is to keep of the metadata of the photo that it is made of. What goes by choice is
+/// not lost.
+struct KeepOptions {
+  bool everything = true;  ///< Else the colour profile alone.
+  bool location = true;
+  bool thumbnail = true;
+  bool gainMap = true;
+};
 
-/// The segments that an upright picture made of a JPEG file keeps: all of them, byte for byte but
-/// for an orientation of 1. Colour profiles of grey and CMYK files are left out, since they do not
-/// describe RGB pixels.
-/// @param channels  of the file.
-std::vector<MetadataSegment> keptMetadata(std::vector<MetadataSegment> segments, int channels);
+/// The metadata of a file that is about to be written.
+struct KeptMetadata {
+  std::vector<MetadataSegment> segments;
+  std::vector<TailPart> tail;  ///< What is to stand behind the picture.
+  std::vector<Loss> lost;      ///< What the photo had and this file has not.
+};
+
+/// The metadata of a picture made of a photo, such that it says what the picture is: its size and
+/// that it is upright, a thumbnail of it, regions where their contents are, a gain map turned with
+/// it, an index and a container of what the file holds. What is unknown stays byte for byte; what
+/// can neither be kept nor made true goes and is named in `lost`.
+/// @param picture   as it will be written, upright.
+/// @param metadata  what `open` gave with it.
+/// @throws std::bad_alloc.
+KeptMetadata keptMetadata(const image_processing::Image<image_processing::RGBA8Pixel>& picture,
+                          const Metadata& metadata, const KeepOptions& options = {});
+
+/// Removes the colour profile from among the segments.
+void removeColourProfile(std::vector<MetadataSegment>& segments);
+
+/// Appends the kept tail to a JPEG file with the kept segments, and fills in the index of pictures
+/// among them.
+void appendTail(std::vector<std::uint8_t>& file, const std::vector<TailPart>& tail);
 
 }  // namespace pelorin::photo

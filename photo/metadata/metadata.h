@@ -1,16 +1,25 @@
 #pragma once
 
+#include <cstdint>
 #include <vector>
 
 #include "photo/metadata/metadata_segment.h"
+#include "photo/picture_size.h"
+#include "photo/turn.h"
 
 namespace pelorin::photo {
 
-/// What a photo says beside its pixels.
+/// What a photo says beside its pixels, as its file has it.
 struct Metadata {
   /// EXIF, XMP, colour profile and the rest, as a JPEG file has them, whatever the file was; in its
   /// order.
   std::vector<MetadataSegment> segments;
+  /// What stands behind the picture in the file: gain map, previews, video.
+  std::vector<std::uint8_t> tail = {};
+  // What all of it was written for, and how the decoded picture differs from that.
+  PictureSize storedSize = {};
+  int orientation = 1;  ///< EXIF, 1 ... 8.
+  Turn turn = {};       ///< From the stored picture to the decoded one.
 };
 
 }  // namespace pelorin::photo

@@ -32,51 +32,31 @@ TEST(ExifOrientation, IsReadInBothByteOrders) {
   }
 }
 
-TEST(ExifOrientation, BecomesUprightByOneByteAndNothingElse) {
-  for (const bool littleEndian : {false, true}) {
-    const Bytes before = exifPayload({6, "2024:05:01 12:30:45", "25", "+02:00"}, littleEndian);
-    Bytes after = before;
-    setExifOrientationUpright(after);
-    EXPECT_EQ(exifOrientation(after), 1);
-    EXPECT_EQ(orientationByLibexif(after), 1);
-    EXPECT_EQ(after, exifPayload({1, "2024:05:01 12:30:45", "25", "+02:00"}, littleEndian));
-  }
-}
-
 TEST(ExifOrientation, IsUprightForValuesThatMeanNothing) {
   for (const int value : {0, 9, 255, 65535}) {
     Bytes payload = exifPayload({1, "", "", ""}, true);
     const std::size_t place = 6 + 8 + 2 + 8;
     payload[place] = static_cast<std::uint8_t>(value);
     payload[place + 1] = static_cast<std::uint8_t>(value >> 8);
-    const Bytes before = payload;
     EXPECT_EQ(exifOrientation(payload), 1);
-    setExifOrientationUpright(payload);
-    EXPECT_EQ(payload, before);
   }
 }
 
-TEST(ExifOrientation, OfSeveralIsTheFirstAndAllBecomeUpright) {
+TEST(ExifOrientation, OfSeveralIsTheFirst) {
   Bytes payload = {'E', 'x', 'i', 'f', 0, 0, 'M', 'M', 0, 42, 0, 0, 0, 8, 0, 2};
   for (const std::uint8_t value : {3, 6}) {
     const Bytes entry = {0x01, 0x12, 0, 3, 0, 0, 0, 1, 0, value, 0, 0};
     payload.insert(payload.end(), entry.begin(), entry.end());
   }
   EXPECT_EQ(exifOrientation(payload), 3);
-  setExifOrientationUpright(payload);
-  EXPECT_EQ(payload[6 + 8 + 2 + 9], 1);
-  EXPECT_EQ(payload[6 + 8 + 2 + 12 + 9], 1);
 }
 
 TEST(ExifOrientation, SurvivesASegmentCutAnywhere) {
   for (const bool littleEndian : {false, true}) {
     const Bytes whole = exifPayload({6, "2024:05:01 12:30:45", "", ""}, littleEndian);
     for (std::size_t size = 0; size < whole.size(); ++size) {
-      Bytes cut(whole.begin(), whole.begin() + static_cast<std::ptrdiff_t>(size));
-      const int orientation = exifOrientation(cut);
+      const int orientation = exifOrientation(std::span(whole).first(size));
       EXPECT_TRUE(orientation == 1 || orientation == 6);
-      setExifOrientationUpright(cut);
-      EXPECT_EQ(exifOrientation(cut), 1);
     }
   }
 }
@@ -89,8 +69,8 @@ TEST(ExifOrientation, SurvivesOffsetsAndCountsBeyondTheSegment) {
                                         static_cast<std::uint32_t>(good.size() - 7)}) {
       Bytes payload = good;
       for (int i = 0; i < 4; ++i) payload[place + i] = static_cast<std::uint8_t>(hostile >> 8 * i);
-      setExifOrientationUpright(payload);
-      EXPECT_EQ(exifOrientation(payload), 1);
+      const int orientation = exifOrientation(payload);
+      EXPECT_TRUE(orientation >= 1 && orientation <= 8);
     }
   }
 }
@@ -100,10 +80,7 @@ TEST(ExifOrientation, IsUprightForWhatIsNoExif) {
   Random random(7);
   for (int round = 0; round < 1000; ++round) {
     for (std::uint8_t& byte : noise) byte = static_cast<std::uint8_t>(random.below(256));
-    const Bytes before = noise;
     EXPECT_EQ(exifOrientation(noise), 1);
-    setExifOrientationUpright(noise);
-    EXPECT_EQ(noise, before);
   }
   EXPECT_EQ(exifOrientation(Bytes{}), 1);
 }

@@ -21,7 +21,8 @@ Bytes colourProfile() {
 
 std::vector<MetadataSegment> cameraSegments(int orientation, bool littleEndian) {
   return {{0xE1, exifPayload({orientation, "2024:05:01 12:30:45", "25", "+02:00"}, littleEndian)},
-          {0xE1, bytesOf(std::string("http://ns.adobe.com/xap/1.0/\0<xmp/>", 35))},
+          {0xE1, bytesOf(std::string("http://ns.adobe.com/xap/1.0/\0", 29) +
+                         "<rdf:RDF xmlns:rdf='http://www.w3.org/1999/02/22-rdf-syntax-ns#'/>")},
           {0xE2, colourProfile()},
           {0xED, bytesOf("Photoshop 3.0")},
           {0xFE, bytesOf("a comment")}};

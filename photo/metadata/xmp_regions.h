@@ -1,0 +1,30 @@
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "photo/metadata/picture_change.h"
+#include "photo/metadata/xmp_packet.h"
+
+namespace pelorin::photo {
+
+/// A face that a file knows of, in fractions of the upright picture.
+struct KnownFace {
+  double left, top, right, bottom;
+  std::string name;  ///< Of the person; empty where none is stated.
+};
+
+/// Brings the regions of a packet to where their contents stand in the changed picture, and states
+/// its size beside them: the Metadata Working Group's (mwg-rs), Microsoft's (MP) and IPTC's
+/// (Iptc4xmpExt:ImageRegion). Regions refer to the picture as stored, except that those whose
+/// AppliedToDimensions is the upright size refer to that, with which some programs write them. A
+/// list whose AppliedToDimensions has the shape of neither belongs to another crop and stays as it
+/// is.
+void turnRegions(XmpPacket& packet, const PictureChange& change);
+
+/// The faces among the regions of a packet, each person once though two dialects tell of it, by
+/// where they stand in the picture made by `change`. Regions that are no rectangle or circle, or
+/// that belong to another crop, are left out.
+std::vector<KnownFace> facesOf(const XmpPacket& packet, const PictureChange& change);
+
+}  // namespace pelorin::photo

@@ -1,0 +1,269 @@
+#include "photo/metadata/kept_metadata.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <string>
+
+#include "photo/jpeg/jpeg_codec.h"
+#include "photo/jpeg/jpeg_end.h"
+#include "photo/metadata/exif_orientation.h"
+#include "photo/metadata/mpf.h"
+#include "photo/metadata/xmp_regions.h"
+#include "photo/metadata/xmp_segments.h"
+#include "photo/photo.h"
+#include "tests/photo/metadata/exif_segments.h"
+#include "tests/photo/metadata/xmp_texts.h"
+#include "tests/support/pictures.h"
+
+namespace pelorin::photo {
+namespace {
+
+using namespace std::string_literals;
+using image_processing::Image;
+using image_processing::RGBA8Pixel;
+using test_support::Bytes;
+using test_support::cameraExif;
+using test_support::photoLikePicture;
+using test_support::xmpPacket;
+
+Bytes bytesOf(const std::string& text) {
+  return {text.begin(), text.end()};
+}
+
+Bytes jpegOf(const Image<RGBA8Pixel>& picture, const std::vector<MetadataSegment>& segments = {}) {
+  return encodeJpeg(reinterpret_cast<const std::uint8_t*>(picture.data.get()), picture.width,
+                    picture.height, 90, segments);
+}
+
+MetadataSegment xmpSegment(const std::string& text) {
+  return {0xE1, bytesOf("http://ns.adobe.com/xap/1.0/\0"s + text)};
+}
+
+Bytes joined(std::initializer_list<Bytes> parts) {
+  Bytes all;
+  for (const Bytes& part : parts) all.insert(all.end(), part.begin(), part.end());
+  return all;
+}
+
+struct Written {
+  Bytes file;
+  std::vector<Loss> lost;
+
+  JpegHeader header() const { return readJpegHeader(file); }
+  Bytes tail() const {
+    return {file.begin() + static_cast<std::ptrdiff_t>(jpegEnd(file)), file.end()};
+  }
+  std::string text() const { return {file.begin(), file.end()}; }
+};
+
+Written rewritten(const Bytes& file, const OpenOptions& options = {},
+                  const KeepOptions& keep = {}) {
+  const Photo photo = open(file, options);
+  Written written;
+  written.file = save(*photo.image, "JPEG", photo.metadata, {.keep = keep}, &written.lost);
+  return written;
+}
+
+const std::string gainMapXmp =
+    "<rdf:Description xmlns:hdrgm='http://ns.adobe.com/hdr-gain-map/1.0/' hdrgm:Version='1.0' "
+    "hdrgm:GainMapMax='2.5'/>";
+const std::string container =
+    "<rdf:Description xmlns:hdrgm='http://ns.adobe.com/hdr-gain-map/1.0/' "
+    "xmlns:Container='http://ns.google.com/photos/1.0/container/' "
+    "xmlns:Item='http://ns.google.com/photos/1.0/container/item/' "
+    "xmlns:GCamera='http://ns.google.com/photos/1.0/camera/' hdrgm:Version='1.0' "
+    "GCamera:MotionPhoto='1'><Container:Directory><rdf:Seq>"
+    "<rdf:li rdf:parseType='Resource'><Container:Item Item:Semantic='Primary' "
+    "Item:Mime='image/jpeg'/></rdf:li>"
+    "<rdf:li rdf:parseType='Resource'><Container:Item Item:Semantic='GainMap' "
+    "Item:Mime='image/jpeg' Item:Length='7'/></rdf:li>"
+    "<rdf:li rdf:parseType='Resource'><Container:Item Item:Semantic='MotionPhoto' "
+    "Item:Mime='video/mp4' Item:Length='8'/></rdf:li>"
+    "</rdf:Seq></Container:Directory></rdf:Description>";
+
+Bytes gainMap(bool iso = false) {
+  const MetadataSegment mark =
+      iso ? MetadataSegment{0xE2, bytesOf("urn:iso:std:iso:ts:21496:-1\0payload"s)}
+          : xmpSegment(xmpPacket(gainMapXmp));
+  return jpegOf(photoLikePicture(32, 64, 5), {mark});
+}
+
+Bytes video() {
+  return bytesOf("\0\0\0\x10"s + "ftypmp42\0\0\0\0"s + "\0\0\0\x0C"s + "mdat" + "film");
+}
+
+// As a phone writes it: every claim wrong but for what can be found.
+Bytes phonePhoto(int orientation, const Bytes& tail) {
+  return joined(
+      {jpegOf(photoLikePicture(64, 128, 1),
+              {{0xE1, cameraExif({.orientation = orientation, .width = 64, .height = 128})},
+               xmpSegment(xmpPacket(container)),
+               {0xE2, writeMpf(std::vector<MpfEntry>{{mpfPrimary, 1, 0}, {0, 2, 3}})},
+               {0xE2, bytesOf("urn:iso:std:iso:ts:21496:-1\0\0\0\0\0"s)}}),
+       tail});
+}
+
+MetadataSegment mpfOf(const JpegHeader& header) {
+  for (const MetadataSegment& segment : header.metadata) {
+    if (segment.marker == 0xE2 && isMpf(segment.payload)) return segment;
+  }
+  return {0, {}};
+}
+
+TEST(KeptMetadata, HasAGainMapWhereIndexAndContainerSay) {
+  for (const bool iso : {false, true}) {
+    const Bytes map = gainMap(iso);
+    const Written written = rewritten(phonePhoto(1, joined({map, video()})));
+    EXPECT_TRUE(written.lost.empty());
+    EXPECT_EQ(written.tail(), joined({map, video()}));
+    const std::vector<MpfEntry> entries = readMpf(mpfOf(written.header()).payload);
+    ASSERT_EQ(entries.size(), 2u);
+    EXPECT_EQ(entries[0].size, jpegEnd(written.file));
+    EXPECT_EQ(entries[1].size, map.size());
+    const std::size_t header = written.text().find("MPF\0"s) + 4;
+    EXPECT_EQ(header + entries[1].offset, jpegEnd(written.file));
+    EXPECT_THAT(written.text(), testing::HasSubstr("Item:Length=\"" + std::to_string(map.size())));
+    EXPECT_THAT(written.text(),
+                testing::HasSubstr("Item:Length=\"" + std::to_string(video().size())));
+  }
+}
+
+TEST(KeptMetadata, TurnsTheGainMapWithThePicture) {
+  for (int orientation = 1; orientation <= 8; ++orientation) {
+    const Written written = rewritten(phonePhoto(orientation, gainMap()));
+    const Bytes map = written.tail();
+    EXPECT_TRUE(isGainMap(map));
+    const DecodedPicture turned = decodeJpeg(map);
+    const Image<RGBA8Pixel> before = photoLikePicture(32, 64, 5);
+    const Turn turn = uprightTurn(orientation);
+    ASSERT_EQ(turned.width, turn.swapsAxes() ? 64u : 32u);
+    double difference = 0;
+    for (std::uint32_t y = 0; y < turned.height; ++y) {
+      for (std::uint32_t x = 0; x < turned.width; ++x) {
+        const Turn::Place from = turn.sourceOf({y, x}, before.height, before.width);
+        const int was = before.row(from.row)[from.column].g;
+        difference += std::abs(was - turned.pixels.get()[4 * (y * turned.width + x) + 1]);
+      }
+    }
+    EXPECT_LT(difference / (turned.width * turned.height), 6) << orientation;
+  }
+}
+
+TEST(KeptMetadata, WithoutItsGainMapClaimsNone) {
+  for (const bool dropped : {false, true}) {
+    // Dropped by choice, or missing from the file.
+    const Written written = dropped ? rewritten(phonePhoto(1, gainMap()), {}, {.gainMap = false})
+                                    : rewritten(phonePhoto(1, {}));
+    EXPECT_TRUE(written.tail().empty());
+    for (const std::string& claim :
+         {"MPF\0"s, "hdrgm:Version"s, "GainMap"s, "urn:iso:std:iso:ts:21496"s, "MotionPhoto"s})
+      EXPECT_EQ(written.text().find(claim), std::string::npos) << claim;
+  }
+}
+
+TEST(KeptMetadata, NamesSecondPicturesAndUnknownDataThatGo) {
+  const Bytes preview = jpegOf(photoLikePicture(16, 16, 2));
+  const Written written =
+      rewritten(phonePhoto(1, joined({preview, {0, 0, 0}, bytesOf("what is this?")})));
+  EXPECT_TRUE(written.tail().empty());
+  ASSERT_EQ(written.lost.size(), 2u);
+  EXPECT_EQ(written.lost[0].what, "second picture");
+  EXPECT_EQ(written.lost[1].what, "data behind the picture");
+}
+
+TEST(KeptMetadata, NamesTheManifestThatAnEditBreaks) {
+  const Bytes file = jpegOf(photoLikePicture(32, 32, 1),
+                            {{0xEB, bytesOf("JP\0\1\0\0\0\1\0\0\0\x40jumb....c2pa"s)}});
+  const Written written = rewritten(file);
+  EXPECT_EQ(written.lost, (std::vector<Loss>{{"C2PA manifest", "an edit breaks its signature"}}));
+  EXPECT_EQ(written.text().find("c2pa"), std::string::npos);
+}
+
+TEST(KeptMetadata, KeepsSamsungsTrailerAtTheEnd) {
+  const std::string block = "\0\0\x30\x0A\x10\0\0\0MotionPhoto_Datafilm"s;
+  const auto little = [](std::size_t value) {
+    return std::string{static_cast<char>(value), static_cast<char>(value >> 8), 0, 0};
+  };
+  const std::string table = "SEFH" + little(107) + little(1) + "\0\0\x30\x0A"s +
+                            little(block.size()) + little(block.size());
+  const Bytes trailer = bytesOf(block + table + little(table.size()) + "SEFT");
+  const Written written = rewritten(phonePhoto(6, trailer));
+  EXPECT_TRUE(written.lost.empty());
+  EXPECT_EQ(written.tail(), trailer);
+  EXPECT_THAT(written.text(), testing::HasSubstr("GCamera:MotionPhoto=\"1\""));
+  EXPECT_THAT(written.text(), testing::HasSubstr("Item:Length=\"8\""));
+}
+
+TEST(KeptMetadata, RemovesThumbnailsThatShowThePictureAsItWas) {
+  const Bytes jfif = bytesOf("JFIF\0\1\2\0\0\1\0\1\1\1abc"s);
+  const Bytes resources = bytesOf("Photoshop 3.0\0"s + "8BIM\x04\x04\0\0\0\0\0\3abc\0"s +
+                                  "8BIM\x04\x0C\0\0\0\0\0\4old!"s);
+  const Written written =
+      rewritten(jpegOf(photoLikePicture(32, 32, 1), {{0xE0, jfif}, {0xED, resources}}));
+  EXPECT_EQ(written.lost.size(), 2u);
+  const std::vector<MetadataSegment> segments = written.header().metadata;
+  ASSERT_EQ(segments.size(), 2u);
+  EXPECT_EQ(segments[0].payload, bytesOf("JFIF\0\1\2\0\0\1\0\1\0\0"s));
+  EXPECT_EQ(segments[1].payload, bytesOf("Photoshop 3.0\0"s + "8BIM\x04\x04\0\0\0\0\0\3abc\0"s));
+}
+
+TEST(KeptMetadata, OfEveryKindAgreesAboutSizeAndOrientation) {
+  const std::string xmp = xmpPacket(
+      "<rdf:Description tiff:Orientation='6' exif:PixelXDimension='64' exif:PixelYDimension='128'>"
+      "<mwg-rs:Regions rdf:parseType='Resource'><mwg-rs:AppliedToDimensions stDim:w='64' "
+      "stDim:h='128'/><mwg-rs:RegionList><rdf:Bag><rdf:li mwg-rs:Type='Face'><mwg-rs:Area "
+      "stArea:x='0.25' stArea:y='0.5' stArea:w='0.1' stArea:h='0.1'/></rdf:li></rdf:Bag>"
+      "</mwg-rs:RegionList></mwg-rs:Regions></rdf:Description>");
+  const Bytes file = jpegOf(photoLikePicture(64, 128, 1),
+                            {{0xE1, cameraExif({.width = 64, .height = 128})}, xmpSegment(xmp)});
+  const Written written = rewritten(file, {.scale = 2});
+  const JpegHeader header = written.header();
+  EXPECT_EQ(header.width, 64u);
+  EXPECT_EQ(header.height, 32u);
+  EXPECT_EQ(header.metadata[0].payload, cameraExif({.orientation = 1, .width = 64, .height = 32}));
+  std::vector<MetadataSegment> segments = header.metadata;
+  std::vector<Loss> lost;
+  editXmp(
+      segments,
+      [](XmpPacket& packet) {
+        EXPECT_EQ(packet.property({"http://ns.adobe.com/tiff/1.0/", "Orientation"}).text(), "1");
+        EXPECT_EQ(packet.property({"http://ns.adobe.com/exif/1.0/", "PixelXDimension"}).text(),
+                  "64");
+        EXPECT_EQ(packet.property({"http://ns.adobe.com/exif/1.0/", "PixelYDimension"}).text(),
+                  "32");
+        const std::vector<KnownFace> faces = facesOf(packet, {{64, 32}, {64, 32}, {}, 1});
+        ASSERT_EQ(faces.size(), 1u);
+        EXPECT_NEAR((faces[0].left + faces[0].right) / 2, 0.5, 1e-6);
+        EXPECT_NEAR((faces[0].top + faces[0].bottom) / 2, 0.25, 1e-6);
+      },
+      lost);
+}
+
+TEST(KeptMetadata, CanBeTheColourProfileAlone) {
+  const MetadataSegment profile = {0xE2, bytesOf("ICC_PROFILE\0\1\1profile"s)};
+  const Bytes file = joined({jpegOf(photoLikePicture(32, 32, 1),
+                                    {{0xE1, cameraExif({})}, profile, {0xFE, bytesOf("note")}}),
+                             gainMap()});
+  const Written written = rewritten(file, {}, {.everything = false});
+  EXPECT_TRUE(written.tail().empty());
+  const std::vector<MetadataSegment> segments = written.header().metadata;
+  ASSERT_EQ(segments.size(), 2u);  // JFIF and the profile
+  EXPECT_EQ(segments[1].payload, profile.payload);
+  EXPECT_TRUE(written.lost.empty());
+}
+
+TEST(KeptMetadata, SurvivesATailCutAnywhere) {
+  const Bytes tail = joined({gainMap(), video(), bytesOf("CANON OPTIONAL DATA\0"s)});
+  const Bytes photo = phonePhoto(6, {});
+  for (std::size_t size = 0; size <= tail.size(); size += 1 + size / 64) {
+    Bytes file = photo;
+    file.insert(file.end(), tail.begin(), tail.begin() + static_cast<std::ptrdiff_t>(size));
+    const Written written = rewritten(file);
+    EXPECT_EQ(decodeJpeg(written.file).width, 128u);
+  }
+}
+
+}  // namespace
+}  // namespace pelorin::photo

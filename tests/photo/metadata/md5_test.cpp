@@ -1,0 +1,22 @@
+#include "photo/metadata/md5.h"
+
+#include <gtest/gtest.h>
+
+namespace pelorin::photo {
+namespace {
+
+TEST(Md5, OfTheSuiteInRfc1321) {
+  EXPECT_EQ(md5Hex(""), "D41D8CD98F00B204E9800998ECF8427E");
+  EXPECT_EQ(md5Hex("a"), "0CC175B9C0F1B6A831C399E269772661");
+  EXPECT_EQ(md5Hex("abc"), "900150983CD24FB0D6963F7D28E17F72");
+  EXPECT_EQ(md5Hex("message digest"), "F96B697D7CB7938D525A2F31AAF161D0");
+  EXPECT_EQ(md5Hex("abcdefghijklmnopqrstuvwxyz"), "C3FCD3D76192E4007DFB496CCA67E13B");
+  EXPECT_EQ(md5Hex("ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789"),
+            "D174AB98D277D9F5A5611C2C9F419D9F");
+  EXPECT_EQ(md5Hex("1234567890123456789012345678901234567890123456789012345678901234567890123456789"
+                   "0"),
+            "57EDF4A22BE3C955AC49DA2E2107B67A");
+}
+
+}  // namespace
+}  // namespace pelorin::photo
