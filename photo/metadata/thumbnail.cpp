@@ -71,7 +71,7 @@ std::optional<Thumbnail> ThumbnailMaker::make(std::uint32_t longerSide, std::siz
   const PictureSize size = fitWithin(whole, {longerSide, longerSide});
   const Image<RGBA8Pixel> small = scaledTo(picture_, size);
   const auto* pixels = reinterpret_cast<const std::uint8_t*>(small.data.get());
-  for (const int quality : {90, 80, 65, 40}) {
+  for (const int quality : {95, 90, 80, 65, 40}) {
     std::vector<std::uint8_t> file =
         encodeJpeg(pixels, size.width, size.height, quality, {}, Chroma::whole);
     removeJfif(file);

@@ -23,7 +23,7 @@ class ThumbnailMaker {
       : picture_(picture) {}
 
   /// @param longerSide  in pixels; a smaller picture keeps its size.
-  /// @param room        bytes that the file must fit; quality falls from 90 to 40 for it.
+  /// @param room        bytes that the file must fit; quality falls from 95 to 40 for it.
   /// @returns nothing when even the lowest quality does not fit.
   std::optional<Thumbnail> make(std::uint32_t longerSide, std::size_t room);
 
