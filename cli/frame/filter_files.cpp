@@ -28,16 +28,21 @@ struct Work {
   FilterToApply filter;
   std::vector<Face> faces;
   photo::OpenOptions photo;
-  int quality;
+  SaveChoice save;
   bool overwrite;
 };
 
 struct Done {
   std::uint32_t width, height;
+  std::vector<photo::Loss> lost = {};
 };
 
 Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter) {
-  Work work = {filter, readFaces(options.faces), {}, options.quality, options.outputs.overwrite};
+  Work work = {filter, readFaces(options.faces), {}, {}, options.outputs.overwrite};
+  work.save = {.raw = !options.raw.empty(),
+               .quality = options.quality,
+               .keep = keepOptions(options.keep),
+               .strict = options.keep.strict};
   if (!work.faces.empty() && !filter.filter.parameters().readsFaces) {
     throw UsageError("--face: has no effect on " + filter.filter.name);
   }
@@ -57,7 +62,7 @@ Done process(const Work& work, const PlannedFile& file) {
   photo::Photo photo = loadPhoto(file.input, work.photo, &spare);
   stopIfInterrupted();
   Image<RGBA8Pixel>& picture = *photo.image;
-  const Done done = {picture.width, picture.height};
+  Done done = {picture.width, picture.height};
   {
     // The session ends before the encoder begins: its masks are several times the picture.
     FilteredImage session(photo.image,
@@ -68,14 +73,19 @@ Done process(const Work& work, const PlannedFile& file) {
                                   /*output=*/picture);
   }
   stopIfInterrupted();
-  const bool raw = work.photo.raw.has_value();
-  savePicture(file.output, picture, raw, work.quality, photo.metadata);
-  if (!raw) spare.keep(picture);
+  done.lost = savePicture(file.output, picture, photo.metadata, work.save);
+  if (!work.save.raw) spare.keep(picture);
   return done;
 }
 
 Json describe(const PlannedFile& file, const char* status) {
   return {{"input", file.input.path}, {"output", file.output}, {"status", status}};
+}
+
+Json jsonOf(const std::vector<photo::Loss>& lost) {
+  Json list = Json::array();
+  for (const photo::Loss& loss : lost) list.push_back({{"what", loss.what}, {"why", loss.why}});
+  return list;
 }
 
 ExitCode printPlan(const std::vector<PlannedFile>& plan, JsonOutput& json) {
@@ -105,6 +115,7 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
   verb.option("--quality", options.quality, "JPEG quality, 90 unless given")
       .between(1, 100)
       .group("Output");
+  addKeepOptions(verb, options.keep);
   addRawOption(verb, options.raw);
   addJobsOption(verb, options.jobs);
   addReportOptions(verb, options.report);
@@ -161,7 +172,10 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
           object["height"] = (*attempt.result)->height;
           object["filter"] = filter.filter.name;
           object["params"] = filter.params;
+          object["lost"] = jsonOf((*attempt.result)->lost);
           json.add(object);
+          for (const photo::Loss& loss : (*attempt.result)->lost)
+            talk.note(file.output + ": " + lossText(loss));
         }
         talk.fileDone();
       });

@@ -7,6 +7,7 @@
 #include "cli/frame/exit_code.h"
 #include "cli/frame/faces.h"
 #include "cli/frame/inputs.h"
+#include "cli/frame/keep_option.h"
 #include "cli/frame/outputs.h"
 #include "cli/frame/talk.h"
 #include "cli/frame/verb.h"
@@ -19,6 +20,7 @@ struct FilterFilesOptions {
   InputOptions inputs;
   OutputOptions outputs;
   ReportOptions report;
+  KeepChoice keep;
   std::vector<std::string> faces;
   std::string raw;
   int rotate = 0;

@@ -2,6 +2,7 @@
 
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/interrupt.h"
+#include "cli/frame/keep_option.h"
 
 namespace pelorin::cli {
 
@@ -10,12 +11,20 @@ photo::Photo loadPhoto(const Input& input, photo::OpenOptions options, photo::Sp
   return photo::open(readInput(input), options, spare);
 }
 
-void savePicture(const std::string& path,
-                 const image_processing::Image<image_processing::RGBA8Pixel>& picture, bool raw,
-                 int quality, const photo::Metadata& metadata) {
+std::vector<photo::Loss> savePicture(
+    const std::string& path, const image_processing::Image<image_processing::RGBA8Pixel>& picture,
+    const photo::Metadata& metadata, const SaveChoice& choice) {
   const auto* pixels = reinterpret_cast<const std::uint8_t*>(picture.data.get());
-  if (raw) return writeOutput(path, {pixels, picture.byteSize()});
-  writeOutput(path, photo::save(picture, "JPEG", metadata, {quality, interruptToken()}));
+  std::vector<photo::Loss> lost;
+  if (choice.raw) {
+    writeOutput(path, {pixels, picture.byteSize()});
+    return lost;
+  }
+  const std::vector<std::uint8_t> file = photo::save(
+      picture, "JPEG", metadata, {choice.quality, interruptToken(), choice.keep}, &lost);
+  refuseLosses(lost, choice.strict);
+  writeOutput(path, file);
+  return lost;
 }
 
 }  // namespace pelorin::cli

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <string>
+#include <vector>
 
 #include "cli/frame/inputs.h"
 #include "photo/photo.h"
@@ -13,10 +14,18 @@ namespace pelorin::cli {
 photo::Photo loadPhoto(const Input& input, photo::OpenOptions options,
                        photo::SparePixels* spare = nullptr);
 
-/// Writes a picture to a file or standard output, as JPEG or, with `raw`, as raw pixels.
+struct SaveChoice {
+  bool raw = false;  ///< As raw pixels, else as JPEG.
+  int quality = 90;
+  photo::KeepOptions keep = {};
+  bool strict = false;  ///< Fail where metadata would be lost.
+};
+
+/// Writes a picture to a file or standard output.
+/// @returns what is lost of the metadata.
 /// @throws what encoding and writing throw, Interrupted on Ctrl-C; an old file is then as it was.
-void savePicture(const std::string& path,
-                 const image_processing::Image<image_processing::RGBA8Pixel>& picture, bool raw,
-                 int quality, const photo::Metadata& metadata);
+std::vector<photo::Loss> savePicture(
+    const std::string& path, const image_processing::Image<image_processing::RGBA8Pixel>& picture,
+    const photo::Metadata& metadata, const SaveChoice& choice);
 
 }  // namespace pelorin::cli

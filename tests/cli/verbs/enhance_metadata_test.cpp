@@ -1,5 +1,7 @@
 #include <gmock/gmock.h>
 
+#include <filesystem>
+
 #include "tests/cli/jpeg_files.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/support/pictures.h"
@@ -68,6 +70,34 @@ TEST(KeptMetadata, SurvivesADamagedExifSegment) {
   EXPECT_EQ(quenby({"enhance", in, "-o", folder / "b.jpg"}).exitCode, 0);
   expectSegments(folder.read("b.jpg"), {{0xE1, exif}});
   EXPECT_EQ(decoded(folder.read("b.jpg")).width, 48u);
+}
+
+TEST(KeptMetadata, ThatIsLostIsNamedOrRefused) {
+  const TemporaryFolder folder;
+  const MetadataSegment manifest = {
+      0xEB, bytesOf(std::string("JP\0\1\0\0\0\1\0\0\0\x40jumb....c2pa", 24))};
+  const std::string in = folder.write("a.jpg", jpegOf(photoLikePicture(48, 32, 1), {manifest}));
+  const Finished strict = quenby({"enhance", in, "-o", folder / "b.jpg", "--strict-metadata"});
+  EXPECT_EQ(strict.exitCode, 1);
+  EXPECT_THAT(strict.errors, testing::HasSubstr("C2PA manifest lost: an edit breaks"));
+  EXPECT_FALSE(std::filesystem::exists(folder / "b.jpg"));
+  const Finished named = quenby({"enhance", in, "-o", folder / "b.jpg", "--json"});
+  EXPECT_EQ(named.exitCode, 0);
+  EXPECT_THAT(named.errors, testing::HasSubstr("b.jpg: C2PA manifest lost: an edit breaks"));
+  EXPECT_THAT(named.output, testing::HasSubstr("\"what\": \"C2PA manifest\""));
+}
+
+TEST(KeptMetadata, GoesWhereItIsStripped) {
+  const TemporaryFolder folder;
+  const std::string in =
+      folder.write("a.jpg", jpegOf(photoLikePicture(48, 32, 1), cameraSegments(6, true)));
+  const Finished all =
+      quenby({"enhance", in, "-o", folder / "b.jpg", "--strip", "all", "--strict-metadata"});
+  EXPECT_EQ(all.exitCode, 0) << all.errors;
+  const auto left = photo::readJpegHeader(folder.read("b.jpg")).metadata;
+  ASSERT_EQ(left.size(), 2u);  // JFIF and the colour profile
+  EXPECT_EQ(left[1].payload, colourProfile());
+  EXPECT_EQ(quenby({"enhance", in, "-o", folder / "c.jpg", "--strip", "everything"}).exitCode, 2);
 }
 
 TEST(Upright, IsEveryOneOfTheEightOrientations) {
