@@ -81,6 +81,5 @@ cp "$prefix/source/highway/LICENSE" "$prefix/share/licences/highway.txt"
 cp "$prefix/source/libjpeg-turbo/LICENSE.md" "$prefix/share/licences/libjpeg-turbo.txt"
 cp "$prefix/source/libjpeg-turbo/README.ijg" "$prefix/share/licences/libjpeg-turbo-ijg.txt"
 cp "$prefix/source/lcms2/COPYING" "$prefix/share/licences/lcms2.txt"
-rm -rf "$prefix/source" "$prefix/build" "$prefix/bin" "$prefix/share/man" "$prefix/share/doc" \
-  "$prefix/lib/libhwy_test.a"
+rm -rf "$prefix/source" "$prefix/build" "$prefix/bin" "$prefix/share/man" "$prefix/share/doc"
 echo "$stamp" >"$prefix/stamp"
