@@ -6,8 +6,7 @@
 #include <cstdio>
 #include <string>
 
-#include "bench/kernels/kernels.h"
-#include "tests/support/pictures.h"
+#include "tests/kernels/kernels.h"
 
 int main() {
   using namespace pelorin;
@@ -17,18 +16,19 @@ int main() {
   }
   // Odd sizes: the pixels that fill no whole vector are there, but do not rule.
   const auto photo = test_support::photoLikePicture(1021, 509, 1);
-  const std::vector<bench::Kernel> kernels = bench::kernelsOn(photo);
   std::printf("pixels %zu\n", photo.pixelCount());
-  for (const std::int64_t target : hwy::SupportedAndGeneratedTargets()) {
-    hwy::SetSupportedTargetsForTest(target);
-    for (const bench::Kernel& kernel : kernels) {
-      kernel.run();  // tables that the first call makes are not its own
-      const std::string label = std::string(hwy::TargetName(target)) + " " + kernel.name;
+  for (const test_support::KernelRow& row : test_support::kernelRows()) {
+    const test_support::Kernel kernel = row.on(photo);
+    for (const std::int64_t target : hwy::SupportedAndGeneratedTargets()) {
+      hwy::SetSupportedTargetsForTest(target);
+      kernel.vectors();  // tables that the first call makes are not its own
+      const std::string label = std::string(hwy::TargetName(target)) + " " + row.name;
       CALLGRIND_ZERO_STATS;
       CALLGRIND_TOGGLE_COLLECT;
-      kernel.run();
+      kernel.vectors();
       CALLGRIND_TOGGLE_COLLECT;
       CALLGRIND_DUMP_STATS_AT(label.c_str());
+      hwy::SetSupportedTargetsForTest(0);
     }
   }
 }

@@ -91,10 +91,4 @@ double secondsOf(const std::function<void()>& work) {
   return processorSeconds() - start;
 }
 
-double median(std::vector<double> values) {
-  const auto middle = values.begin() + (static_cast<std::ptrdiff_t>(values.size()) - 1) / 2;
-  std::nth_element(values.begin(), middle, values.end());
-  return *middle;
-}
-
 }  // namespace pelorin::bench

@@ -30,7 +30,4 @@ std::uint64_t peakBytesOfThisProcess();
 /// Seconds of the processor that `work` takes in this process.
 double secondsOf(const std::function<void()>& work);
 
-/// The middle one; of an even number the lower.
-double median(std::vector<double> values);
-
 }  // namespace pelorin::bench

@@ -12,10 +12,10 @@
 #include <map>
 #include <stdexcept>
 
-#include "bench/report/instruction_sets.h"
 #include "bench/report/scale.h"
 #include "bench/report/stages.h"
 #include "bench/report/whole_file.h"
+#include "bench/support/instruction_sets.h"
 #include "photo/file_io.h"
 #include "photo/png/png_file.h"
 

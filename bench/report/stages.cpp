@@ -6,10 +6,11 @@
 #include <functional>
 #include <vector>
 
-#include "bench/kernels/kernels.h"
 #include "bench/report/child.h"
-#include "bench/report/instruction_sets.h"
+#include "bench/support/instruction_sets.h"
+#include "bench/support/median.h"
 #include "bench/support/per_pixel.h"
+#include "tests/kernels/kernels.h"
 
 namespace pelorin::bench {
 namespace {
@@ -41,21 +42,22 @@ std::string stagesTable() {
   }
   std::string table = header + " definition / best |\n" + rule + "---:|\n";
 
-  for (const Kernel& kernel : kernelsOn(photo)) {
-    kernel.run();  // makes tables, and touches new memory
+  for (const test_support::KernelRow& row : test_support::kernelRows()) {
+    const test_support::Kernel kernel = row.on(photo);
+    kernel.vectors();  // makes tables, and touches new memory
     std::string fast;
     double best = 0;
     for (const InstructionSet& set : sets) {
       hwy::SetSupportedTargetsForTest(set.targets);
-      best = timeOf(kernel.run, 3);
+      best = timeOf(kernel.vectors, 3);
       fast += fmt::format(" {:.2f} |", best);
     }
     hwy::SetSupportedTargetsForTest(0);
-    if (kernel.plain) {
-      const double plain = timeOf(kernel.plain, 1);
-      table += fmt::format("| {} | {:.2f} |{} {:.1f} |\n", kernel.name, plain, fast, plain / best);
+    if (kernel.definition) {
+      const double plain = timeOf(kernel.definition, 1);
+      table += fmt::format("| {} | {:.2f} |{} {:.1f} |\n", row.name, plain, fast, plain / best);
     } else {
-      table += fmt::format("| {} | |{} |\n", kernel.name, fast);
+      table += fmt::format("| {} | |{} |\n", row.name, fast);
     }
   }
   const Image<RGBA8Pixel> copy(photo.width, photo.height);

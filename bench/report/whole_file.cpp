@@ -8,8 +8,8 @@
 
 #include "bench/report/child.h"
 #include "bench/report/codec_floor.h"
-#include "bench/report/instruction_sets.h"
 #include "bench/report/photos.h"
+#include "bench/support/instruction_sets.h"
 #include "photo/file_io.h"
 
 namespace pelorin::bench {

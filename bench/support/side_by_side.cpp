@@ -1,45 +1,22 @@
 #include "bench/support/side_by_side.h"
 
-#include <hwy/highway.h>
-
-#include <algorithm>
 #include <chrono>
 #include <cstring>
 #include <map>
 #include <string>
 #include <vector>
 
+#include "bench/support/instruction_sets.h"
+#include "bench/support/median.h"
+
 namespace pelorin::bench {
 namespace {
-
-struct InstructionSet {
-  const char* name;
-  std::int64_t targets;
-};
-
-// The sets the machine has, the best last. Each comes with those it contains, since not every
-// kernel is built for each.
-std::vector<InstructionSet> instructionSets() {
-  const std::int64_t all = hwy::SupportedTargets();
-  std::vector<InstructionSet> sets;
-  if ((all & HWY_SSE4) != 0) sets.push_back({"SSE4", all & -HWY_SSE4});
-  if ((all & HWY_AVX2) != 0) sets.push_back({"AVX2", all & -HWY_AVX2});
-  if ((all & HWY_AVX3) != 0) sets.push_back({"AVX512", all});
-  if (sets.empty()) sets.push_back({"fast", all});
-  return sets;
-}
 
 double nanoseconds(const std::function<void()>& run) {
   const auto start = std::chrono::steady_clock::now();
   run();
   benchmark::ClobberMemory();
   return std::chrono::duration<double, std::nano>(std::chrono::steady_clock::now() - start).count();
-}
-
-double median(std::vector<double>& times) {
-  const auto middle = times.begin() + times.size() / 2;
-  std::nth_element(times.begin(), middle, times.end());
-  return *middle;
 }
 
 }  // namespace

@@ -1,15 +1,18 @@
-// The same corners from OpenCV, to compare times with those of fast_bench.
+// The same corners from OpenCV, to compare times with those of corners/detect.
 #include <benchmark/benchmark.h>
 
 #include <cstdlib>
 #include <opencv2/features2d.hpp>
 
-#include "bench/features/grey_pictures.h"
 #include "bench/support/per_pixel.h"
 #include "image_processing/features/fast.h"
+#include "tests/kernels/kernel_pictures.h"
+#include "tests/support/grey_pictures.h"
 
 namespace pelorin::bench {
 namespace {
+
+using test_support::PictureKind;
 
 constexpr int threshold = 20;
 
@@ -24,7 +27,8 @@ bool sameCorners(const std::vector<cv::KeyPoint>& theirs, const xy* ours, int co
 
 void openCvFast9(benchmark::State& state) {
   cv::setNumThreads(1);
-  const auto image = greyPicture(static_cast<GreyPicture>(state.range(0)));
+  const auto kind = static_cast<PictureKind>(state.range(0));
+  const auto image = test_support::greenOf(test_support::pictureOf(kind, 4000, 3000));
   const int width = static_cast<int>(image.width), height = static_cast<int>(image.height);
   const cv::Mat pixels(height, width, CV_8U, image.data.get());
   const auto detector =
@@ -40,9 +44,10 @@ void openCvFast9(benchmark::State& state) {
   std::free(ours);
   state.counters["corners"] = count;
   reportPerPixel(state, image.pixelCount());
-  state.SetLabel(nameOf(static_cast<GreyPicture>(state.range(0))));
+  state.SetLabel(nameOf(kind));
 }
-BENCHMARK(openCvFast9)->DenseRange(detail, photo);
+BENCHMARK(openCvFast9)
+    ->DenseRange(static_cast<int>(PictureKind::photo), static_cast<int>(PictureKind::smooth));
 
 }  // namespace
 }  // namespace pelorin::bench
