@@ -19,7 +19,7 @@ TonePass::TonePass(const std::vector<float>& unitCurve, float scale, float vibra
       detailGain(detailGain) {
   for (float& sample : curve) sample *= scale;
   const auto moderate = [](float value) { return std::fabs(value) < 1e6f; };  // false for NaN
-  ordinary = scale == 100.0f && std::all_of(curve.begin(), curve.end(), moderate) &&
+  ordinary = scale == labWhite && std::all_of(curve.begin(), curve.end(), moderate) &&
              curve.size() < 64 && moderate(ltmBlend) && moderate(detailGain) && vibrance >= 0.0f &&
              moderate(vibrance);
 }

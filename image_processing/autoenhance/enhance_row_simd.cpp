@@ -11,6 +11,7 @@
 #include "image_processing/autoenhance/colour/colour_tables.h"
 #include "image_processing/autoenhance/colour/companding_steps.h"
 #include "image_processing/autoenhance/colour/lab_simd.h"
+#include "image_processing/autoenhance/colour/srgb.h"
 #include "image_processing/autoenhance/colour/vibrance_simd.h"
 #include "image_processing/core/prefetch.h"
 #include "image_processing/core/simd.h"
@@ -22,7 +23,7 @@ namespace {
 namespace hn = hwy::HWY_NAMESPACE;
 using lab::F;
 using lab::Floats;
-using lab::matrixRow;
+using lab::product;
 using lab::set;
 using simd::Divisor;
 using Ints = hn::RebindToSigned<Floats>;
@@ -70,17 +71,15 @@ HWY_NOINLINE void findSteps(const RGBA8Pixel* in, std::size_t count, Block& bloc
     const auto step = [](F value) HWY_ATTR {
       return simd::truncate(hn::Mul(value, set(compandingStepCount - 1)));
     };
-    hn::Store(step(matrixRow(r, g, b, 0.43394995f, 0.3762098f, 0.1898403f)), Ints(),
-              block.xStep + i);
-    hn::Store(step(matrixRow(r, g, b, 0.2126729f, 0.7151522f, 0.072175f)), Ints(), block.yStep + i);
-    hn::Store(step(matrixRow(r, g, b, 0.017756583f, 0.10946796f, 0.87277544f)), Ints(),
-              block.zStep + i);
+    hn::Store(step(product(xOfRgb, r, g, b)), Ints(), block.xStep + i);
+    hn::Store(step(product(yOfRgb, r, g, b)), Ints(), block.yStep + i);
+    hn::Store(step(product(zOfRgb, r, g, b)), Ints(), block.zStep + i);
   }
 }
 
 /// A byte of a mask as the value it stands for.
 HWY_INLINE F valueOf(I byte) {
-  return simd::divide(toFloats(byte), Divisor(255.0f));
+  return simd::divide(toFloats(byte), Divisor(Quantized::codesPerUnit));
 }
 
 /// The tone curve, and its values where the argument is one of a few. Some 40 KB, for the stack.
@@ -168,10 +167,10 @@ HWY_NOINLINE void mapTones(const TonePass& pass, const ToneMap& toneMap, const M
     const F fx = lookUp(xyzToLab, hn::Load(Ints(), block.xStep + i));
     const F fy = lookUp(xyzToLab, yStep);
     const F fz = lookUp(xyzToLab, hn::Load(Ints(), block.zStep + i));
-    const F a = hn::Mul(set(500.0f), hn::Sub(fx, fy));
-    const F b = hn::Mul(set(200.0f), hn::Sub(fy, fz));
-    hn::Store(simd::divide(a, Divisor(500.0f)), Floats(), block.redness + i);
-    hn::Store(simd::divide(b, Divisor(200.0f)), Floats(), block.yellowness + i);
+    const F a = hn::Mul(set(labAGain), hn::Sub(fx, fy));
+    const F b = hn::Mul(set(labBGain), hn::Sub(fy, fz));
+    hn::Store(simd::divide(a, Divisor(labAGain)), Floats(), block.redness + i);
+    hn::Store(simd::divide(b, Divisor(labBGain)), Floats(), block.yellowness + i);
 
     const F mapped = toneMap.ofStep(yStep);
     F L = mapped;
@@ -195,20 +194,18 @@ HWY_NOINLINE void encode(std::size_t count, Block& block) {
   const float* const codes = colourTables().codes.data();
   for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
     const F L = hn::Load(Floats(), block.L + i);
-    const F fy = simd::divide(hn::Add(L, set(16.0f)), Divisor(116.0f));
+    const F fy = simd::divide(hn::Add(L, set(labLOffset)), Divisor(labLGain));
     const F X = lab::labToXz(hn::Add(hn::Load(Floats(), block.redness + i), fy));
     const F Y = lab::labToY(L);
     const F Z = lab::labToXz(hn::Sub(fy, hn::Load(Floats(), block.yellowness + i)));
     const auto encoded = [&](F value) HWY_ATTR {
-      const F place = simd::clampTo(hn::Mul(value, set(1023.0f)), hn::Zero(Floats()), set(1023.0f));
+      const F last = set(sRGBSteps - 1);
+      const F place = simd::clampTo(hn::Mul(value, last), hn::Zero(Floats()), last);
       return lookUp(codes, simd::truncate(place));
     };
-    hn::Store(encoded(matrixRow(X, Y, Z, 3.0799544f, -1.5371385f, -0.5428159f)), Floats(),
-              block.r + i);
-    hn::Store(encoded(matrixRow(X, Y, Z, -0.9212582f, 1.8760108f, 0.04524742f)), Floats(),
-              block.g + i);
-    hn::Store(encoded(matrixRow(X, Y, Z, 0.05288738f, -0.2040259f, 1.1511385f)), Floats(),
-              block.b + i);
+    hn::Store(encoded(product(redOfXyz, X, Y, Z)), Floats(), block.r + i);
+    hn::Store(encoded(product(greenOfXyz, X, Y, Z)), Floats(), block.g + i);
+    hn::Store(encoded(product(blueOfXyz, X, Y, Z)), Floats(), block.b + i);
   }
 }
 

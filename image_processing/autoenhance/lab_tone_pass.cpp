@@ -2,6 +2,7 @@
 
 #include <algorithm>
 
+#include "image_processing/autoenhance/colour/lab_constants.h"
 #include "image_processing/autoenhance/enhance_row.h"
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
 
@@ -28,7 +29,7 @@ template <typename TB, typename TL>
 void apply(const Image<RGBA8Pixel>& source, const ImageStatistics& statistics,
            const FilterConfig& config, const ImageMasks<TB, TL>& masks, Image<RGBA8Pixel>& output) {
   const std::vector<float> curve = buildToneCurve(statistics, config);
-  imageVibranceLabAndToneCurve(source, output, config, curve, 100.0f, masks);
+  imageVibranceLabAndToneCurve(source, output, config, curve, labWhite, masks);
 }
 
 template void imageVibranceLabAndToneCurve(const Image<RGBA8Pixel>&, Image<RGBA8Pixel>&,

@@ -22,18 +22,20 @@ class QuantizedFloat;
 template <>
 class QuantizedFloat<unsigned char> {
  public:
+  static constexpr float codesPerUnit = 255.0f;
+
   QuantizedFloat() = default;  // uninitialised, as any pixel of a new image
 
   /// Stores `value` · 255 truncated, its low 8 bits: there is no clamping at the top, so 1.004
   /// wraps to 0. Negative values and NaN store 0.
   /// @returns the stored value read back, so that a chain of assignments sees the quantised value.
   float operator=(float value) {
-    stored_ = static_cast<unsigned char>(truncateTo<std::uint32_t>(value * 255.0f));
+    stored_ = static_cast<unsigned char>(truncateTo<std::uint32_t>(value * codesPerUnit));
     return *this;
   }
 
   /// Stored byte / 255; a division, since a multiplication by 1/255 differs for half of the bytes.
-  operator float() const { return static_cast<float>(stored_) / 255.0f; }
+  operator float() const { return static_cast<float>(stored_) / codesPerUnit; }
 
   unsigned char stored() const { return stored_; }
 

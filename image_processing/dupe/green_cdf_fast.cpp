@@ -2,6 +2,7 @@
 #include <cstddef>
 #include <cstdint>
 
+#include "image_processing/core/float_counter.h"
 #include "image_processing/core/prefetch.h"
 #include "image_processing/dupe/green_cdf.h"
 
@@ -26,11 +27,6 @@ void count(const RGBA8Pixel* pixels, std::size_t pixelCount, Counts& counts) {
     for (std::size_t x = 0; x < pixelsInLine; ++x) ++counts[x % ways][pixels[i + x].g];
   }
   for (; i < pixelCount; ++i) ++counts[0][pixels[i].g];
-}
-
-// Where a float counter stops: adding 1 to 2^24 gives 2^24.
-float asFloatCounter(std::uint64_t count) {
-  return static_cast<float>(std::min<std::uint64_t>(count, std::uint64_t{1} << 24));
 }
 
 }  // namespace

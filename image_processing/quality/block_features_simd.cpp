@@ -10,6 +10,8 @@
 #include <hwy/foreach_target.h>  // compiles the rest of this file once per instruction set
 #include <hwy/highway.h>
 
+#include "image_processing/core/simd.h"
+
 // Each lane sums a block of its own, so that every sum keeps the order of its rows. A row of all
 // blocks of a group is first turned so that one vector holds one column of every block.
 HWY_BEFORE_NAMESPACE();
@@ -83,14 +85,10 @@ void turnRow(const float* const* blocks, std::size_t offset, std::size_t width, 
     float* column = columns + lane;
     std::size_t i = 0;
     for (; i + 4 <= width; i += 4, column += 4 * lanes) {
-      const auto va = hn::LoadU(four, a + i), vb = hn::LoadU(four, b + i);
-      const auto vc = hn::LoadU(four, c + i), vd = hn::LoadU(four, d + i);
-      const auto ab01 = hn::InterleaveLower(four, va, vb), ab23 = hn::InterleaveUpper(four, va, vb);
-      const auto cd01 = hn::InterleaveLower(four, vc, vd), cd23 = hn::InterleaveUpper(four, vc, vd);
-      hn::Store(hn::ConcatLowerLower(four, cd01, ab01), four, column);
-      hn::Store(hn::ConcatUpperUpper(four, cd01, ab01), four, column + lanes);
-      hn::Store(hn::ConcatLowerLower(four, cd23, ab23), four, column + 2 * lanes);
-      hn::Store(hn::ConcatUpperUpper(four, cd23, ab23), four, column + 3 * lanes);
+      hn::Vec<decltype(four)> square[] = {hn::LoadU(four, a + i), hn::LoadU(four, b + i),
+                                          hn::LoadU(four, c + i), hn::LoadU(four, d + i)};
+      simd::transposeFours(four, square);
+      for (std::size_t j = 0; j < 4; ++j) hn::Store(square[j], four, column + j * lanes);
     }
     for (; i < width; ++i, column += lanes) {
       column[0] = a[i];

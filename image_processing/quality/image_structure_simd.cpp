@@ -1,5 +1,4 @@
 #include <algorithm>
-#include <cmath>
 
 #include "image_processing/quality/aligned_floats.h"
 #include "image_processing/quality/image_structure.h"
@@ -8,6 +7,8 @@
 #define HWY_TARGET_INCLUDE "image_processing/quality/image_structure_simd.cpp"
 #include <hwy/foreach_target.h>  // compiles the rest of this file once per instruction set
 #include <hwy/highway.h>
+
+#include "image_processing/core/simd.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace pelorin::image_processing::HWY_NAMESPACE {
@@ -19,18 +20,9 @@ using Vector = hn::Vec<Floats>;
 // difference / (sqrt(|variance|) + 1)
 HWY_INLINE void storeNormalised(Vector difference, Vector variance, float* out) {
   const Floats floats;
-#if HWY_ARCH_ARM_V7
-  // Vector roots and quotients are approximations there.
-  const std::size_t lanes = hn::Lanes(floats);
-  HWY_ALIGN float variances[hn::MaxLanes(floats)];
-  hn::Store(variance, floats, variances);
-  hn::StoreU(difference, floats, out);
-  for (std::size_t lane = 0; lane < lanes; ++lane)
-    out[lane] /= std::sqrt(std::fabs(variances[lane])) + 1.0f;
-#else
-  const auto deviation = hn::Sqrt(hn::Abs(variance));
-  hn::StoreU(hn::Div(difference, hn::Add(deviation, hn::Set(floats, 1.0f))), floats, out);
-#endif
+  const Vector deviation = simd::squareRoot(hn::Abs(variance));
+  const Vector divisor = hn::Add(deviation, hn::Set(floats, 1.0f));
+  hn::StoreU(simd::divide(difference, divisor), floats, out);
 }
 
 // Mean and mean square along the columns of the row in the middle of seven.

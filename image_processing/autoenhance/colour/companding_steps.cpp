@@ -10,7 +10,7 @@ std::array<float, compandingStepCount> makeLightness(float divisor) {
   const std::vector<float>& fy = colourTables().xyzToLab.samples();
   std::array<float, compandingStepCount> lightness;
   for (std::size_t step = 0; step < compandingStepCount; ++step) {
-    lightness[step] = (116.0f * fy[step] - 16.0f) / divisor;
+    lightness[step] = (labLGain * fy[step] - labLOffset) / divisor;
   }
   return lightness;
 }
@@ -23,8 +23,7 @@ void compandingStepsScalar(const RGBA8Pixel* pixels, std::uint16_t* steps, std::
     const float R = sRGBToLinearTable[pixels[i].r];
     const float G = sRGBToLinearTable[pixels[i].g];
     const float B = sRGBToLinearTable[pixels[i].b];
-    const float Y = 0.2126729f * R + 0.7151522f * G + 0.072175f * B;
-    steps[i] = static_cast<std::uint16_t>(tables.xyzToLab.indexOf(Y));
+    steps[i] = static_cast<std::uint16_t>(tables.xyzToLab.indexOf(yOfRgb(R, G, B)));
   }
 }
 
@@ -34,7 +33,7 @@ const std::array<float, compandingStepCount>& lightnessOfSteps() {
 }
 
 const std::array<float, compandingStepCount>& unitLightnessOfSteps() {
-  static const auto lightness = makeLightness(100.0f);
+  static const auto lightness = makeLightness(labWhite);
   return lightness;
 }
 

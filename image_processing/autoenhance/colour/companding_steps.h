@@ -4,13 +4,14 @@
 #include <cstddef>
 #include <cstdint>
 
+#include "image_processing/autoenhance/colour/lab_constants.h"
 #include "image_processing/core/pixel_types.h"
 
 namespace pelorin::image_processing {
 
 /// Number of steps in which Lab's companding is tabulated. A pixel's lightness depends on its step
 /// alone, and so does all that follows from lightness.
-inline constexpr std::size_t compandingStepCount = 10000;
+inline constexpr std::size_t compandingStepCount = compandingSamples;
 
 /// The step, 0 ... 9999, of the luminance of each of `count` pixels: the index that the XYZ-to-Lab
 /// table is read at for L.

@@ -28,9 +28,9 @@ struct Shares {
 
   Shares() {
     for (int code = 0; code < 256; ++code) {
-      red[code] = 0.2126729f * sRGBToLinearTable[code];
-      green[code] = 0.7151522f * sRGBToLinearTable[code];
-      blue[code] = 0.072175f * sRGBToLinearTable[code];
+      red[code] = yOfRgb.first * sRGBToLinearTable[code];
+      green[code] = yOfRgb.second * sRGBToLinearTable[code];
+      blue[code] = yOfRgb.third * sRGBToLinearTable[code];
     }
   }
 };
@@ -38,7 +38,7 @@ struct Shares {
 HWY_INLINE void storeSteps(hn::Vec<Floats> red, hn::Vec<Floats> green, hn::Vec<Floats> blue,
                            std::uint16_t* steps) {
   const hn::Rebind<std::uint16_t, Floats> halves;
-  const auto most = hn::Set(Floats(), 9999.0f);
+  const auto most = hn::Set(Floats(), static_cast<float>(compandingStepCount - 1));
   const auto luminance = hn::Add(hn::Add(red, green), blue);
   const auto step = simd::truncate(hn::Min(hn::Mul(luminance, most), most));
   hn::StoreU(hn::DemoteTo(halves, step), halves, steps);
@@ -142,8 +142,10 @@ void compandingSteps(const RGBA8Pixel* pixels, std::uint16_t* steps, std::size_t
     const auto share = [&](const float* table, auto word) HWY_ATTR {
       return hn::GatherIndex(Floats(), table, hn::BitCast(Ints(), hn::And(word, byte)));
     };
-    storeSteps(share(shares.red, p), share(shares.green, hn::ShiftRight<8>(p)),
-               share(shares.blue, hn::ShiftRight<16>(p)), steps + i);
+    const auto red = share(shares.red, p);
+    const auto green = share(shares.green, hn::ShiftRight<8>(p));
+    const auto blue = share(shares.blue, hn::ShiftRight<16>(p));
+    storeSteps(red, green, blue, steps + i);
   }
   compandingStepsScalar(pixels + i, steps + i, count - i);
 }

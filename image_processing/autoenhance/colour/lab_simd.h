@@ -9,6 +9,7 @@
 
 #include <hwy/highway.h>
 
+#include "image_processing/autoenhance/colour/lab_constants.h"
 #include "image_processing/core/simd.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -17,46 +18,47 @@ namespace lab {
 namespace hn = hwy::HWY_NAMESPACE;
 using Floats = hn::CappedTag<float, 16>;
 using F = hn::Vec<Floats>;
+constexpr float lastInverseSample = inverseCompandingSamples - 1;
 
 HWY_INLINE F set(float value) {
   return hn::Set(Floats(), value);
 }
 
-/// One row of a colour matrix times a colour.
-HWY_INLINE F matrixRow(F x, F y, F z, float ofX, float ofY, float ofZ) {
-  F sum = hn::Mul(set(ofX), x);
-  sum = hn::Add(sum, hn::Mul(set(ofY), y));
-  return hn::Add(sum, hn::Mul(set(ofZ), z));
+/// A row of a colour matrix times a colour.
+HWY_INLINE F product(const MatrixRow& row, F x, F y, F z) {
+  F sum = hn::Mul(set(row.first), x);
+  sum = hn::Add(sum, hn::Mul(set(row.second), y));
+  return hn::Add(sum, hn::Mul(set(row.third), z));
 }
 
 HWY_INLINE F lightness(F fy) {
-  return hn::Sub(hn::Mul(set(116.0f), fy), set(16.0f));
+  return hn::Sub(hn::Mul(set(labLGain), fy), set(labLOffset));
 }
 
-/// Index of the sample of a table over [0, 1000 / scale] that a look-up of `x` takes.
-HWY_INLINE F sampleOf1000(F x, float scale) {
-  const F place = simd::clampTo(hn::Mul(x, set(scale)), hn::Zero(Floats()), set(999.0f));
+/// Index of the sample that a look-up of `x` takes in an inverse table of `scale` samples per unit.
+HWY_INLINE F sampleIndex(F x, float scale) {
+  const F place = simd::clampTo(hn::Mul(x, set(scale)), hn::Zero(Floats()), set(lastInverseSample));
   return hn::ConvertTo(Floats(), simd::truncate(place));
 }
 
 /// `Lab2xzTable` at `x`: its samples are the formula at their own arguments, which takes less time
 /// than to fetch them.
 HWY_INLINE F labToXz(F x) {
-  const F sample = hn::Mul(sampleOf1000(x, 999.0f), set(1.0f / 999.0f));
+  const F sample = hn::Mul(sampleIndex(x, lastInverseSample), set(1.0f / lastInverseSample));
   const F cube = hn::Mul(hn::Mul(sample, sample), sample);
-  const F line =
-      simd::divide(hn::Sub(hn::Mul(set(116.0f), sample), set(16.0f)), simd::Divisor(903.3f));
-  return hn::IfThenElse(hn::Gt(cube, set(0.008856f)), cube, line);
+  const F line = simd::divide(hn::Sub(hn::Mul(set(labLGain), sample), set(labLOffset)),
+                              simd::Divisor(cieKappa));
+  return hn::IfThenElse(hn::Gt(cube, set(cieEpsilon)), cube, line);
 }
 
 /// `Lab2yTable` likewise.
 HWY_INLINE F labToY(F L) {
-  constexpr float scale = 999.0f / 100.0f;
-  const F sample = hn::Mul(sampleOf1000(L, scale), set(1.0f / scale));
-  const F fy = simd::divide(hn::Add(sample, set(16.0f)), simd::Divisor(116.0f));
+  constexpr float scale = lastInverseSample / labWhite;
+  const F sample = hn::Mul(sampleIndex(L, scale), set(1.0f / scale));
+  const F fy = simd::divide(hn::Add(sample, set(labLOffset)), simd::Divisor(labLGain));
   const F cube = hn::Mul(hn::Mul(fy, fy), fy);
-  const F line = simd::divide(sample, simd::Divisor(903.3f));
-  return hn::IfThenElse(hn::Gt(sample, set(7.999625f)), cube, line);
+  const F line = simd::divide(sample, simd::Divisor(cieKappa));
+  return hn::IfThenElse(hn::Gt(sample, set(cieKappaEpsilon)), cube, line);
 }
 
 }  // namespace lab

@@ -2,24 +2,26 @@
 
 #include <cmath>
 
+#include "image_processing/autoenhance/colour/lab_constants.h"
+
 namespace pelorin::image_processing {
 
 float XYZ2labTable::f(float x) const {
-  if (x > 0.008856f) return static_cast<float>(std::cbrt(static_cast<double>(x)));
-  return (16.0f + 903.3f * x) / 116.0f;
+  if (x > cieEpsilon) return static_cast<float>(std::cbrt(static_cast<double>(x)));
+  return (labLOffset + cieKappa * x) / labLGain;
 }
 
 float Lab2xzTable::f(float x) const {
   const float cube = (x * x) * x;
-  return cube > 0.008856f ? cube : (116.0f * x - 16.0f) / 903.3f;
+  return cube > cieEpsilon ? cube : (labLGain * x - labLOffset) / cieKappa;
 }
 
 float Lab2yTable::f(float x) const {
-  if (x > 7.999625f) {  // 903.3 · 0.008856
-    const float fy = (x + 16.0f) / 116.0f;
+  if (x > cieKappaEpsilon) {
+    const float fy = (x + labLOffset) / labLGain;
     return (fy * fy) * fy;
   }
-  return x / 903.3f;
+  return x / cieKappa;
 }
 
 }  // namespace pelorin::image_processing

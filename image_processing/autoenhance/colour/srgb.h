@@ -12,6 +12,9 @@ namespace pelorin::image_processing {
 /// once. Checked by SRGBToLinearTable.IsTheFormulaRoundedOnce. There before any code runs.
 extern const std::array<float, 256> sRGBToLinearTable;
 
+/// Steps in which sRGB is encoded.
+inline constexpr int sRGBSteps = 1024;
+
 /// Encodes linear light as 8-bit sRGB through 1024 steps. Entries are truncated, not rounded, so
 /// only the last is 255. Read-only, so any thread may look up.
 class Uint8_Gamma_sRGB_Table {
@@ -27,14 +30,14 @@ class Uint8_Gamma_sRGB_Table {
   }
 
   /// The codes by step, 0 ... 255.
-  std::array<float, 1024> asFloats() const {
-    std::array<float, 1024> codes;
+  std::array<float, sRGBSteps> asFloats() const {
+    std::array<float, sRGBSteps> codes;
     std::copy(codes_.begin(), codes_.end(), codes.begin());
     return codes;
   }
 
  private:
-  static constexpr std::uint32_t maxIndex = 1023;
+  static constexpr std::uint32_t maxIndex = sRGBSteps - 1;
   std::array<std::uint8_t, maxIndex + 1> codes_;
 };
 

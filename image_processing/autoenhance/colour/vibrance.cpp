@@ -13,13 +13,13 @@ void vibranceInRGB(float amount, unsigned char& r, unsigned char& g, unsigned ch
   const float lowest = std::min({red, green, blue});
   if (highest == lowest) return;
 
-  const float grey = 0.7f * green + 0.2f * red + 0.1f * blue;
+  const float grey = vibranceGreen * green + vibranceRed * red + vibranceBlue * blue;
   const float roomAbove = (255.0f - grey) / (highest - grey);
   const float roomBelow = -grey / (lowest - grey);
   float gain = std::min(roomAbove, roomBelow);
   if (!(gain < amount)) gain = amount;
   if (amount > 1.0f) {
-    const float notRed = std::clamp((std::max(green, blue) - red) / 5.0f, 0.0f, 1.0f);
+    const float notRed = std::clamp((std::max(green, blue) - red) / vibranceFade, 0.0f, 1.0f);
     gain = 1.0f - notRed + notRed * gain;
   }
   const auto scaled = [grey, gain](float channel) {

@@ -9,6 +9,7 @@
 
 #include <hwy/highway.h>
 
+#include "image_processing/autoenhance/colour/vibrance.h"
 #include "image_processing/core/simd.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -22,9 +23,9 @@ HWY_INLINE void vibranceInRGB(float amount, V& r, V& g, V& b) {
   const V one = hn::Set(d, 1.0f);
   const V highest = hn::Max(hn::Max(r, g), b);
   const V lowest = hn::Min(hn::Min(r, g), b);
-  V grey = hn::Mul(hn::Set(d, 0.7f), g);
-  grey = hn::Add(grey, hn::Mul(hn::Set(d, 0.2f), r));
-  grey = hn::Add(grey, hn::Mul(hn::Set(d, 0.1f), b));
+  V grey = hn::Mul(hn::Set(d, vibranceGreen), g);
+  grey = hn::Add(grey, hn::Mul(hn::Set(d, vibranceRed), r));
+  grey = hn::Add(grey, hn::Mul(hn::Set(d, vibranceBlue), b));
   // A coloured pixel's distances are a tenth at least; a grey one's must not divide 0 by 0.
   const V least = hn::Set(d, 1.0f / 1024.0f);
   const V roomAbove =
@@ -33,8 +34,9 @@ HWY_INLINE void vibranceInRGB(float amount, V& r, V& g, V& b) {
   V gain = hn::Min(hn::Min(roomAbove, roomBelow), hn::Set(d, amount));
   // A gain of 1 restores a grey pixel exactly.
   if (amount > 1.0f) {
-    // Between 0 and 5, whole numbers times 0.2 are the floats that a division by 5 gives.
-    const V fifths = hn::Mul(hn::Sub(hn::Max(g, b), r), hn::Set(d, 0.2f));
+    // Between 0 and 5, whole numbers times a fifth are the floats that a division by 5 gives.
+    static_assert(vibranceFade == 5.0f);
+    const V fifths = hn::Mul(hn::Sub(hn::Max(g, b), r), hn::Set(d, 1.0f / vibranceFade));
     const V notRed = simd::clampTo(fifths, hn::Zero(d), one);
     gain = hn::Add(hn::Sub(one, notRed), hn::Mul(notRed, gain));
   } else {

@@ -4,14 +4,11 @@
 #include <numeric>
 
 #include "image_processing/autoenhance/colour/companding_steps.h"
+#include "image_processing/core/float_counter.h"
 #include "image_processing/core/float_to_integer.h"
 
 namespace pelorin::image_processing {
 namespace {
-
-float asFloatCount(std::uint64_t count) {
-  return static_cast<float>(std::min<std::uint64_t>(count, std::uint64_t{1} << 24));
-}
 
 std::uint64_t sum(const std::vector<std::uint64_t>& counts) {
   return std::accumulate(counts.begin(), counts.end(), std::uint64_t{0});
@@ -41,11 +38,11 @@ std::vector<float> LightnessHistogram::normalised() const {
 }
 
 std::vector<float> normalised(const std::vector<std::uint64_t>& counts) {
-  const float total = asFloatCount(sum(counts));
+  const float total = asFloatCounter(sum(counts));
   const float share = total == 0.0f ? 1.0f : 1.0f / total;
   std::vector<float> histogram(counts.size());
   std::transform(counts.begin(), counts.end(), histogram.begin(),
-                 [&](std::uint64_t count) { return asFloatCount(count) * share; });
+                 [&](std::uint64_t count) { return asFloatCounter(count) * share; });
   return histogram;
 }
 

@@ -4,11 +4,13 @@
 #include <cstdint>
 #include <vector>
 
+#include "image_processing/autoenhance/colour/lab_constants.h"
+
 namespace pelorin::image_processing {
 
 /// Bins and range of the statistics that auto-enhance works with; the last bin holds L = 100 alone.
 inline constexpr int lightnessBins = 50;
-inline constexpr float lightnessScale = 100.0f;
+inline constexpr float lightnessScale = labWhite;
 
 /// Counts pixels by lightness, in bins over L in [0, scale].
 class LightnessHistogram {

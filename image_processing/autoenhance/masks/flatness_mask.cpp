@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "image_processing/autoenhance/colour/colour_tables.h"
-#include "image_processing/autoenhance/masks/gaussian_approximation.h"
+#include "image_processing/autoenhance/masks/flatness_rows.h"
 #include "image_processing/autoenhance/masks/mirror.h"
 
 namespace pelorin::image_processing {
@@ -26,10 +26,7 @@ void computeFlatnessMaskScalar(const Image<float>& lightness, const Image<TB>& s
 
   const std::int64_t width = lightness.width, height = lightness.height, r = radius;
   const std::int64_t n = 2 * r + 1;
-  const float side =
-      static_cast<float>(static_cast<std::uint64_t>(n) * static_cast<std::uint64_t>(n));
-  const float noDetail = 20.0f / 255.0f;
-  const GaussianApproximation<float> weight(-noDetail, noDetail, 0.0f, 1.0f / side);
+  const GaussianApproximation<float> weight = flatnessWeight(n);
   const MonotonicTable<float>& shaped = colourTables().flatness;
 
   const std::int64_t tableWidth = width + n;

@@ -44,10 +44,7 @@ void computeFlatnessMask(RowSource<float>& lightness, RowSource<TB>& smoothed, i
   }
   const std::int64_t width = mask.width, height = mask.height, r = radius;
   const std::int64_t n = 2 * r + 1;
-  const float side =
-      static_cast<float>(static_cast<std::uint64_t>(n) * static_cast<std::uint64_t>(n));
-  const float noDetail = 20.0f / 255.0f;
-  const GaussianApproximation<float> weight(-noDetail, noDetail, 0.0f, 1.0f / side);
+  const GaussianApproximation<float> weight = flatnessWeight(n);
 
   const FlatnessShape shape;
 

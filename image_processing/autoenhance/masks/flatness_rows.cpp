@@ -9,6 +9,12 @@ namespace pelorin::image_processing {
 
 using Quantized = QuantizedFloat<unsigned char>;
 
+GaussianApproximation<float> flatnessWeight(std::int64_t side) {
+  constexpr float noDetail = 20.0f / 255.0f;
+  const auto n = static_cast<std::uint64_t>(side);
+  return {-noDetail, noDetail, 0.0f, 1.0f / static_cast<float>(n * n)};
+}
+
 template <typename T>
 void weighRowScalar(const GaussianApproximation<float>& weight, const float* lightness,
                     const T* smoothed, float* weights, std::size_t count) {

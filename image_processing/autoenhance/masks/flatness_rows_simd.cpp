@@ -27,7 +27,7 @@ HWY_INLINE F loadMask(const QuantizedFloat<unsigned char>* mask) {
   const hn::Rebind<std::uint8_t, Floats> bytes;
   const auto stored = hn::LoadU(bytes, reinterpret_cast<const std::uint8_t*>(mask));
   return simd::divide(hn::ConvertTo(Floats(), hn::PromoteTo(Ints(), stored)),
-                      simd::Divisor(255.0f));
+                      simd::Divisor(QuantizedFloat<unsigned char>::codesPerUnit));
 }
 
 template <typename T>

@@ -16,6 +16,9 @@ namespace pelorin::image_processing {
 /// Steps of the grid's lightness axis.
 inline constexpr std::int32_t gridBins = 32;
 
+/// The last of them, which holds lightness 1.
+inline constexpr float lastGridBin = gridBins - 1;
+
 /// What the pixels near one place and of about one lightness add up to.
 struct GridNode {
   float value = 0.0f;

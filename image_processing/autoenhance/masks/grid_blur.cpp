@@ -1,7 +1,5 @@
 #include "image_processing/autoenhance/masks/grid_blur.h"
 
-#include "image_processing/autoenhance/masks/gaussian_approximation.h"
-
 namespace pelorin::image_processing {
 namespace {
 
@@ -9,7 +7,7 @@ namespace {
 /// overwritten.
 void blurLine(GridCell* cells, std::int64_t count, std::int64_t stride,
               std::vector<GridCell>& before) {
-  const GaussianApproximation<float> kernel(-2.0f, 2.0f, 0.0f, 1.0f);
+  const GaussianApproximation<float> kernel = spatialBell();
   for (std::int64_t i = 0; i < count; ++i) before[i] = cells[i * stride];
   for (std::int64_t i = 0; i < count; ++i) {
     GridCell sums;
@@ -34,9 +32,8 @@ void blurSpatially(Grid& grid) {
 }
 
 void blurLightness(Grid& grid, float sigmaRange) {
-  const std::int64_t radius = truncateTo<std::int32_t>(sigmaRange * static_cast<float>(gridBins));
-  const float support = static_cast<float>(radius);
-  const GaussianApproximation<float> kernel(-support, support, 0.0f, 1.0f);
+  const std::int64_t radius = rangeRadius(sigmaRange);
+  const GaussianApproximation<float> kernel = rangeBell(radius);
   // The bell at -d, for d from -31 to 31: in float it is not the bell at d for many offsets.
   std::array<float, 2 * gridBins - 1> weights;
   for (std::int32_t d = 1 - gridBins; d < gridBins; ++d) {

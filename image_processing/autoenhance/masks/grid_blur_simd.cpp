@@ -8,7 +8,6 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "image_processing/autoenhance/masks/gaussian_approximation.h"
 #include "image_processing/core/simd.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -79,7 +78,7 @@ HWY_INLINE void blurLightness(const float* bell, float* cell) {
 }
 
 void blur(Grid& grid, float sigmaRange) {
-  const GaussianApproximation<float> spatial(-2.0f, 2.0f, 0.0f, 1.0f);
+  const GaussianApproximation<float> spatial = spatialBell();
   const SpatialBell bell{hn::Set(Floats(), spatial(-1.0f)), hn::Set(Floats(), spatial(1.0f))};
   const auto floats = [&](std::int64_t row) { return &(*grid.row(row))[0].value; };
   const auto columns = static_cast<std::ptrdiff_t>(grid.columns);
@@ -88,15 +87,14 @@ void blur(Grid& grid, float sigmaRange) {
     blurLine(bell, floats(0) + x * cellFloats, grid.rows, columns * cellFloats);
   }
 
-  const std::int64_t radius = truncateTo<std::int32_t>(sigmaRange * static_cast<float>(gridBins));
-  const float support = static_cast<float>(radius);
-  const GaussianApproximation<float> range(-support, support, 0.0f, 1.0f);
-  float rangeBell[2 * (2 * gridBins - 1)];
+  const std::int64_t radius = rangeRadius(sigmaRange);
+  const GaussianApproximation<float> range = rangeBell(radius);
+  float weights[2 * (2 * gridBins - 1)];
   for (std::int32_t distance = 1 - gridBins; distance < gridBins; ++distance) {
-    float* const both = rangeBell + 2 * (distance + gridBins - 1);
+    float* const both = weights + 2 * (distance + gridBins - 1);
     both[0] = both[1] = std::abs(distance) <= radius ? range(static_cast<float>(distance)) : 0.0f;
   }
-  for (GridCell& cell : grid.cells) blurLightness(rangeBell, &cell[0].value);
+  for (GridCell& cell : grid.cells) blurLightness(weights, &cell[0].value);
 }
 #endif
 

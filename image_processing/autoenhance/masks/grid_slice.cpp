@@ -15,7 +15,7 @@ void sliceScalar(const Grid& grid, const Image<float>& lightness, float cellSize
     T* const out = smoothed.row(y);
     for (std::uint32_t x = 0; x < lightness.width; ++x) {
       const GridNeighbours columns(x, cellSize, grid.columns);
-      const float place = in[x] * 31.0f;
+      const float place = in[x] * lastGridBin;
       const std::int32_t b0 = std::clamp(truncateTo<std::int32_t>(place), 0, gridBins - 1);
       const std::int32_t b1 = reflect(b0 + 1, gridBins);
       const float fraction = place - static_cast<float>(b0);

@@ -112,15 +112,15 @@ class Column {
 void findBins(const float* lightness, Block& block, std::size_t count) {
   std::size_t i = 0;
   for (; i + lanes <= count; i += lanes) {
-    const F place = hn::Mul(hn::LoadU(Floats(), lightness + i), set(31.0f));
+    const F place = hn::Mul(hn::LoadU(Floats(), lightness + i), set(lastGridBin));
     // NaN is in bin 0.
-    const F held = hn::Min(hn::IfThenElseZero(hn::Gt(place, set(0.0f)), place), set(31.0f));
+    const F held = hn::Min(hn::IfThenElseZero(hn::Gt(place, set(0.0f)), place), set(lastGridBin));
     const auto bin = simd::truncate(held);
     hn::Store(bin, Ints(), block.bins + i);
     hn::Store(hn::Sub(place, hn::ConvertTo(Floats(), bin)), Floats(), block.fractions + i);
   }
   for (; i < count; ++i) {
-    const float place = lightness[i] * 31.0f;
+    const float place = lightness[i] * lastGridBin;
     block.bins[i] = std::clamp(truncateTo<std::int32_t>(place), 0, gridBins - 1);
     block.fractions[i] = place - static_cast<float>(block.bins[i]);
   }
@@ -150,7 +150,7 @@ HWY_INLINE void store(F smoothed, float* out) {
 
 HWY_INLINE void store(F smoothed, QuantizedFloat<unsigned char>* out) {
   // As the assignment of a quantised pixel: the low byte of the truncated and saturated number.
-  const F scaled = hn::Mul(smoothed, set(255.0f));
+  const F scaled = hn::Mul(smoothed, set(QuantizedFloat<unsigned char>::codesPerUnit));
   const F beyond = hn::IfThenElseZero(hn::Ge(scaled, set(4294967296.0f)), set(255.0f));
   const F held = hn::IfThenElse(hn::Lt(scaled, set(2147483648.0f)), scaled, beyond);
   const auto number = simd::truncate(hn::IfThenElseZero(hn::Gt(held, set(0.0f)), held));

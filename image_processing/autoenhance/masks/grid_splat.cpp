@@ -12,7 +12,7 @@ void splatScalar(const Image<float>& lightness, float cellSize, Grid& grid) {
     const float* const row = lightness.row(y);
     for (std::uint32_t x = 0; x < lightness.width; ++x) {
       const float value = row[x];
-      const float bin = std::clamp(value * 31.0f + 0.5f, 0.0f, 31.0f);
+      const float bin = std::clamp(value * lastGridBin + 0.5f, 0.0f, lastGridBin);
       GridNode& node = cells[columnOf[x]][truncateTo<std::int32_t>(bin)];
       node.value += value;
       node.weight += 1.0f;

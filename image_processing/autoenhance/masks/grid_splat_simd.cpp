@@ -20,7 +20,7 @@ constexpr std::size_t lanes = hn::MaxLanes(Floats());
 
 void findNodes(const float* lightness, const std::uint32_t* firstNodes, std::uint32_t* nodes,
                std::size_t count) {
-  const auto scale = hn::Set(Floats(), 31.0f);
+  const auto scale = hn::Set(Floats(), lastGridBin);
   std::size_t i = 0;
   for (; i + lanes <= count; i += lanes) {
     const auto place =
@@ -32,7 +32,7 @@ void findNodes(const float* lightness, const std::uint32_t* firstNodes, std::uin
                nodes + i);
   }
   for (; i < count; ++i) {
-    const float bin = std::clamp(lightness[i] * 31.0f + 0.5f, 0.0f, 31.0f);
+    const float bin = std::clamp(lightness[i] * lastGridBin + 0.5f, 0.0f, lastGridBin);
     nodes[i] = firstNodes[i] + truncateTo<std::int32_t>(bin);
   }
 }

@@ -10,6 +10,7 @@
 #include "image_processing/core/prefetch.h"
 #include "image_processing/core/simd.h"
 #include "image_processing/core/small_table.h"
+#include "image_processing/filters/looks/soft_light.h"
 #include "image_processing/filters/looks/vignette_simd.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -37,16 +38,18 @@ struct Colour {
 
 /// `softLight` for masks up to 0.5.
 HWY_INLINE F darkened(F x, F mask) {
-  const F strength = hn::Sub(set(0.003921569f), hn::Mul(mask, set(0.007843138f)));
+  const F strength =
+      hn::Sub(set(soft_light::strength), hn::Mul(mask, set(soft_light::strengthPerMask)));
   return hn::Sub(x, hn::Mul(hn::Mul(strength, x), hn::Sub(set(255.0f), x)));
 }
 
 /// `softLight` for masks above 0.5.
 HWY_INLINE F lightened(F x, F mask) {
-  F cubic = hn::Sub(hn::Mul(set(0.0002460592f), x), set(0.047058824f));
-  cubic = hn::Mul(hn::Add(hn::Mul(cubic, x), set(4.0f)), x);
-  const F root = hn::Mul(set(15.9687195f), simd::squareRoot(x));
-  const F lightest = hn::IfThenElse(hn::Le(x, set(63.75f)), cubic, root);
+  using namespace soft_light;
+  F cubic = hn::Sub(hn::Mul(set(cubic3), x), set(cubic2));
+  cubic = hn::Mul(hn::Add(hn::Mul(cubic, x), set(cubic1)), x);
+  const F root = hn::Mul(set(rootGain), simd::squareRoot(x));
+  const F lightest = hn::IfThenElse(hn::Le(x, set(quarter)), cubic, root);
   const F strength = hn::Sub(hn::Mul(set(2.0f), mask), set(1.0f));
   return hn::Add(x, hn::Mul(strength, hn::Sub(lightest, x)));
 }
@@ -73,14 +76,15 @@ HWY_INLINE Colour mixed(const Colour& c) {
   if constexpr (mix == ChannelMix::none) {
     return c;
   } else if constexpr (mix == ChannelMix::grey) {
-    const F grey = sum(hn::Mul(set(0.8f), c.r), hn::Mul(set(0.1f), c.g), hn::Mul(set(0.1f), c.b));
+    const F grey = sum(hn::Mul(set(greyMix.r), c.r), hn::Mul(set(greyMix.g), c.g),
+                       hn::Mul(set(greyMix.b), c.b));
     return {grey, grey, grey};
   } else {
-    const Colour much{hn::Mul(set(0.9f), c.r), hn::Mul(set(0.9f), c.g), hn::Mul(set(0.9f), c.b)};
-    const Colour little{hn::Mul(set(0.05f), c.r), hn::Mul(set(0.05f), c.g),
-                        hn::Mul(set(0.05f), c.b)};
-    return {sum(much.r, little.g, little.b), sum(little.r, much.g, little.b),
-            sum(little.r, little.g, much.b)};
+    const F own = set(fadedOwn), other = set(fadedOther);
+    const Colour owns{hn::Mul(own, c.r), hn::Mul(own, c.g), hn::Mul(own, c.b)};
+    const Colour others{hn::Mul(other, c.r), hn::Mul(other, c.g), hn::Mul(other, c.b)};
+    return {sum(owns.r, others.g, others.b), sum(others.r, owns.g, others.b),
+            sum(others.r, others.g, owns.b)};
   }
 }
 

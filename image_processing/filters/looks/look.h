@@ -48,18 +48,25 @@ struct Rgb {
   float r, g, b;
 };
 
+/// What red, green and blue count in the grey of `ChannelMix::grey`.
+inline constexpr Rgb greyMix{0.8f, 0.1f, 0.1f};
+
+/// What a curve's own channel and each of the others count in `ChannelMix::faded`.
+inline constexpr float fadedOwn = 0.9f, fadedOther = 0.05f;
+
 /// The inputs of the red, green and blue curve. Sums are formed left to right in float.
 inline Rgb mixChannels(ChannelMix mix, const Rgb& c) {
   switch (mix) {
     case ChannelMix::none:
       break;
     case ChannelMix::grey: {
-      const float grey = 0.8f * c.r + 0.1f * c.g + 0.1f * c.b;
+      const float grey = greyMix.r * c.r + greyMix.g * c.g + greyMix.b * c.b;
       return {grey, grey, grey};
     }
     case ChannelMix::faded:
-      return {0.9f * c.r + 0.05f * c.g + 0.05f * c.b, 0.05f * c.r + 0.9f * c.g + 0.05f * c.b,
-              0.05f * c.r + 0.05f * c.g + 0.9f * c.b};
+      return {fadedOwn * c.r + fadedOther * c.g + fadedOther * c.b,
+              fadedOther * c.r + fadedOwn * c.g + fadedOther * c.b,
+              fadedOther * c.r + fadedOther * c.g + fadedOwn * c.b};
   }
   return c;
 }
