@@ -1,9 +1,9 @@
 #include "jni/registration.h"
 
-#include <span>
 #include <utility>
 
 #include "jni/load_time_cache.h"
+#include "jni/native_methods.h"
 #include "jni/natives.h"
 #include "platform/pn/jni_lookup.h"
 #include "platform/pnjni/environment.h"
@@ -14,7 +14,6 @@ namespace pelorin::quenby {
 
 using jni::Environment;
 using jni::exceptionWrapJNIMethod;
-using jni::findClassLocal;
 using jni::LocalReference;
 using jni::throwCppExceptionIf;
 
@@ -22,18 +21,6 @@ namespace {
 
 constexpr const char* engineClass = "com/pelorin/photos/quenby/autoenhance/QuenbyEngine";
 constexpr const char* dupeDetectorClass = "com/pelorin/photos/quenby/autoenhance/ImageDupeDetector";
-
-JNINativeMethod method(const char* name, const char* signature, void* function) {
-  // Some versions of jni.h want char*; nobody writes there.
-  return {const_cast<char*>(name), const_cast<char*>(signature), function};
-}
-
-void registerNatives(const char* className, std::span<const JNINativeMethod> methods) {
-  const LocalReference<jclass> owner = findClassLocal(className);
-  const jint result = Environment::current()->RegisterNatives(owner.get(), methods.data(),
-                                                              static_cast<jint>(methods.size()));
-  throwCppExceptionIf(result != 0);
-}
 
 void cacheRectF(JNIEnv* env) {
   const LocalReference<jclass> rectF(env, findClassOrThrow(env, "android/graphics/RectF"));
@@ -52,24 +39,25 @@ void cacheRectF(JNIEnv* env) {
 void registerQuenbyFilterNatives() {
   cacheRectF(Environment::current());
   const JNINativeMethod methods[] = {
-      method("init", "(Landroid/graphics/Bitmap;)J", exceptionWrapJNIMethod<&init>()),
-      method("preprocess", "([Landroid/graphics/RectF;J)V", exceptionWrapJNIMethod<&preprocess>()),
-      method("releaseSession", "(J)V", exceptionWrapJNIMethod<&releaseSession>()),
-      method("applyAutoEnhanceFilter",
-             "(JLandroid/graphics/Bitmap;Ljava/lang/String;Ljava/lang/String;)V",
-             exceptionWrapJNIMethod<&applyAutoEnhanceFilter>()),
-      method("applyAutoEnhanceFilterToJpegFile",
-             "(Ljava/lang/String;Ljava/lang/String;I[Landroid/graphics/RectF;I"
-             "Ljava/lang/String;Ljava/lang/String;)Z",
-             exceptionWrapJNIMethod<&applyAutoEnhanceFilterToJpegFile>()),
+      nativeMethod("init", "(Landroid/graphics/Bitmap;)J", exceptionWrapJNIMethod<&init>()),
+      nativeMethod("preprocess", "([Landroid/graphics/RectF;J)V",
+                   exceptionWrapJNIMethod<&preprocess>()),
+      nativeMethod("releaseSession", "(J)V", exceptionWrapJNIMethod<&releaseSession>()),
+      nativeMethod("applyAutoEnhanceFilter",
+                   "(JLandroid/graphics/Bitmap;Ljava/lang/String;Ljava/lang/String;)V",
+                   exceptionWrapJNIMethod<&applyAutoEnhanceFilter>()),
+      nativeMethod("applyAutoEnhanceFilterToJpegFile",
+                   "(Ljava/lang/String;Ljava/lang/String;I[Landroid/graphics/RectF;I"
+                   "Ljava/lang/String;Ljava/lang/String;)Z",
+                   exceptionWrapJNIMethod<&applyAutoEnhanceFilterToJpegFile>()),
   };
   registerNatives(engineClass, methods);
 }
 
 void registerImageDupeDetectorNatives() {
   const JNINativeMethod methods[] = {
-      method("similarityScore", "(Landroid/graphics/Bitmap;DILandroid/graphics/Bitmap;DI)F",
-             exceptionWrapJNIMethod<&similarityScore>()),
+      nativeMethod("similarityScore", "(Landroid/graphics/Bitmap;DILandroid/graphics/Bitmap;DI)F",
+                   exceptionWrapJNIMethod<&similarityScore>()),
   };
   registerNatives(dupeDetectorClass, methods);
 

@@ -1,11 +1,9 @@
 #include "jni/session_table.h"
 
-#include <atomic>
-#include <cstdint>
-#include <random>
 #include <utility>
 
 #include "image_processing/core/never_destroyed.h"
+#include "jni/handles.h"
 #include "jni/log.h"
 
 namespace pelorin::quenby {
@@ -13,18 +11,6 @@ namespace {
 
 void logUnknown(jlong handle) {
   pn_printLog(logError, logTag, "no session has the handle %lld", static_cast<long long>(handle));
-}
-
-/// Every class loader has a copy of this library with a count of its own. Each starts at a point of
-/// 2^62, so that a handle of one means nothing to another either.
-jlong firstHandle() {
-  std::random_device random;
-  return static_cast<jlong>((std::uint64_t{random()} << 32 | random()) >> 2) + 1;
-}
-
-jlong nextHandle() {
-  static std::atomic<jlong> next = firstHandle();
-  return next++;
 }
 
 }  // namespace

@@ -16,11 +16,14 @@ thread_local FakeEnvironment* currentEnvironment = nullptr;
 std::map<std::string, FakeObject, std::less<>>& classes() {
   static std::map<std::string, FakeObject, std::less<>> all = [] {
     std::map<std::string, FakeObject, std::less<>> made;
-    for (const char* name : {"android/graphics/RectF", "android/graphics/Bitmap",
-                             "com/pelorin/photos/quenby/autoenhance/QuenbyEngine",
-                             "com/pelorin/photos/quenby/autoenhance/ImageDupeDetector",
-                             "java/lang/OutOfMemoryError", "java/lang/IllegalArgumentException",
-                             "java/lang/RuntimeException", "java/io/IOException"})
+    for (const char* name :
+         {"android/graphics/RectF", "android/graphics/Bitmap",
+          "com/pelorin/photos/quenby/autoenhance/QuenbyEngine",
+          "com/pelorin/photos/quenby/autoenhance/ImageDupeDetector", "java/lang/OutOfMemoryError",
+          "java/lang/IllegalArgumentException", "java/lang/RuntimeException", "java/io/IOException",
+          "java/util/concurrent/CancellationException",
+          "com/pelorin/photos/quenby/autoenhance/PhotoBytes",
+          "com/pelorin/photos/quenby/autoenhance/PhotoException"})
       made[name] = {.className = "java/lang/Class", .text = name};
     return made;
   }();
@@ -30,10 +33,10 @@ std::map<std::string, FakeObject, std::less<>>& classes() {
 /// Identifiers of members are their names.
 template <typename Id>
 Id idOf(const char* name) {
-  static const char* const known[] = {"left",       "top",         "right",
-                                      "bottom",     "width",       "height",
-                                      "stride",     "format",      "SIMILARITY_ERROR",
-                                      "lockPixels", "unlockPixels"};
+  static const char* const known[] = {"left",       "top",          "right",
+                                      "bottom",     "width",        "height",
+                                      "stride",     "format",       "SIMILARITY_ERROR",
+                                      "lockPixels", "unlockPixels", "<init>"};
   for (const char* candidate : known)
     if (std::strcmp(candidate, name) == 0)
       return reinterpret_cast<Id>(const_cast<char*>(candidate));
@@ -145,6 +148,58 @@ struct FakeFunctions {
     return fake.resolve(buffer, "GetDirectBufferAddress")->address;
   }
 
+  static jlong getDirectBufferCapacity(JNIEnv* env, jobject buffer) {
+    FakeEnvironment& fake = of(env);
+    fake.checkNothingPending("GetDirectBufferCapacity");
+    return static_cast<jlong>(fake.resolve(buffer, "GetDirectBufferCapacity")->capacity);
+  }
+
+  // Arrays of numbers. Natives get one at a time, whose room is made beforehand.
+  template <auto elements, typename Array>
+  static Array newArray(JNIEnv* env, jsize count) {
+    FakeEnvironment& fake = of(env);
+    fake.checkNothingPending("New...Array");
+    if (fake.shouldFail("New...Array")) return nullptr;
+    (fake.made.*elements).resize(static_cast<std::size_t>(count));
+    return static_cast<Array>(fake.newLocal(&fake.made, "New...Array"));
+  }
+
+  template <auto elements, typename Array, typename Element>
+  static void getRegion(JNIEnv* env, Array array, jsize start, jsize count, Element* to) {
+    FakeEnvironment& fake = of(env);
+    fake.checkNothingPending("Get...ArrayRegion");
+    const auto& from = fake.resolve(array, "Get...ArrayRegion")->*elements;
+    if (static_cast<std::size_t>(start) + static_cast<std::size_t>(count) > from.size())
+      fake.violate("outside the array", "Get...ArrayRegion");
+    else
+      std::copy_n(from.begin() + start, count, to);
+  }
+
+  template <auto elements, typename Array, typename Element>
+  static void setRegion(JNIEnv* env, Array array, jsize start, jsize count, const Element* from) {
+    FakeEnvironment& fake = of(env);
+    fake.checkNothingPending("Set...ArrayRegion");
+    auto& to = fake.resolve(array, "Set...ArrayRegion")->*elements;
+    if (static_cast<std::size_t>(start) + static_cast<std::size_t>(count) > to.size())
+      fake.violate("outside the array", "Set...ArrayRegion");
+    else
+      std::copy_n(from, count, to.begin() + start);
+  }
+
+  /// Of PhotoException alone: a number and a text.
+  static jobject newObject(JNIEnv* env, jclass type, jmethodID, va_list arguments) {
+    FakeEnvironment& fake = of(env);
+    fake.checkNothingPending("NewObject");
+    if (fake.shouldFail("NewObject")) return nullptr;
+    const int number = va_arg(arguments, jint);
+    const FakeObject* const text = fake.resolve(va_arg(arguments, jobject), "NewObject");
+    std::snprintf(fake.pendingMessage_, sizeof(fake.pendingMessage_), "%d %s", number,
+                  text->text.c_str());
+    fake.exception_.className.assign(fake.resolve(type, "NewObject")->text);
+    fake.exception_.text.assign(fake.pendingMessage_);
+    return fake.newLocal(&fake.exception_, "NewObject");
+  }
+
   static jint registerNatives(JNIEnv* env, jclass owner, const JNINativeMethod* methods,
                               jint count) {
     FakeEnvironment& fake = of(env);
@@ -183,7 +238,9 @@ struct FakeFunctions {
   static jsize getArrayLength(JNIEnv* env, jarray array) {
     FakeEnvironment& fake = of(env);
     fake.checkNothingPending("GetArrayLength");
-    return static_cast<jsize>(fake.resolve(array, "GetArrayLength")->elements.size());
+    const FakeObject& object = *fake.resolve(array, "GetArrayLength");
+    return static_cast<jsize>(object.elements.size() + object.bytes.size() +
+                              object.floatElements.size());
   }
 
   static jobject getObjectArrayElement(JNIEnv* env, jobjectArray array, jsize index) {
@@ -273,6 +330,16 @@ struct FakeFunctions {
       made.GetStaticFloatField = getStaticFloatField;
       made.CallObjectMethodV = callObjectMethod;
       made.CallVoidMethodV = callVoidMethod;
+      made.GetDirectBufferCapacity = getDirectBufferCapacity;
+      made.NewByteArray = newArray<&FakeObject::bytes, jbyteArray>;
+      made.NewFloatArray = newArray<&FakeObject::floatElements, jfloatArray>;
+      made.NewDoubleArray = newArray<&FakeObject::doubleElements, jdoubleArray>;
+      made.GetByteArrayRegion = getRegion<&FakeObject::bytes, jbyteArray, jbyte>;
+      made.GetFloatArrayRegion = getRegion<&FakeObject::floatElements, jfloatArray, jfloat>;
+      made.SetByteArrayRegion = setRegion<&FakeObject::bytes, jbyteArray, jbyte>;
+      made.SetFloatArrayRegion = setRegion<&FakeObject::floatElements, jfloatArray, jfloat>;
+      made.SetDoubleArrayRegion = setRegion<&FakeObject::doubleElements, jdoubleArray, jdouble>;
+      made.NewObjectV = newObject;
       made.GetDirectBufferAddress = getDirectBufferAddress;
       made.RegisterNatives = registerNatives;
       made.NewStringUTF = newStringUTF;
@@ -302,6 +369,9 @@ FakeEnvironment::FakeEnvironment() {
   // Room for any exception or string, so that none of them allocates.
   string_.className = "java/lang/String";
   string_.text.reserve(sizeof(pendingMessage_));
+  made.bytes.reserve(1 << 18);
+  made.floatElements.reserve(256);
+  made.doubleElements.reserve(8);
   exception_.className.reserve(sizeof(pendingClass_));
   exception_.text.reserve(sizeof(pendingMessage_));
   currentEnvironment = this;

@@ -19,7 +19,12 @@ struct FakeObject {
   std::vector<FakeObject*> elements = {};
   std::map<std::string, float> floats = {};  ///< Fields by name.
   std::map<std::string, int> ints = {};
-  void* address = nullptr;  ///< Of a direct buffer.
+  void* address = nullptr;   ///< Of a direct buffer.
+  std::size_t capacity = 0;  ///< Its bytes.
+  // Elements of an array of numbers.
+  std::vector<std::uint8_t> bytes = {};
+  std::vector<float> floatElements = {};
+  std::vector<double> doubleElements = {};
 };
 
 /// A Java environment without Java, for the thread that makes it. It checks the rules that a real
@@ -73,6 +78,9 @@ class FakeEnvironment : public JNIEnv {
   int charactersInUse = 0;
   int localReferences = 0;
   int mostLocalReferences = 0;
+
+  /// The array of numbers that a native made last.
+  FakeObject made;
 
   /// The functions given to RegisterNatives by any environment, by name and signature.
   static std::map<std::string, void*, std::less<>>& registered();

@@ -1,0 +1,143 @@
+#include "bindings/java/photo_natives.h"
+
+#include <array>
+#include <cmath>
+#include <limits>
+#include <stdexcept>
+
+#include "bindings/java/cancellations.h"
+#include "bindings/java/filter_photo.h"
+#include "bindings/java/java_arrays.h"
+#include "bindings/java/photo_errors.h"
+#include "image_processing/dupe/cdf_distance.h"
+#include "image_processing/dupe/dupe_score.h"
+#include "image_processing/quality/niqe.h"
+#include "jni/java_string.h"
+#include "jni/native_methods.h"
+#include "photo/collection/photo_record.h"
+#include "photo/collection/photo_score.h"
+#include "photo/photo.h"
+
+namespace pelorin::quenby {
+
+using image_processing::FaceFractions;
+using image_processing::GreenCDF;
+
+namespace {
+
+std::vector<FaceFractions> facesOf(JNIEnv* env, jfloatArray array) {
+  const std::vector<float> sides = floatsOf(env, array);
+  if (sides.size() % 4 != 0)
+    throw std::invalid_argument("faces: needs left, top, right, bottom of each");
+  std::vector<FaceFractions> faces;
+  for (std::size_t i = 0; i < sides.size(); i += 4)
+    faces.push_back({sides[i], sides[i + 1], sides[i + 2], sides[i + 3]});
+  return faces;
+}
+
+GreenCDF cdfOf(JNIEnv* env, jfloatArray array) {
+  const std::vector<float> values = floatsOf(env, array);
+  GreenCDF cdf;
+  if (values.size() != cdf.size()) throw std::invalid_argument("a green CDF has 256 values");
+  std::copy(values.begin(), values.end(), cdf.begin());
+  return cdf;
+}
+
+}  // namespace
+
+jbyteArray filterBytes(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
+                       jint length, jint quality, jint rotation, jfloatArray faces, jint scale,
+                       jstring filter, jstring params, jlong cancel) {
+  const FilterRequest request{.filter = toString(env, filter),
+                              .params = toString(env, params),
+                              .quality = quality,
+                              .rotation = rotation,
+                              .scale = scale,
+                              .faces = facesOf(env, faces),
+                              .stop = cancellations().token(cancel)};
+  const FileBytes file(env, array, buffer, offset, length);
+  return javaArray(env, filterPhoto(file.bytes(), request));
+}
+
+jfloat niqe(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset, jint length,
+            jlong cancel) {
+  const FileBytes file(env, array, buffer, offset, length);
+  return photo::scoreOf(file.bytes(), cancellations().token(cancel));
+}
+
+jfloatArray niqeMeanFeatures(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
+                             jint length, jlong cancel) {
+  const FileBytes file(env, array, buffer, offset, length);
+  const photo::Photo photo = photo::open(file.bytes(), {.stop = cancellations().token(cancel)});
+  return javaArray(env, image_processing::analyzeNiqe(*photo.image).meanFeatures);
+}
+
+jfloatArray greenCdf(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
+                     jint length, jlong cancel) {
+  const FileBytes file(env, array, buffer, offset, length);
+  return javaArray(env, photo::readPhotoRecord(file.bytes(), photo::automaticScale,
+                                               cancellations().token(cancel))
+                            .cdf);
+}
+
+jdoubleArray facts(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
+                   jint length) {
+  const FileBytes file(env, array, buffer, offset, length);
+  const photo::PhotoFacts facts = photo::readFacts(file.bytes());
+  constexpr double unknown = std::numeric_limits<double>::quiet_NaN();
+  std::array<double, 5> values = {double(facts.width), double(facts.height),
+                                  double(facts.orientation), unknown, unknown};
+  if (facts.captureTime) {
+    const photo::ShotTime time = photo::shotTime(*facts.captureTime);
+    values[3] = time.wallClock;
+    values[4] = time.utc.value_or(unknown);
+  }
+  return javaArray(env, values);
+}
+
+jfloat distance(JNIEnv* env, jobject, jfloatArray a, jfloatArray b) {
+  return image_processing::exposureInvariantCDFDistance(cdfOf(env, a), cdfOf(env, b));
+}
+
+jfloat score(JNIEnv*, jobject, jfloat distance, jdouble seconds, jboolean sameOrientation) {
+  return image_processing::dupeScoreOfDistance(distance, static_cast<float>(std::fabs(seconds)),
+                                               sameOrientation != JNI_FALSE);
+}
+
+jdouble window(JNIEnv*, jobject, jfloat threshold, jboolean sameOrientation) {
+  return image_processing::longestDupeTimeDifference(threshold, sameOrientation != JNI_FALSE);
+}
+
+jlong newCancel(JNIEnv*, jobject) {
+  return cancellations().open();
+}
+
+void cancel(JNIEnv*, jobject, jlong handle) {
+  cancellations().cancel(handle);
+}
+
+void freeCancel(JNIEnv*, jobject, jlong handle) {
+  cancellations().close(handle);
+}
+
+void registerPhotoNatives() {
+  const JNINativeMethod methods[] = {
+      nativeMethod("filter",
+                   "([BLjava/nio/ByteBuffer;IIII[FILjava/lang/String;Ljava/lang/String;J)[B",
+                   photoNative<&filterBytes>()),
+      nativeMethod("niqe", "([BLjava/nio/ByteBuffer;IIJ)F", photoNative<&niqe>()),
+      nativeMethod("niqeFeatures", "([BLjava/nio/ByteBuffer;IIJ)[F",
+                   photoNative<&niqeMeanFeatures>()),
+      nativeMethod("greenCdf", "([BLjava/nio/ByteBuffer;IIJ)[F", photoNative<&greenCdf>()),
+      nativeMethod("facts", "([BLjava/nio/ByteBuffer;II)[D", photoNative<&facts>()),
+      nativeMethod("distance", "([F[F)F", photoNative<&distance>()),
+      nativeMethod("score", "(FDZ)F", photoNative<&score>()),
+      nativeMethod("window", "(FZ)D", photoNative<&window>()),
+      nativeMethod("newCancel", "()J", photoNative<&newCancel>()),
+      nativeMethod("cancel", "(J)V", photoNative<&cancel>()),
+      nativeMethod("freeCancel", "(J)V", photoNative<&freeCancel>()),
+  };
+  registerNatives("com/pelorin/photos/quenby/autoenhance/PhotoBytes", methods);
+}
+
+}  // namespace pelorin::quenby

@@ -1,0 +1,58 @@
+#pragma once
+
+#include <jni.h>
+
+namespace pelorin::quenby {
+
+// The natives of PhotoBytes, to be registered through `photoNative`. Any thread that the virtual
+// machine knows may call, any number at once.
+//
+// A photo is given as an array or a direct buffer, see FileBytes, and `cancel` is a handle of
+// Cancellations or 0. Beside what single natives say: PhotoException for what is no photo, damaged or
+// beyond the limits, CancellationException after a cancellation, IllegalArgumentException that names
+// the argument, OutOfMemoryError.
+
+/// The file that `quenby enhance` makes of it, see FilterRequest.
+/// @param faces  left, top, right, bottom of each as fractions of the upright, turned picture; null
+///               is none.
+jbyteArray filterBytes(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset,
+                       jint length, jint quality, jint rotation, jfloatArray faces, jint scale,
+                       jstring filter, jstring params, jlong cancel);
+
+/// The NIQE score of the upright picture; NaN when a side is below 96 pixels.
+jfloat niqe(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset, jint length,
+            jlong cancel);
+
+/// The 36 mean features behind the score; none when a side is below 96 pixels.
+jfloatArray niqeMeanFeatures(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer,
+                             jint offset, jint length, jlong cancel);
+
+/// The 256 values of the green CDF, of the picture at the size that `quenby dupes` reads.
+jfloatArray greenCdf(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset,
+                     jint length, jlong cancel);
+
+/// Width and height as stored, EXIF orientation, capture time in seconds since 1970 by the clock of
+/// its place and in UTC, each NaN when it is not known; from the header alone.
+jdoubleArray facts(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset,
+                   jint length);
+
+/// How far apart two green CDFs are, 0 ... 1.
+jfloat distance(JNIEnv* env, jobject caller, jfloatArray a, jfloatArray b);
+
+/// The duplicate score of two photos so far apart.
+jfloat score(JNIEnv* env, jobject caller, jfloat distance, jdouble seconds,
+             jboolean sameOrientation);
+
+/// The longest time between two photos that may reach `threshold`; see longestDupeTimeDifference.
+jdouble window(JNIEnv* env, jobject caller, jfloat threshold, jboolean sameOrientation);
+
+jlong newCancel(JNIEnv* env, jobject caller);
+void cancel(JNIEnv* env, jobject caller, jlong handle);
+void freeCancel(JNIEnv* env, jobject caller, jlong handle);
+
+/// Registers them all.
+/// @throws JniError, as a rule with a Java exception pending, when PhotoBytes or one of its methods
+///         is missing.
+void registerPhotoNatives();
+
+}  // namespace pelorin::quenby
