@@ -1,0 +1,29 @@
+#!/usr/bin/env bash
+# The jars that others use, in build/jar: quenby, and quenby-desktop with natives for every machine,
+# each with sources and documentation. The natives are built before:
+#
+#   tools/jar.sh [MAVEN OPTION...]
+#
+# where a goal may follow the options, such as install.
+set -euo pipefail
+root=$(cd "$(dirname "${BASH_SOURCE[0]}")/.." && pwd)
+contents=$root/build/jar/contents
+
+rm -rf "$contents"
+add_natives() { # FOLDER PRESET
+  mkdir -p "$contents/native/$1"
+  local name
+  for name in libpn libpnjni libpn_imgproc libjnigraphics libpn_quenby; do
+    cp "$root/build/$2/lib/$name.so" "$contents/native/$1/"
+  done
+}
+add_natives linux-amd64 amd64
+add_natives linux-aarch64 arm64
+add_natives linux-arm armhf
+mkdir -p "$contents/META-INF/licences"
+cp "$root"/build/static/amd64/share/licences/* "$contents/META-INF/licences/"
+
+[ $# -gt 0 ] || set -- package
+mvn --batch-mode --no-transfer-progress --quiet -Dstyle.color=never --file "$root/java/pom.xml" -Prelease -DskipTests \
+  -Dquenby.jar.contents="$contents" -Dquenby.build.dir="$root/build/jar" \
+  --projects .,quenby,quenby-desktop "$@"
