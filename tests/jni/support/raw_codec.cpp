@@ -60,7 +60,7 @@ DecodedPicture decodeJpeg(std::span<const std::uint8_t> file, int scale, const D
 
 std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t width,
                                      std::uint32_t height, int quality,
-                                     std::span<const MetadataSegment>) {
+                                     std::span<const MetadataSegment>, Chroma) {
   if (width == 0 || height == 0)
     throw PhotoError(PhotoError::Kind::invalidRequest, "a picture without pixels");
   std::vector<std::uint8_t> file = makeFile(width, height);
