@@ -14,6 +14,7 @@
 #include "photo/metadata/xmp_segments.h"
 #include "photo/photo.h"
 #include "tests/photo/metadata/exif_segments.h"
+#include "tests/photo/metadata/phone_photos.h"
 #include "tests/photo/metadata/xmp_texts.h"
 #include "tests/support/pictures.h"
 
@@ -24,28 +25,16 @@ using namespace std::string_literals;
 using image_processing::Image;
 using image_processing::RGBA8Pixel;
 using test_support::Bytes;
+using test_support::bytesOf;
 using test_support::cameraExif;
+using test_support::gainMap;
+using test_support::joined;
+using test_support::jpegWith;
+using test_support::phonePhoto;
 using test_support::photoLikePicture;
+using test_support::video;
 using test_support::xmpPacket;
-
-Bytes bytesOf(const std::string& text) {
-  return {text.begin(), text.end()};
-}
-
-Bytes jpegOf(const Image<RGBA8Pixel>& picture, const std::vector<MetadataSegment>& segments = {}) {
-  return encodeJpeg(reinterpret_cast<const std::uint8_t*>(picture.data.get()), picture.width,
-                    picture.height, 90, segments);
-}
-
-MetadataSegment xmpSegment(const std::string& text) {
-  return {0xE1, bytesOf("http://ns.adobe.com/xap/1.0/\0"s + text)};
-}
-
-Bytes joined(std::initializer_list<Bytes> parts) {
-  Bytes all;
-  for (const Bytes& part : parts) all.insert(all.end(), part.begin(), part.end());
-  return all;
-}
+using test_support::xmpSegment;
 
 struct Written {
   Bytes file;
@@ -64,45 +53,6 @@ Written rewritten(const Bytes& file, const OpenOptions& options = {},
   Written written;
   written.file = save(*photo.image, "JPEG", photo.metadata, {.keep = keep}, &written.lost);
   return written;
-}
-
-const std::string gainMapXmp =
-    "<rdf:Description xmlns:hdrgm='http://ns.adobe.com/hdr-gain-map/1.0/' hdrgm:Version='1.0' "
-    "hdrgm:GainMapMax='2.5'/>";
-const std::string container =
-    "<rdf:Description xmlns:hdrgm='http://ns.adobe.com/hdr-gain-map/1.0/' "
-    "xmlns:Container='http://ns.google.com/photos/1.0/container/' "
-    "xmlns:Item='http://ns.google.com/photos/1.0/container/item/' "
-    "xmlns:GCamera='http://ns.google.com/photos/1.0/camera/' hdrgm:Version='1.0' "
-    "GCamera:MotionPhoto='1'><Container:Directory><rdf:Seq>"
-    "<rdf:li rdf:parseType='Resource'><Container:Item Item:Semantic='Primary' "
-    "Item:Mime='image/jpeg'/></rdf:li>"
-    "<rdf:li rdf:parseType='Resource'><Container:Item Item:Semantic='GainMap' "
-    "Item:Mime='image/jpeg' Item:Length='7'/></rdf:li>"
-    "<rdf:li rdf:parseType='Resource'><Container:Item Item:Semantic='MotionPhoto' "
-    "Item:Mime='video/mp4' Item:Length='8'/></rdf:li>"
-    "</rdf:Seq></Container:Directory></rdf:Description>";
-
-Bytes gainMap(bool iso = false) {
-  const MetadataSegment mark =
-      iso ? MetadataSegment{0xE2, bytesOf("urn:iso:std:iso:ts:21496:-1\0payload"s)}
-          : xmpSegment(xmpPacket(gainMapXmp));
-  return jpegOf(photoLikePicture(32, 64, 5), {mark});
-}
-
-Bytes video() {
-  return bytesOf("\0\0\0\x10"s + "ftypmp42\0\0\0\0"s + "\0\0\0\x0C"s + "mdat" + "film");
-}
-
-// As a phone writes it: every claim wrong but for what can be found.
-Bytes phonePhoto(int orientation, const Bytes& tail) {
-  return joined(
-      {jpegOf(photoLikePicture(64, 128, 1),
-              {{0xE1, cameraExif({.orientation = orientation, .width = 64, .height = 128})},
-               xmpSegment(xmpPacket(container)),
-               {0xE2, writeMpf(std::vector<MpfEntry>{{mpfPrimary, 1, 0}, {0, 2, 3}})},
-               {0xE2, bytesOf("urn:iso:std:iso:ts:21496:-1\0\0\0\0\0"s)}}),
-       tail});
 }
 
 MetadataSegment mpfOf(const JpegHeader& header) {
@@ -164,7 +114,7 @@ TEST(KeptMetadata, WithoutItsGainMapClaimsNone) {
 }
 
 TEST(KeptMetadata, NamesSecondPicturesAndUnknownDataThatGo) {
-  const Bytes preview = jpegOf(photoLikePicture(16, 16, 2));
+  const Bytes preview = jpegWith(photoLikePicture(16, 16, 2));
   const Written written =
       rewritten(phonePhoto(1, joined({preview, {0, 0, 0}, bytesOf("what is this?")})));
   EXPECT_TRUE(written.tail().empty());
@@ -174,8 +124,8 @@ TEST(KeptMetadata, NamesSecondPicturesAndUnknownDataThatGo) {
 }
 
 TEST(KeptMetadata, NamesTheManifestThatAnEditBreaks) {
-  const Bytes file = jpegOf(photoLikePicture(32, 32, 1),
-                            {{0xEB, bytesOf("JP\0\1\0\0\0\1\0\0\0\x40jumb....c2pa"s)}});
+  const Bytes file = jpegWith(photoLikePicture(32, 32, 1),
+                              {{0xEB, bytesOf("JP\0\1\0\0\0\1\0\0\0\x40jumb....c2pa"s)}});
   const Written written = rewritten(file);
   EXPECT_EQ(written.lost, (std::vector<Loss>{{"C2PA manifest", "an edit breaks its signature"}}));
   EXPECT_EQ(written.text().find("c2pa"), std::string::npos);
@@ -201,7 +151,7 @@ TEST(KeptMetadata, RemovesThumbnailsThatShowThePictureAsItWas) {
   const Bytes resources = bytesOf("Photoshop 3.0\0"s + "8BIM\x04\x04\0\0\0\0\0\3abc\0"s +
                                   "8BIM\x04\x0C\0\0\0\0\0\4old!"s);
   const Written written =
-      rewritten(jpegOf(photoLikePicture(32, 32, 1), {{0xE0, jfif}, {0xED, resources}}));
+      rewritten(jpegWith(photoLikePicture(32, 32, 1), {{0xE0, jfif}, {0xED, resources}}));
   EXPECT_EQ(written.lost.size(), 2u);
   const std::vector<MetadataSegment> segments = written.header().metadata;
   ASSERT_EQ(segments.size(), 2u);
@@ -216,8 +166,8 @@ TEST(KeptMetadata, OfEveryKindAgreesAboutSizeAndOrientation) {
       "stDim:h='128'/><mwg-rs:RegionList><rdf:Bag><rdf:li mwg-rs:Type='Face'><mwg-rs:Area "
       "stArea:x='0.25' stArea:y='0.5' stArea:w='0.1' stArea:h='0.1'/></rdf:li></rdf:Bag>"
       "</mwg-rs:RegionList></mwg-rs:Regions></rdf:Description>");
-  const Bytes file = jpegOf(photoLikePicture(64, 128, 1),
-                            {{0xE1, cameraExif({.width = 64, .height = 128})}, xmpSegment(xmp)});
+  const Bytes file = jpegWith(photoLikePicture(64, 128, 1),
+                              {{0xE1, cameraExif({.width = 64, .height = 128})}, xmpSegment(xmp)});
   const Written written = rewritten(file, {.scale = 2});
   const JpegHeader header = written.header();
   EXPECT_EQ(header.width, 64u);
@@ -243,8 +193,8 @@ TEST(KeptMetadata, OfEveryKindAgreesAboutSizeAndOrientation) {
 
 TEST(KeptMetadata, CanBeTheColourProfileAlone) {
   const MetadataSegment profile = {0xE2, bytesOf("ICC_PROFILE\0\1\1profile"s)};
-  const Bytes file = joined({jpegOf(photoLikePicture(32, 32, 1),
-                                    {{0xE1, cameraExif({})}, profile, {0xFE, bytesOf("note")}}),
+  const Bytes file = joined({jpegWith(photoLikePicture(32, 32, 1),
+                                      {{0xE1, cameraExif({})}, profile, {0xFE, bytesOf("note")}}),
                              gainMap()});
   const Written written = rewritten(file, {}, {.everything = false});
   EXPECT_TRUE(written.tail().empty());
