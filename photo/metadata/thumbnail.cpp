@@ -11,11 +11,11 @@ namespace {
 using image_processing::Image;
 using image_processing::RGBA8Pixel;
 
-// Eight lines of those that a new pixel covers tell its colour.
-constexpr std::uint32_t linesForEach = 8;
+// Four lines of those that a new pixel covers tell its colour.
+constexpr std::uint32_t linesForEach = 4;
 
-// The average of some lines of whole pixels around each new one: for pictures that are at least
-// eight times as large.
+// The average of some lines of whole pixels around each new one: for pictures that have as many for
+// each.
 Image<RGBA8Pixel> averageOfLines(const Image<RGBA8Pixel>& picture, PictureSize size) {
   Image<RGBA8Pixel> result(size.width, size.height);
   const std::size_t bytes = std::size_t{picture.width} * 4;
