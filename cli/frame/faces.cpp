@@ -13,10 +13,9 @@
 #include "cli/frame/number_text.h"
 
 namespace pelorin::cli {
+namespace {
 
 using image_processing::BoundingBox;
-
-namespace {
 
 // No face is twice as far to the right as the picture is wide.
 constexpr float largestFraction = 2.0f;

@@ -5,6 +5,7 @@
 #include <memory>
 #include <optional>
 
+#include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/interrupt.h"
 #include "cli/frame/jobs.h"
@@ -57,7 +58,6 @@ Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter)
 }
 
 Done process(const Work& work, const PlannedFile& file) {
-  stopIfInterrupted();
   thread_local photo::SparePixels spare;  // each worker's own
   photo::Photo photo = loadPhoto(file.input, work.photo, &spare);
   stopIfInterrupted();
@@ -147,49 +147,46 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
   if (options.jobs == 1 && plan.size() > 1) recycleFreedMemory();
   const OutputFolders folders(plan);
   Talk talk(verb, options.report.quiet, plan.size());
-  std::size_t done = 0, failed = 0, skipped = 0;
-  const bool finished = attemptJobs<std::optional<Done>>(
-      plan.size(), options.jobs,
-      [&](std::size_t index) -> std::optional<Done> {
-        return plan[index].skipped ? std::nullopt : std::optional(process(work, plan[index]));
-      },
-      [&](std::size_t index, const Attempt<std::optional<Done>>& attempt) {
-        const PlannedFile& file = plan[index];
-        if (!attempt.result) {
-          ++failed;
-          talk.error(file.input.shownName(), attempt.error);
-          Json object = describe(file, "failed");
-          object["error"] = attempt.error;
-          json.add(object);
-        } else if (!*attempt.result) {
-          ++skipped;
-          talk.error(file.output, "exists already; add --overwrite to replace it");
-          json.add(describe(file, "exists"));
-        } else {
-          ++done;
-          Json object = describe(file, "done");
-          object["width"] = (*attempt.result)->width;
-          object["height"] = (*attempt.result)->height;
-          object["filter"] = filter.filter.name;
-          object["params"] = filter.params;
-          object["lost"] = jsonOf((*attempt.result)->lost);
-          json.add(object);
-          for (const photo::Loss& loss : (*attempt.result)->lost)
-            talk.note(file.output + ": " + lossText(loss));
-        }
-        talk.fileDone();
-      });
-  if (plan.empty()) talk.note("no photos found");
+  std::size_t skipped = 0;
+  const PhotoTally tally = eachPhoto<std::optional<Done>>(
+      inputs, options.jobs, talk,
+      {.work = [&](std::size_t index) -> std::optional<Done> {
+         return plan[index].skipped ? std::nullopt : std::optional(process(work, plan[index]));
+       },
+       .done =
+           [&](std::size_t index, const std::optional<Done>& done) {
+             if (!done) {
+               ++skipped;
+               talk.error(plan[index].output, "exists already; add --overwrite to replace it");
+               json.add(describe(plan[index], "exists"));
+               return;
+             }
+             Json object = describe(plan[index], "done");
+             object["width"] = done->width;
+             object["height"] = done->height;
+             object["filter"] = filter.filter.name;
+             object["params"] = filter.params;
+             object["lost"] = jsonOf(done->lost);
+             json.add(object);
+             for (const photo::Loss& loss : done->lost) {
+               talk.note(plan[index].output + ": " + lossText(loss));
+             }
+           },
+       .failed =
+           [&](std::size_t index, const std::string& reason) {
+             Json object = describe(plan[index], "failed");
+             object["error"] = reason;
+             json.add(object);
+           }});
+  const std::size_t done = tally.done - skipped;
   if (plan.size() > 1) {
     talk.note(fmt::format("{} of {} photos done, {} failed, {} there already", done, plan.size(),
-                          failed, skipped));
+                          tally.failed, skipped));
   }
-  if (!finished) {
-    talk.note("interrupted; finished files stand");
-    return ExitCode::interrupted;
-  }
-  if (done == 0 && failed == 0) return ExitCode::nothingToDo;
-  return failed + skipped > 0 ? ExitCode::someFailed : ExitCode::allDone;
+  if (tally.interrupted) talk.note("interrupted; finished files stand");
+  const ExitCode code = tally.exitCode(talk);
+  if (code != ExitCode::allDone || skipped == 0) return code;
+  return done == 0 ? ExitCode::nothingToDo : ExitCode::someFailed;
 }
 
 }  // namespace pelorin::cli

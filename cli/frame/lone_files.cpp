@@ -7,7 +7,6 @@
 #include <filesystem>
 
 #include "cli/frame/errors.h"
-#include "cli/frame/interrupt.h"
 
 namespace fs = std::filesystem;
 
@@ -87,18 +86,6 @@ void requireExtension(const std::string& path, const std::vector<std::string>& e
   const bool known = std::find(extensions.begin(), extensions.end(), extension) != extensions.end();
   if (extension.empty() || known) return;
   throw UsageError(path + ": would not be a " + extension + " file; name it " + extensions[0]);
-}
-
-bool succeeds(Talk& talk, const std::string& file, const std::function<void()>& step) {
-  try {
-    step();
-    return true;
-  } catch (const Interrupted&) {
-    throw;
-  } catch (const std::exception& error) {
-    talk.error(file, explain(error));
-    return false;
-  }
 }
 
 }  // namespace pelorin::cli

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <functional>
 #include <optional>
 #include <string>
 #include <vector>
@@ -44,9 +43,5 @@ std::optional<ExitCode> stopBeforeWork(const std::vector<Input>& inputs,
 /// @param extensions  what the kind may be called, in small letters: ".jpg".
 /// @throws UsageError; names without an extension and "-" pass.
 void requireExtension(const std::string& path, const std::vector<std::string>& extensions);
-
-/// Does one step of the work on `file`.
-/// @returns false, with the reason said, when the step throws; Interrupted passes through.
-bool succeeds(Talk& talk, const std::string& file, const std::function<void()>& step);
 
 }  // namespace pelorin::cli

@@ -1,11 +1,13 @@
 #include <fmt/format.h>
 
+#include <array>
 #include <memory>
 #include <optional>
 #include <string>
+#include <vector>
 
+#include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
-#include "cli/frame/interrupt.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/photo_files.h"
@@ -28,25 +30,20 @@ struct CompareOptions {
   ReportOptions report;
 };
 
-photo::Shot readShot(const std::string& path, const std::string& raw, int scale) {
-  const Input input = {path, {}};
-  try {
-    photo::OpenOptions options;
-    options.scale = scale;
-    if (!raw.empty()) options.raw = readRawSize(raw);
-    const photo::Photo photo = loadPhoto(input, options);
-    photo::Shot shot;
-    image_processing::computeGreenCDF(*photo.image, shot.cdf);
-    shot.orientation = photo.facts.orientation;
-    if (photo.facts.captureTime) shot.time = photo::shotTime(*photo.facts.captureTime);
-    return shot;
-  } catch (const UsageError&) {
-    throw;
-  } catch (const Interrupted&) {
-    throw;
-  } catch (const std::exception& error) {
-    throw FileError(input.shownName() + ": " + explain(error));
-  }
+photo::Shot readShot(const Input& input, const photo::OpenOptions& options) {
+  const photo::Photo photo = loadPhoto(input, options);
+  photo::Shot shot;
+  image_processing::computeGreenCDF(*photo.image, shot.cdf);
+  shot.orientation = photo.facts.orientation;
+  if (photo.facts.captureTime) shot.time = photo::shotTime(*photo.facts.captureTime);
+  return shot;
+}
+
+photo::OpenOptions openOptions(int scale, const std::string& raw) {
+  photo::OpenOptions options;
+  options.scale = scale;
+  if (!raw.empty()) options.raw = readRawSize(raw);
+  return options;
 }
 
 ExitCode runCompare(const CompareOptions& options) {
@@ -60,9 +57,18 @@ ExitCode runCompare(const CompareOptions& options) {
   std::optional<float> givenSeconds;
   if (!options.dt.empty()) givenSeconds = readFiniteNumber("--dt", options.dt);
 
-  photo::Shot a = readShot(options.a, options.raw, options.scale);
-  photo::Shot b =
-      readShot(options.b, options.raw2.empty() ? options.raw : options.raw2, options.scale);
+  const std::vector<Input> inputs = {{options.a, {}}, {options.b, {}}};
+  const std::array open = {
+      openOptions(options.scale, options.raw),
+      openOptions(options.scale, options.raw2.empty() ? options.raw : options.raw2)};
+  std::array<photo::Shot, 2> shots;
+  auto& [a, b] = shots;
+  Talk talk("compare", options.report.quiet, 0);
+  const PhotoTally tally = eachPhoto<photo::Shot>(
+      inputs, /*jobs=*/1, talk,
+      {.work = [&](std::size_t index) { return readShot(inputs[index], open[index]); },
+       .done = [&](std::size_t index, const photo::Shot& shot) { shots[index] = shot; }});
+  if (tally.done < shots.size()) return tally.exitCode(talk);
   const char* timeSource = a.time && b.time ? "camera" : "unknown";
   if (givenSeconds) {
     timeSource = "given";

@@ -4,6 +4,7 @@
 #include <memory>
 #include <vector>
 
+#include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/faces.h"
 #include "cli/frame/file_bytes.h"
@@ -96,18 +97,25 @@ ExitCode runCurve(const CurveOptions& options) {
   const std::vector<std::string> outputs(plotted ? 1 : 0, output);
   if (const auto code = stopBeforeWork({input}, outputs, options.outputs, talk, json)) return *code;
 
-  Curve curve;
-  const bool done = succeeds(talk, input.shownName(), [&] {
-    curve = curveOf(loadPhoto(input, photoOptions), slider, faces);
-    if (!plotted) return;
-    writeOutput(output, photo::encodePng(drawPlot(plotOf(curve, input, slider, faces.size()))));
-  });
-  if (!done) return ExitCode::someFailed;
-  if (options.text) {
-    for (const float sample : curve.samples) fmt::print("{:.9g}\n", sample);
-  }
-  json.add(describe(curve, input, slider));
-  return ExitCode::allDone;
+  const PhotoTally tally = eachPhoto<Curve>(
+      {input}, /*jobs=*/1, talk,
+      {.work =
+           [&](std::size_t) {
+             const Curve curve = curveOf(loadPhoto(input, photoOptions), slider, faces);
+             if (plotted) {
+               writeOutput(output,
+                           photo::encodePng(drawPlot(plotOf(curve, input, slider, faces.size()))));
+             }
+             return curve;
+           },
+       .done =
+           [&](std::size_t, const Curve& curve) {
+             for (const float sample : curve.samples) {
+               if (options.text) fmt::print("{:.9g}\n", sample);
+             }
+             json.add(describe(curve, input, slider));
+           }});
+  return tally.exitCode(talk);
 }
 
 }  // namespace

@@ -8,6 +8,7 @@
 #include <utility>
 #include <vector>
 
+#include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/jobs.h"
@@ -79,57 +80,60 @@ bool scorePhotos(const DupesOptions& options, photo::PhotoCache* cache, std::str
     if (cache != nullptr && stamp) photo.niqe = cache->findScore(photo.path, *stamp);
     if (!photo.niqe) unscored.push_back({i, stamp});
   }
-  Talk talk(verbName, options.report.quiet, unscored.size());
-  return attemptJobs<float>(
-      unscored.size(), options.jobs,
-      [&](std::size_t job) {
-        const std::string& path = report.photos[unscored[job].photo].path;
-        return photo::scoreOf(readInput({path, {}}), interruptToken());
-      },
-      [&](std::size_t job, const Attempt<float>& attempt) {
-        const auto& [i, stamp] = unscored[job];
-        const std::string& path = report.photos[i].path;
-        report.photos[i].niqe = attempt.result;
-        if (!attempt.result) {
-          report.failed.push_back({path, "no score of it: " + attempt.error});
-          talk.error(shownName(path), report.failed.back().reason);
-        } else if (cache != nullptr && stamp && cacheTrouble.empty()) {
-          try {
-            cache->storeScore(path, *stamp, *attempt.result);
-          } catch (const photo::CacheError& error) {
-            cacheTrouble = error.what();
-          }
-        }
-        talk.fileDone();
-      });
+  std::vector<Input> inputs;
+  for (const Unscored& photo : unscored) inputs.push_back({report.photos[photo.photo].path, {}});
+  Talk talk(verbName, options.report.quiet, inputs.size());
+  const PhotoTally tally =
+      eachPhoto<float>(inputs, options.jobs, talk,
+                       {.work =
+                            [&](std::size_t job) {
+                              return photo::scoreOf(readInput(inputs[job]), interruptToken());
+                            },
+                        .done =
+                            [&](std::size_t job, float score) {
+                              const auto& [i, stamp] = unscored[job];
+                              report.photos[i].niqe = score;
+                              if (cache == nullptr || !stamp || !cacheTrouble.empty()) return;
+                              try {
+                                cache->storeScore(inputs[job].path, *stamp, score);
+                              } catch (const photo::CacheError& error) {
+                                cacheTrouble = error.what();
+                              }
+                            },
+                        .failed =
+                            [&](std::size_t job, const std::string& reason) {
+                              report.failed.push_back({inputs[job].path, reason});
+                            },
+                        .failure = "no score of it: "});
+  return !tally.interrupted;
 }
 
 // Reads the photos of all groups once more, for their pictures.
 bool writeHtml(const DupesOptions& options, DupeReport& report) {
   std::vector<std::size_t> shown;
+  std::vector<Input> inputs;
   for (const photo::DupeGroup& group : report.groups) {
     for (const std::size_t photo : group.photos) {
-      if (report.photos[photo].path != "-") shown.push_back(photo);
+      if (report.photos[photo].path == "-") continue;  // cannot be read twice
+      shown.push_back(photo);
+      inputs.push_back({report.photos[photo].path, {}});
     }
   }
-  std::vector<std::vector<std::uint8_t>> thumbnails(report.photos.size());
   using Thumbnail = std::vector<std::uint8_t>;
+  std::vector<Thumbnail> thumbnails(report.photos.size());
   {
-    Talk talk(verbName, options.report.quiet, shown.size());
-    const bool finished = attemptJobs<Thumbnail>(
-        shown.size(), options.jobs,
-        [&](std::size_t job) { return thumbnailOf(report.photos[shown[job]]); },
-        [&](std::size_t job, const Attempt<Thumbnail>& attempt) {
-          if (attempt.result) {
-            thumbnails[shown[job]] = *attempt.result;
-          } else {
-            const std::string& path = report.photos[shown[job]].path;
-            report.failed.push_back({path, "no picture of it: " + attempt.error});
-            talk.error(shownName(path), report.failed.back().reason);
-          }
-          talk.fileDone();
-        });
-    if (!finished) return false;
+    Talk talk(verbName, options.report.quiet, inputs.size());
+    const PhotoTally tally = eachPhoto<Thumbnail>(
+        inputs, options.jobs, talk,
+        {.work = [&](std::size_t job) { return thumbnailOf(report.photos[shown[job]]); },
+         .done = [&](std::size_t job,
+                     const Thumbnail& thumbnail) { thumbnails[shown[job]] = thumbnail; },
+         .failed =
+             [&](std::size_t job, const std::string& reason) {
+               report.failed.push_back({inputs[job].path, reason});
+             },
+         .failure = "no picture of it: "});
+    if (tally.interrupted) return false;
   }
   const std::string html = htmlReport(report, thumbnails);
   writeOutput(options.html, {reinterpret_cast<const std::uint8_t*>(html.data()), html.size()});
@@ -197,14 +201,10 @@ ExitCode runDupes(const DupesOptions& options) {
   ScanResult scan;
   {
     Talk talk(verbName, options.report.quiet, inputs.size());
-    scan = scanPhotos(
-        inputs,
-        {options.scale == "auto" ? photo::automaticScale : std::stoi(options.scale), options.jobs,
-         options.assumeFileTime, cache.get()},
-        [&](const photo::FailedPhoto& failed) {
-          talk.error(shownName(failed.path), failed.reason);
-        },
-        [&] { talk.fileDone(); });
+    scan = scanPhotos(inputs,
+                      {options.scale == "auto" ? photo::automaticScale : std::stoi(options.scale),
+                       options.jobs, options.assumeFileTime, cache.get()},
+                      talk);
   }
   if (scan.interrupted) return ExitCode::interrupted;
   std::vector<photo::ShotPair> pairs;

@@ -5,14 +5,15 @@
 #include <string>
 #include <vector>
 
+#include "cli/frame/each_photo.h"
 #include "cli/frame/faces.h"
-#include "cli/frame/histogram_chart.h"
 #include "cli/frame/inputs.h"
 #include "cli/frame/jobs.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/photo_files.h"
 #include "cli/frame/raw_option.h"
+#include "cli/verbs/histogram_chart.h"
 #include "cli/verbs/verbs.h"
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
 #include "image_processing/autoenhance/lightness/cdf.h"
@@ -41,7 +42,6 @@ struct Info {
 
 Info inspect(const Input& input, const photo::OpenOptions& options, const std::vector<Face>& faces,
              float slider) {
-  stopIfInterrupted();
   const photo::Photo photo = loadPhoto(input, options);
   Info info = {photo.image->width, photo.image->height, std::nullopt, {}, {}};
   if (!options.raw) info.facts = photo.facts;
@@ -129,29 +129,22 @@ ExitCode runInfo(const InfoOptions& options) {
 
   JsonOutput json(options.report, isSingleFile(options.inputs, inputs));
   Talk talk("info", options.report.quiet, inputs.size());
-  std::size_t failed = 0;
-  const bool finished = attemptJobs<Info>(
-      inputs.size(), options.jobs,
-      [&](std::size_t index) { return inspect(inputs[index], photo, faces, slider); },
-      [&](std::size_t index, const Attempt<Info>& attempt) {
-        const Input& input = inputs[index];
-        if (!attempt.result) {
-          ++failed;
-          talk.error(input.shownName(), attempt.error);
-          json.add({{"file", input.path}, {"error", attempt.error}});
-        } else if (json.wanted()) {
-          json.add(jsonOf(input, *attempt.result, slider));
-        } else {
-          printText(input, *attempt.result, options.slider);
-        }
-        talk.fileDone();
-      });
-  if (!finished) return ExitCode::interrupted;
-  if (inputs.empty()) {
-    talk.note("no photos found");
-    return ExitCode::nothingToDo;
-  }
-  return failed > 0 ? ExitCode::someFailed : ExitCode::allDone;
+  const PhotoTally tally = eachPhoto<Info>(
+      inputs, options.jobs, talk,
+      {.work = [&](std::size_t index) { return inspect(inputs[index], photo, faces, slider); },
+       .done =
+           [&](std::size_t index, const Info& info) {
+             if (json.wanted()) {
+               json.add(jsonOf(inputs[index], info, slider));
+             } else {
+               printText(inputs[index], info, options.slider);
+             }
+           },
+       .failed =
+           [&](std::size_t index, const std::string& reason) {
+             json.add({{"file", inputs[index].path}, {"error", reason}});
+           }});
+  return tally.exitCode(talk);
 }
 
 }  // namespace

@@ -6,6 +6,7 @@
 #include <string>
 #include <vector>
 
+#include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/lone_files.h"
@@ -114,24 +115,30 @@ ExitCode runKeypoints(const KeypointsOptions& options) {
   JsonOutput json(options.report, true);
   if (const auto code = stopBeforeWork({input}, outputs, options.drawing, talk, json)) return *code;
 
-  Keypoints keypoints;
-  const bool done = succeeds(talk, input.shownName(), [&] {
-    const photo::Photo photo = loadPhoto(input, photoOptions);
-    keypoints = {photo.image->width, photo.image->height,
+  const PhotoTally tally = eachPhoto<Keypoints>(
+      {input}, /*jobs=*/1, talk,
+      {.work =
+           [&](std::size_t) {
+             const photo::Photo photo = loadPhoto(input, photoOptions);
+             Keypoints keypoints = {
+                 photo.image->width, photo.image->height,
                  findCorners(image_processing::imageMakeGrayscale(*photo.image), search)};
-    if (!drawing.empty()) {
-      writeOutput(drawing, drawingOf(photo, input, keypoints.corners, search));
-    }
-  });
-  if (!done) return ExitCode::someFailed;
-  if (json.wanted()) {
-    json.add(jsonOf(input, keypoints, search));
-  } else if (options.text) {
-    printText(keypoints);
-  } else {
-    printSummary(input, keypoints, search);
-  }
-  return ExitCode::allDone;
+             if (!drawing.empty()) {
+               writeOutput(drawing, drawingOf(photo, input, keypoints.corners, search));
+             }
+             return keypoints;
+           },
+       .done =
+           [&](std::size_t, const Keypoints& keypoints) {
+             if (json.wanted()) {
+               json.add(jsonOf(input, keypoints, search));
+             } else if (options.text) {
+               printText(keypoints);
+             } else {
+               printSummary(input, keypoints, search);
+             }
+           }});
+  return tally.exitCode(talk);
 }
 
 }  // namespace

@@ -3,6 +3,7 @@
 #include <memory>
 #include <vector>
 
+#include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/faces.h"
 #include "cli/frame/file_bytes.h"
@@ -88,18 +89,24 @@ ExitCode runMasks(const MasksOptions& options) {
   JsonOutput json(options.report, true);
   if (const auto code = stopBeforeWork({input}, paths, options.outputs, talk, json)) return *code;
 
-  Masks masks;
-  const bool done = succeeds(talk, input.shownName(), [&] {
-    masks = masksOf(loadPhoto(input, photoOptions), options.filter, faces, options.exact);
-    writeMasks(masks, bilateralPath, ltmPath, raw);
-  });
-  if (!done) return ExitCode::someFailed;
-  json.add({{"file", input.path},
-            {"width", masks.ltm->width},
-            {"height", masks.ltm->height},
-            {"filter", options.filter},
-            {"outputs", paths}});
-  return ExitCode::allDone;
+  const PhotoTally tally =
+      eachPhoto<Masks>({input}, /*jobs=*/1, talk,
+                       {.work =
+                            [&](std::size_t) {
+                              const Masks masks = masksOf(loadPhoto(input, photoOptions),
+                                                          options.filter, faces, options.exact);
+                              writeMasks(masks, bilateralPath, ltmPath, raw);
+                              return masks;
+                            },
+                        .done =
+                            [&](std::size_t, const Masks& masks) {
+                              json.add({{"file", input.path},
+                                        {"width", masks.ltm->width},
+                                        {"height", masks.ltm->height},
+                                        {"filter", options.filter},
+                                        {"outputs", paths}});
+                            }});
+  return tally.exitCode(talk);
 }
 
 }  // namespace

@@ -6,6 +6,7 @@
 #include <string>
 #include <vector>
 
+#include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/interrupt.h"
@@ -52,7 +53,6 @@ std::vector<std::uint8_t> heatMapOf(const photo::Photo& photo, const Input& inpu
 
 /// @param map  where the heat map goes; null for none.
 ScoredPhoto score(const Input& input, const photo::OpenOptions& options, const PlannedFile* map) {
-  stopIfInterrupted();
   const photo::Photo photo = loadPhoto(input, options);
   stopIfInterrupted();
   ScoredPhoto scored = {photo.image->width, photo.image->height,
@@ -74,16 +74,6 @@ std::vector<PlannedFile> planMaps(const ScoreOptions& options, const std::vector
   return planOutputs(inputs, options.inputs, options.maps, {});
 }
 
-struct Tally {
-  std::size_t scored = 0, tooSmall = 0, failed = 0, above = 0;
-
-  ExitCode exitCode() const {
-    if (failed > 0) return ExitCode::someFailed;
-    if (above > 0) return ExitCode::aboveLimit;
-    return scored == 0 ? ExitCode::nothingToDo : ExitCode::allDone;
-  }
-};
-
 ExitCode runScore(const ScoreOptions& options) {
   std::optional<float> limit;
   if (options.failAbove) limit = readFiniteNumber("--fail-above", *options.failAbove);
@@ -95,46 +85,41 @@ ExitCode runScore(const ScoreOptions& options) {
 
   ScoreOutput output(options.format, isSingleFile(options.inputs, inputs));
   Talk talk("score", options.format.report.quiet, inputs.size());
-  Tally tally;
-  const auto reportScore = [&](std::size_t index, const ScoredPhoto& photo) {
+  std::size_t scored = 0, above = 0, mapsKept = 0;
+  const auto report = [&](std::size_t index, const ScoredPhoto& photo) {
     const Input& input = inputs[index];
     output.add(input, photo);
     if (photo.isTooSmall()) {
-      ++tally.tooSmall;
       talk.error(input.shownName(),
                  fmt::format("is {} x {} pixels, too small: a score needs {} x {} or more",
                              photo.width, photo.height, niqeBlockSize, niqeBlockSize));
       return;
     }
-    ++tally.scored;
+    ++scored;
     if (limit && !(photo.niqe.score <= *limit)) {
-      ++tally.above;
+      ++above;
       talk.error(input.shownName(),
                  fmt::format("scores {:.9g}, above {}", photo.niqe.score, *options.failAbove));
     }
     if (!maps.empty() && maps[index].skipped) {
-      ++tally.failed;
+      ++mapsKept;
       talk.error(maps[index].output, "exists already; add --overwrite to replace it");
     }
   };
-  const bool finished = attemptJobs<ScoredPhoto>(
-      inputs.size(), options.jobs,
-      [&](std::size_t index) {
-        return score(inputs[index], photoOptions, maps.empty() ? nullptr : &maps[index]);
-      },
-      [&](std::size_t index, const Attempt<ScoredPhoto>& attempt) {
-        if (attempt.result) {
-          reportScore(index, *attempt.result);
-        } else {
-          ++tally.failed;
-          talk.error(inputs[index].shownName(), attempt.error);
-          output.addFailed(inputs[index], attempt.error);
-        }
-        talk.fileDone();
-      });
-  if (!finished) return ExitCode::interrupted;
-  if (inputs.empty()) talk.note("no photos found");
-  return tally.exitCode();
+  const PhotoTally tally = eachPhoto<ScoredPhoto>(
+      inputs, options.jobs, talk,
+      {.work =
+           [&](std::size_t index) {
+             return score(inputs[index], photoOptions, maps.empty() ? nullptr : &maps[index]);
+           },
+       .done = report,
+       .failed = [&](std::size_t index,
+                     const std::string& reason) { output.addFailed(inputs[index], reason); }});
+  const ExitCode code = tally.exitCode(talk);
+  if (code != ExitCode::allDone) return code;
+  if (mapsKept > 0) return ExitCode::someFailed;
+  if (above > 0) return ExitCode::aboveLimit;
+  return scored == 0 ? ExitCode::nothingToDo : ExitCode::allDone;
 }
 
 }  // namespace

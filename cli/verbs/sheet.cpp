@@ -6,6 +6,7 @@
 #include <optional>
 #include <vector>
 
+#include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/faces.h"
 #include "cli/frame/file_bytes.h"
@@ -146,37 +147,36 @@ ExitCode runSheet(const SheetOptions& options) {
   JpegBandEncoder encoder(static_cast<std::uint32_t>(painter.width()),
                           static_cast<std::uint32_t>(painter.height()), options.quality);
   encoder.add(painter.heading());
-  std::size_t failed = 0;
   Json rows = Json::array();
-  const bool finished = attemptJobs<SheetRow>(
-      inputs.size(), options.jobs,
-      [&](std::size_t index) { return makeRow(work, inputs[index], painter.thumbnailSize(index)); },
-      [&](std::size_t index, const Attempt<SheetRow>& attempt) {
-        Json row = {{"input", inputs[index].path}, {"status", "done"}};
-        if (attempt.result) {
-          encoder.add(painter.row(index, attempt.result->label, attempt.result->thumbnails));
-        } else {
-          ++failed;
-          talk.error(inputs[index].shownName(), attempt.error);
-          encoder.add(painter.row(index, inputs[index].shownName(), {}, attempt.error));
-          row["status"] = "failed";
-          row["error"] = attempt.error;
-        }
-        rows.push_back(row);
-        talk.fileDone();
-      });
-  if (!finished) {
+  const PhotoTally tally = eachPhoto<SheetRow>(
+      inputs, options.jobs, talk,
+      {.work =
+           [&](std::size_t index) {
+             return makeRow(work, inputs[index], painter.thumbnailSize(index));
+           },
+       .done =
+           [&](std::size_t index, const SheetRow& row) {
+             encoder.add(painter.row(index, row.label, row.thumbnails));
+             rows.push_back({{"input", inputs[index].path}, {"status", "done"}});
+           },
+       .failed =
+           [&](std::size_t index, const std::string& reason) {
+             encoder.add(painter.row(index, inputs[index].shownName(), {}, reason));
+             rows.push_back(
+                 {{"input", inputs[index].path}, {"status", "failed"}, {"error", reason}});
+           }});
+  if (tally.interrupted) {
     talk.note("interrupted; no sheet was made");
     return ExitCode::interrupted;
   }
-  const bool something = failed < inputs.size();
+  const bool something = tally.done > 0;
   if (something) writeOutput(output, encoder.finish());
   json.add({{"output", output},
             {"status", something ? "done" : "failed"},
             {"width", painter.width()},
             {"height", painter.height()},
             {"photos", rows}});
-  return failed == 0 ? ExitCode::allDone : ExitCode::someFailed;
+  return tally.exitCode(talk);
 }
 
 }  // namespace

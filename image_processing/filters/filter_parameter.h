@@ -29,9 +29,9 @@ struct FilterParameter {
 
   /// What counts without the key, 0 or 1 for a boolean; of a required one, where a user may begin.
   /// None when the filter has something of its own that no parameter string can say.
-  std::optional<float> standard;
-  bool required = false;  ///< Without it the filter throws std::out_of_range ("map::at").
-  std::string onlyWith;   ///< The boolean that must be true for this key to matter; mostly empty.
+  std::optional<float> standard = {};
+  bool required = false;      ///< Without it the filter throws std::out_of_range ("map::at").
+  std::string onlyWith = {};  ///< The boolean without which this key does nothing; mostly none.
 };
 
 /// How a filter cuts its parameter string into items and reads the values.

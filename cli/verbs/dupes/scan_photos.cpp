@@ -4,8 +4,9 @@
 #include <optional>
 #include <set>
 
+#include "cli/frame/each_photo.h"
 #include "cli/frame/file_bytes.h"
-#include "cli/frame/jobs.h"
+#include "cli/frame/interrupt.h"
 
 namespace pelorin::cli {
 namespace {
@@ -20,41 +21,40 @@ class Scan {
       : inputs_(inputs), options_(options), stamps_(inputs.size()), records_(inputs.size()) {}
 
   /// What needs no reading of photos.
-  void lookUp(const std::function<void()>& onDone) {
+  void lookUp(Talk& talk) {
     for (std::size_t i = 0; i < inputs_.size() && !interruptRequested(); ++i) {
       stamps_[i] = stampOf(inputs_[i]);
       if (options_.cache != nullptr && stamps_[i]) {
         records_[i] = options_.cache->find(inputs_[i].path, *stamps_[i], options_.scale);
       }
       if (records_[i]) {
-        onDone();
+        talk.fileDone();
       } else {
         unread_.push_back(i);
       }
     }
   }
 
-  void readTheRest(const std::function<void(const photo::FailedPhoto&)>& onFailure,
-                   const std::function<void()>& onDone, ScanResult& result) {
-    const bool finished = attemptJobs<photo::PhotoRecord>(
-        unread_.size(), options_.jobs,
-        [&](std::size_t job) {
-          stopIfInterrupted();
-          return photo::readPhotoRecord(readInput(inputs_[unread_[job]]), options_.scale,
-                                        interruptToken());
-        },
-        [&](std::size_t job, const Attempt<photo::PhotoRecord>& attempt) {
-          const std::size_t i = unread_[job];
-          if (attempt.result) {
-            records_[i] = attempt.result;
-            store(i, result.cacheTrouble);
-          } else {
-            result.failed.push_back({inputs_[i].path, attempt.error});
-            onFailure(result.failed.back());
-          }
-          onDone();
-        });
-    result.interrupted = !finished || interruptRequested();
+  void readTheRest(Talk& talk, ScanResult& result) {
+    std::vector<Input> unread;
+    for (const std::size_t i : unread_) unread.push_back(inputs_[i]);
+    const PhotoTally tally = eachPhoto<photo::PhotoRecord>(
+        unread, options_.jobs, talk,
+        {.work =
+             [&](std::size_t job) {
+               return photo::readPhotoRecord(readInput(unread[job]), options_.scale,
+                                             interruptToken());
+             },
+         .done =
+             [&](std::size_t job, const photo::PhotoRecord& record) {
+               records_[unread_[job]] = record;
+               store(unread_[job], result.cacheTrouble);
+             },
+         .failed =
+             [&](std::size_t job, const std::string& reason) {
+               result.failed.push_back({unread[job].path, reason});
+             }});
+    result.interrupted = tally.interrupted || interruptRequested();
   }
 
   void moveInto(photo::PhotoLibrary& library) {
@@ -85,13 +85,11 @@ class Scan {
 
 }  // namespace
 
-ScanResult scanPhotos(const std::vector<Input>& inputs, const ScanOptions& options,
-                      const std::function<void(const photo::FailedPhoto&)>& onFailure,
-                      const std::function<void()>& onDone) {
+ScanResult scanPhotos(const std::vector<Input>& inputs, const ScanOptions& options, Talk& talk) {
   ScanResult result;
   Scan scan(inputs, options);
-  scan.lookUp(onDone);
-  scan.readTheRest(onFailure, onDone, result);
+  scan.lookUp(talk);
+  scan.readTheRest(talk, result);
   if (!result.interrupted) scan.moveInto(result.library);
   return result;
 }

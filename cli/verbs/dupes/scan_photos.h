@@ -1,10 +1,10 @@
 #pragma once
 
-#include <functional>
 #include <string>
 #include <vector>
 
 #include "cli/frame/inputs.h"
+#include "cli/frame/talk.h"
 #include "photo/collection/photo_cache.h"
 #include "photo/collection/photo_library.h"
 
@@ -25,13 +25,9 @@ struct ScanResult {
 };
 
 /// Reduces every input to what the search needs, each decoded at most once, or taken from the
-/// cache. A file that cannot be read is listed and stops nothing.
-/// @param onFailure  called at once for each such file, on the calling thread.
-/// @param onDone     called for each input, on the calling thread.
+/// cache. A file that cannot be read is said and listed, and stops nothing.
 /// @throws CacheError when the cache cannot be read.
-ScanResult scanPhotos(const std::vector<Input>& inputs, const ScanOptions& options,
-                      const std::function<void(const photo::FailedPhoto&)>& onFailure,
-                      const std::function<void()>& onDone);
+ScanResult scanPhotos(const std::vector<Input>& inputs, const ScanOptions& options, Talk& talk);
 
 /// The inputs without those that name the same path again.
 std::vector<Input> withoutRepetitions(const std::vector<Input>& inputs);

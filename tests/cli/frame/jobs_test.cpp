@@ -4,7 +4,6 @@
 
 #include <atomic>
 #include <mutex>
-#include <new>
 #include <numeric>
 #include <set>
 #include <thread>
@@ -47,24 +46,6 @@ TEST(Jobs, ReportWhatTheOthersDidWhenOneIsInterrupted) {
       },
       [&](std::size_t index) { reported.push_back(index); }));
   EXPECT_EQ(reported, (std::vector<std::size_t>{0, 2, 3}));
-}
-
-TEST(Attempts, CarryTheResultOrTheReason) {
-  std::vector<std::string> told;
-  attemptJobs<int>(
-      3, 2,
-      [](std::size_t index) -> int {
-        if (index == 1) throw FileError("is odd");
-        if (index == 2) throw std::bad_alloc();
-        return 40;
-      },
-      [&](std::size_t, const Attempt<int>& attempt) {
-        told.push_back(attempt.result ? std::to_string(*attempt.result) : attempt.error);
-      });
-  ASSERT_EQ(told.size(), 3u);
-  EXPECT_EQ(told[0], "40");
-  EXPECT_EQ(told[1], "is odd");
-  EXPECT_NE(told[2].find("not enough memory"), std::string::npos);
 }
 
 }  // namespace

@@ -155,5 +155,18 @@ TEST(Enhance, WarnsOfParametersThatReadOtherwiseThanTheyLook) {
   EXPECT_EQ(folder.read("b.jpg"), enhancedDirectly(folder.read("a.jpg"), "AE0", "slider=0.4;"));
 }
 
+TEST(Enhance, FailsForAFaceBesideThePictureAndGoesOnWithTheOthers) {
+  const TemporaryFolder folder;
+  const std::string small = folder.write("small.jpg", jpegOf(photoLikePicture(60, 45, 1)));
+  const std::string large = folder.write("large.jpg", jpegOf(photoLikePicture(120, 90, 1)));
+  const std::string out = folder.makeFolder("out");
+  const Finished run = quenby({"enhance", small, large, "-o", out, "--face", "70,10,110,50", "-q"});
+  EXPECT_EQ(run.exitCode, 1);
+  EXPECT_EQ(run.errors,
+            "quenby enhance: " + small + ": --face 70,10,110,50 lies outside the picture\n");
+  EXPECT_FALSE(folder.has("out/small_AE0.jpg"));
+  EXPECT_TRUE(folder.has("out/large_AE0.jpg"));
+}
+
 }  // namespace
 }  // namespace pelorin::test_support

@@ -17,7 +17,7 @@ TEST(LooksVerb, ListsEveryLookInALine) {
   EXPECT_EQ(run.exitCode, 0);
   EXPECT_EQ(run.errors, "");
   std::istringstream lines(run.output);
-  std::size_t count = 0;
+  std::ptrdiff_t count = 0;
   for (const auto& [name, look] : DefaultFilterFactory::filterFactory()->descriptions) {
     std::string line, shownName, shownDisplayName;
     ASSERT_TRUE(std::getline(lines, line));
@@ -27,14 +27,14 @@ TEST(LooksVerb, ListsEveryLookInALine) {
     EXPECT_TRUE(line.ends_with("  " + look->description)) << line;
     ++count;
   }
-  EXPECT_EQ(count, 10u);
-  EXPECT_EQ(std::count(run.output.begin(), run.output.end(), '\n'), 10);
+  EXPECT_GE(count, 10);
+  EXPECT_EQ(std::count(run.output.begin(), run.output.end(), '\n'), count);
 }
 
 TEST(LooksVerb, ListsThemAsJson) {
   const auto list = parsedJson(quenby({"looks", "--json"}).output);
-  ASSERT_EQ(list.size(), 10u);
-  nlohmann::json snow = list[9];
+  ASSERT_EQ(list.size(), DefaultFilterFactory::filterFactory()->descriptions.size());
+  const nlohmann::json& snow = list.back();
   EXPECT_EQ(snow.at("name"), "ZebraBW");
   EXPECT_EQ(snow.at("displayName"), "Snow");
   EXPECT_EQ(snow.at("description"), "Black-and-white filter with softlight radial vignette.");
@@ -66,7 +66,7 @@ TEST(LooksVerb, TellsProgramsOfEveryParameter) {
     "description": "Strength of the enhancement"})"));
   EXPECT_EQ(enhancement[2].at("onlyWith"), "gtmOnly");
   EXPECT_EQ(enhancement[2].at("true"), "true");
-  const auto& snow = list[9].at("parameters");
+  const auto& snow = list.back().at("parameters");
   EXPECT_EQ(snow[0].at("exclusiveMinimum"), 0.0);
   EXPECT_EQ(snow[0].at("default").dump(), "2.28");
   EXPECT_EQ(snow[2].at("default"), true);

@@ -1,4 +1,4 @@
-#include "cli/frame/histogram_chart.h"
+#include "cli/verbs/histogram_chart.h"
 
 #include <algorithm>
 
