@@ -1,4 +1,4 @@
-// The quality score: a picture of any size from the input's bytes, fast against definition.
+// The quality score: a picture of any size from the input's bytes, vectors against definition.
 #include <cmath>
 #include <cstdlib>
 #include <cstring>

@@ -45,19 +45,19 @@ std::string stagesTable() {
   for (const test_support::KernelRow& row : test_support::kernelRows()) {
     const test_support::Kernel kernel = row.on(photo);
     kernel.vectors();  // makes tables, and touches new memory
-    std::string fast;
+    std::string variants;
     double best = 0;
     for (const InstructionSet& set : sets) {
       hwy::SetSupportedTargetsForTest(set.targets);
       best = timeOf(kernel.vectors, 3);
-      fast += fmt::format(" {:.2f} |", best);
+      variants += fmt::format(" {:.2f} |", best);
     }
     hwy::SetSupportedTargetsForTest(0);
     if (kernel.definition) {
       const double plain = timeOf(kernel.definition, 1);
-      table += fmt::format("| {} | {:.2f} |{} {:.1f} |\n", row.name, plain, fast, plain / best);
+      table += fmt::format("| {} | {:.2f} |{} {:.1f} |\n", row.name, plain, variants, plain / best);
     } else {
-      table += fmt::format("| {} | |{} |\n", row.name, fast);
+      table += fmt::format("| {} | |{} |\n", row.name, variants);
     }
   }
   const Image<RGBA8Pixel> copy(photo.width, photo.height);

@@ -23,17 +23,17 @@ double nanoseconds(const std::function<void()>& run) {
 
 void sideBySide(benchmark::State& state, std::uint64_t pixels, const void* picture,
                 std::size_t bytes, const std::function<void()>& scalar,
-                const std::function<void()>& fast) {
+                const std::function<void()>& variant) {
   static const std::vector<InstructionSet> sets = instructionSets();
   std::vector<unsigned char> copy(bytes);
   std::map<std::string, std::vector<double>> times;
-  fast();
+  variant();
   for (auto _ : state) {
     times["copy"].push_back(nanoseconds([&] { std::memcpy(copy.data(), picture, bytes); }));
     if (scalar) times["scalar"].push_back(nanoseconds(scalar));
     for (const InstructionSet& set : sets) {
       hwy::SetSupportedTargetsForTest(set.targets);
-      times[set.name].push_back(nanoseconds(fast));
+      times[set.name].push_back(nanoseconds(variant));
     }
     hwy::SetSupportedTargetsForTest(0);
     state.SetIterationTime(times[sets.back().name].back() * 1e-9);

@@ -19,7 +19,7 @@ struct TonePass {
   float vibrance;
   float ltmBlend;
   float detailGain;
-  /// Every number is ordinary, so that vectors and scalars agree: what the fast variant asks for.
+  /// Every number is ordinary, so that vectors and scalars agree: what the vectors ask for.
   bool ordinary;
 };
 

@@ -66,8 +66,8 @@ void replicateEnds(float* row, std::size_t width) {
   std::fill_n(row + width, 3, row[width - 1]);
 }
 
-void computeImageStructureFast(const Image<float>& grey, std::uint32_t width, std::uint32_t height,
-                               Image<float>& structure) {
+void computeImageStructure_fast(const Image<float>& grey, std::uint32_t width, std::uint32_t height,
+                                Image<float>& structure) {
   if (width < hn::Lanes(Floats())) return computeImageStructure(grey, width, height, structure);
   constexpr std::size_t margin = 16;  // keeps vectors within cache lines
   const std::size_t rowSize = margin + (width + 2 * margin - 1) / margin * margin;
@@ -90,10 +90,10 @@ void computeImageStructureFast(const Image<float>& grey, std::uint32_t width, st
 HWY_AFTER_NAMESPACE();
 #if HWY_ONCE
 namespace pelorin::image_processing {
-HWY_EXPORT(computeImageStructureFast);
+HWY_EXPORT(computeImageStructure_fast);
 void computeImageStructure_fast(const Image<float>& grey, std::uint32_t width, std::uint32_t height,
                                 Image<float>& structure) {
-  HWY_DYNAMIC_DISPATCH(computeImageStructureFast)(grey, width, height, structure);
+  HWY_DYNAMIC_DISPATCH(computeImageStructure_fast)(grey, width, height, structure);
 }
 }  // namespace pelorin::image_processing
 #endif

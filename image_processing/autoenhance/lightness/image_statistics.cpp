@@ -44,13 +44,13 @@ std::int32_t faceMedianBin(const Image<RGBA8Pixel>& image, const ImageMetadata& 
 
 void analyzeImage(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata,
                   ImageStatistics& statistics) {
-  LightnessCounter counter;
+  LightnessHistogramSimd counter;
   LightnessRows lightness(image);
   for (std::uint32_t y = 0; y < image.height; ++y) counter.add(lightness.row(y), image.width);
   analyzeImage(counter, image, metadata, statistics);
 }
 
-void analyzeImage(const LightnessCounter& counted, const Image<RGBA8Pixel>& image,
+void analyzeImage(const LightnessHistogramSimd& counted, const Image<RGBA8Pixel>& image,
                   const ImageMetadata& metadata, ImageStatistics& statistics) {
   computeCDF(normalised(counted.counts()), statistics.cdf);
   statistics.faceMedianBin = faceMedianBin(image, metadata, lightnessBins, lightnessScale);

@@ -3,7 +3,7 @@
 #include <cstdint>
 #include <vector>
 
-#include "image_processing/autoenhance/lightness/lightness_counter.h"
+#include "image_processing/autoenhance/lightness/lightness_histogram.h"
 #include "image_processing/core/image.h"
 #include "image_processing/core/image_metadata.h"
 
@@ -25,7 +25,7 @@ void analyzeImage(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata,
                   ImageStatistics& statistics);
 
 /// The same where every pixel of `image` has been counted.
-void analyzeImage(const LightnessCounter& counted, const Image<RGBA8Pixel>& image,
+void analyzeImage(const LightnessHistogramSimd& counted, const Image<RGBA8Pixel>& image,
                   const ImageMetadata& metadata, ImageStatistics& statistics);
 
 /// Statistics in `bins` bins (at least 1) over L in [0, scale].

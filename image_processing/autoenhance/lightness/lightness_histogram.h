@@ -12,6 +12,9 @@ namespace pelorin::image_processing {
 inline constexpr int lightnessBins = 50;
 inline constexpr float lightnessScale = labWhite;
 
+// A pair: `LightnessHistogram` defines what is counted, in any bins; `LightnessHistogramSimd` counts
+// whole photos in the bins of `analyzeImage` to the same end.
+
 /// Counts pixels by lightness, in bins over L in [0, scale].
 class LightnessHistogram {
  public:
@@ -28,6 +31,27 @@ class LightnessHistogram {
 
  private:
   std::vector<std::int32_t> binOfStep_;
+  std::vector<std::uint64_t> counts_;
+};
+
+/// The same with `lightnessBins` over [0, `lightnessScale`], for all pixels of a photo.
+class LightnessHistogramSimd {
+ public:
+  /// @throws std::bad_alloc.
+  LightnessHistogramSimd() : counts_(tables * tableSize) {}
+
+  /// Counts `count` pixels of a photo's L / 100. Never throws.
+  void add(const float* lightness, std::size_t count);
+
+  /// Pixels in each bin. @throws std::bad_alloc.
+  std::vector<std::uint64_t> counts() const;
+
+ private:
+  // Two pixels are counted in one place: it is the first's bin plus 64 times the second's. Places
+  // of neighbours are often the same: in two tables they need not wait for each other.
+  static constexpr std::size_t tables = 2, binsHeld = 64, tableSize = binsHeld * binsHeld;
+  static_assert(lightnessBins < binsHeld);  // the last stands for no pixel
+
   std::vector<std::uint64_t> counts_;
 };
 

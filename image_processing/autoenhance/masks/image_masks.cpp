@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "image_processing/autoenhance/lightness/lightness_counter.h"
+#include "image_processing/autoenhance/lightness/lightness_histogram.h"
 #include "image_processing/autoenhance/lightness/lightness_rows.h"
 #include "image_processing/autoenhance/masks/bilateral_filter.h"
 #include "image_processing/autoenhance/masks/bilateral_grid.h"
@@ -54,7 +54,7 @@ void computeMasksExactly(const Image<RGBA8Pixel>& photo, const ImageMetadata& me
 template <typename TB, typename TL>
 bool computeMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                   const FilterConfig& config, ImageMasks<TB, TL>& masks,
-                  LightnessCounter& counter) {
+                  LightnessHistogramSimd& counter) {
   allocateImageMasks(photo, masks);
   if (config.detailGainHigh == 0.0f) return false;
   const bool byGrid = config.useBilateralGrid != 0;
@@ -80,7 +80,7 @@ void allocateImageMasks(const Image<RGBA8Pixel>& photo, ImageMasks<TB, TL>& mask
 template <typename TB, typename TL>
 void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                         const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
-                        LightnessCounter& counter) {
+                        LightnessHistogramSimd& counter) {
   if (photo.pixelCount() == 0) return;
   LightnessRows lightness(photo);
   const float cellSize = gridCellSize(spatialExtent(photo, config));
@@ -106,7 +106,7 @@ void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& met
 template <typename TB, typename TL>
 void computeImageMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                        const FilterConfig& config, ImageMasks<TB, TL>& masks) {
-  LightnessCounter unused;
+  LightnessHistogramSimd unused;
   computeMasks(photo, metadata, config, masks, unused);
 }
 
@@ -114,7 +114,7 @@ template <typename TB, typename TL>
 void prepareImage(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                   const FilterConfig& config, ImageStatistics& statistics,
                   ImageMasks<TB, TL>& masks) {
-  LightnessCounter counter;
+  LightnessHistogramSimd counter;
   if (computeMasks(photo, metadata, config, masks, counter)) {
     analyzeImage(counter, photo, metadata, statistics);
   } else {
@@ -138,10 +138,10 @@ template void allocateImageMasks(const Image<RGBA8Pixel>&, ImageMasks<float, flo
 template void allocateImageMasks(const Image<RGBA8Pixel>&, ImageMasks<Quantized, Quantized>&);
 template void computeMasksByGrid(const Image<RGBA8Pixel>&, const ImageMetadata&,
                                  const FilterConfig&, Image<float>&, Image<float>&,
-                                 LightnessCounter&);
+                                 LightnessHistogramSimd&);
 template void computeMasksByGrid(const Image<RGBA8Pixel>&, const ImageMetadata&,
                                  const FilterConfig&, Image<Quantized>&, Image<Quantized>&,
-                                 LightnessCounter&);
+                                 LightnessHistogramSimd&);
 template void computeImageMasks(const Image<RGBA8Pixel>&, const ImageMetadata&, const FilterConfig&,
                                 ImageMasks<float, float>&);
 template void computeImageMasks(const Image<RGBA8Pixel>&, const ImageMetadata&, const FilterConfig&,

@@ -53,7 +53,7 @@ void prepareImage(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
 template <typename TB, typename TL>
 void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                         const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
-                        LightnessCounter& counter);
+                        LightnessHistogramSimd& counter);
 
 /// Fills the LTM mask: flatness when `amount` is above 0, else 0, then the faces one by one, each
 /// blending into what the one before left.

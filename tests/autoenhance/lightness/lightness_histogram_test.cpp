@@ -1,4 +1,4 @@
-#include "image_processing/autoenhance/lightness/lightness_counter.h"
+#include "image_processing/autoenhance/lightness/lightness_histogram.h"
 
 #include <gtest/gtest.h>
 
@@ -16,26 +16,26 @@ namespace {
 using test_support::onEveryInstructionSet;
 using test_support::Random;
 
-TEST(LightnessCounter, FindsTheBinOfEveryStep) {
+TEST(LightnessHistogramSimd, FindsTheBinOfEveryStep) {
   std::vector<std::uint16_t> steps(compandingStepCount);
   std::iota(steps.begin(), steps.end(), std::uint16_t{0});
   for (std::size_t step = 0; step < compandingStepCount; ++step) {
     LightnessHistogram expected(lightnessBins, lightnessScale);
     expected.add(&steps[step], 1);
-    LightnessCounter counter;
+    LightnessHistogramSimd counter;
     counter.add(&unitLightnessOfSteps()[step], 1);
     ASSERT_EQ(normalised(counter.counts()), expected.normalised()) << step;
   }
   LightnessHistogram expected(lightnessBins, lightnessScale);
   expected.add(steps.data(), steps.size());
   onEveryInstructionSet([&] {
-    LightnessCounter counter;
+    LightnessHistogramSimd counter;
     counter.add(unitLightnessOfSteps().data(), compandingStepCount);
     ASSERT_EQ(normalised(counter.counts()), expected.normalised());
   });
 }
 
-TEST(LightnessCounter, MatchesTheHistogramAtEveryTailLength) {
+TEST(LightnessHistogramSimd, MatchesTheHistogramAtEveryTailLength) {
   Random random(3);
   for (std::size_t count = 0; count <= 1100; count += count < 140 ? 1 : 37) {
     std::vector<std::uint16_t> steps(count);
@@ -45,7 +45,7 @@ TEST(LightnessCounter, MatchesTheHistogramAtEveryTailLength) {
     LightnessHistogram expected(lightnessBins, lightnessScale);
     expected.add(steps.data(), count);
     onEveryInstructionSet([&] {
-      LightnessCounter counter;
+      LightnessHistogramSimd counter;
       counter.add(lightness.data(), count);
       if (count == 0) unitLightness(nullptr, nullptr, 0);  // some kernel is to be called
       ASSERT_EQ(normalised(counter.counts()), expected.normalised()) << count;

@@ -1,7 +1,7 @@
-#include "image_processing/autoenhance/lightness/lightness_counter.h"
+#include "image_processing/autoenhance/lightness/lightness_histogram.h"
 
 #undef HWY_TARGET_INCLUDE
-#define HWY_TARGET_INCLUDE "image_processing/autoenhance/lightness/lightness_counter_simd.cpp"
+#define HWY_TARGET_INCLUDE "image_processing/autoenhance/lightness/lightness_histogram_simd.cpp"
 #include <hwy/foreach_target.h>  // compiles the rest of this file once per instruction set
 #include <hwy/highway.h>
 
@@ -44,7 +44,7 @@ namespace pelorin::image_processing {
 
 HWY_EXPORT(findPlaces);
 
-void LightnessCounter::add(const float* lightness, std::size_t count) {
+void LightnessHistogramSimd::add(const float* lightness, std::size_t count) {
   constexpr std::size_t blockSize = 512;
   std::uint16_t places[blockSize / 2];
   std::uint64_t* const even = counts_.data();
@@ -67,7 +67,7 @@ void LightnessCounter::add(const float* lightness, std::size_t count) {
   }
 }
 
-std::vector<std::uint64_t> LightnessCounter::counts() const {
+std::vector<std::uint64_t> LightnessHistogramSimd::counts() const {
   std::vector<std::uint64_t> bins(binsHeld);
   for (std::size_t place = 0; place < counts_.size(); ++place) {
     bins[place % binsHeld] += counts_[place];
