@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <bit>
+#include <tuple>
 
 #include "image_processing/autoenhance/colour/colour_tables.h"
 #include "image_processing/autoenhance/colour/companding_steps.h"
@@ -255,8 +256,8 @@ HWY_INLINE void enhanceBlocks(const TonePass& pass, const RGBA8Pixel* in, const 
 }
 
 template <typename Mask>
-HWY_INLINE void enhanceRowVector(const TonePass& pass, const RGBA8Pixel* in, const Mask* bilateral,
-                                 const Mask* ltm, RGBA8Pixel* out, std::size_t count) {
+void enhanceRowVector(const TonePass& pass, const RGBA8Pixel* in, const Mask* bilateral,
+                      const Mask* ltm, RGBA8Pixel* out, std::size_t count) {
   if (bilateral != nullptr) {
     enhanceBlocks<true>(pass, in, bilateral, ltm, out, count);
   } else {
@@ -264,14 +265,9 @@ HWY_INLINE void enhanceRowVector(const TonePass& pass, const RGBA8Pixel* in, con
   }
 }
 
-void enhanceRowFloat(const TonePass& pass, const RGBA8Pixel* in, const float* bilateral,
-                     const float* ltm, RGBA8Pixel* out, std::size_t count) {
-  enhanceRowVector(pass, in, bilateral, ltm, out, count);
-}
-
-void enhanceRow8bit(const TonePass& pass, const RGBA8Pixel* in, const Quantized* bilateral,
-                    const Quantized* ltm, RGBA8Pixel* out, std::size_t count) {
-  enhanceRowVector(pass, in, bilateral, ltm, out, count);
+/// The kernel for every kind of mask. The types are those of every instruction set.
+std::tuple<decltype(&enhanceRow<float>), decltype(&enhanceRow<Quantized>)> entries() {
+  return {enhanceRowVector<float>, enhanceRowVector<Quantized>};
 }
 
 }  // namespace
@@ -281,23 +277,21 @@ HWY_AFTER_NAMESPACE();
 #if HWY_ONCE
 namespace pelorin::image_processing {
 
-HWY_EXPORT(enhanceRowFloat);
-HWY_EXPORT(enhanceRow8bit);
+HWY_EXPORT(entries);
 
-template <>
-void enhanceRow(const TonePass& pass, const RGBA8Pixel* in, const float* bilateral,
-                const float* ltm, RGBA8Pixel* out, std::size_t count) {
+template <typename Mask>
+void enhanceRow(const TonePass& pass, const RGBA8Pixel* in, const Mask* bilateral, const Mask* ltm,
+                RGBA8Pixel* out, std::size_t count) {
   if (!pass.ordinary) return enhanceRowScalar(pass, in, bilateral, ltm, out, count);
-  HWY_DYNAMIC_DISPATCH(enhanceRowFloat)(pass, in, bilateral, ltm, out, count);
+  std::get<decltype(&enhanceRow<Mask>)>(HWY_DYNAMIC_DISPATCH(entries)())(pass, in, bilateral, ltm,
+                                                                         out, count);
 }
 
-template <>
-void enhanceRow(const TonePass& pass, const RGBA8Pixel* in,
-                const QuantizedFloat<unsigned char>* bilateral,
-                const QuantizedFloat<unsigned char>* ltm, RGBA8Pixel* out, std::size_t count) {
-  if (!pass.ordinary) return enhanceRowScalar(pass, in, bilateral, ltm, out, count);
-  HWY_DYNAMIC_DISPATCH(enhanceRow8bit)(pass, in, bilateral, ltm, out, count);
-}
+using Quantized = QuantizedFloat<unsigned char>;
+template void enhanceRow(const TonePass&, const RGBA8Pixel*, const float*, const float*,
+                         RGBA8Pixel*, std::size_t);
+template void enhanceRow(const TonePass&, const RGBA8Pixel*, const Quantized*, const Quantized*,
+                         RGBA8Pixel*, std::size_t);
 
 }  // namespace pelorin::image_processing
 #endif

@@ -5,6 +5,8 @@
 #include <hwy/foreach_target.h>  // compiles the rest of this file once per instruction set
 #include <hwy/highway.h>
 
+#include <tuple>
+
 #include "image_processing/core/simd.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -14,6 +16,7 @@ namespace hn = hwy::HWY_NAMESPACE;
 using Floats = hn::CappedTag<float, 16>;
 using Ints = hn::RebindToSigned<Floats>;
 using F = hn::Vec<Floats>;
+using Quantized = QuantizedFloat<unsigned char>;
 constexpr std::size_t lanes = hn::MaxLanes(Floats());
 
 HWY_INLINE F set(float value) {
@@ -31,8 +34,8 @@ HWY_INLINE F loadMask(const QuantizedFloat<unsigned char>* mask) {
 }
 
 template <typename T>
-HWY_INLINE void weigh(const GaussianApproximation<float>& weight, const float* lightness,
-                      const T* smoothed, float* weights, std::size_t count) {
+void weigh(const GaussianApproximation<float>& weight, const float* lightness, const T* smoothed,
+           float* weights, std::size_t count) {
   const auto bell = weight.terms();
   std::size_t x = 0;
   for (; x + lanes <= count; x += lanes) {
@@ -51,16 +54,6 @@ HWY_INLINE void weigh(const GaussianApproximation<float>& weight, const float* l
   weighRowScalar(weight, lightness + x, smoothed + x, weights + x, count - x);
 }
 
-void weighRowFloat(const GaussianApproximation<float>& weight, const float* lightness,
-                   const float* smoothed, float* weights, std::size_t count) {
-  weigh(weight, lightness, smoothed, weights, count);
-}
-void weighRow8bit(const GaussianApproximation<float>& weight, const float* lightness,
-                  const QuantizedFloat<unsigned char>* smoothed, float* weights,
-                  std::size_t count) {
-  weigh(weight, lightness, smoothed, weights, count);
-}
-
 HWY_INLINE void store(const FlatnessShape& shape, hn::Vec<Ints> places, float* mask) {
   hn::StoreU(hn::GatherIndex(Floats(), shape.samples.data(), places), Floats(), mask);
 }
@@ -72,8 +65,8 @@ HWY_INLINE void store(const FlatnessShape& shape, hn::Vec<Ints> places,
 }
 
 template <typename T>
-HWY_INLINE void shapeWindows(const float* top, const float* bottom, std::ptrdiff_t n,
-                             const FlatnessShape& shape, T* mask, std::size_t count) {
+void shapeWindows(const float* top, const float* bottom, std::ptrdiff_t n,
+                  const FlatnessShape& shape, T* mask, std::size_t count) {
   const F last = set(static_cast<float>(shape.samples.size() - 1));
   std::size_t x = 0;
   for (; x + lanes <= count; x += lanes) {
@@ -85,14 +78,11 @@ HWY_INLINE void shapeWindows(const float* top, const float* bottom, std::ptrdiff
   shapeRowScalar(top + x, bottom + x, n, shape, mask + x, count - x);
 }
 
-void shapeRowFloat(const float* top, const float* bottom, std::ptrdiff_t n,
-                   const FlatnessShape& shape, float* mask, std::size_t count) {
-  shapeWindows(top, bottom, n, shape, mask, count);
-}
-void shapeRow8bit(const float* top, const float* bottom, std::ptrdiff_t n,
-                  const FlatnessShape& shape, QuantizedFloat<unsigned char>* mask,
-                  std::size_t count) {
-  shapeWindows(top, bottom, n, shape, mask, count);
+/// Every kernel of this file for every kind of mask. The types are those of every instruction set.
+using Entries = std::tuple<decltype(&weighRow<float>), decltype(&weighRow<Quantized>),
+                           decltype(&shapeRow<float>), decltype(&shapeRow<Quantized>)>;
+Entries entries() {
+  return {weigh<float>, weigh<Quantized>, shapeWindows<float>, shapeWindows<Quantized>};
 }
 
 }  // namespace
@@ -102,32 +92,31 @@ HWY_AFTER_NAMESPACE();
 #if HWY_ONCE
 namespace pelorin::image_processing {
 
-using Quantized = QuantizedFloat<unsigned char>;
-HWY_EXPORT(weighRowFloat);
-HWY_EXPORT(weighRow8bit);
-HWY_EXPORT(shapeRowFloat);
-HWY_EXPORT(shapeRow8bit);
+HWY_EXPORT(entries);
 
-template <>
-void weighRow(const GaussianApproximation<float>& weight, const float* lightness,
-              const float* smoothed, float* weights, std::size_t count) {
-  HWY_DYNAMIC_DISPATCH(weighRowFloat)(weight, lightness, smoothed, weights, count);
+template <typename T>
+void weighRow(const GaussianApproximation<float>& weight, const float* lightness, const T* smoothed,
+              float* weights, std::size_t count) {
+  std::get<decltype(&weighRow<T>)>(HWY_DYNAMIC_DISPATCH(entries)())(weight, lightness, smoothed,
+                                                                    weights, count);
 }
-template <>
-void weighRow(const GaussianApproximation<float>& weight, const float* lightness,
-              const Quantized* smoothed, float* weights, std::size_t count) {
-  HWY_DYNAMIC_DISPATCH(weighRow8bit)(weight, lightness, smoothed, weights, count);
-}
-template <>
+
+template <typename T>
 void shapeRow(const float* top, const float* bottom, std::ptrdiff_t n, const FlatnessShape& shape,
-              float* mask, std::size_t count) {
-  HWY_DYNAMIC_DISPATCH(shapeRowFloat)(top, bottom, n, shape, mask, count);
+              T* mask, std::size_t count) {
+  std::get<decltype(&shapeRow<T>)>(HWY_DYNAMIC_DISPATCH(entries)())(top, bottom, n, shape, mask,
+                                                                    count);
 }
-template <>
-void shapeRow(const float* top, const float* bottom, std::ptrdiff_t n, const FlatnessShape& shape,
-              Quantized* mask, std::size_t count) {
-  HWY_DYNAMIC_DISPATCH(shapeRow8bit)(top, bottom, n, shape, mask, count);
-}
+
+using Quantized = QuantizedFloat<unsigned char>;
+template void weighRow(const GaussianApproximation<float>&, const float*, const float*, float*,
+                       std::size_t);
+template void weighRow(const GaussianApproximation<float>&, const float*, const Quantized*, float*,
+                       std::size_t);
+template void shapeRow(const float*, const float*, std::ptrdiff_t, const FlatnessShape&, float*,
+                       std::size_t);
+template void shapeRow(const float*, const float*, std::ptrdiff_t, const FlatnessShape&, Quantized*,
+                       std::size_t);
 
 }  // namespace pelorin::image_processing
 #endif

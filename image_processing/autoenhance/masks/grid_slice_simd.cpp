@@ -5,6 +5,8 @@
 #include <hwy/foreach_target.h>  // compiles the rest of this file once per instruction set
 #include <hwy/highway.h>
 
+#include <tuple>
+
 #include "image_processing/core/simd.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -175,9 +177,9 @@ HWY_INLINE void divide(const Block& block, T* smoothed, std::size_t count) {
 }
 
 template <typename T>
-HWY_INLINE void sliceRuns(const std::vector<SliceRun>& runs, const float* fractions,
-                          const SliceColumn* columns, const float* lightness, T* smoothed,
-                          std::uint32_t width) {
+void sliceRuns(const std::vector<SliceRun>& runs, const float* fractions,
+               const SliceColumn* columns, const float* lightness, T* smoothed,
+               std::uint32_t width) {
   Block block;
   std::fill(std::begin(block.bins), std::end(block.bins), 0);
   auto run = runs.begin();
@@ -200,15 +202,11 @@ void interpolateColumns(const Grid& grid, const GridNeighbours& rows, SliceColum
   }
 }
 
-void sliceRunsFloat(const std::vector<SliceRun>& runs, const float* fractions,
-                    const SliceColumn* columns, const float* lightness, float* smoothed,
-                    std::uint32_t width) {
-  sliceRuns(runs, fractions, columns, lightness, smoothed, width);
-}
-void sliceRuns8bit(const std::vector<SliceRun>& runs, const float* fractions,
-                   const SliceColumn* columns, const float* lightness,
-                   QuantizedFloat<unsigned char>* smoothed, std::uint32_t width) {
-  sliceRuns(runs, fractions, columns, lightness, smoothed, width);
+/// Every kernel of this file, for every kind of mask. The types are those of every instruction set.
+using Entries = std::tuple<decltype(&interpolateColumns), decltype(&sliceRuns<float>),
+                           decltype(&sliceRuns<QuantizedFloat<unsigned char>>)>;
+Entries entries() {
+  return {interpolateColumns, sliceRuns<float>, sliceRuns<QuantizedFloat<unsigned char>>};
 }
 
 }  // namespace
@@ -219,9 +217,7 @@ HWY_AFTER_NAMESPACE();
 namespace pelorin::image_processing {
 
 using Quantized = QuantizedFloat<unsigned char>;
-HWY_EXPORT(interpolateColumns);
-HWY_EXPORT(sliceRunsFloat);
-HWY_EXPORT(sliceRuns8bit);
+HWY_EXPORT(entries);
 
 GridSlicer::GridSlicer(const Grid& grid, std::uint32_t width, float cellSize)
     : grid_(grid),
@@ -239,19 +235,17 @@ GridSlicer::GridSlicer(const Grid& grid, std::uint32_t width, float cellSize)
   }
 }
 
-template <>
-void GridSlicer::sliceRow(std::uint32_t y, const float* lightness, float* smoothed) {
-  HWY_DYNAMIC_DISPATCH(interpolateColumns)(grid_, {y, cellSize_, grid_.rows}, columns_.data());
-  HWY_DYNAMIC_DISPATCH(sliceRunsFloat)
-  (runs_, fractions_.data(), columns_.data(), lightness, smoothed, width_);
+template <typename T>
+void GridSlicer::sliceRow(std::uint32_t y, const float* lightness, T* smoothed) {
+  const auto kernels = HWY_DYNAMIC_DISPATCH(entries)();
+  std::get<decltype(&HWY_NAMESPACE::interpolateColumns)>(kernels)(grid_, {y, cellSize_, grid_.rows},
+                                                                  columns_.data());
+  std::get<decltype(&HWY_NAMESPACE::sliceRuns<T>)>(kernels)(
+      runs_, fractions_.data(), columns_.data(), lightness, smoothed, width_);
 }
 
-template <>
-void GridSlicer::sliceRow(std::uint32_t y, const float* lightness, Quantized* smoothed) {
-  HWY_DYNAMIC_DISPATCH(interpolateColumns)(grid_, {y, cellSize_, grid_.rows}, columns_.data());
-  HWY_DYNAMIC_DISPATCH(sliceRuns8bit)
-  (runs_, fractions_.data(), columns_.data(), lightness, smoothed, width_);
-}
+template void GridSlicer::sliceRow(std::uint32_t, const float*, float*);
+template void GridSlicer::sliceRow(std::uint32_t, const float*, Quantized*);
 
 template <typename T>
 void slice(const Grid& grid, const Image<float>& lightness, float cellSize, Image<T>& smoothed) {
