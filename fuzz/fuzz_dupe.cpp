@@ -1,5 +1,5 @@
-// Bytes become two pictures and two sets of arbitrary floats. The counts in tables must be those of the
-// definition, the distance of distributions lies in 0 ... 1, and nothing reads out of bounds.
+// Bytes become two pictures and two sets of arbitrary floats. The counts in tables must be those of
+// the definition, the distance of distributions lies in 0 ... 1, and nothing reads out of bounds.
 #include <algorithm>
 #include <cstdlib>
 #include <cstring>

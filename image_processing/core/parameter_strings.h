@@ -10,8 +10,8 @@ namespace pelorin::image_processing {
 // at the edges on purpose: `FilterParams` for auto-enhance, the splitting functions and
 // `readNumber` for the curve filters. Neither trims spaces, neither rejects a malformed text. All
 // are stateless or immutable, so any thread may use them; only std::bad_alloc is thrown unless a
-// function says more. Numbers have a point and booleans are the words "true" and "false" whatever the
-// global locales of C and C++ are.
+// function says more. Numbers have a point and booleans are the words "true" and "false" whatever
+// the global locales of C and C++ are.
 
 /// The pieces of `text` that end with `separator` (not empty). What follows the last separator is
 /// not returned: "a;b;c" gives "a" and "b".
@@ -21,7 +21,7 @@ std::vector<std::string> splitStringAt(const std::string& text, const std::strin
 /// "a" and "a=" give "a" and "".
 std::vector<std::string> splitStringOnceAt(const std::string& text, const std::string& separator);
 
-/// The number at the start of `text` as `strtod` reads it; 0 when there is none. "0.4abc" reads 0.4.
+/// The number at the start of `text` as `strtod` reads it; 0 when there is none: "0.4abc" is 0.4.
 double readNumber(const std::string& text);
 
 /// "true" or "false".
@@ -37,8 +37,8 @@ class FilterParams {
   /// @throws std::out_of_range ("map::at") when the key is absent.
   const std::string& at(const std::string& key) const;
 
-  /// Whether the value of `key` starts with "true", as a stream reads it, after white space perhaps;
-  /// false when absent or anything else, "1" included.
+  /// Whether the value of `key` starts with "true", as a stream reads it, perhaps after white
+  /// space; false when absent or anything else, "1" included.
   bool readBool(const std::string& key) const;
 
   /// The value of a required key, which must be a decimal number that fits a float, an infinity or

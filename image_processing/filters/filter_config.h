@@ -30,8 +30,8 @@ struct FilterConfig {
 };
 static_assert(sizeof(FilterConfig) == 16 * 4);
 
-/// What an application without wishes of its own passes: every field as above. There before any code
-/// runs.
+/// What an application without wishes of its own passes: every field as above. There before any
+/// code runs.
 PELORIN_EXPORT extern const FilterConfig defaultFilterConfigValue;
 
 /// Rewrites the five slider-driven fields of `config`. Below 0.3 the whole effect fades in from

@@ -12,8 +12,8 @@ namespace pelorin::image_processing {
 inline constexpr int lightnessBins = 50;
 inline constexpr float lightnessScale = labWhite;
 
-// A pair: `LightnessHistogram` defines what is counted, in any bins; `LightnessHistogramSimd` counts
-// whole photos in the bins of `analyzeImage` to the same end.
+// A pair: `LightnessHistogram` defines what is counted, in any bins; `LightnessHistogramSimd`
+// counts whole photos in the bins of `analyzeImage` to the same end.
 
 /// Counts pixels by lightness, in bins over L in [0, scale].
 class LightnessHistogram {

@@ -10,8 +10,8 @@
 namespace pelorin::image_processing {
 namespace {
 
-/// Whether the blur in vectors may be trusted: it leaves out taps of weight 0, which matter beside numbers
-/// that are not finite, and such as these stay finite on the way.
+/// Whether the blur in vectors may be trusted: it leaves out taps of weight 0, which matter beside
+/// numbers that are not finite, and such as these stay finite on the way.
 bool isOrdinary(const Grid& grid) {
   return std::ranges::all_of(grid.cells, [](const GridCell& cell) {
     return std::ranges::all_of(cell, [](const GridNode& node) {

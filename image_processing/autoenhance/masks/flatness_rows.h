@@ -12,8 +12,8 @@ namespace pelorin::image_processing {
 // The two loops over pixels on either side of the flatness mask's summed-area table. Both never
 // throw and keep no state, and are there for float and QuantizedFloat<unsigned char>.
 
-/// The weight of a difference between lightness and its smoothing: none from 20/255 on, and 1 in all
-/// for a window of `side` x `side` pixels without any.
+/// The weight of a difference between lightness and its smoothing: none from 20/255 on, and 1 in
+/// all for a window of `side` x `side` pixels without any.
 GaussianApproximation<float> flatnessWeight(std::int64_t side);
 
 /// Weighs `count` pixels by the difference between lightness and its smoothing.

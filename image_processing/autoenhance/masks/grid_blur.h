@@ -22,9 +22,9 @@ inline GaussianApproximation<float> rangeBell(std::int64_t radius) {
 }
 
 /// Blurs values and weights alike along columns, rows and lightness, in that order: with
-/// `spatialBell` in space, mirrored at the borders, and `rangeBell` in lightness, where nothing lies
-/// beyond the ends. A radius of 0 or less leaves 0 in every node. Nodes hold finite numbers from 0
-/// on. @throws std::bad_alloc for one line of cells.
+/// `spatialBell` in space, mirrored at the borders, and `rangeBell` in lightness, where nothing
+/// lies beyond the ends. A radius of 0 or less leaves 0 in every node. Nodes hold finite numbers
+/// from 0 on. @throws std::bad_alloc for one line of cells.
 void blur(Grid& grid, float sigmaRange);
 
 /// The definition of `blur`.
