@@ -35,8 +35,14 @@ function(platform_library name)
   pelorin_place_beside_each_other(${name})
 endfunction()
 
-platform_library(pn SOURCES pn/log.cpp pn/java_log.cpp pn/jni_lookup.cpp
-                 DEPENDS pelorin_jni_headers)
+set(log_line pn/log_line.cpp)
+set(log_library "")
+if(ANDROID)
+  set(log_line pn/log_line_android.cpp)
+  set(log_library log)
+endif()
+platform_library(pn SOURCES pn/log.cpp ${log_line} pn/java_log.cpp pn/jni_lookup.cpp
+                 DEPENDS pelorin_jni_headers PRIVATE ${log_library})
 platform_library(
   pnjni SOURCES pnjni/environment.cpp pnjni/exceptions.cpp pnjni/java_message.cpp
                 pnjni/local_reference.cpp

@@ -1,23 +1,14 @@
 #include "platform/pn/log.h"
 
-#include <sys/time.h>
-#include <time.h>
-#include <unistd.h>
-
-#include <algorithm>
 #include <atomic>
 #include <cstdarg>
-#include <cstddef>
 #include <cstdio>
+
+#include "platform/pn/log_line.h"
 
 namespace {
 
 std::atomic<int> leastPriority = 4;
-
-char letterOf(int priority) {
-  constexpr char letters[] = "VDIWEF";  // 2 ... 7
-  return priority >= 2 && priority <= 7 ? letters[priority - 2] : '?';
-}
 
 }  // namespace
 
@@ -27,24 +18,10 @@ void pn_setLogPriority(int priority) {
 
 void pn_printLog(int priority, const char* tag, const char* format, ...) {
   if (priority < leastPriority) return;
-  timeval now;
-  tm local{};
-  gettimeofday(&now, nullptr);
-  localtime_r(&now.tv_sec, &local);
-
-  char line[1200];
-  constexpr std::size_t room = sizeof(line) - 1;  // for the newline
-  std::size_t length = strftime(line, room, "%m-%d %H:%M:%S", &local);
-  const auto grow = [&](int added) {
-    if (added > 0) length = std::min(length + static_cast<std::size_t>(added), room - 1);
-  };
-  grow(snprintf(line + length, room - length, ".%03d %c %.100s: ",
-                static_cast<int>(now.tv_usec / 1000), letterOf(priority), tag));
+  char text[1100];
   va_list arguments;
   va_start(arguments, format);
-  grow(vsnprintf(line + length, room - length, format, arguments));
+  const int length = vsnprintf(text, sizeof(text), format, arguments);
   va_end(arguments);
-  line[length++] = '\n';
-  // There is nobody to tell when standard error is closed.
-  [[maybe_unused]] const auto written = write(STDERR_FILENO, line, length);
+  if (length >= 0) pn_writeLogLine(priority, tag, text);
 }

@@ -5,10 +5,11 @@
 
 /// Writes one line to standard error: local time, the priority's letter, the tag and the formatted
 /// text, which is cut after a thousand bytes. One write a line, so lines of several threads never
-/// mix; nothing is allocated, and a line that cannot be written is dropped. Any thread may call.
+/// mix; nothing is allocated, and a line that cannot be written is dropped. Any thread may call. A
+/// build for Android writes to that platform's log instead.
 extern "C" void pn_printLog(int priority, const char* tag, const char* format, ...)
     __attribute__((format(printf, 3, 4)));
 
-/// Drops lines below `priority` from now on, in the whole process. At first that is 4: progress
-/// lines are for whoever asks for them.
+/// Drops lines below `priority` from now on, in the whole process; with 8 there are none. At first
+/// that is 4: progress lines are for whoever asks for them.
 extern "C" void pn_setLogPriority(int priority);
