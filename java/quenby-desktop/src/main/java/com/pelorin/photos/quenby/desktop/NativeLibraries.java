@@ -120,17 +120,23 @@ public final class NativeLibraries {
 
     private static boolean loadFile(Path file, String what, List<String> tried) {
         Path absolute = file.toAbsolutePath();
-        try {
-            System.load(absolute.toString());
-            return true;
-        } catch (UnsatisfiedLinkError error) {
-            if (error.getMessage() != null
-                    && error.getMessage().contains("already loaded in another classloader")) {
-                return loadPrivateCopy(absolute, what, tried);
+        // The class loader that has the file may go meanwhile, with the libraries that a copy needs.
+        for (int attempt = 0; attempt < 3; ++attempt) {
+            try {
+                System.load(absolute.toString());
+                return true;
+            } catch (UnsatisfiedLinkError error) {
+                if (error.getMessage() == null
+                        || !error.getMessage().contains("already loaded in another classloader")) {
+                    tried.add(what + absolute + ": " + error.getMessage());
+                    return false;
+                }
             }
-            tried.add(what + absolute + ": " + error.getMessage());
-            return false;
+            if (loadPrivateCopy(absolute, what, tried)) {
+                return true;
+            }
         }
+        return false;
     }
 
     /** A virtual machine loads a file for one class loader only. */
