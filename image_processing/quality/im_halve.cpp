@@ -11,7 +11,7 @@ void imHalveScalar(Image<float>& image, std::uint32_t& width, std::uint32_t& hei
     float* half = image.row(y);  // never after its inputs, so one buffer is enough
     for (std::uint32_t x = 0; x < width; ++x) {
       const std::uint32_t left = 2 * x, right = left + 1;
-      half[x] = (((upper[left] + upper[right]) + lower[left]) + lower[right]) * 0.25f;
+      half[x] = (((upper[left] + upper[right]) + lower[left]) + lower[right]) * imHalveShare;
     }
   }
 }

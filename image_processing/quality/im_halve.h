@@ -7,8 +7,11 @@
 
 namespace pelorin::image_processing {
 
+/// What each of 2 x 2 pixels counts in their mean.
+constexpr float imHalveShare = 0.25f;
+
 /// Halves a grey image in place: each pixel becomes the mean of 2 x 2, summed along the upper row,
-/// then along the lower one, times 0.25. An odd last row or column is dropped.
+/// then along the lower one, times `imHalveShare`. An odd last row or column is dropped.
 /// @param image   its top left `width` x `height` pixels are halved. Its own size, and with it the
 ///                distance between rows, stays; pixels outside the half are unspecified afterwards.
 /// @param width   at most the image's width; halved, rounding down.

@@ -25,10 +25,11 @@ void imHalve(Image<float>& image, std::uint32_t& width, std::uint32_t& height) {
       hn::LoadInterleaved2(floats, upper + 2 * x, upperLeft, upperRight);
       hn::LoadInterleaved2(floats, lower + 2 * x, lowerLeft, lowerRight);
       const auto sum = hn::Add(hn::Add(hn::Add(upperLeft, upperRight), lowerLeft), lowerRight);
-      hn::StoreU(hn::Mul(sum, hn::Set(floats, 0.25f)), floats, half + x);
+      hn::StoreU(hn::Mul(sum, hn::Set(floats, imHalveShare)), floats, half + x);
     }
     for (; x < width; ++x)
-      half[x] = (((upper[2 * x] + upper[2 * x + 1]) + lower[2 * x]) + lower[2 * x + 1]) * 0.25f;
+      half[x] =
+          (((upper[2 * x] + upper[2 * x + 1]) + lower[2 * x]) + lower[2 * x + 1]) * imHalveShare;
   }
 }
 }  // namespace
