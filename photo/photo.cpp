@@ -91,6 +91,8 @@ Photo open(std::span<const std::uint8_t> file, const OpenOptions& options, Spare
     photo.metadata.turn = turnedFurther(uprightTurn(photo.facts.orientation), options.rotate);
     photo.image = turned(photo.image, photo.metadata.turn);
   }
+  if (options.faces && !options.raw)
+    photo.faces = knownFaces(photo.metadata, {photo.image->width, photo.image->height});
   return photo;
 }
 

@@ -11,6 +11,7 @@
 #include "image_processing/core/image.h"
 #include "photo/decode_limits.h"
 #include "photo/metadata/kept_metadata.h"
+#include "photo/metadata/known_faces.h"
 #include "photo/metadata/metadata.h"
 #include "photo/photo_error.h"
 #include "photo/photo_facts.h"
@@ -26,7 +27,8 @@ namespace pelorin::photo {
 struct Photo {
   std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> image;
   PhotoFacts facts;
-  Metadata metadata;  ///< For a file made of it.
+  Metadata metadata;             ///< For a file made of it.
+  std::vector<KnownFace> faces;  ///< That the file knows of.
 };
 
 struct OpenOptions {
@@ -34,6 +36,7 @@ struct OpenOptions {
   int rotate = 0;                       ///< Degrees clockwise beyond upright, a multiple of 90.
   bool upright = true;                  ///< Else the picture is as it is stored, and `rotate` idle.
   std::optional<PictureSize> raw = {};  ///< The bytes are raw pixels of this size.
+  bool faces = true;                    ///< Read those that the file knows of.
   DecodeLimits limits = {};
   std::stop_token stop = {};  ///< Asked between steps; the default never stops.
 };

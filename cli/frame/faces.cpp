@@ -59,13 +59,26 @@ BoundingBox boxOf(const Face& face, std::uint32_t width, std::uint32_t height, i
 
 }  // namespace
 
-void addFaceOption(Verb verb, std::vector<std::string>& texts) {
+void addFaceOption(Verb verb, std::vector<std::string>& texts, std::string& source) {
   verb.option("--face", texts,
               "A face as left,top,right,bottom of the upright picture, in fractions (0,0 its top "
               "left corner, 1,1 the opposite one) or, when a number is above 2, in pixels of its "
               "full size; may be repeated")
       .oneValueEach()
       .type("L,T,R,B");
+  verb.option("--faces", source,
+              "Use the faces that the photo's XMP knows of, or none; xmp unless given. --face adds "
+              "to them")
+      .oneOf({"xmp", "none"});
+}
+
+std::vector<Face> allFaces(std::vector<Face> faces, const photo::Photo& photo) {
+  for (const photo::KnownFace& face : photo.faces) {
+    if (face.right <= 0 || face.bottom <= 0 || face.left >= 1 || face.top >= 1) continue;
+    faces.push_back({static_cast<float>(face.left), static_cast<float>(face.top),
+                     static_cast<float>(face.right), static_cast<float>(face.bottom), false});
+  }
+  return faces;
 }
 
 std::vector<Face> readFaces(const std::vector<std::string>& texts) {

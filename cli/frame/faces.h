@@ -7,6 +7,7 @@
 #include "cli/frame/verb.h"
 #include "image_processing/core/face_fractions.h"
 #include "image_processing/core/image_metadata.h"
+#include "photo/photo.h"
 
 namespace pelorin::cli {
 
@@ -16,13 +17,17 @@ struct Face {
   bool inPixels;  ///< Of the picture at its full size; fractions of it otherwise.
 };
 
-/// Adds `--face l,t,r,b`, repeatable; `texts` is for `readFaces`.
-void addFaceOption(Verb verb, std::vector<std::string>& texts);
+/// Adds `--face l,t,r,b`, repeatable, whose `texts` are for `readFaces`, and `--faces`.
+/// @param source  where other faces come from: "xmp", the photo's file, or "none".
+void addFaceOption(Verb verb, std::vector<std::string>& texts, std::string& source);
 
 /// Four numbers are pixels when one is above 2, and fractions otherwise.
 /// @throws UsageError when a text is not four finite numbers, when they are pixels and not all whole,
 ///         when left is right of right or top below bottom, and for fractions outside the picture.
 std::vector<Face> readFaces(const std::vector<std::string>& texts);
+
+/// The user's faces, then those that the photo's file knows of and that touch the picture.
+std::vector<Face> allFaces(std::vector<Face> faces, const photo::Photo& photo);
 
 /// The boxes in pixels of a picture of this size. Fractions are multiplied by it in float and
 /// truncated, with no clamping, as the Java natives do it.

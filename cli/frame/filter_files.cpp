@@ -48,7 +48,8 @@ Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter)
     throw UsageError("--face: has no effect on " + filter.filter.name);
   }
   if (options.rotate % 90 != 0) throw UsageError("--rotate: must be a multiple of 90");
-  work.photo = {.scale = options.scale, .rotate = options.rotate};
+  work.photo = {
+      .scale = options.scale, .rotate = options.rotate, .faces = options.knownFaces == "xmp"};
   if (!options.raw.empty()) {
     if (options.scale != 1) throw UsageError("--scale: raw pixels are read at their full size");
     if (options.inputs.recursive) throw UsageError("--raw: name the files, folders hold JPEG");
@@ -65,9 +66,10 @@ Done process(const Work& work, const PlannedFile& file) {
   Done done = {picture.width, picture.height};
   {
     // The session ends before the encoder begins: its masks are several times the picture.
-    FilteredImage session(photo.image,
-                          metadataWithFaces(work.faces, done.width, done.height, work.photo.scale),
-                          "", defaultFilterConfigValue, DefaultFilterFactory::filterFactory());
+    FilteredImage session(
+        photo.image,
+        metadataWithFaces(allFaces(work.faces, photo), done.width, done.height, work.photo.scale),
+        "", defaultFilterConfigValue, DefaultFilterFactory::filterFactory());
     session.applyFilterWithParams(work.filter.filter.name, work.filter.params,
                                   defaultFilterConfigValue,
                                   /*output=*/picture);
@@ -106,7 +108,7 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
                            const std::string& placeholders) {
   addInputOptions(verb, options.inputs);
   addOutputOptions(verb, options.outputs, "{stem}_{filter}.jpg", placeholders);
-  addFaceOption(verb, options.faces);
+  addFaceOption(verb, options.faces, options.knownFaces);
   verb.option("--rotate", options.rotate,
               "Turn further by so many degrees clockwise, a multiple of 90")
       .type("DEGREES");

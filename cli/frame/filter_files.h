@@ -22,6 +22,7 @@ struct FilterFilesOptions {
   ReportOptions report;
   KeepChoice keep;
   std::vector<std::string> faces;
+  std::string knownFaces = "xmp";
   std::string raw;
   int rotate = 0;
   int scale = 1;

@@ -31,17 +31,20 @@ struct CurveOptions {
   LoneOutputOptions outputs;
   ReportOptions report;
   std::vector<std::string> faces;
+  std::string knownFaces = "xmp";
   bool text = false;
 };
 
 struct Curve {
   std::uint32_t width, height;
+  std::size_t faces;
   ImageStatistics statistics;
   std::vector<float> samples;
 };
 
-Curve curveOf(const photo::Photo& photo, float slider, const std::vector<Face>& faces) {
-  Curve curve{photo.image->width, photo.image->height, {}, {}};
+Curve curveOf(const photo::Photo& photo, float slider, const std::vector<Face>& given) {
+  const std::vector<Face> faces = allFaces(given, photo);
+  Curve curve{photo.image->width, photo.image->height, faces.size(), {}, {}};
   image_processing::analyzeImage(*photo.image, metadataWithFaces(faces, curve.width, curve.height),
                                  curve.statistics);
   image_processing::FilterConfig config = image_processing::defaultFilterConfigValue;
@@ -50,13 +53,14 @@ Curve curveOf(const photo::Photo& photo, float slider, const std::vector<Face>& 
   return curve;
 }
 
-Plot plotOf(const Curve& curve, const Input& input, float slider, std::size_t faces) {
+Plot plotOf(const Curve& curve, const Input& input, float slider) {
   const std::string name = input.isStandardInput()
                                ? "standard input"
                                : std::filesystem::path(input.path).filename().string();
   std::string about =
       fmt::format("{} \xC3\x97 {} pixels, slider {:g}", curve.width, curve.height, slider);
-  if (faces > 0) about += fmt::format(", {} {}", faces, faces == 1 ? "face" : "faces");
+  if (curve.faces > 0)
+    about += fmt::format(", {} {}", curve.faces, curve.faces == 1 ? "face" : "faces");
   return toneCurvePlot("Tone curve of " + name, about, curve.samples, curve.statistics.cdf,
                        curve.statistics.faceMedianBin);
 }
@@ -80,7 +84,7 @@ Json describe(const Curve& curve, const Input& input, float slider) {
 ExitCode runCurve(const CurveOptions& options) {
   const float slider = readSlider("--slider", options.slider);
   const std::vector<Face> faces = readFaces(options.faces);
-  photo::OpenOptions photoOptions;
+  photo::OpenOptions photoOptions = {.faces = options.knownFaces == "xmp"};
   if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
   const Input input = loneInput(options.input);
   const std::string& output = options.outputs.output;
@@ -103,8 +107,7 @@ ExitCode runCurve(const CurveOptions& options) {
            [&](std::size_t) {
              const Curve curve = curveOf(loadPhoto(input, photoOptions), slider, faces);
              if (plotted) {
-               writeOutput(output,
-                           photo::encodePng(drawPlot(plotOf(curve, input, slider, faces.size()))));
+               writeOutput(output, photo::encodePng(drawPlot(plotOf(curve, input, slider))));
              }
              return curve;
            },
@@ -131,7 +134,7 @@ void addCurve(CommandLine& commandLine) {
   verb.option("IN", options->input, "A photo: a JPEG file or - (standard input)").required();
   verb.option("--slider", options->slider, "Strength from 0 (none) to 1; 0.4 unless given")
       .type("NUMBER");
-  addFaceOption(verb, options->faces);
+  addFaceOption(verb, options->faces, options->knownFaces);
   verb.flag("--text", options->text,
             "Print the 51 samples, one a line, with nine significant digits");
   addLoneOutputOptions(verb, options->outputs, "FILE",

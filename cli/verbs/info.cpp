@@ -28,6 +28,7 @@ struct InfoOptions {
   InputOptions inputs;
   ReportOptions report;
   std::vector<std::string> faces;
+  std::string knownFaces = "xmp";
   std::string raw;
   std::string slider = "0.4";
   int jobs = 1;
@@ -36,6 +37,7 @@ struct InfoOptions {
 struct Info {
   std::uint32_t width, height;
   std::optional<photo::PhotoFacts> facts;
+  std::vector<photo::KnownFace> faces;
   ImageStatistics statistics;
   std::vector<float> curve;
 };
@@ -43,9 +45,10 @@ struct Info {
 Info inspect(const Input& input, const photo::OpenOptions& options, const std::vector<Face>& faces,
              float slider) {
   const photo::Photo photo = loadPhoto(input, options);
-  Info info = {photo.image->width, photo.image->height, std::nullopt, {}, {}};
+  Info info = {photo.image->width, photo.image->height, std::nullopt, photo.faces, {}, {}};
   if (!options.raw) info.facts = photo.facts;
-  image_processing::analyzeImage(*photo.image, metadataWithFaces(faces, info.width, info.height),
+  image_processing::analyzeImage(*photo.image,
+                                 metadataWithFaces(allFaces(faces, photo), info.width, info.height),
                                  info.statistics);
   FilterConfig config = image_processing::defaultFilterConfigValue;
   image_processing::updateFilterConfigForSliderValue(slider, &config);
@@ -79,6 +82,14 @@ Json jsonOf(const Input& input, const Info& info, float slider) {
     object["orientation"] = info.facts->orientation;
     object["captureTime"] = info.facts->captureTime ? Json(info.facts->captureTime->text) : Json();
   }
+  object["faces"] = Json::array();
+  for (const photo::KnownFace& face : info.faces) {
+    object["faces"].push_back({{"left", face.left},
+                               {"top", face.top},
+                               {"right", face.right},
+                               {"bottom", face.bottom},
+                               {"name", face.name}});
+  }
   object["medianBin"] = medianBin(info.statistics.cdf);
   object["faceMedianBin"] = info.statistics.faceMedianBin;
   object["cdf"] = nineDigitsOf(info.statistics.cdf);
@@ -99,6 +110,10 @@ void printFacts(const Info& info) {
              facts.progressive ? "progressive" : "baseline");
   fmt::print("  orientation  {}\n", facts.orientation);
   fmt::print("  taken        {}\n", facts.captureTime ? facts.captureTime->text : "unknown");
+  for (const photo::KnownFace& face : info.faces) {
+    fmt::print("  face         {:.3f},{:.3f},{:.3f},{:.3f} {}\n", face.left, face.top, face.right,
+               face.bottom, face.name);
+  }
 }
 
 void printText(const Input& input, const Info& info, const std::string& slider) {
@@ -123,7 +138,7 @@ void printText(const Input& input, const Info& info, const std::string& slider) 
 ExitCode runInfo(const InfoOptions& options) {
   const float slider = readSlider("--slider", options.slider);
   const std::vector<Face> faces = readFaces(options.faces);
-  photo::OpenOptions photo;
+  photo::OpenOptions photo = {.faces = options.knownFaces == "xmp"};
   if (!options.raw.empty()) photo.raw = readRawSize(options.raw);
   const std::vector<Input> inputs = expandInputs(options.inputs);
 
@@ -162,7 +177,7 @@ void addInfo(CommandLine& commandLine) {
   verb.option("--slider", options->slider,
               "Strength, 0 to 1, whose tone curve is shown; 0.4 unless given")
       .type("S");
-  addFaceOption(verb, options->faces);
+  addFaceOption(verb, options->faces, options->knownFaces);
   addRawOption(verb, options->raw);
   addJobsOption(verb, options->jobs);
   addReportOptions(verb, options->report);

@@ -30,6 +30,7 @@ struct MasksOptions {
   ReportOptions report;
   std::string filter = "AE0";
   std::vector<std::string> faces;
+  std::string knownFaces = "xmp";
   bool exact = false;
 };
 
@@ -42,8 +43,9 @@ Masks masksOf(photo::Photo photo, const std::string& filter, const std::vector<F
   image_processing::FilterConfig config = image_processing::defaultFilterConfigValue;
   config.useBilateralGrid = exact ? 0 : 1;
   image_processing::FilteredImage session(
-      photo.image, metadataWithFaces(faces, photo.image->width, photo.image->height), "", config,
-      image_processing::DefaultFilterFactory::filterFactory());
+      photo.image,
+      metadataWithFaces(allFaces(faces, photo), photo.image->width, photo.image->height), "",
+      config, image_processing::DefaultFilterFactory::filterFactory());
   const auto prepared = session.setupFilter(filter, "");
   const auto& withMasks = dynamic_cast<const image_processing::AEFilterBase&>(*prepared);
   return {withMasks.getBilateralMask(), withMasks.getLtmMask()};
@@ -76,7 +78,7 @@ ExitCode runMasks(const MasksOptions& options) {
     throw UsageError("--filter: " + unknownName("filter with masks", options.filter, filters));
   }
   const std::vector<Face> faces = readFaces(options.faces);
-  photo::OpenOptions photoOptions;
+  photo::OpenOptions photoOptions = {.faces = options.knownFaces == "xmp"};
   if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
   const bool raw = photoOptions.raw.has_value();
 
@@ -125,7 +127,7 @@ void addMasks(CommandLine& commandLine) {
                        "flatness; with --raw bilateral.f32 and ltm.f32");
   verb.named("--output").required();
   verb.option("--filter", options->filter, "AE0 (unless given) or AE08bit").type("NAME");
-  addFaceOption(verb, options->faces);
+  addFaceOption(verb, options->faces, options->knownFaces);
   verb.flag("--exact", options->exact,
             "Smooth with the exact bilateral filter in place of the grid; slow");
   addRawOption(verb, options->raw);

@@ -41,6 +41,7 @@ struct SheetOptions {
   ReportOptions report;
   SheetColumnOptions columns;
   std::vector<std::string> faces;
+  std::string knownFaces = "xmp";
   std::string raw;
   std::optional<std::string> title;
   std::uint32_t cell = 320;
@@ -90,7 +91,7 @@ SheetRow makeRow(const SheetWork& work, const Input& input, photo::PictureSize r
   SheetRow row{fmt::format("{}  \xC2\xB7  {} \xC3\x97 {}", name, size.width, size.height), {}};
   row.thumbnails.push_back(photo::areaAverage(*photo.image, small));
   image_processing::FilteredImage session(
-      photo.image, metadataWithFaces(work.faces, size.width, size.height), "",
+      photo.image, metadataWithFaces(allFaces(work.faces, photo), size.width, size.height), "",
       defaultFilterConfigValue, image_processing::DefaultFilterFactory::filterFactory());
   Image<RGBA8Pixel> filtered(size.width, size.height);
   for (const SheetColumn& column : work.columns) {
@@ -119,6 +120,7 @@ ExitCode runSheet(const SheetOptions& options) {
     return column.filter->parameters().readsFaces;
   });
   if (!work.faces.empty() && !facesMatter) throw UsageError("--face: has no effect on these looks");
+  work.photo.faces = options.knownFaces == "xmp";
   if (!options.raw.empty()) {
     if (options.inputs.recursive) throw UsageError("--raw: name the files, folders hold JPEG");
     work.photo.raw = readRawSize(options.raw);
@@ -191,7 +193,7 @@ void addSheet(CommandLine& commandLine) {
                           [options] { return runSheet(*options); });
   addInputOptions(verb, options->inputs);
   addSheetColumnOptions(verb, options->columns);
-  addFaceOption(verb, options->faces);
+  addFaceOption(verb, options->faces, options->knownFaces);
   addLoneOutputOptions(verb, options->outputs, "FILE",
                        "The JPEG file for the sheet, or - (standard output)");
   verb.named("--output").required();

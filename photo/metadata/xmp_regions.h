@@ -1,18 +1,12 @@
 #pragma once
 
-#include <string>
 #include <vector>
 
+#include "photo/metadata/known_faces.h"
 #include "photo/metadata/picture_change.h"
 #include "photo/metadata/xmp_packet.h"
 
 namespace pelorin::photo {
-
-/// A face that a file knows of, in fractions of the upright picture.
-struct KnownFace {
-  double left, top, right, bottom;
-  std::string name;  ///< Of the person; empty where none is stated.
-};
 
 /// Brings the regions of a packet to where their contents stand in the changed picture, and states
 /// its size beside them: the Metadata Working Group's (mwg-rs), Microsoft's (MP) and IPTC's

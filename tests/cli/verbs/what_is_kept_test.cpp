@@ -126,6 +126,24 @@ TEST(WhatIsKept, FacesStandOnTheirColourInEveryOrientationAndSize) {
   if (hasExifTool()) expectNoNewWarnings(folder, files);
 }
 
+TEST(WhatIsKept, FacesOfAFileAreUsedUnlessItIsSaidOtherwise) {
+  const TemporaryFolder folder;
+  const std::string in = folder.write("a.jpg", cameraPhoto(6));
+  const auto enhanced = [&](const std::vector<std::string>& options) {
+    std::vector<std::string> arguments = {"enhance", in, "-o", folder / "b.jpg", "--overwrite"};
+    arguments.insert(arguments.end(), options.begin(), options.end());
+    EXPECT_EQ(quenby(arguments).exitCode, 0);
+    return folder.read("b.jpg");
+  };
+  // The stored 0.2 ... 0.3 across and 0.4 ... 0.6 down, a quarter clockwise.
+  const std::string sameFace = "0.4,0.2,0.6,0.3";
+  const Bytes known = enhanced({});
+  EXPECT_EQ(known, enhanced({"--faces", "none", "--face", sameFace}));
+  EXPECT_NE(known, enhanced({"--faces", "none"}));
+  const Finished info = quenby({"info", in});
+  EXPECT_THAT(info.output, testing::HasSubstr("0.400,0.200,0.600,0.300"));
+}
+
 TEST(WhatIsKept, PassesExifToolWithGainMapsAndVideos) {
   if (!hasExifTool()) GTEST_SKIP() << "exiftool is not installed";
   const TemporaryFolder folder;
