@@ -7,9 +7,19 @@
 
 // The engine without Java, for the tests of the Java classes to compare with:
 //   apply_filter WIDTH HEIGHT FILTER PARAMETERS < rgba > rgba
-// Filters a photo without faces; an unknown filter is exit code 1.
+// Filters a photo without faces; an unknown filter is exit code 1. Without arguments it lists the
+// filters, a line each: key, name to show, keys of parameters.
 int main(int count, char** arguments) {
   using namespace pelorin::image_processing;
+  if (count == 1) {
+    for (const auto& [key, filter] : DefaultFilterFactory::filterFactory()->descriptions) {
+      std::printf("%s %s", key.c_str(), filter->displayName.c_str());
+      for (const FilterParameter& row : filter->parameters().rows)
+        std::printf(" %s", row.name.c_str());
+      std::puts("");
+    }
+    return 0;
+  }
   if (count != 5) return 2;
   const auto width = static_cast<std::uint32_t>(std::atoi(arguments[1]));
   const auto height = static_cast<std::uint32_t>(std::atoi(arguments[2]));

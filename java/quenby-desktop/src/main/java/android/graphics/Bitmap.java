@@ -589,8 +589,9 @@ public final class Bitmap {
                     "a row of " + columns + " pixels is longer than the stride " + stride);
         }
         long last = offset + (rows - 1L) * stride;
-        if (columns > 0 && rows > 0
-                && (Math.min(offset, last) < 0 || Math.max(offset, last) + columns > colors.length)) {
+        boolean fits = Math.min(offset, last) >= 0
+                && Math.max(offset, last) + columns <= colors.length;
+        if (columns > 0 && rows > 0 && !fits) {
             throw new ArrayIndexOutOfBoundsException("the array is too small: " + colors.length);
         }
         return stored;

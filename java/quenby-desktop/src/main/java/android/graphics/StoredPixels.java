@@ -3,7 +3,7 @@ package android.graphics;
 /**
  * Pixels as a bitmap of ARGB_8888 stores them: bytes red, green, blue, alpha, read as an int of
  * little endian; against colours, {@code 0xAARRGGBB} and not premultiplied. With premultiplication
- * a stored channel is {@code c * alpha / 255} and a colour's {@code min(255, c * 255 / alpha)}, both
+ * a stored channel is {@code c * alpha / 255}, a colour's {@code min(255, c * 255 / alpha)}, both
  * rounded to nearest, a half upwards; alpha 0 gives colour 0. A stored pixel survives the way to a
  * colour and back.
  */

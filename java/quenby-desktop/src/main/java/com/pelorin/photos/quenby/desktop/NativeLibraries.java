@@ -12,8 +12,8 @@ import java.util.List;
 import java.util.Map;
 
 /**
- * Loads libpn_quenby.so with the libraries beside it. They are looked for in the folder or file
- * that the property {@value #PROPERTY} names, and only there if it is set; then on
+ * Loads libpn_quenby.so and libquenby_photo.so with the libraries beside them. They are looked for
+ * in the folder or file that the property {@value #PROPERTY} names, and only there if it is set; then on
  * {@code java.library.path}; then in this jar, from which they are copied into a folder of the
  * user's own below {@code java.io.tmpdir} or, where that cannot be written or may not hold
  * programs, {@code ~/.cache}. The folder is named by their content, and any number of processes may
@@ -23,23 +23,43 @@ public final class NativeLibraries {
     /** The property that names the folder or the file of libpn_quenby.so. */
     public static final String PROPERTY = "quenby.library";
 
-    private static final String LIBRARY = "libpn_quenby.so";
+    private static final NativeLibraries ENGINE = new NativeLibraries("pn_quenby");
+    private static final NativeLibraries PHOTO = new NativeLibraries("quenby_photo");
     /** What the jar holds for one kind of machine; each comes after those it needs. */
-    private static final List<String> NAMES = List.of(
-            "libpn.so", "libpnjni.so", "libpn_imgproc.so", "libjnigraphics.so", LIBRARY);
+    private static final List<String> NAMES = List.of("libpn.so", "libpnjni.so",
+            "libpn_imgproc.so", "libjnigraphics.so", ENGINE.file, PHOTO.file);
 
-    private static boolean loaded;
+    private final String name;
+    private final String file;
+    private boolean loaded;
 
-    private NativeLibraries() {}
+    private NativeLibraries(String name) {
+        this.name = name;
+        this.file = "lib" + name + ".so";
+    }
 
     /**
-     * Loads the libraries for this class's class loader, once. Several class loaders may each load
-     * them.
+     * Loads libpn_quenby.so for this class's class loader, once. Several class loaders may each
+     * load it.
      *
      * @throws UnsatisfiedLinkError when that fails; its message lists what was tried and names the
      *                              properties to set
      */
-    public static synchronized void load() {
+    public static void load() {
+        ENGINE.loadOnce();
+    }
+
+    /**
+     * Loads libquenby_photo.so in the same way.
+     *
+     * @throws UnsatisfiedLinkError when that fails; its message lists what was tried and names the
+     *                              properties to set
+     */
+    public static void loadPhoto() {
+        PHOTO.loadOnce();
+    }
+
+    private synchronized void loadOnce() {
         if (loaded) {
             return;
         }
@@ -51,20 +71,21 @@ public final class NativeLibraries {
         if (!found) {
             throw new UnsatisfiedLinkError("Quenby's native library cannot be loaded. Tried:\n  "
                     + String.join("\n  ", tried) + "\nSet the property " + PROPERTY
-                    + " to the folder that holds " + LIBRARY
+                    + " to the folder that holds " + file
                     + ", or java.io.tmpdir to one that can be written and may hold programs.");
         }
         loaded = true;
     }
 
-    private static boolean loadFromProperty(Path path, List<String> tried) {
-        Path file = Files.isDirectory(path) ? path.resolve(LIBRARY) : path;
-        return loadFile(file, "property " + PROPERTY + ", ", tried);
+    private boolean loadFromProperty(Path path, List<String> tried) {
+        Path named = Files.isDirectory(path) ? path.resolve(file)
+                : this == ENGINE ? path : path.resolveSibling(file);
+        return loadFile(named, "property " + PROPERTY + ", ", tried);
     }
 
-    private static boolean loadFromLibraryPath(List<String> tried) {
+    private boolean loadFromLibraryPath(List<String> tried) {
         try {
-            System.loadLibrary("pn_quenby");
+            System.loadLibrary(name);
             return true;
         } catch (UnsatisfiedLinkError error) {
             tried.add("java.library.path " + System.getProperty("java.library.path") + ": "
@@ -73,21 +94,23 @@ public final class NativeLibraries {
         }
     }
 
-    private static boolean loadFromJar(List<String> tried) {
+    private boolean loadFromJar(List<String> tried) {
         String folder = "/native/linux-" + System.getProperty("os.arch") + "/";
         Map<String, byte[]> libraries = new LinkedHashMap<>();
         try {
-            for (String name : NAMES) {
-                try (InputStream in = NativeLibraries.class.getResourceAsStream(folder + name)) {
-                    if (in == null) {
-                        tried.add("this jar: no " + folder + name);
-                        return false;
+            for (String each : NAMES) {
+                try (InputStream in = NativeLibraries.class.getResourceAsStream(folder + each)) {
+                    if (in != null) {
+                        libraries.put(each, in.readAllBytes());
                     }
-                    libraries.put(name, in.readAllBytes());
                 }
             }
         } catch (IOException error) {
             tried.add("this jar: " + error);
+            return false;
+        }
+        if (!libraries.containsKey(file)) {
+            tried.add("this jar: no " + folder + file);
             return false;
         }
         for (Path parent : parents()) {
@@ -98,7 +121,7 @@ public final class NativeLibraries {
                 tried.add("this jar, copied into " + target + ": " + error);
                 continue;
             }
-            if (loadFile(target.resolve(LIBRARY), "this jar, copied into ", tried)) {
+            if (loadFile(target.resolve(file), "this jar, copied into ", tried)) {
                 return true;
             }
         }

@@ -78,9 +78,10 @@ class UnpackedLibrariesTest {
         libraries.put("libb.so", new byte[] {1, 2, 4});
         assertNotEquals(name, UnpackedLibraries.folderName(libraries));
         // The same bytes, cut elsewhere.
-        assertNotEquals(
-                UnpackedLibraries.folderName(new TreeMap<>(Map.of("a", new byte[1], "b", new byte[2]))),
-                UnpackedLibraries.folderName(new TreeMap<>(Map.of("a", new byte[2], "b", new byte[1]))));
+        Map<String, byte[]> one = Map.of("a", new byte[1], "b", new byte[2]);
+        Map<String, byte[]> other = Map.of("a", new byte[2], "b", new byte[1]);
+        assertNotEquals(UnpackedLibraries.folderName(new TreeMap<>(one)),
+                UnpackedLibraries.folderName(new TreeMap<>(other)));
     }
 
     @Test

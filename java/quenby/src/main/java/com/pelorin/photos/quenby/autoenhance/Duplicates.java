@@ -53,6 +53,36 @@ public final class Duplicates {
     }
 
     /**
+     * Scores two photos by what was kept of them, in the same manner.
+     *
+     * @param a               one photo's distribution
+     * @param b               the other's
+     * @param secondsApart    between their captures, whichever came first
+     * @param sameOrientation whether their orientations are equal
+     * @return the score
+     * @throws IllegalArgumentException when the time is not finite
+     */
+    public static float score(
+            GreenCdf a, GreenCdf b, double secondsApart, boolean sameOrientation) {
+        if (!Double.isFinite(secondsApart)) {
+            throw new IllegalArgumentException("the time between is " + secondsApart);
+        }
+        return PhotoBytes.score(a.distanceTo(b), secondsApart, sameOrientation);
+    }
+
+    /**
+     * Tells how far apart two photos may be taken and still score above a threshold.
+     *
+     * @param threshold       of the score
+     * @param sameOrientation whether their orientations are equal
+     * @return seconds; negative when no photos score that much
+     */
+    public static double window(float threshold, boolean sameOrientation) {
+        NativeLibrary.loadPhoto();
+        return PhotoBytes.window(threshold, sameOrientation);
+    }
+
+    /**
      * Tells whether two photos are more likely near-duplicates than not.
      *
      * @param a one photo

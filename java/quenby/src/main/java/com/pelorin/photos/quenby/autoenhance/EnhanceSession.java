@@ -174,15 +174,38 @@ public final class EnhanceSession implements AutoCloseable {
      * @param params its parameters, "key=value;" items, every one with its semicolon
      * @param output of ARGB_8888 and the photo's size; may be the photo
      * @throws UnsuitableBitmapException for another bitmap
-     * @throws IllegalArgumentException  when a required parameter is missing or unreadable
+     * @throws IllegalArgumentException  when a parameter is unknown, missing or unreadable; the
+     *                                   message says what the filter wants
      * @throws SessionClosedException    after {@link #close}
      * @throws OutOfMemoryError          when memory does not suffice; the output is then as it was
      */
     public void apply(Filter filter, String params, Bitmap output) {
+        apply(filter, params, output, null);
+    }
+
+    /**
+     * Writes the filtered photo into a bitmap unless another thread gives it up before. A call that
+     * has begun is not interrupted yet: it writes and returns.
+     *
+     * @param filter       which filter
+     * @param params       as above
+     * @param output       as above
+     * @param cancellation by which it is given up; null for not at all
+     * @throws UnsuitableBitmapException for another bitmap
+     * @throws IllegalArgumentException  when a parameter is unknown, missing or unreadable; the
+     *                                   message says what the filter wants
+     * @throws SessionClosedException    after {@link #close}
+     * @throws java.util.concurrent.CancellationException when it was given up; the output is then
+     *                                   as it was
+     * @throws OutOfMemoryError          when memory does not suffice; the output is then as it was
+     */
+    public void apply(Filter filter, String params, Bitmap output, Cancellation cancellation) {
         if (filter == null) {
             throw new UnknownFilterException(null);
         }
+        filter.keys().check(filter.key(), params);
         Bitmaps.requireRoomFor(width, height, output);
+        Cancellation.check(cancellation);
         long session = handle.beginCall();
         try {
             ENGINE.applyAutoEnhanceFilter(session, output, filter.key(), params);
@@ -202,7 +225,8 @@ public final class EnhanceSession implements AutoCloseable {
      * @param output as above
      * @throws UnknownFilterException    when no filter has that key
      * @throws UnsuitableBitmapException for another bitmap
-     * @throws IllegalArgumentException  when a required parameter is missing or unreadable
+     * @throws IllegalArgumentException  when a parameter is unknown, missing or unreadable; the
+     *                                   message says what the filter wants
      * @throws SessionClosedException    after {@link #close}
      * @throws OutOfMemoryError          when memory does not suffice; the output is then as it was
      */

@@ -3,32 +3,38 @@ package com.pelorin.photos.quenby.autoenhance;
 /** The filters there are. */
 public enum Filter {
     /** Automatic enhancement. Requires "slider=0.4;", of 0 to 1. */
-    AUTO("AE0", "Auto"),
+    AUTO("AE0", "Auto", FilterKeys.ENHANCEMENT),
     /** Automatic enhancement in less memory. Requires "slider=0.4;", of 0 to 1. */
-    AUTO_8BIT("AE08bit", "Auto"),
+    AUTO_8BIT("AE08bit", "Auto", FilterKeys.ENHANCEMENT),
     /** Black and white with a vignette. */
-    SNOW("ZebraBW", "Snow"),
+    SNOW("ZebraBW", "Snow", FilterKeys.LOOK),
     /** Light with hints of raspberry. */
-    SUMMER("SummerRGB", "Summer"),
+    SUMMER("SummerRGB", "Summer", FilterKeys.LOOK),
     /** Warm with a vignette. */
-    SPRING("SpringRGB", "Spring"),
+    SPRING("SpringRGB", "Spring", FilterKeys.LOOK),
     /** Bright and energetic. */
-    FALL("FallRGB", "Fall"),
+    FALL("FallRGB", "Fall", FilterKeys.LOOK),
     /** As from an old print. */
-    VINTAGE("VintageRGB", "Vintage"),
+    VINTAGE("VintageRGB", "Vintage", FilterKeys.LOOK),
     /** Cool with a vignette. */
-    WINTER("WinterRGB", "Winter"),
+    WINTER("WinterRGB", "Winter", FilterKeys.LOOK),
     /** Curves by four parameters "s1" to "s4" of 0 to 1; 0.5 each changes least. */
-    STARFISH("LowDimRGBCurve", "StarFish"),
+    STARFISH("LowDimRGBCurve", "StarFish", FilterKeys.CURVE),
     /** The photo as it is. */
-    ORIGINAL("PassThrough", "Original");
+    ORIGINAL("PassThrough", "Original", FilterKeys.NONE);
 
     private final String key;
     private final String displayName;
+    private final FilterKeys keys;
 
-    Filter(String key, String displayName) {
+    Filter(String key, String displayName, FilterKeys keys) {
         this.key = key;
         this.displayName = displayName;
+        this.keys = keys;
+    }
+
+    FilterKeys keys() {
+        return keys;
     }
 
     /**

@@ -1,18 +1,16 @@
 package com.pelorin.photos.quenby.autoenhance;
 
-import java.io.IOException;
-
-/** A file is no JPEG file, is damaged, or cannot be turned or written as one. */
-public class JpegException extends IOException {
+/** A file is no photo, is damaged, or cannot be written as a JPEG file; the kind says which. */
+public class JpegException extends PhotoException {
     private static final long serialVersionUID = 1;
 
     /**
      * Reports a file.
      *
-     * @param message what is wrong with it
-     * @param cause   what the native library raised, or null
+     * @param file  its name
+     * @param cause what is wrong with its bytes
      */
-    public JpegException(String message, Throwable cause) {
-        super(message, cause);
+    public JpegException(String file, PhotoException cause) {
+        super(cause.kind(), file + ": " + cause.getMessage(), cause);
     }
 }

@@ -7,12 +7,15 @@ import java.nio.file.Files;
 import java.nio.file.NoSuchFileException;
 import java.nio.file.Path;
 import java.nio.file.StandardCopyOption;
+import java.util.Arrays;
+import java.util.Collections;
 import java.util.List;
 import java.util.UUID;
 
 /**
- * Filters a JPEG file into another: rotates without loss, decodes, filters, encodes at quality 90.
- * The output appears whole or not at all, whatever fails; it may be the input. Immutable: each
+ * Filters a photo's file into a JPEG file, as the {@code quenby} command does: upright, turned,
+ * filtered, encoded at quality 90, with the metadata kept as far as it still holds. The output
+ * appears whole or not at all, whatever fails; it may be the input. Immutable: each
  * setting gives a new job, and any thread may run it.
  *
  * <pre>{@code
@@ -27,9 +30,10 @@ public final class JpegJob {
     private final List<RectF> faces;
     private final Filter filter;
     private final String params;
+    private final Cancellation cancellation;
 
     private JpegJob(Path input, Path output, int rotation, int scale, List<RectF> faces,
-            Filter filter, String params) {
+            Filter filter, String params, Cancellation cancellation) {
         this.input = input;
         this.output = output;
         this.rotation = rotation;
@@ -37,6 +41,7 @@ public final class JpegJob {
         this.faces = faces;
         this.filter = filter;
         this.params = params;
+        this.cancellation = cancellation;
     }
 
     /**
@@ -47,11 +52,12 @@ public final class JpegJob {
      * @return the job
      */
     public static JpegJob of(Path input, Path output) {
-        return new JpegJob(input, output, 0, 1, List.of(), Filter.AUTO, "slider=0.4;");
+        return new JpegJob(input, output, 0, 1, Collections.emptyList(), Filter.AUTO,
+                "slider=0.4;", null);
     }
 
     /**
-     * Turns the photo first, without loss but for blocks at the edge that cannot be moved.
+     * Turns the photo first, beyond upright.
      *
      * @param degrees clockwise, a multiple of 90
      * @return a job that does
@@ -61,7 +67,8 @@ public final class JpegJob {
         if (degrees % 90 != 0) {
             throw new IllegalArgumentException("no multiple of 90 degrees: " + degrees);
         }
-        return new JpegJob(input, output, degrees % 360, scale, faces, filter, params);
+        return new JpegJob(
+                input, output, degrees % 360, scale, faces, filter, params, cancellation);
     }
 
     /**
@@ -72,22 +79,22 @@ public final class JpegJob {
      * @throws IllegalArgumentException for another divisor
      */
     public JpegJob scale(int divisor) {
-        if (!List.of(1, 2, 4, 8).contains(divisor)) {
+        if (!Arrays.asList(1, 2, 4, 8).contains(divisor)) {
             throw new IllegalArgumentException("neither 1, 2, 4 nor 8: " + divisor);
         }
-        return new JpegJob(input, output, rotation, divisor, faces, filter, params);
+        return new JpegJob(input, output, rotation, divisor, faces, filter, params, cancellation);
     }
 
     /**
      * Takes care of faces.
      *
-     * @param faces in fractions of the turned photo
+     * @param faces in fractions of the upright and turned photo
      * @return a job that does
      * @throws IllegalArgumentException when a face is null or not finite
      */
     public JpegJob faces(List<RectF> faces) {
-        Faces.check(faces);
-        return new JpegJob(input, output, rotation, scale, List.copyOf(faces), filter, params);
+        List<RectF> own = Arrays.asList(Faces.check(faces));
+        return new JpegJob(input, output, rotation, scale, own, filter, params, cancellation);
     }
 
     /**
@@ -101,53 +108,57 @@ public final class JpegJob {
         if (filter == null) {
             throw new UnknownFilterException(null);
         }
-        return new JpegJob(input, output, rotation, scale, faces, filter, params);
+        return new JpegJob(input, output, rotation, scale, faces, filter, params, cancellation);
+    }
+
+    /**
+     * Lets another thread give the job up.
+     *
+     * @param cancellation by which it does; null for nobody
+     * @return a job that can be given up
+     */
+    public JpegJob cancellation(Cancellation cancellation) {
+        return new JpegJob(input, output, rotation, scale, faces, filter, params, cancellation);
     }
 
     /**
      * Does it.
      *
      * @throws NoSuchFileException      when there is no input file
-     * @throws JpegException            when the input is no JPEG file or damaged
+     * @throws JpegException            when the input is empty, no photo, truncated or damaged; the
+     *                                  kind says which, the message why
      * @throws IOException              when a file cannot be read or written
-     * @throws IllegalArgumentException when a required parameter is missing or unreadable
+     * @throws IllegalArgumentException when a parameter is unknown, missing or unreadable; the
+     *                                  message says what the filter wants
+     * @throws java.util.concurrent.CancellationException when it was given up
      * @throws OutOfMemoryError         when memory does not suffice
      */
     public void run() throws IOException {
-        if (!Files.exists(input)) {
-            throw new NoSuchFileException(input.toString());
+        if (Files.isDirectory(input)) {
+            throw new AccessDeniedException(input.toString(), null, "a folder");
         }
-        if (!Files.isReadable(input) || Files.isDirectory(input)) {
-            throw new AccessDeniedException(input.toString(), null, "not a readable file");
+        byte[] made;
+        try {
+            made = PhotoBytes.of(Files.readAllBytes(input)).rotation(rotation).scale(scale)
+                    .faces(faces).cancellation(cancellation).filter(filter, params);
+        } catch (PhotoException error) {
+            throw new JpegException(input.toString(), error);
         }
-        if (rotation == 0) {
-            callNative(output);
+        if (Files.exists(output) && !Files.isRegularFile(output)) { // a pipe, a device
+            Files.write(output, made);
             return;
         }
-        // The native leaves a rotated copy at its output when it fails later.
-        Path beside = output.resolveSibling("." + output.getFileName() + "." + UUID.randomUUID());
+        replace(Files.isSymbolicLink(output) ? output.toRealPath() : output, made);
+    }
+
+    private static void replace(Path file, byte[] content) throws IOException {
+        Path beside = file.resolveSibling("." + file.getFileName() + "." + UUID.randomUUID());
         try {
-            callNative(beside);
-            Files.move(beside, output, StandardCopyOption.ATOMIC_MOVE,
+            Files.write(beside, content);
+            Files.move(beside, file, StandardCopyOption.ATOMIC_MOVE,
                     StandardCopyOption.REPLACE_EXISTING);
         } finally {
             Files.deleteIfExists(beside);
-        }
-    }
-
-    private void callNative(Path target) throws IOException {
-        NativeLibrary.load();
-        boolean written;
-        try {
-            written = new QuenbyEngine().applyAutoEnhanceFilterToJpegFile(input.toString(),
-                    target.toString(), rotation, Faces.check(faces), scale, filter.key(), params);
-        } catch (IllegalArgumentException error) {
-            throw error;
-        } catch (RuntimeException error) {
-            throw new JpegException(input + ": " + error.getMessage(), error);
-        }
-        if (!written) {
-            throw new JpegException(input + " cannot be read as a JPEG file", null);
         }
     }
 }

@@ -47,7 +47,8 @@ public class QuenbyEngine {
     /**
      * Writes the filtered photo into a bitmap. Nothing is written for a handle that is no session,
      * before {@link #preprocess}, or into a bitmap that is smaller than the photo or not of
-     * {@code ARGB_8888}.
+     * {@code ARGB_8888}. The session keeps one picture of the photo's size that a call filtered
+     * into for the next call, until it is released; calls at once have one each meanwhile.
      *
      * @param handle     from {@link #init}
      * @param outBitmap  receives the photo in its upper left corner
@@ -61,7 +62,9 @@ public class QuenbyEngine {
 
     /**
      * Filters a JPEG file into another, which may be the same. A rotation leaves the rotated copy
-     * at {@code outputPath} when something fails after it.
+     * at {@code outputPath} when something fails after it. The output has no metadata: the EXIF
+     * orientation, by which the picture is not turned, times, colour profile and all else are
+     * dropped. {@link JpegJob} and {@link PhotoBytes} turn the picture and keep them.
      *
      * @param inputPath   the file to read
      * @param outputPath  the file to write, in one step
@@ -74,6 +77,8 @@ public class QuenbyEngine {
      * @throws IOException              when a file cannot be written, or the input of a rotation
      *                                  cannot be read
      * @throws IllegalArgumentException for a null path and for parameters as above
+     * @throws RuntimeException         when the input of a rotation is damaged, or the rotation is
+     *                                  no multiple of 90 degrees
      * @throws OutOfMemoryError         when memory does not suffice
      */
     public native boolean applyAutoEnhanceFilterToJpegFile(String inputPath, String outputPath,

@@ -11,8 +11,10 @@ import org.junit.jupiter.api.Test;
 
 /** The other tests, in a virtual machine that checks every call of the natives. */
 class CheckedJniTest {
-    private static final Pattern COMPLAINT =
-            Pattern.compile("WARNING in native method|FATAL ERROR in native|WARNING: JNI");
+    /** Complaints of Java's own writer of JPEG files are none of ours. */
+    private static final Pattern COMPLAINT = Pattern.compile(
+            "(?:WARNING in native method|FATAL ERROR in native|WARNING: JNI)"
+            + "(?![^\n]*\n\tat com\\.sun\\.imageio\\.)");
 
     @Test
     void complaintsAreRecognised() {
@@ -29,11 +31,11 @@ class CheckedJniTest {
         ChildJvm child = ChildJvm.run(List.of("-Xcheck:jni"), RunTests.class,
                 QuenbyEngineTest.class.getName(), EnhanceSessionTest.class.getName(),
                 JpegFileTest.class.getName(), DuplicatesTest.class.getName(),
-                HostileArgumentsTest.class.getName());
+                PhotoBytesTest.class.getName(), HostileArgumentsTest.class.getName());
         assertEquals(0, child.exitCode, child.output);
         assertFalse(COMPLAINT.matcher(child.output).find(), child.output);
         Matcher succeeded = Pattern.compile("(\\d+) tests succeeded").matcher(child.output);
-        assertTrue(succeeded.find() && Integer.parseInt(succeeded.group(1)) >= 39, child.output);
+        assertTrue(succeeded.find() && Integer.parseInt(succeeded.group(1)) >= 55, child.output);
         System.out.println(succeeded.group() + " under -Xcheck:jni without a complaint");
     }
 }

@@ -10,6 +10,7 @@ import android.graphics.RectF;
 import java.util.Arrays;
 import java.util.List;
 import java.util.concurrent.Callable;
+import java.util.concurrent.CancellationException;
 import java.util.concurrent.CountDownLatch;
 import java.util.concurrent.CyclicBarrier;
 import java.util.concurrent.ExecutorService;
@@ -191,11 +192,27 @@ class EnhanceSessionTest {
     }
 
     @Test
-    void knowsItsFilters() {
-        for (Filter filter : Filter.values()) {
-            assertEquals(filter, Filter.of(filter.key()));
+    void namesTheParameterThatIsWrong() {
+        try (EnhanceSession session = EnhanceSession.open(photo)) {
+            for (String params : new String[] {null, "", "slide=0.4;", "slider=much;"}) {
+                String message = assertThrows(IllegalArgumentException.class,
+                        () -> session.apply(Filter.AUTO, params, output)).getMessage();
+                assertTrue(message.contains("AE0") && message.contains("slider"), message);
+            }
         }
-        assertEquals("Auto", Filter.AUTO_8BIT.displayName());
-        assertThrows(UnknownFilterException.class, () -> Filter.of("AUTO"));
+    }
+
+    @Test
+    void givesUpWhatWasCancelled() {
+        Cancellation cancellation = new Cancellation();
+        byte[] before = Pictures.bytes(output);
+        try (EnhanceSession session = EnhanceSession.open(photo)) {
+            cancellation.cancel();
+            assertThrows(CancellationException.class,
+                    () -> session.apply(Filter.AUTO, "slider=0.4;", output, cancellation));
+            assertArrayEquals(before, Pictures.bytes(output));
+            session.apply(Filter.AUTO, "slider=0.4;", output, new Cancellation());
+            assertTrue(!Arrays.equals(before, Pictures.bytes(output)));
+        }
     }
 }

@@ -18,6 +18,7 @@ import java.util.concurrent.TimeUnit;
 import java.util.concurrent.atomic.AtomicReference;
 import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.io.TempDir;
+import org.opentest4j.AssertionFailedError;
 
 /** The first uses of a fresh virtual machine, several at once. */
 class FirstUseTest {
@@ -66,6 +67,20 @@ class FirstUseTest {
                     // It was read.
                 } catch (IOException error) {
                     fail(error);
+                }
+            }
+        },
+        BYTES {
+            @Override
+            void use() {
+                try {
+                    assertEquals(PhotoException.Kind.EMPTY, assertThrows(PhotoException.class,
+                            () -> PhotoBytes.of(new byte[0]).facts()).kind());
+                } catch (AssertionFailedError notLoaded) {
+                    if (notLoaded.getCause() instanceof Error) {
+                        throw (Error) notLoaded.getCause();
+                    }
+                    throw notLoaded;
                 }
             }
         },
@@ -147,7 +162,7 @@ class FirstUseTest {
             }
         }
         checkAll(running);
-        assertEquals(28, pairs);
+        assertEquals(36, pairs);
     }
 
     private static void checkAll(List<ChildJvm.Running> running) throws Exception {

@@ -15,6 +15,7 @@ import java.nio.file.Path;
 import java.nio.file.attribute.FileTime;
 import java.util.Arrays;
 import java.util.List;
+import java.util.concurrent.CancellationException;
 import java.util.stream.Collectors;
 import java.util.stream.Stream;
 import javax.imageio.ImageIO;
@@ -160,13 +161,55 @@ class JpegFileTest {
     }
 
     @Test
-    void aJobGivesTheNativesFile() throws IOException {
-        for (int rotation : new int[] {0, 180}) {
-            assertTrue(call(input, output, rotation, "slider=0.7;"));
-            Path own = folder.resolve("own.jpg");
-            JpegJob.of(input, own).rotation(rotation).filter(Filter.AUTO, "slider=0.7;").run();
-            assertArrayEquals(Files.readAllBytes(output), Files.readAllBytes(own));
+    void aJobSaysWhatIsWrongWithItsInput() throws IOException {
+        byte[] whole = Files.readAllBytes(input);
+        Files.write(output, new byte[] {1, 2, 3});
+        Object[][] inputs = {{PhotoException.Kind.EMPTY, new byte[0]},
+            {PhotoException.Kind.NOT_A_PHOTO, "text".getBytes()},
+            {PhotoException.Kind.TRUNCATED, Arrays.copyOf(whole, whole.length / 2)}};
+        for (Object[] each : inputs) {
+            Files.write(input, (byte[]) each[1]);
+            JpegException error =
+                    assertThrows(JpegException.class, () -> JpegJob.of(input, output).run());
+            assertEquals(each[0], error.kind());
+            assertTrue(error.getMessage().startsWith(input + ": "), error.getMessage());
+            assertEquals(error.getMessage(), input + ": " + error.getCause().getMessage());
         }
+        assertArrayEquals(new byte[] {1, 2, 3}, Files.readAllBytes(output));
+        assertEquals(List.of("in.jpg", "out.jpg"), names());
+    }
+
+    @Test
+    void aJobTurnsAPhotoUprightAndKeepsItsTime() throws IOException {
+        Files.write(input, PhotoBytesTest.withExif(Files.readAllBytes(input), 6));
+        JpegJob.of(input, output).run();
+        BufferedImage image = ImageIO.read(output.toFile());
+        assertEquals(48, image.getWidth());
+        assertEquals(64, image.getHeight());
+        assertTrue(PhotoBytes.of(Files.readAllBytes(output)).facts().utcSeconds().isPresent());
+        JpegJob.of(input, input).run();
+        assertArrayEquals(Files.readAllBytes(output), Files.readAllBytes(input));
+    }
+
+    @Test
+    void aJobFollowsALinkAndWritesIntoADevice() throws IOException {
+        Path link = Files.createSymbolicLink(folder.resolve("link.jpg"), output);
+        Files.write(output, new byte[] {1, 2, 3});
+        JpegJob.of(input, link).run();
+        assertTrue(Files.isSymbolicLink(link));
+        assertEquals(64, ImageIO.read(output.toFile()).getWidth());
+        Path device = Path.of("/dev/null");
+        JpegJob.of(input, device).rotation(90).run();
+        assertFalse(Files.isRegularFile(device));
+    }
+
+    @Test
+    void aJobThatIsGivenUpWritesNothing() throws IOException {
+        Cancellation cancellation = new Cancellation();
+        cancellation.cancel();
+        assertThrows(CancellationException.class,
+                () -> JpegJob.of(input, output).cancellation(cancellation).run());
+        assertEquals(List.of("in.jpg"), names());
     }
 
     @Test
