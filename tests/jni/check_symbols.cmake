@@ -63,7 +63,9 @@ set(fromDevice
     pelorin::imgproc::NativeImageProcessor::encodeJpeg
     pelorin::imgproc::NativeImageProcessor::rotateJpeg pelorin::imgproc::Stream::Stream
     pelorin::imgproc::Stream::~Stream)
-set(linkerTools _ITM_deregisterTMCloneTable _ITM_registerTMCloneTable __gmon_start__)
+# The last is a weak wish of the C++ library where that is linked in.
+set(linkerTools _ITM_deregisterTMCloneTable _ITM_registerTMCloneTable __gmon_start__
+                __cxa_pure_virtual)
 run(undefined ${NM} -D -C --undefined-only ${LIBRARY})
 foreach(line IN LISTS undefined)
   if(line MATCHES "@")
