@@ -39,12 +39,17 @@ void checkRequest(const FilterRequest& request, const FilterFactory& factory) {
   }
 }
 
-ImageMetadata metadataWithFaces(const std::vector<FaceFractions>& faces,
-                                const Image<RGBA8Pixel>& picture) {
+/// Those of the request, then those that the file knows of.
+ImageMetadata metadataWithFaces(std::vector<FaceFractions> faces, const photo::Photo& photo) {
+  for (const photo::KnownFace& face : photo.faces) {
+    if (face.right <= 0 || face.bottom <= 0 || face.left >= 1 || face.top >= 1) continue;
+    faces.push_back({static_cast<float>(face.left), static_cast<float>(face.top),
+                     static_cast<float>(face.right), static_cast<float>(face.bottom)});
+  }
   ImageMetadata metadata;
   for (const FaceFractions& face : faces) {
-    const BoundingBox box =
-        boxInPixels(face, static_cast<float>(picture.width), static_cast<float>(picture.height));
+    const BoundingBox box = boxInPixels(face, static_cast<float>(photo.image->width),
+                                        static_cast<float>(photo.image->height));
     metadata.faces.push_back(std::make_shared<BoundingBox>(box));
   }
   return metadata;
@@ -61,7 +66,7 @@ std::vector<std::uint8_t> filterPhoto(std::span<const std::uint8_t> file,
   if (request.stop.stop_requested()) throw photo::Stopped();
   {
     // The session ends before the encoder begins: its masks are several times the picture.
-    FilteredImage session(photo.image, metadataWithFaces(request.faces, *photo.image), "",
+    FilteredImage session(photo.image, metadataWithFaces(request.faces, photo), "",
                           defaultFilterConfigValue, factory);
     session.applyFilterWithParams(request.filter, request.params, defaultFilterConfigValue,
                                   /*output=*/*photo.image);

@@ -17,7 +17,7 @@ struct FilterRequest {
   int quality = 90;
   int rotation = 0;  ///< Degrees clockwise beyond upright.
   int scale = 1;
-  std::vector<image_processing::FaceFractions> faces = {};
+  std::vector<image_processing::FaceFractions> faces = {};  ///< Beside those the file knows of.
   std::stop_token stop = {};
 };
 

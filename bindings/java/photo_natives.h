@@ -14,7 +14,7 @@ namespace pelorin::quenby {
 
 /// The file that `quenby enhance` makes of it, see FilterRequest.
 /// @param faces  left, top, right, bottom of each as fractions of the upright, turned picture; null
-///               is none.
+///               is none. Those that the file knows of come with them.
 jbyteArray filterBytes(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset,
                        jint length, jint quality, jint rotation, jfloatArray faces, jint scale,
                        jstring filter, jstring params, jlong cancel);

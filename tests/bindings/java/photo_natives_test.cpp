@@ -18,6 +18,7 @@
 #include "tests/cli/jpeg_files.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/jni/support/natives_fixture.h"
+#include "tests/photo/metadata/xmp_texts.h"
 #include "tests/support/allocation_faults.h"
 #include "tests/support/pictures.h"
 
@@ -184,6 +185,24 @@ TEST_F(PhotoNatives, GiveTheFileThatTheCommandWrites) {
                            filter, params, 0),
               expected);
   }
+}
+
+TEST_F(PhotoNatives, TakeCareOfFacesThatTheFileKnowsOf) {
+  const std::string packet = xmpPacket(
+      "<rdf:Description><mwg-rs:Regions rdf:parseType='Resource'><mwg-rs:AppliedToDimensions "
+      "stDim:w='130' stDim:h='100' stDim:unit='pixel'/><mwg-rs:RegionList><rdf:Bag>"
+      "<rdf:li mwg-rs:Type='Face'><mwg-rs:Area stArea:x='0.4' stArea:y='0.5' stArea:w='0.5' "
+      "stArea:h='0.6' stArea:unit='normalized'/></rdf:li></rdf:Bag></mwg-rs:RegionList>"
+      "</mwg-rs:Regions></rdf:Description>");
+  Bytes payload;
+  for (const char byte : std::string("http://ns.adobe.com/xap/1.0/") + '\0' + packet)
+    payload.push_back(static_cast<std::uint8_t>(byte));
+  FakeBytes known(jpegOf(photoLikePicture(130, 100, 3), {{0xE1, payload}}));
+  const Finished with = quenby({"enhance", "-", "-o", "-"}, known.bytes);
+  const Finished without = quenby({"enhance", "-", "-o", "-", "--faces", "none"}, known.bytes);
+  ASSERT_EQ(with.exitCode, 0) << with.errors;
+  EXPECT_NE(with.output, without.output);
+  EXPECT_EQ(filtered(known), Bytes(with.output.begin(), with.output.end()));
 }
 
 TEST_F(PhotoNatives, KeepTheMetadataAndShowThePhotoUpright) {
