@@ -110,6 +110,8 @@ std::vector<std::uint8_t> save(const Image<RGBA8Pixel>& picture, std::string_vie
     lost = std::move(kept.lost);
   } else if (format == "PNG") {
     file = encodePng(picture);
+    if (!metadata.segments.empty() || !metadata.tail.empty())
+      lost.push_back({"metadata", "PNG files carry none yet"});
   } else if (format == "raw pixels") {
     file.assign(pixels, pixels + picture.byteSize());
   } else {

@@ -191,6 +191,13 @@ TEST(KeptMetadata, OfEveryKindAgreesAboutSizeAndOrientation) {
       lost);
 }
 
+TEST(KeptMetadata, IsNamedAsLostWhereTheFormatHasNoPlaceForIt) {
+  const Photo photo = open(phonePhoto(6, gainMap()));
+  std::vector<Loss> lost;
+  save(*photo.image, "PNG", photo.metadata, {}, &lost);
+  EXPECT_EQ(lost, (std::vector<Loss>{{"metadata", "PNG files carry none yet"}}));
+}
+
 TEST(KeptMetadata, CanBeTheColourProfileAlone) {
   const MetadataSegment profile = {0xE2, bytesOf("ICC_PROFILE\0\1\1profile"s)};
   const Bytes file = joined({jpegWith(photoLikePicture(32, 32, 1),
