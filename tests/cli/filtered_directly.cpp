@@ -9,11 +9,6 @@ namespace pelorin::test_support {
 
 using namespace image_processing;
 
-Bytes rawBytes(const Image<RGBA8Pixel>& image) {
-  const auto* first = reinterpret_cast<const std::uint8_t*>(image.data.get());
-  return Bytes(first, first + image.byteSize());
-}
-
 Bytes filteredDirectly(const Image<RGBA8Pixel>& source, const std::string& filter,
                        const std::string& params, const ImageMetadata& faces) {
   auto image = std::make_shared<Image<RGBA8Pixel>>(source);

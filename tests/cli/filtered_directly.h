@@ -5,12 +5,9 @@
 #include "image_processing/core/image.h"
 #include "image_processing/core/image_metadata.h"
 #include "image_processing/core/pixel_types.h"
-#include "tests/cli/temporary_folder.h"
+#include "tests/support/bytes.h"
 
 namespace pelorin::test_support {
-
-/// The packed RGBA bytes of a picture.
-Bytes rawBytes(const image_processing::Image<image_processing::RGBA8Pixel>& image);
 
 /// The packed RGBA bytes that the engine itself makes of a picture, in a session of its own.
 Bytes filteredDirectly(const image_processing::Image<image_processing::RGBA8Pixel>& source,

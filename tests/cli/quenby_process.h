@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include "tests/cli/temporary_folder.h"
+#include "tests/support/temporary_folder.h"
 
 namespace pelorin::test_support {
 

@@ -36,7 +36,7 @@ class JpegFileNative : public NativesTest {
   }
 
   TemporaryFolder folder;
-  FakeString input{folder.file("in.jpg")}, output{folder.file("out.jpg")};
+  FakeString input{folder / "in.jpg"}, output{folder / "out.jpg"};
   FakeString ae{"AE0"}, passThrough{"PassThrough"}, slider{"slider=0.4;"}, empty{""};
   FakeFaces noFaces{};
   const Image<RGBA8Pixel> picture = photoLikePicture(48, 32, 2);
@@ -47,7 +47,7 @@ TEST_F(JpegFileNative, WritesTheFilteredPictureAtQualityNinety) {
   EXPECT_EQ(contentOf(output.text), expected(contentOf(input.text), 1, "AE0", "slider=0.4;"));
   EXPECT_THAT(takeLogLines(), ElementsAre("3 QuenbyLib: applyToJpegFile: " + input.text +
                                           " [48x32:0] AE0 slider=0.4;"));
-  EXPECT_THAT(folder.names(), ElementsAre("in.jpg", "out.jpg"));
+  EXPECT_THAT(folder.content(), ElementsAre("in.jpg", "out.jpg"));
 }
 
 TEST_F(JpegFileNative, NeverOpensTheInputForWritingWithoutRotation) {
@@ -90,14 +90,14 @@ TEST_F(JpegFileNative, ScalesFacesByTheDecodedSize) {
 }
 
 TEST_F(JpegFileNative, IsFalseWithALineForAMissingInput) {
-  FakeString missing(folder.file("missing.jpg"));
+  FakeString missing(folder / "missing.jpg");
   const std::string line = "6 QuenbyLib: image decoding/scaling failed for " + missing.text;
   EXPECT_FALSE(natives.applyToFile(missing, output, 0, noFaces, 1, ae, slider));
   EXPECT_THAT(takeLogLines(), testing::Contains(line));
   EXPECT_FALSE(natives.applyToFile(missing, output, 90, noFaces, 1, ae, slider));
   EXPECT_THAT(env.takeException(), StartsWith("java/io/IOException"));
   EXPECT_THAT(takeLogLines(), testing::Contains(line));
-  EXPECT_THAT(folder.names(), ElementsAre("in.jpg"));
+  EXPECT_THAT(folder.content(), ElementsAre("in.jpg"));
 }
 
 TEST_F(JpegFileNative, IsFalseForADamagedFileAndKeepsTheOldOutput) {
@@ -119,16 +119,16 @@ TEST_F(JpegFileNative, IsFalseForADamagedFileAndKeepsTheOldOutput) {
 TEST_F(JpegFileNative, RaisesForAnAngleThatIsNoQuarterTurn) {
   EXPECT_FALSE(natives.applyToFile(input, output, 45, noFaces, 1, ae, slider));
   EXPECT_THAT(env.takeException(), StartsWith("java/lang/RuntimeException: "));
-  EXPECT_THAT(folder.names(), ElementsAre("in.jpg"));
+  EXPECT_THAT(folder.content(), ElementsAre("in.jpg"));
 }
 
 TEST_F(JpegFileNative, RaisesAnIOExceptionForAnOutputThatCannotBeWritten) {
-  FakeString nowhere(folder.file("no such folder/out.jpg"));
+  FakeString nowhere(folder / "no such folder/out.jpg");
   for (const int rotation : {0, 90}) {
     EXPECT_FALSE(natives.applyToFile(input, nowhere, rotation, noFaces, 1, ae, slider));
     EXPECT_THAT(env.takeException(), StartsWith("java/io/IOException: "));
   }
-  EXPECT_THAT(folder.names(), ElementsAre("in.jpg"));
+  EXPECT_THAT(folder.content(), ElementsAre("in.jpg"));
 }
 
 TEST_F(JpegFileNative, LeavesTheRotatedCopyWhenAFilterFails) {
@@ -147,10 +147,10 @@ TEST_F(JpegFileNative, RaisesIllegalArgumentForANullPath) {
 
 TEST_F(JpegFileNative, TurnsInMemoryWhereTheOutputGivesNothingBack) {
   ASSERT_EQ(mkfifo(output.text.c_str(), 0600), 0);
-  std::filesystem::create_symlink("out.jpg", folder.file("link.jpg"));
+  std::filesystem::create_symlink("out.jpg", folder / "link.jpg");
   const std::vector<std::uint8_t> turned = photo::rotateJpeg(contentOf(input.text), 90);
   alarm(60);  // a hang ends the test
-  for (const std::string& name : {output.text, folder.file("link.jpg")}) {
+  for (const std::string& name : {output.text, folder / "link.jpg"}) {
     FakeString path(name);
     auto reader = std::async(std::launch::async, [&] { return contentOf(path.text); });
     EXPECT_TRUE(natives.applyToFile(input, path, 90, noFaces, 1, ae, slider));
@@ -166,11 +166,11 @@ TEST_F(JpegFileNative, TurnsInMemoryWhereTheOutputGivesNothingBack) {
   EXPECT_FALSE(natives.applyToFile(input, nowhere, 45, noFaces, 1, ae, slider));
   EXPECT_THAT(env.takeException(), StartsWith("java/lang/RuntimeException: "));
   alarm(0);
-  EXPECT_THAT(folder.names(), ElementsAre("in.jpg", "link.jpg", "out.jpg"));
+  EXPECT_THAT(folder.content(), ElementsAre("in.jpg", "link.jpg", "out.jpg"));
 }
 
 TEST_F(JpegFileNative, SaysThatAFolderIsNoOutput) {
-  FakeString itself(folder.file(""));
+  FakeString itself(folder / "");
   for (const int rotation : {0, 90}) {
     EXPECT_FALSE(natives.applyToFile(input, itself, rotation, noFaces, 1, ae, slider));
     EXPECT_THAT(env.takeException(), StartsWith("java/io/IOException: " + itself.text));
@@ -178,7 +178,7 @@ TEST_F(JpegFileNative, SaysThatAFolderIsNoOutput) {
 }
 
 TEST_F(JpegFileNative, BlamesTheInputOnlyForWhatIsWrongWithIt) {
-  FakeString nowhere(folder.file("no such folder/out.jpg"));
+  FakeString nowhere(folder / "no such folder/out.jpg");
   EXPECT_FALSE(natives.applyToFile(input, nowhere, 90, noFaces, 1, ae, slider));
   EXPECT_THAT(env.takeException(), StartsWith("java/io/IOException: "));
   EXPECT_THAT(takeLogLines(), IsEmpty());
@@ -194,8 +194,8 @@ TEST_F(JpegFileNative, CopiesThePictureForAnUnknownOrNullFilter) {
 
 TEST_F(JpegFileNative, OpensFilesWhoseNamesAreBeyondTheBasicPlane) {
   const std::string camera = "\xF0\x9F\x93\xB7";
-  writePicture(folder.file(camera), picture);
-  FakeString javaName(folder.file("\xED\xA0\xBD\xED\xB3\xB7"));  // as the virtual machine spells it
+  writePicture(folder / camera, picture);
+  FakeString javaName(folder / "\xED\xA0\xBD\xED\xB3\xB7");  // as the virtual machine spells it
   EXPECT_TRUE(natives.applyToFile(javaName, output, 0, noFaces, 1, passThrough, empty));
 }
 

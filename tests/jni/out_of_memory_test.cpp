@@ -77,7 +77,7 @@ class OutOfMemory : public NativesTest {
     };
     EXPECT_TRUE(call());
     const std::vector<std::uint8_t> expected = contentOf(output.text);
-    const std::vector<std::string> names = run.folder.names();
+    const auto names = run.folder.content();
     bool decodingCanFail = false;
     failEachAllocation<bool>(
         call,
@@ -91,7 +91,7 @@ class OutOfMemory : public NativesTest {
     EXPECT_TRUE(decodingCanFail);
     EXPECT_TRUE(call());
     EXPECT_EQ(contentOf(output.text), expected);
-    EXPECT_EQ(run.folder.names(), names);
+    EXPECT_EQ(run.folder.content(), names);
   }
 
   WholeRun run{natives};
@@ -188,7 +188,7 @@ TEST_F(OutOfMemory, InApplyAutoEnhanceFilterToJpegFileTurnedInMemory) {
 }
 
 TEST_F(OutOfMemory, InApplyAutoEnhanceFilterToJpegFileTurnedByItsPixels) {
-  FakeString strip(run.folder.file("strip.jpg"));
+  FakeString strip(run.folder / "strip.jpg");
   writePicture(strip.text, photoLikePicture(40, 5, 3));
   if (contentOf(strip.text)[0] == 'R') GTEST_SKIP() << "the tests' own codec knows no blocks";
   failEachAllocationOfTheFileCall(strip, run.file, 90);

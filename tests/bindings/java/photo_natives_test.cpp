@@ -15,11 +15,12 @@
 #include "photo/collection/photo_record.h"
 #include "photo/photo.h"
 #include "platform/pnjni/environment.h"
-#include "tests/cli/jpeg_files.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/jni/support/natives_fixture.h"
 #include "tests/photo/metadata/xmp_texts.h"
 #include "tests/support/allocation_faults.h"
+#include "tests/support/exif_payload.h"
+#include "tests/support/jpeg_files.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::test_support {
@@ -262,7 +263,7 @@ TEST_F(PhotoNatives, TellEachKindOfBadFileApart) {
       {{}, "0 "},
       {{'t', 'e', 'x', 't'}, "1 "},
       {cut, "4 "},
-      {withHeaderSize(file.bytes, 65500, 65500), "5 "}};
+      {withSize(file.bytes, 65500, 65500), "5 "}};
   for (const auto& [content, kind] : files) {
     FakeBytes bad(content);
     EXPECT_TRUE(filtered(bad).empty());

@@ -8,9 +8,9 @@
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
 #include "image_processing/autoenhance/lightness/image_statistics.h"
 #include "photo/png/png_file.h"
-#include "tests/cli/jpeg_files.h"
 #include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
+#include "tests/support/jpeg_files.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::test_support {

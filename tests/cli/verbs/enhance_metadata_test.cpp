@@ -2,8 +2,9 @@
 
 #include <filesystem>
 
-#include "tests/cli/jpeg_files.h"
 #include "tests/cli/quenby_process.h"
+#include "tests/support/exif_payload.h"
+#include "tests/support/jpeg_files.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::test_support {
@@ -54,7 +55,9 @@ TEST(KeptMetadata, IsTheSameByteForByteButForTheOrientation) {
 TEST(KeptMetadata, OfACmykFileHasNoColourProfile) {
   const TemporaryFolder folder;
   std::vector<MetadataSegment> segments = cameraSegments(1, true);
-  const std::string in = folder.write("a.jpg", cmykJpeg(40, 30, segments));
+  const Bytes cmyk = makeJpeg(
+      {.width = 40, .height = 30, .samples = JCS_CMYK, .stored = JCS_CMYK, .metadata = segments});
+  const std::string in = folder.write("a.jpg", cmyk);
   const Finished run = quenby({"enhance", in, "-o", folder / "b.jpg"});
   EXPECT_EQ(run.exitCode, 0) << run.errors;
   segments.erase(segments.begin() + 2);

@@ -2,9 +2,11 @@
 
 #include "cli/frame/number_text.h"
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
-#include "tests/cli/jpeg_files.h"
 #include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
+#include "tests/support/bytes.h"
+#include "tests/support/exif_payload.h"
+#include "tests/support/jpeg_files.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::test_support {
@@ -19,11 +21,6 @@ std::vector<double> nineDigitsOf(const std::vector<float>& values) {
   std::vector<double> numbers;
   for (const float value : values) numbers.push_back(cli::nineDigits(value));
   return numbers;
-}
-
-Bytes rawBytes(const Image<RGBA8Pixel>& image) {
-  const auto* first = reinterpret_cast<const std::uint8_t*>(image.data.get());
-  return Bytes(first, first + image.byteSize());
 }
 
 TEST(Info, GivesTheEnginesNumbersToNineDigits) {

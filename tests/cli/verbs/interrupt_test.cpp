@@ -5,8 +5,8 @@
 #include <chrono>
 #include <thread>
 
-#include "tests/cli/jpeg_files.h"
 #include "tests/cli/quenby_process.h"
+#include "tests/support/jpeg_files.h"
 
 namespace pelorin::test_support {
 namespace {

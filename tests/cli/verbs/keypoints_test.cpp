@@ -9,9 +9,11 @@
 #include "image_processing/features/fast.h"
 #include "photo/png/png_file.h"
 #include "photo/turned_image.h"
-#include "tests/cli/jpeg_files.h"
 #include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
+#include "tests/support/bytes.h"
+#include "tests/support/exif_payload.h"
+#include "tests/support/jpeg_files.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::test_support {
@@ -20,11 +22,6 @@ namespace {
 using image_processing::BriefDescriptor;
 using testing::HasSubstr;
 using testing::IsEmpty;
-
-Bytes rawBytes(const Image<RGBA8Pixel>& image) {
-  const auto* first = reinterpret_cast<const std::uint8_t*>(image.data.get());
-  return Bytes(first, first + image.byteSize());
-}
 
 Image<unsigned char> greenOf(const Image<RGBA8Pixel>& image) {
   Image<unsigned char> green(image.width, image.height);

@@ -7,8 +7,8 @@
 #include "cli/pictures/grey_picture.h"
 #include "image_processing/autoenhance/masks/image_masks.h"
 #include "photo/png/png_file.h"
-#include "tests/cli/jpeg_files.h"
 #include "tests/cli/quenby_process.h"
+#include "tests/support/jpeg_files.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::test_support {

@@ -1,8 +1,8 @@
 #include <gmock/gmock.h>
 
 #include "tests/cli/filtered_directly.h"
-#include "tests/cli/jpeg_files.h"
 #include "tests/cli/quenby_process.h"
+#include "tests/support/jpeg_files.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::test_support {

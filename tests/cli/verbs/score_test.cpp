@@ -6,9 +6,11 @@
 #include "image_processing/quality/niqe.h"
 #include "photo/png/png_file.h"
 #include "photo/turned_image.h"
-#include "tests/cli/jpeg_files.h"
 #include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
+#include "tests/support/bytes.h"
+#include "tests/support/exif_payload.h"
+#include "tests/support/jpeg_files.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::test_support {
@@ -21,11 +23,6 @@ using testing::IsEmpty;
 using testing::Not;
 using testing::StartsWith;
 using testing::UnorderedElementsAre;
-
-Bytes rawBytes(const Image<RGBA8Pixel>& image) {
-  const auto* first = reinterpret_cast<const std::uint8_t*>(image.data.get());
-  return Bytes(first, first + image.byteSize());
-}
 
 std::string nineDigitText(float value) {
   char text[32];

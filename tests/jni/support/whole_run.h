@@ -20,7 +20,7 @@ struct WholeRun {
   FakeFaces faces{{0.2f, 0.2f, 0.6f, 0.7f}, {0.1f, 0.5f, 0.3f, 0.9f}};
   FakeString filter{"AE0"}, params{"slider=0.4;gtmOnly=false;gtmExtraMemory=false;"};
   TemporaryFolder folder;
-  FakeString input{folder.file("in.jpg")}, file{folder.file("out.jpg")};
+  FakeString input{folder / "in.jpg"}, file{folder / "out.jpg"};
 
   /// A whole life of a session and the other two natives, and what they made: the score's bytes,
   /// the bitmap's pixels and the file.

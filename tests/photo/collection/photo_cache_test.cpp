@@ -9,8 +9,8 @@
 #include <limits>
 #include <thread>
 
-#include "tests/cli/temporary_folder.h"
 #include "tests/dupe/synthetic_cdfs.h"
+#include "tests/support/temporary_folder.h"
 
 namespace pelorin::photo {
 namespace {

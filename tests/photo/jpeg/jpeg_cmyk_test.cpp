@@ -1,7 +1,7 @@
 #include <gtest/gtest.h>
 #include <lcms2.h>
 
-#include "tests/photo/jpeg/jpeg_files.h"
+#include "tests/support/jpeg_files.h"
 
 namespace pelorin::photo {
 namespace {

@@ -3,7 +3,7 @@
 
 #include <climits>
 
-#include "tests/photo/jpeg/jpeg_files.h"
+#include "tests/support/jpeg_files.h"
 
 namespace pelorin::photo {
 namespace {

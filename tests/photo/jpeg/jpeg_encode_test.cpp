@@ -4,7 +4,7 @@
 #include <algorithm>
 #include <string_view>
 
-#include "tests/photo/jpeg/jpeg_files.h"
+#include "tests/support/jpeg_files.h"
 
 namespace pelorin::photo {
 namespace {

@@ -5,7 +5,7 @@
 #include <map>
 #include <utility>
 
-#include "tests/photo/jpeg/jpeg_files.h"
+#include "tests/support/jpeg_files.h"
 
 namespace pelorin::photo {
 namespace {

@@ -2,7 +2,8 @@
 
 #include <gtest/gtest.h>
 
-#include "tests/cli/jpeg_files.h"
+#include "tests/support/exif_payload.h"
+#include "tests/support/jpeg_files.h"
 
 namespace pelorin::photo {
 namespace {

@@ -3,7 +3,8 @@
 #include <gtest/gtest.h>
 #include <libexif/exif-data.h>
 
-#include "tests/cli/jpeg_files.h"
+#include "tests/support/exif_payload.h"
+#include "tests/support/jpeg_files.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::photo {

@@ -42,7 +42,7 @@ class StreamTest : public testing::Test {
 
   FakeEnvironment env;
   TemporaryFolder folder;
-  FakeString output{folder.file("out.jpg")};
+  FakeString output{folder / "out.jpg"};
   const std::vector<std::uint8_t> old = {1, 2, 3};
 };
 
@@ -53,7 +53,7 @@ TEST_F(StreamTest, IsClosedWhenItIsDestroyed) {
     EXPECT_EQ(contentOf(output.text), old);
   }
   EXPECT_EQ(contentOf(output.text).size(), 12u);
-  EXPECT_THAT(folder.names(), ElementsAre("out.jpg"));
+  EXPECT_THAT(folder.content(), ElementsAre("out.jpg"));
 }
 
 TEST_F(StreamTest, LeavesTheFileWhenNothingWasWrittenToTheEnd) {
@@ -66,7 +66,7 @@ TEST_F(StreamTest, LeavesTheFileWhenNothingWasWrittenToTheEnd) {
   } catch (const std::runtime_error&) {
   }
   EXPECT_EQ(contentOf(output.text), old);
-  EXPECT_THAT(folder.names(), ElementsAre("out.jpg"));
+  EXPECT_THAT(folder.content(), ElementsAre("out.jpg"));
 }
 
 TEST_F(StreamTest, LeavesAnIOExceptionPendingWhenItCannotBeClosed) {
@@ -77,7 +77,7 @@ TEST_F(StreamTest, LeavesAnIOExceptionPendingWhenItCannotBeClosed) {
     std::filesystem::create_directory(output.text);
   }
   EXPECT_THAT(env.takeException(), StartsWith("java/io/IOException: " + output.text));
-  EXPECT_THAT(folder.names(), ElementsAre("out.jpg"));
+  EXPECT_THAT(folder.content(), ElementsAre("out.jpg/"));
 }
 
 TEST_F(StreamTest, LeavesAnEarlierExceptionPendingWhenItCannotBeClosed) {
@@ -92,7 +92,7 @@ TEST_F(StreamTest, LeavesAnEarlierExceptionPendingWhenItCannotBeClosed) {
 }
 
 TEST_F(StreamTest, ThrowsWhenItsFileCannotBeWritten) {
-  FakeString nowhere(folder.file("no such folder/out.jpg"));
+  FakeString nowhere(folder / "no such folder/out.jpg");
   Stream out(&env, nowhere, "w");
   EXPECT_THROW(encodeInto(out), std::system_error);
 }
@@ -100,7 +100,7 @@ TEST_F(StreamTest, ThrowsWhenItsFileCannotBeWritten) {
 TEST_F(StreamTest, RefusesANullPathAndAnotherMode) {
   EXPECT_THROW(Stream(&env, nullptr, "r"), std::invalid_argument);
   EXPECT_THROW(Stream(&env, output, "rw"), std::invalid_argument);
-  FakeString missing(folder.file("missing.jpg"));
+  FakeString missing(folder / "missing.jpg");
   EXPECT_THROW(Stream(&env, missing, "r"), std::system_error);
 }
 

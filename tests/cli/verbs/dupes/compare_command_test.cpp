@@ -7,6 +7,7 @@
 #include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/cli/verbs/dupes/photo_library_files.h"
+#include "tests/support/bytes.h"
 #include "tests/support/green_cdf.h"
 
 namespace pelorin::test_support {
@@ -18,11 +19,6 @@ using image_processing::GreenCDF;
 using image_processing::matchCDFDomain;
 using Json = nlohmann::json;
 using testing::HasSubstr;
-
-Bytes rawOf(const Image<RGBA8Pixel>& picture) {
-  const auto* bytes = reinterpret_cast<const std::uint8_t*>(picture.data.get());
-  return Bytes(bytes, bytes + picture.byteSize());
-}
 
 Json compare(std::vector<std::string> arguments) {
   arguments.insert(arguments.begin(), "compare");
@@ -51,8 +47,8 @@ TEST(SceneShots, DifferBetweenScenesAndHardlyWithinOne) {
 TEST(CompareCommand, TellsTheEnginesNumbersToTheLastBit) {
   const TemporaryFolder folder;
   const Image<RGBA8Pixel> a = sceneShot(1, 100, 64, 48), b = sceneShot(1, 55, 30, 40);
-  const std::vector<std::string> files = {folder.write("a", rawOf(a)),
-                                          folder.write("b", rawOf(b)),
+  const std::vector<std::string> files = {folder.write("a", rawBytes(a)),
+                                          folder.write("b", rawBytes(b)),
                                           "--raw",
                                           "64x48",
                                           "--raw2",
@@ -76,8 +72,8 @@ TEST(CompareCommand, TellsTheEnginesNumbersToTheLastBit) {
 TEST(CompareCommand, PrintsNineSignificantDigits) {
   const TemporaryFolder folder;
   const Image<RGBA8Pixel> a = sceneShot(1, 100, 64, 48), b = sceneShot(2, 80, 64, 48);
-  const Finished run = quenby({"compare", folder.write("a", rawOf(a)), folder.write("b", rawOf(b)),
-                               "--raw", "64x48", "--dt", "3"});
+  const Finished run = quenby({"compare", folder.write("a", rawBytes(a)),
+                               folder.write("b", rawBytes(b)), "--raw", "64x48", "--dt", "3"});
   EXPECT_EQ(run.exitCode, 0) << run.errors;
   const float score = dupeScoreOfCDFs(cdfOf(a), cdfOf(b), 3.0f, true);
   EXPECT_THAT(run.output, HasSubstr(fmt::format("score        {:.9g}\n", score)));

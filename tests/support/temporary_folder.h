@@ -11,9 +11,9 @@
 #include <string>
 #include <vector>
 
-namespace pelorin::test_support {
+#include "tests/support/bytes.h"
 
-using Bytes = std::vector<std::uint8_t>;
+namespace pelorin::test_support {
 
 /// A folder of a test's own, gone with it.
 class TemporaryFolder {

@@ -1,7 +1,8 @@
-#include "tests/photo/jpeg/jpeg_files.h"
+#include "tests/support/jpeg_files.h"
 
 #include <algorithm>
 #include <cstdlib>
+#include <cstring>
 #include <stdexcept>
 
 namespace pelorin::test_support {
@@ -31,6 +32,23 @@ Bytes photoSamples(const JpegRecipe& recipe) {
 }
 
 }  // namespace
+
+Bytes jpegOf(const Image<RGBA8Pixel>& picture, const std::vector<photo::MetadataSegment>& metadata,
+             int quality) {
+  return photo::encodeJpeg(reinterpret_cast<const std::uint8_t*>(picture.data.get()), picture.width,
+                           picture.height, quality, metadata);
+}
+
+Bytes smallJpeg(std::uint64_t seed) {
+  return jpegOf(photoLikePicture(48, 32, seed));
+}
+
+Image<RGBA8Pixel> decoded(const Bytes& file) {
+  const photo::DecodedPicture picture = photo::decodeJpeg(file);
+  Image<RGBA8Pixel> image(picture.width, picture.height);
+  std::memcpy(image.data.get(), picture.pixels.get(), image.byteSize());
+  return image;
+}
 
 Bytes makeJpeg(const JpegRecipe& recipe, const Bytes& pixels) {
   photo::LibjpegErrors errors;
@@ -111,6 +129,16 @@ std::vector<jpeg_scan_info> progressiveScans(int count) {
 
 std::vector<jpeg_scan_info> channelScans() {
   return {{1, {0}, 0, 63, 0, 0}, {1, {1}, 0, 63, 0, 0}, {1, {2}, 0, 63, 0, 0}};
+}
+
+std::vector<jpeg_scan_info> greyScansBitByBit() {
+  constexpr int topBit = 7;
+  std::vector<jpeg_scan_info> scans = {{1, {0}, 0, 0, 0, 0}};
+  for (int k = 1; k < 64; ++k) {
+    scans.push_back({1, {0}, k, k, 0, topBit});
+    for (int bit = topBit; bit > 0; --bit) scans.push_back({1, {0}, k, k, bit, bit - 1});
+  }
+  return scans;
 }
 
 std::size_t findSegment(const Bytes& file, std::uint8_t marker, int nth) {

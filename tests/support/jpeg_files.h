@@ -7,11 +7,20 @@
 
 #include "photo/jpeg/jpeg_codec.h"
 #include "photo/jpeg/libjpeg_errors.h"
+#include "tests/support/bytes.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::test_support {
 
-using Bytes = std::vector<std::uint8_t>;
+/// A picture as a JPEG file.
+Bytes jpegOf(const Image<RGBA8Pixel>& picture,
+             const std::vector<photo::MetadataSegment>& metadata = {}, int quality = 90);
+
+/// A small photo-like JPEG file.
+Bytes smallJpeg(std::uint64_t seed = 1);
+
+/// The pixels of a JPEG file, as stored.
+Image<RGBA8Pixel> decoded(const Bytes& file);
 
 /// A file as other programs may write it; the defaults are a plain colour photo.
 struct JpegRecipe {
@@ -43,6 +52,9 @@ std::vector<jpeg_scan_info> progressiveScans(int count);
 
 /// Three scans of one whole channel each.
 std::vector<jpeg_scan_info> channelScans();
+
+/// A script for one channel of 505 scans, each the refinement of one coefficient by one bit.
+std::vector<jpeg_scan_info> greyScansBitByBit();
 
 /// Where a segment's marker code begins (its 0xFF); `nth` counts from 0.
 std::size_t findSegment(const Bytes& file, std::uint8_t marker, int nth = 0);

@@ -1,0 +1,18 @@
+#pragma once
+
+#include <cstdint>
+#include <vector>
+
+#include "image_processing/core/image.h"
+
+namespace pelorin::test_support {
+
+using Bytes = std::vector<std::uint8_t>;
+
+/// The packed RGBA bytes of a picture.
+inline Bytes rawBytes(const image_processing::Image<image_processing::RGBA8Pixel>& image) {
+  const auto* const first = reinterpret_cast<const std::uint8_t*>(image.data.get());
+  return Bytes(first, first + image.byteSize());
+}
+
+}  // namespace pelorin::test_support
