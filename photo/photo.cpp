@@ -1,15 +1,10 @@
 #include "photo/photo.h"
 
-#include <string>
+#include <algorithm>
+#include <bit>
 #include <utility>
 
-#include "photo/jpeg/jpeg_codec.h"
-#include "photo/jpeg/jpeg_end.h"
-#include "photo/metadata/exif_orientation.h"
-#include "photo/metadata/first_exif.h"
-#include "photo/metadata/kept_metadata.h"
-#include "photo/png/png_file.h"
-#include "photo/raw/raw_pixels.h"
+#include "photo/reduced_rows.h"
 #include "photo/turned_image.h"
 
 namespace pelorin::photo {
@@ -19,73 +14,49 @@ using image_processing::RGBA8Pixel;
 
 namespace {
 
-void stopIfAsked(const std::stop_token& stop) {
-  if (stop.stop_requested()) throw Stopped();
+// As decoders that scale take it.
+std::uint32_t divisorOf(int scale) {
+  return std::min(8u, std::bit_floor(static_cast<unsigned>(std::max(1, scale))));
 }
 
-std::shared_ptr<Image<RGBA8Pixel>> decodedImage(std::span<const std::uint8_t> file,
-                                                const OpenOptions& options, SparePixels& spare) {
-  std::shared_ptr<Image<RGBA8Pixel>> image;
-  const auto makeRoom = [&](std::uint32_t width, std::uint32_t height) {
-    image = spare.picture(width, height);
-    return reinterpret_cast<std::uint8_t*>(image->data.get());
-  };
-  decodeJpegInto(makeRoom, file, options.scale, options.limits);
-  return image;
+std::unique_ptr<RowReader> readerOf(std::span<const std::uint8_t> file,
+                                    const OpenOptions& options) {
+  const Format& format = options.raw ? rawPixels() : formatOf(file);
+  std::unique_ptr<RowReader> reader = format.reader(file, options);
+  const std::uint32_t divisor = divisorOf(options.scale);
+  if (divisor == 1 || format.scalesWhileDecoding) return reader;
+  return reducedRows(std::move(reader), divisor);
 }
 
-PhotoFacts factsOf(const JpegHeader& header) {
-  PhotoFacts facts = {.format = "JPEG",
-                      .width = header.width,
-                      .height = header.height,
-                      .channels = header.components,
-                      .progressive = header.progressive};
-  if (const MetadataSegment* exif = firstExif(header.metadata)) {
-    facts.orientation = exifOrientation(exif->payload);
-    facts.captureTime = exifCaptureTime(exif->payload);
-  }
-  return facts;
-}
-
-// What a JPEG file has beside its pixels; a profile for grey or CMYK does not describe RGB.
-Metadata metadataOf(std::span<const std::uint8_t> file, JpegHeader header,
-                    const PhotoFacts& facts) {
-  if (header.components != 3) removeColourProfile(header.metadata);
-  const auto tail = file.subspan(jpegEnd(file));
-  return {.segments = std::move(header.metadata),
-          .tail = {tail.begin(), tail.end()},
-          .storedSize = {facts.width, facts.height},
-          .orientation = facts.orientation};
-}
-
-void refuseEmpty(std::span<const std::uint8_t> file) {
-  if (file.empty()) throw PhotoError(PhotoError::Kind::empty, "is empty, not a JPEG file");
+bool hasAlpha(const Image<RGBA8Pixel>& picture) {
+  const RGBA8Pixel* first = picture.data.get();
+  return std::any_of(first, first + picture.pixelCount(),
+                     [](const RGBA8Pixel& pixel) { return pixel.a != 255; });
 }
 
 }  // namespace
 
+void stopIfAsked(const std::stop_token& stop) {
+  if (stop.stop_requested()) throw Stopped();
+}
+
+std::unique_ptr<RowReader> openRows(std::span<const std::uint8_t> file,
+                                    const OpenOptions& options) {
+  stopIfAsked(options.stop);
+  return readerOf(file, options);
+}
+
 PhotoFacts readFacts(std::span<const std::uint8_t> file) {
-  refuseEmpty(file);
-  return factsOf(readJpegHeader(file));
+  return readerOf(file, {})->facts();
 }
 
 Photo open(std::span<const std::uint8_t> file, const OpenOptions& options, SparePixels* spare) {
-  stopIfAsked(options.stop);
-  Photo photo;
-  if (options.raw) {
-    photo.facts = {.format = "raw pixels",
-                   .width = options.raw->width,
-                   .height = options.raw->height,
-                   .channels = 4};
-    photo.image = readRawPixels(file, *options.raw);
-  } else {
-    refuseEmpty(file);
-    JpegHeader header = readJpegHeader(file);
-    photo.facts = factsOf(header);
-    photo.metadata = metadataOf(file, std::move(header), photo.facts);
-    SparePixels none;
-    photo.image = decodedImage(file, options, spare != nullptr ? *spare : none);
-  }
+  const std::unique_ptr<RowReader> rows = openRows(file, options);
+  Photo photo{nullptr, rows->facts(), rows->metadata(), {}};
+  SparePixels none;
+  const PictureSize size = rows->size();
+  photo.image = (spare != nullptr ? spare : &none)->picture(size.width, size.height);
+  rows->read(photo.image->data.get(), size.height);
   stopIfAsked(options.stop);
   if (options.upright) {
     photo.metadata.turn = turnedFurther(uprightTurn(photo.facts.orientation), options.rotate);
@@ -96,31 +67,35 @@ Photo open(std::span<const std::uint8_t> file, const OpenOptions& options, Spare
   return photo;
 }
 
+std::vector<std::uint8_t> save(const Image<RGBA8Pixel>& picture, const Format& format,
+                               const Metadata& metadata, const SaveOptions& options,
+                               std::vector<Loss>* lost) {
+  stopIfAsked(options.stop);
+  KeptMetadata kept = keptMetadata(picture, metadata, options.keep);
+  format.removeForeign(kept);
+  const bool alpha = hasAlpha(picture);
+  if (alpha && !format.keepsAlpha) {
+    kept.lost.push_back({"transparency", "a " + std::string(format.name) + " file has none"});
+  }
+  std::vector<Loss> losses = std::move(kept.lost);
+  const PictureSize size = {picture.width, picture.height};
+  const auto writer = format.writer(size, alpha, std::move(kept), options);
+  writer->write(picture.data.get(), picture.height);
+  std::vector<std::uint8_t> file = writer->finish();
+  if (lost != nullptr) *lost = std::move(losses);
+  stopIfAsked(options.stop);
+  return file;
+}
+
 std::vector<std::uint8_t> save(const Image<RGBA8Pixel>& picture, std::string_view format,
                                const Metadata& metadata, const SaveOptions& options,
-                               std::vector<Loss>* losses) {
-  stopIfAsked(options.stop);
-  const auto* pixels = reinterpret_cast<const std::uint8_t*>(picture.data.get());
-  std::vector<std::uint8_t> file;
-  std::vector<Loss> lost;
-  if (format == "JPEG") {
-    KeptMetadata kept = keptMetadata(picture, metadata, options.keep);
-    file = encodeJpeg(pixels, picture.width, picture.height, options.quality, kept.segments);
-    appendTail(file, kept.tail);
-    lost = std::move(kept.lost);
-  } else if (format == "PNG") {
-    file = encodePng(picture);
-    if (!metadata.segments.empty() || !metadata.tail.empty())
-      lost.push_back({"metadata", "PNG files carry none yet"});
-  } else if (format == "raw pixels") {
-    file.assign(pixels, pixels + picture.byteSize());
-  } else {
+                               std::vector<Loss>* lost) {
+  const Format* known = formatNamed(format);
+  if (known == nullptr) {
     throw PhotoError(PhotoError::Kind::invalidRequest,
                      "'" + std::string(format) + "' is no format that can be written");
   }
-  if (losses != nullptr) *losses = std::move(lost);
-  stopIfAsked(options.stop);
-  return file;
+  return save(picture, *known, metadata, options, lost);
 }
 
 }  // namespace pelorin::photo

@@ -2,20 +2,18 @@
 
 #include <cstdint>
 #include <memory>
-#include <optional>
 #include <span>
-#include <stop_token>
 #include <string_view>
 #include <vector>
 
 #include "image_processing/core/image.h"
-#include "photo/decode_limits.h"
-#include "photo/metadata/kept_metadata.h"
+#include "photo/format.h"
 #include "photo/metadata/known_faces.h"
 #include "photo/metadata/metadata.h"
+#include "photo/options.h"
 #include "photo/photo_error.h"
 #include "photo/photo_facts.h"
-#include "photo/picture_size.h"
+#include "photo/rows.h"
 #include "photo/spare_pixels.h"
 
 namespace pelorin::photo {
@@ -31,16 +29,6 @@ struct Photo {
   std::vector<KnownFace> faces;  ///< That the file knows of.
 };
 
-struct OpenOptions {
-  int scale = 1;                        ///< 1, 2, 4 or 8: what its sides are divided by.
-  int rotate = 0;                       ///< Degrees clockwise beyond upright, a multiple of 90.
-  bool upright = true;                  ///< Else the picture is as it is stored, and `rotate` idle.
-  std::optional<PictureSize> raw = {};  ///< The bytes are raw pixels of this size.
-  bool faces = true;                    ///< Read those that the file knows of.
-  DecodeLimits limits = {};
-  std::stop_token stop = {};  ///< Asked between steps; the default never stops.
-};
-
 /// Decodes a photo and turns it upright.
 /// @param spare  where the pixels of a decoded one may come from; may be null.
 /// @throws PhotoError when the bytes are no photo, or damaged, or beyond the limits: never half a
@@ -52,17 +40,24 @@ Photo open(std::span<const std::uint8_t> file, const OpenOptions& options = {},
 /// @throws PhotoError as `open`.
 PhotoFacts readFacts(std::span<const std::uint8_t> file);
 
-struct SaveOptions {
-  int quality = 90;           ///< 1 ... 100, for formats that lose something.
-  std::stop_token stop = {};  ///< Asked between steps; the default never stops.
-  KeepOptions keep = {};      ///< Of the metadata.
-};
+/// The rows of a photo, for what needs no whole picture; scaled as `options` say and as they are
+/// stored, not turned.
+/// @param file  outlives the reader.
+/// @throws PhotoError as `open`.
+std::unique_ptr<RowReader> openRows(std::span<const std::uint8_t> file,
+                                    const OpenOptions& options = {});
 
 /// The bytes of a file with this picture.
-/// @param format    a name in the table of formats: "JPEG".
+/// @param format    from the table of formats.
 /// @param metadata  what goes with it, as far as the format can hold it.
 /// @param lost      where to tell what of the metadata is not in the file; may be null.
-/// @throws PhotoError when the format cannot hold such a picture, or is none; Stopped.
+/// @throws PhotoError when the format cannot hold such a picture; Stopped.
+std::vector<std::uint8_t> save(const image_processing::Image<image_processing::RGBA8Pixel>& picture,
+                               const Format& format, const Metadata& metadata = {},
+                               const SaveOptions& options = {}, std::vector<Loss>* lost = nullptr);
+
+/// The same, with a name in the table of formats: "JPEG".
+/// @throws PhotoError also when there is no such format.
 std::vector<std::uint8_t> save(const image_processing::Image<image_processing::RGBA8Pixel>& picture,
                                std::string_view format, const Metadata& metadata = {},
                                const SaveOptions& options = {}, std::vector<Loss>* lost = nullptr);

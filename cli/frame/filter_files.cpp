@@ -36,6 +36,7 @@ struct Work {
 struct Done {
   std::uint32_t width, height;
   std::vector<photo::Loss> lost = {};
+  std::vector<std::string> notices = {};
 };
 
 Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter) {
@@ -63,7 +64,7 @@ Done process(const Work& work, const PlannedFile& file) {
   photo::Photo photo = loadPhoto(file.input, work.photo, &spare);
   stopIfInterrupted();
   Image<RGBA8Pixel>& picture = *photo.image;
-  Done done = {picture.width, picture.height};
+  Done done = {picture.width, picture.height, {}, photo.facts.notices};
   {
     // The session ends before the encoder begins: its masks are several times the picture.
     FilteredImage session(
@@ -107,7 +108,7 @@ ExitCode printPlan(const std::vector<PlannedFile>& plan, JsonOutput& json) {
 void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
                            const std::string& placeholders) {
   addInputOptions(verb, options.inputs);
-  addOutputOptions(verb, options.outputs, "{stem}_{filter}.jpg", placeholders);
+  addOutputOptions(verb, options.outputs, "{stem}_{filter}.{ext}", placeholders);
   addFaceOption(verb, options.faces, options.knownFaces);
   verb.option("--rotate", options.rotate,
               "Turn further by so many degrees clockwise, a multiple of 90")
@@ -134,13 +135,14 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
     throw UsageError("-o -: standard output takes the picture or --json, not both");
   }
   if (options.outputs.name.empty()) {
-    options.outputs.name = raw ? "{stem}_{filter}.rgba" : "{stem}_{filter}.jpg";
+    options.outputs.name = raw ? "{stem}_{filter}.rgba" : "{stem}_{filter}.{ext}";
   }
   std::map<std::string, std::string> values = filter.values;
   values["filter"] = filter.filter.name;
   const std::vector<Input> inputs = expandInputs(options.inputs);
   const std::vector<PlannedFile> plan =
       planOutputs(inputs, options.inputs, options.outputs, values);
+  for (const PlannedFile& file : plan) requireFormatOf(file.output, raw);
 
   const bool singleFile = isSingleFile(options.inputs, inputs);
   JsonOutput json(options.report, singleFile);
@@ -169,7 +171,11 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
              object["filter"] = filter.filter.name;
              object["params"] = filter.params;
              object["lost"] = jsonOf(done->lost);
+             object["notices"] = done->notices;
              json.add(object);
+             for (const std::string& notice : done->notices) {
+               talk.note(inputs[index].shownName() + ": " + notice);
+             }
              for (const photo::Loss& loss : done->lost) {
                talk.note(plan[index].output + ": " + lossText(loss));
              }

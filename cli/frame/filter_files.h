@@ -33,7 +33,7 @@ struct FilterFilesOptions {
 /// Adds all of them to a verb. Results in a folder are called `{stem}_{filter}` by default.
 /// @param placeholders  what `--name` may hold, for the help.
 void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
-                           const std::string& placeholders = "{stem} and {filter}");
+                           const std::string& placeholders = "{stem}, {filter} and {ext}");
 
 /// What to do with every file.
 struct FilterToApply {

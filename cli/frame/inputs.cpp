@@ -1,11 +1,11 @@
 #include "cli/frame/inputs.h"
 
 #include <algorithm>
-#include <cctype>
 #include <fstream>
 #include <iostream>
 
 #include "cli/frame/errors.h"
+#include "photo/format.h"
 
 namespace fs = std::filesystem;
 
@@ -13,11 +13,7 @@ namespace pelorin::cli {
 namespace {
 
 bool isNamedLikeAPhoto(const fs::path& path) {
-  std::string extension = path.extension().string();
-  for (char& letter : extension) {
-    letter = static_cast<char>(std::tolower(static_cast<unsigned char>(letter)));
-  }
-  return extension == ".jpg" || extension == ".jpeg" || extension == ".jpe";
+  return photo::isPictureExtension(path.extension().string());
 }
 
 void addFolder(const std::string& folder, std::vector<Input>& inputs) {
@@ -96,12 +92,13 @@ class Expansion {
 
 void addInputOptions(Verb verb, InputOptions& options) {
   verb.option("IN", options.names,
-              "JPEG files, folders (with -r), @LIST (one name a line), - (standard input)")
+              photo::pictureFormats() +
+                  " files, folders (with -r), @LIST (one name a line), - (standard input)")
       .required()
       .type("")
       .group("Input");
   verb.flag("-r,--recursive", options.recursive,
-            "Take the .jpg, .jpeg and .jpe files below a folder, in sorted order")
+            "Take the " + photo::pictureExtensions() + " files below a folder, in sorted order")
       .group("Input");
 }
 

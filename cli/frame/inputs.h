@@ -32,7 +32,7 @@ struct Input {
 };
 
 /// The files behind the names, in order: a file stands for itself, a folder (only with `-r`) for
-/// the *.jpg, *.jpeg and *.jpe files below it in sorted order, `@list` for the names in the lines
+/// the files below it that are called like a photo in sorted order, `@list` for the names in the lines
 /// of that file (`@-`: of standard input), `-` for standard input. Names that do not exist are
 /// kept: reading them fails like that of any other file.
 /// @throws UsageError for a folder without `-r`, an unreadable list, a second use of standard

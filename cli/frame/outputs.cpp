@@ -4,6 +4,7 @@
 
 #include "cli/frame/errors.h"
 #include "cli/frame/nearest_name.h"
+#include "photo/format.h"
 
 namespace fs = std::filesystem;
 
@@ -47,6 +48,8 @@ std::string nameInFolder(const Input& input, const OutputOptions& options,
                          std::map<std::string, std::string> values) {
   const fs::path path = input.path;
   values["stem"] = input.isStandardInput() ? "stdin" : path.stem().string();
+  const photo::Format* format = photo::formatWithExtension(path.extension().string());
+  values["ext"] = format != nullptr ? format->extensions[0].substr(1) : "jpg";
   const std::string name = fillIn(options.name, values);
   if (options.output.empty()) return (path.parent_path() / name).string();
   return (fs::path(options.output) / input.subfolder / name).string();

@@ -32,7 +32,8 @@ struct PlannedFile {
 };
 
 /// Says for every input which file it becomes, before any work. In a folder a result is called
-/// after `name`, whose {stem} is the input's name without its extension and whose other
+/// after `name`, whose {stem} is the input's name without its extension, whose {ext}
+/// is the usual extension of the input's format ("jpg" where it has none) and whose other
 /// placeholders are `values`; below it stand the input's own sub-folders.
 /// @param named  what the user typed as inputs: several, a folder or a list need an output folder.
 /// @throws UsageError when two inputs would become one file, when a result would replace an input

@@ -8,7 +8,7 @@
 namespace pelorin::cli {
 
 void addRawOption(Verb verb, std::string& text) {
-  verb.option("--raw", text, "Read and write packed RGBA bytes of this size instead of JPEG files")
+  verb.option("--raw", text, "Read and write packed RGBA bytes of this size instead of photos")
       .type("WxH")
       .group("Raw pixels");
 }

@@ -46,7 +46,7 @@ void addEnhance(CommandLine& commandLine) {
       .type("NAME");
   options->parameters =
       FilterOptions(verb, {&filterNamed(options->filter)}, "slider=0.4;gtmOnly=true;");
-  addFilterFilesOptions(verb, options->files, "{stem}, {filter} and {slider}");
+  addFilterFilesOptions(verb, options->files, "{stem}, {filter}, {ext} and {slider}");
 }
 
 }  // namespace pelorin::cli

@@ -51,7 +51,7 @@ void addLook(CommandLine& commandLine) {
       .type("")
       .group("Input");
   options->parameters = FilterOptions(verb, allFilters(), "applyMask=0;r=0,0.5,1,;");
-  addFilterFilesOptions(verb, options->files, "{stem}, {filter} and {look}");
+  addFilterFilesOptions(verb, options->files, "{stem}, {filter}, {ext} and {look}");
 }
 
 }  // namespace pelorin::cli

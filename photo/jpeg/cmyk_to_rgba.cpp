@@ -12,22 +12,18 @@ namespace {
 struct CloseProfile {
   void operator()(void* profile) const { cmsCloseProfile(profile); }
 };
-struct DeleteTransform {
-  void operator()(void* transform) const { cmsDeleteTransform(transform); }
-};
 using Profile = std::unique_ptr<std::remove_pointer_t<cmsHPROFILE>, CloseProfile>;
-using Transform = std::unique_ptr<std::remove_pointer_t<cmsHTRANSFORM>, DeleteTransform>;
 
 // Null when the profile is of no use.
-Transform transformFrom(std::span<const std::uint8_t> bytes, bool inverted) {
+cmsHTRANSFORM transformFrom(std::span<const std::uint8_t> bytes, bool inverted) {
   if (bytes.empty()) return nullptr;
   const Profile inks(
       cmsOpenProfileFromMem(bytes.data(), static_cast<cmsUInt32Number>(bytes.size())));
   if (inks == nullptr || cmsGetColorSpace(inks.get()) != cmsSigCmykData) return nullptr;
   const Profile screen(cmsCreate_sRGBProfile());
   if (screen == nullptr) return nullptr;
-  return Transform(cmsCreateTransform(inks.get(), inverted ? TYPE_CMYK_8_REV : TYPE_CMYK_8,
-                                      screen.get(), TYPE_RGBA_8, INTENT_PERCEPTUAL, 0));
+  return cmsCreateTransform(inks.get(), inverted ? TYPE_CMYK_8_REV : TYPE_CMYK_8, screen.get(),
+                            TYPE_RGBA_8, INTENT_PERCEPTUAL, 0);
 }
 
 // Light through one ink and black, each a byte with 255 for no ink.
@@ -46,18 +42,17 @@ void convertSimply(std::uint8_t* pixels, std::size_t count, bool inverted) {
 
 }  // namespace
 
-void cmykToRgba(std::uint8_t* pixels, std::uint32_t width, std::uint32_t height, bool inverted,
-                std::span<const std::uint8_t> profile) {
-  const Transform transform = transformFrom(profile, inverted);
-  for (std::uint32_t y = 0; y < height; ++y) {
-    std::uint8_t* row = pixels + std::size_t{y} * width * 4;
-    if (transform == nullptr) {
-      convertSimply(row, width, inverted);
-      continue;
-    }
-    cmsDoTransform(transform.get(), row, row, width);
-    for (std::uint32_t x = 0; x < width; ++x) row[std::size_t{x} * 4 + 3] = 255;
-  }
+void CmykToRgba::DeleteTransform::operator()(void* transform) const {
+  cmsDeleteTransform(transform);
+}
+
+CmykToRgba::CmykToRgba(bool inverted, std::span<const std::uint8_t> profile)
+    : inverted_(inverted), transform_(transformFrom(profile, inverted)) {}
+
+void CmykToRgba::convertRow(std::uint8_t* row, std::uint32_t width) const {
+  if (transform_ == nullptr) return convertSimply(row, width, inverted_);
+  cmsDoTransform(transform_.get(), row, row, width);
+  for (std::uint32_t x = 0; x < width; ++x) row[std::size_t{x} * 4 + 3] = 255;
 }
 
 }  // namespace pelorin::photo

@@ -3,8 +3,7 @@
 #include <string>
 #include <string_view>
 
-#include "photo/jpeg/jpeg_codec.h"
-#include "photo/jpeg/libjpeg_writer.h"
+#include "photo/jpeg/jpeg_picture_writer.h"
 
 namespace pelorin::photo {
 namespace {
@@ -32,35 +31,24 @@ void checkSegment(const MetadataSegment& segment) {
   }
 }
 
-// Within `run`.
-void writeRows(jpeg_compress_struct& codec, const std::uint8_t* rgba) {
-  std::array<JSAMPROW, 16> rows;
-  while (codec.next_scanline < codec.image_height) {
-    const JDIMENSION count =
-        std::min<JDIMENSION>(rows.size(), codec.image_height - codec.next_scanline);
-    for (JDIMENSION i = 0; i < count; ++i) {
-      const std::size_t y = codec.next_scanline + i;
-      rows[i] = const_cast<JSAMPROW>(rgba + y * codec.image_width * 4);  // libjpeg only reads
-    }
-    jpeg_write_scanlines(&codec, rows.data(), count);
-  }
-}
-
-}  // namespace
-
-std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t width,
-                                     std::uint32_t height, int quality,
-                                     std::span<const MetadataSegment> metadata, Chroma chroma) {
+// More than most photos need.
+std::size_t expectedSize(std::uint32_t width, std::uint32_t height) {
   if (width < 1 || height < 1 || width > JPEG_MAX_DIMENSION || height > JPEG_MAX_DIMENSION) {
     throw PhotoError(PhotoError::Kind::invalidRequest,
                      "a JPEG file cannot be " + std::to_string(width) + " x " +
                          std::to_string(height) + " pixels, only 1 to 65500 each way");
   }
-  for (const MetadataSegment& segment : metadata) checkSegment(segment);
+  return std::size_t{width} * height / 2;
+}
 
-  LibjpegWriter writer(std::size_t{width} * height / 2);  // more than most photos need
-  jpeg_compress_struct& codec = writer.codec();
-  writer.run([&] {
+}  // namespace
+
+JpegPictureWriter::JpegPictureWriter(std::uint32_t width, std::uint32_t height, int quality,
+                                     std::span<const MetadataSegment> metadata, Chroma chroma)
+    : writer_(expectedSize(width, height)) {
+  for (const MetadataSegment& segment : metadata) checkSegment(segment);
+  jpeg_compress_struct& codec = writer_.codec();
+  writer_.run([&] {
     codec.image_width = width;
     codec.image_height = height;
     codec.input_components = 4;
@@ -75,10 +63,37 @@ std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t wid
       jpeg_write_marker(&codec, segment.marker, segment.payload.data(),
                         static_cast<unsigned>(segment.payload.size()));
     }
-    writeRows(codec, rgba);
-    jpeg_finish_compress(&codec);
   });
-  return writer.takeFile();
+}
+
+void JpegPictureWriter::write(const std::uint8_t* rgba, std::uint32_t count) {
+  jpeg_compress_struct& codec = writer_.codec();
+  const JDIMENSION first = codec.next_scanline;
+  writer_.run([&] {
+    std::array<JSAMPROW, 16> rows;
+    while (codec.next_scanline < first + count) {
+      const JDIMENSION some =
+          std::min<JDIMENSION>(rows.size(), first + count - codec.next_scanline);
+      for (JDIMENSION i = 0; i < some; ++i) {
+        const std::size_t y = codec.next_scanline - first + i;
+        rows[i] = const_cast<JSAMPROW>(rgba + y * codec.image_width * 4);  // libjpeg only reads
+      }
+      jpeg_write_scanlines(&codec, rows.data(), some);
+    }
+  });
+}
+
+std::vector<std::uint8_t> JpegPictureWriter::finish() {
+  writer_.run([this] { jpeg_finish_compress(&writer_.codec()); });
+  return writer_.takeFile();
+}
+
+std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t width,
+                                     std::uint32_t height, int quality,
+                                     std::span<const MetadataSegment> metadata, Chroma chroma) {
+  JpegPictureWriter writer(width, height, quality, metadata, chroma);
+  writer.write(rgba, height);
+  return writer.finish();
 }
 
 }  // namespace pelorin::photo

@@ -1,7 +1,6 @@
 #include <string_view>
 
-#include "photo/jpeg/jpeg_codec.h"
-#include "photo/jpeg/libjpeg_reader.h"
+#include "photo/jpeg/jpeg_picture_reader.h"
 
 namespace pelorin::photo {
 namespace {
@@ -14,12 +13,7 @@ bool isAdobe(const jpeg_marker_struct& segment) {
 
 }  // namespace
 
-JpegHeader readJpegHeader(std::span<const std::uint8_t> file) {
-  LibjpegReader reader(file);
-  reader.keepAllSegments();
-  reader.readHeader();
-
-  const jpeg_decompress_struct& codec = reader.codec();
+JpegHeader headerOf(const jpeg_decompress_struct& codec) {
   JpegHeader header = {codec.image_width,
                        codec.image_height,
                        codec.num_components,
@@ -31,6 +25,13 @@ JpegHeader readJpegHeader(std::span<const std::uint8_t> file) {
         {segment->marker, {segment->data, segment->data + segment->data_length}});
   }
   return header;
+}
+
+JpegHeader readJpegHeader(std::span<const std::uint8_t> file) {
+  LibjpegReader reader(file);
+  reader.keepAllSegments();
+  reader.readHeader();
+  return headerOf(reader.codec());
 }
 
 }  // namespace pelorin::photo

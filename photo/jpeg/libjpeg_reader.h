@@ -17,6 +17,7 @@ class LibjpegReader {
   LibjpegReader& operator=(const LibjpegReader&) = delete;
 
   jpeg_decompress_struct& codec() { return codec_; }
+  const jpeg_decompress_struct& codec() const { return codec_; }
 
   /// As LibjpegErrors::run.
   template <typename Body>

@@ -1,41 +1,41 @@
 #include "photo/metadata/capture_time.h"
 
 #include <fmt/format.h>
-#include <libexif/exif-data.h>
 
 #include <algorithm>
 #include <array>
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
-#include <memory>
+
+#include "photo/metadata/exif_orientation.h"
+#include "photo/metadata/segments.h"
+#include "photo/metadata/tiff.h"
 
 namespace pelorin::photo {
 namespace {
 
-struct Unref {
-  void operator()(ExifData* data) const { exif_data_unref(data); }
-};
-using Exif = std::unique_ptr<ExifData, Unref>;
+constexpr std::uint16_t exifDirectoryTag = 0x8769;
 
 struct TimeTags {
-  ExifIfd directory;
-  ExifTag time, fraction, offset;
+  bool inFirstDirectory;  // else in the Exif one, where fraction and offset always are
+  std::uint16_t time, fraction, offset;
 };
 
+// Of the original, the digitised and the file.
 constexpr std::array<TimeTags, 3> timeTags = {{
-    {EXIF_IFD_EXIF, EXIF_TAG_DATE_TIME_ORIGINAL, EXIF_TAG_SUB_SEC_TIME_ORIGINAL,
-     EXIF_TAG_OFFSET_TIME_ORIGINAL},
-    {EXIF_IFD_EXIF, EXIF_TAG_DATE_TIME_DIGITIZED, EXIF_TAG_SUB_SEC_TIME_DIGITIZED,
-     EXIF_TAG_OFFSET_TIME_DIGITIZED},
-    {EXIF_IFD_0, EXIF_TAG_DATE_TIME, EXIF_TAG_SUB_SEC_TIME, EXIF_TAG_OFFSET_TIME},
+    {false, 0x9003, 0x9291, 0x9011},
+    {false, 0x9004, 0x9292, 0x9012},
+    {true, 0x0132, 0x9290, 0x9010},
 }};
 
-std::string textOf(const Exif& exif, ExifIfd directory, ExifTag tag) {
-  const ExifEntry* entry = exif_content_get_entry(exif->ifd[directory], tag);
-  if (entry == nullptr || entry->format != EXIF_FORMAT_ASCII || entry->data == nullptr) return "";
-  const auto* first = reinterpret_cast<const char*>(entry->data);
-  std::string text(first, std::find(first, first + entry->size, '\0'));
+std::string textOf(std::span<const std::uint8_t> bytes, const TiffDirectory& directory,
+                   std::uint16_t tag) {
+  constexpr std::uint16_t ascii = 2;
+  const TiffEntry* entry = directory.find(tag);
+  if (entry == nullptr || entry->type != ascii) return "";
+  const auto value = bytes.subspan(entry->valuePlace, entry->valueSize);
+  std::string text(value.begin(), std::find(value.begin(), value.end(), 0));
   while (!text.empty() && text.back() == ' ') text.pop_back();
   return text;
 }
@@ -88,12 +88,15 @@ std::optional<CaptureTime> readTime(const std::string& text, const std::string& 
 }  // namespace
 
 std::optional<CaptureTime> exifCaptureTime(std::span<const std::uint8_t> payload) {
-  const Exif exif(exif_data_new_from_data(payload.data(), static_cast<unsigned>(payload.size())));
-  if (exif == nullptr) return std::nullopt;
+  if (!isExif(payload)) return std::nullopt;
+  const std::span<const std::uint8_t> bytes = payload.subspan(exifMark.size());
+  const Tiff tiff(bytes);
+  const TiffDirectory first = tiff.firstDirectory();
+  const TiffDirectory exif = tiff.directoryOf(first.find(exifDirectoryTag));
   for (const TimeTags& tags : timeTags) {
-    std::optional<CaptureTime> time = readTime(textOf(exif, tags.directory, tags.time),
-                                               textOf(exif, EXIF_IFD_EXIF, tags.fraction),
-                                               textOf(exif, EXIF_IFD_EXIF, tags.offset));
+    std::optional<CaptureTime> time =
+        readTime(textOf(bytes, tags.inFirstDirectory ? first : exif, tags.time),
+                 textOf(bytes, exif, tags.fraction), textOf(bytes, exif, tags.offset));
     if (time) return time;
   }
   return std::nullopt;

@@ -194,6 +194,7 @@ KeptMetadata keptMetadata(const Image<RGBA8Pixel>& picture, const Metadata& meta
     std::erase_if(kept.segments, [](const MetadataSegment& s) { return !isColourProfile(s); });
     return kept;
   }
+  kept.chunks = metadata.chunks;
   const PictureChange change = {
       metadata.storedSize, {picture.width, picture.height}, metadata.turn, metadata.orientation};
   kept.tail = keptTail(metadata, change, options, kept.lost);

@@ -21,6 +21,7 @@ struct KeepOptions {
 /// The metadata of a file that is about to be written.
 struct KeptMetadata {
   std::vector<MetadataSegment> segments;
+  std::vector<PngChunk> chunks;
   std::vector<TailPart> tail;  ///< What is to stand behind the picture.
   std::vector<Loss> lost;      ///< What the photo had and this file has not.
 };

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <string>
 #include <vector>
 
 #include "photo/metadata/metadata_segment.h"
@@ -9,11 +10,19 @@
 
 namespace pelorin::photo {
 
+/// A part of a PNG file beside its picture.
+struct PngChunk {
+  std::string type;  ///< Four letters: "tEXt".
+  std::vector<std::uint8_t> data;
+};
+
 /// What a photo says beside its pixels, as its file has it.
 struct Metadata {
   /// EXIF, XMP, colour profile and the rest, as a JPEG file has them, whatever the file was; in its
-  /// order.
+  /// order. One of a PNG file may be longer than a JPEG file allows.
   std::vector<MetadataSegment> segments;
+  /// What only a PNG file can hold: texts, resolution, colour space.
+  std::vector<PngChunk> chunks = {};
   /// What stands behind the picture in the file: gain map, previews, video.
   std::vector<std::uint8_t> tail = {};
   // What all of it was written for, and how the decoded picture differs from that.

@@ -28,7 +28,7 @@ TEST(Folders, AreTakenRecursivelyInSortedOrderWithPhotosOnly) {
     folder.write(name, smallJpeg());
   }
   folder.write("in/notes.txt", std::string("x"));
-  folder.write("in/raw.png", std::string("x"));
+  folder.write("in/raw.gif", std::string("x"));
   folder.makeFolder("in/folder.jpg");
   const Finished plan = enhance({"-r", folder / "in", "--name", "{stem}_x.jpg", "-n"});
   EXPECT_EQ(plan.exitCode, 0);

@@ -195,7 +195,10 @@ TEST(KeptMetadata, IsNamedAsLostWhereTheFormatHasNoPlaceForIt) {
   const Photo photo = open(phonePhoto(6, gainMap()));
   std::vector<Loss> lost;
   save(*photo.image, "PNG", photo.metadata, {}, &lost);
-  EXPECT_EQ(lost, (std::vector<Loss>{{"metadata", "PNG files carry none yet"}}));
+  EXPECT_EQ(
+      std::count_if(lost.begin(), lost.end(),
+                    [](const Loss& loss) { return loss.what == nameOf(TailPart::Kind::gainMap); }),
+      1);
 }
 
 TEST(KeptMetadata, CanBeTheColourProfileAlone) {

@@ -1,0 +1,28 @@
+#pragma once
+
+#include <cstdint>
+#include <span>
+#include <vector>
+
+#include "photo/jpeg/jpeg_codec.h"
+#include "photo/jpeg/libjpeg_writer.h"
+
+namespace pelorin::photo {
+
+/// A JPEG file that is made of rows of RGBA, as `encodeJpeg` makes it.
+class JpegPictureWriter {
+ public:
+  JpegPictureWriter(std::uint32_t width, std::uint32_t height, int quality,
+                    std::span<const MetadataSegment> metadata, Chroma chroma = Chroma::halved);
+
+  /// The next `count` rows, back to back; no more than the picture has.
+  void write(const std::uint8_t* rgba, std::uint32_t count);
+
+  /// The file, once, after the last row.
+  std::vector<std::uint8_t> finish();
+
+ private:
+  LibjpegWriter writer_;
+};
+
+}  // namespace pelorin::photo

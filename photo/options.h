@@ -1,0 +1,31 @@
+#pragma once
+
+#include <optional>
+#include <stop_token>
+
+#include "photo/decode_limits.h"
+#include "photo/metadata/kept_metadata.h"
+#include "photo/picture_size.h"
+
+namespace pelorin::photo {
+
+struct OpenOptions {
+  int scale = 1;        ///< 1, 2, 4 or 8: what its sides are divided by, rounded up.
+  int rotate = 0;       ///< Degrees clockwise beyond upright, a multiple of 90.
+  bool upright = true;  ///< Else the picture is as it is stored, and `rotate` idle.
+  std::optional<PictureSize> raw = {};  ///< The bytes are raw pixels of this size.
+  bool faces = true;                    ///< Read those that the file knows of.
+  DecodeLimits limits = {};
+  std::stop_token stop = {};  ///< Asked between steps; the default never stops.
+};
+
+struct SaveOptions {
+  int quality = 90;           ///< 1 ... 100, for formats that lose something.
+  std::stop_token stop = {};  ///< Asked between steps; the default never stops.
+  KeepOptions keep = {};      ///< Of the metadata.
+};
+
+/// @throws Stopped when `stop` asks for it.
+void stopIfAsked(const std::stop_token& stop);
+
+}  // namespace pelorin::photo
