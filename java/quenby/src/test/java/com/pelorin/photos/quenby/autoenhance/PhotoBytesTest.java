@@ -5,7 +5,7 @@ import static org.junit.jupiter.api.Assertions.assertEquals;
 import static org.junit.jupiter.api.Assertions.assertFalse;
 import static org.junit.jupiter.api.Assertions.assertThrows;
 import static org.junit.jupiter.api.Assertions.assertTrue;
-import static org.junit.jupiter.api.Assumptions.assumeTrue;
+import static org.junit.jupiter.api.Assumptions.assumeFalse;
 
 import android.graphics.RectF;
 import java.awt.image.BufferedImage;
@@ -272,7 +272,7 @@ class PhotoBytesTest {
     @Test
     void aFileIsTheCommands() throws Exception {
         String command = System.getProperty("quenby.command", "");
-        assumeTrue(Files.isExecutable(Path.of(command)),
+        assumeFalse(command.isEmpty(),
                 "quenby.command names no quenby to compare with");
         Path input = Files.write(folder.resolve("turned.jpg"), turned);
         Path output = folder.resolve("command.jpg");
