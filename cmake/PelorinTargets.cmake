@@ -57,11 +57,12 @@ function(pelorin_place_beside_each_other target)
                          INSTALL_RPATH $ORIGIN BUILD_WITH_INSTALL_RPATH ON)
   target_link_options(${target} PRIVATE -Wl,-z,max-page-size=16384)
   if(PELORIN_SELF_CONTAINED)
-    # What is linked in is nobody else's: two copies in one process must not mix.
+    # What is linked in is nobody else's: two copies in one process must not mix. The C++ library is
+    # not among it, since exceptions cross from one of the libraries into another.
     target_sources(${target} PRIVATE $<TARGET_OBJECTS:pelorin_older_glibc>)
     target_link_options(
-      ${target} PRIVATE -static-libstdc++ -Wl,--gc-sections -Wl,--strip-all
-                        -Wl,--exclude-libs,libstdc++.a:libhwy.a:libjpeg.a:liblcms2.a)
+      ${target} PRIVATE -Wl,--gc-sections -Wl,--strip-all
+                        -Wl,--exclude-libs,libhwy.a:libjpeg.a:liblcms2.a)
   endif()
 endfunction()
 

@@ -1,8 +1,9 @@
-# What the five libraries in a folder ask of a Linux machine: the C library from glibc 2.28 on, with
-# the compiler's runtime that belongs to every such system, and pages of up to 16 KiB.
+# What the five libraries in a folder ask of a Linux machine: the C library from glibc 2.28 on, the C++
+# library from GCC 11 on with the compiler's runtime that comes with it, and pages of up to 16 KiB.
 #   cmake -DFOLDER=<folder> -DREADELF=<readelf> -P check_self_contained.cmake
 cmake_minimum_required(VERSION 3.25)
 set(newest 2.28)
+set(newest_cxx 3.4.29)
 
 set(failures 0)
 macro(complain)
@@ -18,7 +19,7 @@ foreach(name libpn libpnjni libpn_imgproc libjnigraphics libpn_quenby)
 
   string(REGEX MATCHALL "\\(NEEDED\\)[^\n]*" lines "${facts}")
   foreach(line IN LISTS lines)
-    if(NOT line MATCHES "\\[(lib(pn|pnjni|pn_imgproc|jnigraphics)\\.so|lib(c|m)\\.so\\.6)\\]"
+    if(NOT line MATCHES "\\[(lib(pn|pnjni|pn_imgproc|jnigraphics)\\.so|lib(c|m|stdc\\+\\+)\\.so\\.6)\\]"
        AND NOT line MATCHES "\\[(libgcc_s\\.so\\.1|ld-linux[-a-z0-9_]*\\.so\\.[0-9])\\]")
       complain("${library}: ${line}")
     endif()
@@ -33,6 +34,14 @@ foreach(name libpn libpnjni libpn_imgproc libjnigraphics libpn_quenby)
     list(APPEND found ${version})
     if(version VERSION_GREATER newest)
       complain("${library}: asks for glibc ${version}")
+    endif()
+  endforeach()
+
+  string(REGEX MATCHALL "GLIBCXX_[0-9.]+" versions "${facts}")
+  foreach(version IN LISTS versions)
+    string(REPLACE GLIBCXX_ "" version ${version})
+    if(version VERSION_GREATER newest_cxx)
+      complain("${library}: asks for version ${version} of the C++ library")
     endif()
   endforeach()
 
@@ -57,4 +66,5 @@ if(failures)
 endif()
 list(SORT found COMPARE NATURAL ORDER DESCENDING)
 list(GET found 0 version)
-message("The libraries in ${FOLDER} need glibc ${version} or newer, and nothing else.")
+message("The libraries in ${FOLDER} need glibc ${version} or newer, a C++ library of GCC 11 or \
+newer, and nothing else.")
