@@ -48,7 +48,7 @@ class ManySessionsTest {
     @Test
     void leaveMemoryWhereItWas() throws Exception {
         // A Java heap of a fixed size, touched before the start, does not move.
-        ChildJvm child = ChildJvm.run(List.of("-Xms64m", "-Xmx64m", "-XX:+AlwaysPreTouch",
+        ChildJvm child = ChildJvm.run(List.of("-Xms256m", "-Xmx256m", "-XX:+AlwaysPreTouch",
                 "-XX:+UseSerialGC"), Count.class);
         Matcher grown = Pattern.compile("grown by (-?\\d+) pages").matcher(child.output);
         assertTrue(grown.find(), child.output);
