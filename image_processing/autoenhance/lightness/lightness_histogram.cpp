@@ -25,8 +25,8 @@ LightnessHistogram::LightnessHistogram(int bins, float scale)
   }
 }
 
-void LightnessHistogram::add(const std::uint16_t* steps, std::size_t count) {
-  for (std::size_t i = 0; i < count; ++i) ++counts_[binOfStep_[steps[i]]];
+void LightnessHistogram::add(const std::uint16_t* steps, std::size_t count, std::uint64_t times) {
+  for (std::size_t i = 0; i < count; ++i) counts_[binOfStep_[steps[i]]] += times;
 }
 
 bool LightnessHistogram::empty() const {

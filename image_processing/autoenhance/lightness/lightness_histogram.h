@@ -21,8 +21,8 @@ class LightnessHistogram {
   /// `bins` at least 1. @throws std::bad_alloc.
   LightnessHistogram(int bins, float scale);
 
-  /// Counts `count` pixels, of which `steps` are the companding steps. Never throws.
-  void add(const std::uint16_t* steps, std::size_t count);
+  /// Counts `count` pixels, of which `steps` are the companding steps, `times` each. Never throws.
+  void add(const std::uint16_t* steps, std::size_t count, std::uint64_t times = 1);
 
   bool empty() const;
 

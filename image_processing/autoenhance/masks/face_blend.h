@@ -5,6 +5,8 @@
 
 namespace pelorin::image_processing {
 
+// A pair: `blendFaceIntoMask` defines what a face does; `FaceBlendRows` does it for all of a photo.
+
 /// Draws the LTM mask toward 0.5 on the skin-coloured pixels in and around one face: the box grown
 /// to twice its size about its centre and cut to the photo, fading out toward its border. A region
 /// without width or height after the cut is skipped.

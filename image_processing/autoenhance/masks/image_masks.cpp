@@ -6,7 +6,7 @@
 #include "image_processing/autoenhance/lightness/lightness_rows.h"
 #include "image_processing/autoenhance/masks/bilateral_filter.h"
 #include "image_processing/autoenhance/masks/bilateral_grid.h"
-#include "image_processing/autoenhance/masks/face_blend.h"
+#include "image_processing/autoenhance/masks/face_blend_rows.h"
 #include "image_processing/autoenhance/masks/flatness_mask.h"
 #include "image_processing/autoenhance/masks/grid_blur.h"
 #include "image_processing/autoenhance/masks/grid_splat.h"
@@ -32,7 +32,9 @@ float spatialExtent(const Image<RGBA8Pixel>& photo, const FilterConfig& config) 
 template <typename T>
 void blendFacesIntoMask(const ImageMetadata& metadata, const Image<RGBA8Pixel>& photo,
                         Image<T>& mask) {
-  for (const auto& face : metadata.faces) blendFaceIntoMask(*face, photo, mask);
+  if (metadata.faces.empty()) return;
+  FaceBlendRows faces(metadata, photo.width, photo.height);
+  for (std::uint32_t y = 0; y < photo.height; ++y) faces.blendRow(photo.row(y), mask.row(y));
 }
 
 /// Through the exact filter.
