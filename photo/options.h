@@ -4,6 +4,7 @@
 #include <stop_token>
 
 #include "photo/decode_limits.h"
+#include "photo/metadata/edit_mark.h"
 #include "photo/metadata/kept_metadata.h"
 #include "photo/picture_size.h"
 
@@ -20,9 +21,10 @@ struct OpenOptions {
 };
 
 struct SaveOptions {
-  int quality = 90;           ///< 1 ... 100, for formats that lose something.
-  std::stop_token stop = {};  ///< Asked between steps; the default never stops.
-  KeepOptions keep = {};      ///< Of the metadata.
+  int quality = 90;                   ///< 1 ... 100, for formats that lose something.
+  std::stop_token stop = {};          ///< Asked between steps; the default never stops.
+  KeepOptions keep = {};              ///< Of the metadata.
+  std::optional<EditMark> mark = {};  ///< Added to the history, whatever else is kept.
 };
 
 /// @throws Stopped when `stop` asks for it.

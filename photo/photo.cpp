@@ -72,6 +72,7 @@ std::vector<std::uint8_t> save(const Image<RGBA8Pixel>& picture, const Format& f
                                std::vector<Loss>* lost) {
   stopIfAsked(options.stop);
   KeptMetadata kept = keptMetadata(picture, metadata, options.keep);
+  if (options.mark) addEditMark(kept.segments, *options.mark, kept.lost);
   format.removeForeign(kept);
   const bool alpha = hasAlpha(picture);
   if (alpha && !format.keepsAlpha) {

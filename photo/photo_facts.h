@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "photo/metadata/capture_time.h"
+#include "photo/metadata/edit_mark.h"
 
 namespace pelorin::photo {
 
@@ -19,6 +20,7 @@ struct PhotoFacts {
   bool hasAlpha = false;
   int orientation = 1;  ///< EXIF, 1 ... 8.
   std::optional<CaptureTime> captureTime = {};
+  std::optional<EditMark> editMark = {};  ///< Of the last edit that Quenby left one for.
   std::vector<std::string> notices =
       {};  ///< What a user should know: "16 bits a channel, read as 8".
 };

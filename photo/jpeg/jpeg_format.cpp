@@ -6,8 +6,8 @@
 #include "photo/jpeg/jpeg_end.h"
 #include "photo/jpeg/jpeg_picture_reader.h"
 #include "photo/jpeg/jpeg_picture_writer.h"
-#include "photo/metadata/exif_facts.h"
 #include "photo/metadata/kept_metadata.h"
+#include "photo/metadata/stated_facts.h"
 
 namespace pelorin::photo {
 namespace {
@@ -28,7 +28,7 @@ class JpegRowReader : public RowReader {
     facts_.height = header.height;
     facts_.channels = header.components;
     facts_.progressive = header.progressive;
-    addExifFacts(header.metadata, facts_);
+    addStatedFacts(header.metadata, facts_);
     // A profile for grey or CMYK does not describe RGB.
     if (header.components != 3) removeColourProfile(header.metadata);
     const auto tail = file.subspan(jpegEnd(file));

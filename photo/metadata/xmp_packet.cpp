@@ -8,6 +8,9 @@ namespace {
 
 constexpr std::string_view rdfSpace = "http://www.w3.org/1999/02/22-rdf-syntax-ns#";
 constexpr std::string_view whitespace = " \t\r\n";
+constexpr std::string_view empty =
+    "<x:xmpmeta xmlns:x=\"adobe:ns:meta/\"><rdf:RDF xmlns:rdf=\"http://www.w3.org/1999/02/"
+    "22-rdf-syntax-ns#\"></rdf:RDF></x:xmpmeta>";
 constexpr std::size_t mostParts = 1'000'000;
 constexpr int deepest = 100;
 
@@ -51,6 +54,11 @@ bool isRdf(pugi::xml_node element, std::string_view local) {
 
 pugi::xml_node rdfChild(pugi::xml_node element, std::string_view local) {
   return element.find_child([&](pugi::xml_node child) { return isRdf(child, local); });
+}
+
+pugi::xml_node addElement(pugi::xml_node description, XmpName name, const std::string& prefix) {
+  description.append_attribute(("xmlns:" + prefix).c_str()) = std::string(name.space).c_str();
+  return description.append_child((prefix + ":" + std::string(name.local)).c_str());
 }
 
 std::string trimmed(std::string_view text) {
@@ -163,10 +171,28 @@ XmpPacket::XmpPacket(std::string_view bytes) : state_(std::make_unique<State>())
   state_->rdf = root;
 }
 
-XmpPacket::XmpPacket()
-    : XmpPacket(
-          "<x:xmpmeta xmlns:x=\"adobe:ns:meta/\"><rdf:RDF xmlns:rdf=\"http://www.w3.org/1999/"
-          "02/22-rdf-syntax-ns#\"></rdf:RDF></x:xmpmeta>") {}
+XmpPacket::XmpPacket() : XmpPacket(empty) {}
+
+XmpPacket XmpPacket::ofItsOwn() {
+  // The mark of the byte order is part of the beginning's definition.
+  return XmpPacket("<?xpacket begin=\"\xEF\xBB\xBF\" id=\"W5M0MpCehiHzreSzNTczkc9d\"?>" +
+                   std::string(empty) + "<?xpacket end=\"w\"?>");
+}
+
+std::string XmpPacket::rdfName(std::string_view local) const {
+  const std::string_view root = state_->rdf.name();
+  return std::string(root.substr(0, root.find(':') + 1)) += local;
+}
+
+// One of its own for what is added, so that prefixes collide with no others.
+pugi::xml_node XmpPacket::addDescription() {
+  pugi::xml_node description = state_->rdf.append_child(rdfName("Description").c_str());
+  // All descriptions of a packet are about the same.
+  const std::string about = rdfName("about");
+  const pugi::xml_node first = rdfChild(state_->rdf, "Description");
+  description.append_attribute(about.c_str()) = first.attribute(about.c_str()).value();
+  return description;
+}
 
 std::vector<XmpProperty> XmpPacket::properties() const {
   std::vector<XmpProperty> found;
@@ -207,21 +233,27 @@ XmpProperty XmpPacket::property(XmpName name) const {
 }
 
 void XmpPacket::add(XmpName name, const std::string& prefix, const std::string& text) {
-  // A description of its own, so that the prefix collides with no other.
-  pugi::xml_node description = state_->rdf.append_child(
-      (std::string(state_->rdf.name(), std::string_view(state_->rdf.name()).find(':')) +
-       ":Description")
-          .c_str());
-  description.append_attribute(("xmlns:" + prefix).c_str()) = std::string(name.space).c_str();
-  const std::string written = prefix + ":" + std::string(name.local);
-  description.append_child(written.c_str()).text().set(text.c_str());
+  addElement(addDescription(), name, prefix).text().set(text.c_str());
+  state_->changed = true;
+}
+
+void XmpPacket::append(XmpName list, const std::string& prefix, const XmpStructure& item) {
+  pugi::xml_node owner = property(list).element_;
+  const bool isList = owner && !property(list).attribute_;
+  if (!isList) owner = addElement(addDescription(), list, prefix);
+  pugi::xml_node sequence = rdfChild(owner, "Seq");
+  if (!sequence) sequence = owner.append_child(rdfName("Seq").c_str());
+  pugi::xml_node written = sequence.append_child(rdfName("li").c_str());
+  written.append_attribute(("xmlns:" + item.prefix).c_str()) = std::string(item.space).c_str();
+  written.append_attribute(rdfName("parseType").c_str()) = "Resource";
+  for (const XmpField& field : item.fields)
+    written.append_child((item.prefix + ":" + field.local).c_str()).text().set(field.text.c_str());
   state_->changed = true;
 }
 
 void XmpPacket::take(XmpProperty property) {
   pugi::xml_node source = property.element_;
-  const std::string rdf(state_->rdf.name(), std::string_view(state_->rdf.name()).find(':'));
-  pugi::xml_node description = state_->rdf.append_child((rdf + ":Description").c_str());
+  pugi::xml_node description = addDescription();
   // Every prefix that the property can see; the nearest meaning of each.
   for (pugi::xml_node scope = property.attribute_ ? source : source.parent(); scope;
        scope = scope.parent()) {

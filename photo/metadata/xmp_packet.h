@@ -20,6 +20,16 @@ struct XmpName {
   std::string_view space, local;
 };
 
+/// A structure that is added to a packet.
+struct XmpField {
+  std::string local, text;
+};
+struct XmpStructure {
+  std::string_view space;  ///< Of all its fields.
+  std::string prefix;      ///< What the packet calls it there.
+  std::vector<XmpField> fields;
+};
+
 class XmpPacket;
 
 /// A property, field or list item of a packet, in whichever of RDF's spellings it stands: attribute
@@ -61,8 +71,10 @@ class XmpPacket {
   ///         never does, and bombs do), is nested deeper than 100 or is made of more than a million
   ///         elements and attributes, and std::bad_alloc.
   explicit XmpPacket(std::string_view bytes);
-  /// A packet without properties.
+  /// A packet without properties, and without processing instructions as an extension has none.
   XmpPacket();
+  /// A packet without properties that stands for itself.
+  static XmpPacket ofItsOwn();
 
   /// A property of the packet wherever it stands: files in the wild repeat some.
   std::vector<XmpProperty> properties(XmpName name) const;
@@ -74,6 +86,8 @@ class XmpPacket {
   /// Adds a property that the packet does not have.
   /// @param prefix  for its namespace, where the packet has none for it.
   void add(XmpName name, const std::string& prefix, const std::string& text);
+  /// Appends a structure to an ordered list; one is made where the packet has none.
+  void append(XmpName list, const std::string& prefix, const XmpStructure& item);
   /// Moves a property of another packet here.
   void take(XmpProperty property);
 
@@ -89,6 +103,9 @@ class XmpPacket {
     std::string original;
     std::string_view before, after;  // of the original: what stands around the document
   };
+
+  std::string rdfName(std::string_view local) const;
+  pugi::xml_node addDescription();
 
   std::unique_ptr<State> state_;  // stays where it is, since properties point into it
 };

@@ -60,7 +60,7 @@ using Extensions = std::map<std::string, Extension>;  // by name
 Extensions extensionsIn(const std::vector<MetadataSegment>& segments) {
   Extensions extensions;
   for (const MetadataSegment& segment : segments) {
-    if (!startsWith(segment, extensionMark)) continue;
+    if (!isXmpExtension(segment)) continue;
     const std::string_view body = textOf(segment).substr(extensionMark.size());
     if (body.size() < extensionHeader) continue;
     Extension& extension = extensions[std::string(body.substr(0, nameSize))];
@@ -170,12 +170,16 @@ std::vector<MetadataSegment> edited(const MetadataSegment& segment, Extensions& 
 
 }  // namespace
 
+bool isXmpExtension(const MetadataSegment& segment) {
+  return startsWith(segment, extensionMark);
+}
+
 void editXmp(std::vector<MetadataSegment>& segments, const std::function<void(XmpPacket&)>& edit,
              std::vector<Loss>& lost) {
   Extensions extensions = extensionsIn(segments);
   std::vector<MetadataSegment> result;
   for (const MetadataSegment& segment : segments) {
-    if (startsWith(segment, extensionMark)) continue;  // comes with its packet
+    if (isXmpExtension(segment)) continue;  // comes with its packet
     if (!startsWith(segment, packetMark)) {
       result.push_back(segment);
       continue;

@@ -11,6 +11,9 @@
 
 namespace pelorin::photo {
 
+/// Whether a segment is a part of an extension.
+bool isXmpExtension(const MetadataSegment& segment);
+
 /// Calls `edit` for each packet of XMP among the segments of a JPEG file: the packet itself and its
 /// extension, which is spread over several segments under the MD5 sum of all. What `edit` changes is
 /// written back; a packet that outgrows its segment moves its largest properties to the extension.

@@ -10,9 +10,9 @@
 #include <utility>
 
 #include "image_processing/core/checked_size.h"
-#include "photo/metadata/exif_facts.h"
 #include "photo/metadata/kept_metadata.h"
 #include "photo/metadata/segments.h"
+#include "photo/metadata/stated_facts.h"
 #include "photo/photo_error.h"
 #include "photo/png/png_chunks.h"
 
@@ -143,7 +143,7 @@ class PngRowReader : public RowReader {
     facts_.hasAlpha = (colourType & PNG_COLOR_MASK_ALPHA) != 0 || keyed;
     if (depth == 16) facts_.notices.push_back("has 16 bits a channel, read as 8");
     metadata_ = pngMetadata(file, isColour);
-    addExifFacts(metadata_.segments, facts_);
+    addStatedFacts(metadata_.segments, facts_);
     metadata_.storedSize = size_;
     metadata_.orientation = facts_.orientation;
 

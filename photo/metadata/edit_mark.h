@@ -1,0 +1,32 @@
+#pragma once
+
+#include <optional>
+#include <span>
+#include <string>
+#include <vector>
+
+#include "photo/metadata/loss.h"
+#include "photo/metadata/metadata_segment.h"
+
+namespace pelorin::photo {
+
+/// What Quenby did to a photo, as its XMP tells it: an event of xmpMM:History with the action
+/// "edited". Texts are UTF-8.
+struct EditMark {
+  std::string version;     ///< Of Quenby, as in the software agent "Quenby 1.2".
+  std::string parameters;  ///< "AE0 slider=0.4"
+  std::string when;        ///< ISO 8601; empty where it is not stated.
+
+  friend bool operator==(const EditMark&, const EditMark&) = default;
+};
+
+/// Appends a mark to the history that the segments of a JPEG file tell; a packet is made where there
+/// is none. Packets that cannot be read go, as `editXmp` has it.
+void addEditMark(std::vector<MetadataSegment>& segments, const EditMark& mark,
+                 std::vector<Loss>& lost);
+
+/// The last mark of Quenby's in the history that the segments tell; nothing where there is none.
+/// Any bytes are safe.
+std::optional<EditMark> editMarkOf(std::span<const MetadataSegment> segments);
+
+}  // namespace pelorin::photo
