@@ -1,13 +1,20 @@
 #include "photo/file_io.h"
 
 #include <fcntl.h>
+#include <linux/fs.h>
+#include <sys/file.h>
 #include <sys/stat.h>
+#include <sys/syscall.h>
+#include <sys/xattr.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <atomic>
+#include <cctype>
 #include <cerrno>
 #include <filesystem>
 #include <string>
+#include <string_view>
 #include <system_error>
 #include <utility>
 
@@ -17,6 +24,9 @@ namespace pelorin::photo {
 namespace {
 
 constexpr std::uint64_t largestFile = std::uint64_t{1} << 31;
+
+// A temporary is called so, with numbers between the two.
+constexpr std::string_view temporaryStart = ".quenby-", temporaryEnd = ".tmp";
 
 [[noreturn]] void throwError(int code, const std::string& path) {
   throw std::system_error(code, std::generic_category(), path);
@@ -51,8 +61,26 @@ void writeAll(Descriptor& file, const std::string& path, std::span<const std::ui
       throwError(errno, path);
     }
   }
-  // A full disk may show only on closing.
-  if (::close(file.release()) != 0 && errno != EINTR) throwError(errno, path);
+}
+
+// Where no error can be told from now on, or where there is nothing to make sure of.
+bool cannotBeSynced(int code) {
+  return code == EINVAL || code == ENOTSUP || code == EROFS || code == ENOSYS;
+}
+
+void sync(const Descriptor& file, const std::string& path) {
+  while (::fsync(file.get()) != 0) {
+    if (cannotBeSynced(errno)) return;
+    if (errno != EINTR) throwError(errno, path);
+  }
+}
+
+// A name that is not on the disk yet means the old file after a power cut, which is whole.
+void syncFolder(const char* folder) {
+  const int descriptor = ::open(folder, O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+  if (descriptor < 0) return;
+  ::fsync(descriptor);
+  ::close(descriptor);
 }
 
 // The file that `path` names after following symbolic links, which need not exist.
@@ -66,27 +94,94 @@ fs::path linkTarget(fs::path path) {
   return path;
 }
 
-// Owner and permissions as those of the file to replace; the owner as far as we may.
-void takeAfter(const struct stat& old, const Descriptor& file, const std::string& path) {
+bool isNotAllowed(int code) {
+  return code == EPERM || code == EACCES || code == ENOTSUP || code == ENODATA;
+}
+
+// Attributes that only the system may write, and those of systems that have none, are passed over.
+void copyAttributes(const std::string& from, const Descriptor& to, const std::string& path) {
+  std::string names, value;
+  for (;;) {
+    const ssize_t size = ::listxattr(from.c_str(), nullptr, 0);
+    if (size <= 0) return;
+    names.resize(static_cast<std::size_t>(size));
+    const ssize_t listed = ::listxattr(from.c_str(), names.data(), names.size());
+    if (listed < 0 && errno == ERANGE) continue;  // more than a moment ago
+    names.resize(static_cast<std::size_t>(std::max<ssize_t>(listed, 0)));
+    break;
+  }
+  for (std::size_t at = 0; at < names.size();
+       at += std::string_view(names.c_str() + at).size() + 1) {
+    const char* const name = names.c_str() + at;
+    value.resize(65536);  // the most that the system takes
+    const ssize_t size = ::getxattr(from.c_str(), name, value.data(), value.size());
+    if (size < 0) continue;
+    const auto count = static_cast<std::size_t>(size);
+    if (::fsetxattr(to.get(), name, value.data(), count, 0) != 0 && !isNotAllowed(errno)) {
+      throwError(errno, path);
+    }
+  }
+}
+
+// As the file to replace: owner as far as we may, permissions, attributes.
+void takeAfter(const struct stat& old, const std::string& oldPath, const Descriptor& file,
+               const std::string& path) {
   const bool keepsOwner = ::fchown(file.get(), old.st_uid, old.st_gid) == 0;
   const mode_t permissions = old.st_mode & (keepsOwner ? 07777 : 0777);
   if (::fchmod(file.get(), permissions) != 0) throwError(errno, path);
+  copyAttributes(oldPath, file, path);
 }
 
-// A new empty file in `folder`, whose path `path` gets.
+void takeTimes(const struct stat& old, const Descriptor& file, const std::string& path) {
+  const timespec times[] = {old.st_atim, old.st_mtim};
+  if (::futimens(file.get(), times) != 0) throwError(errno, path);
+}
+
+// A new empty file in `folder`, whose path `path` gets; locked, so that nobody takes it for left.
 Descriptor makeTemporary(const fs::path& folder, mode_t mode, std::string& path) {
   static std::atomic<unsigned> counter = 0;
   for (;;) {
-    std::string name = folder / (".quenby-" + std::to_string(::getpid()) + "-" +
-                                 std::to_string(counter++) + ".tmp");
+    std::string name = folder / (std::string(temporaryStart) + std::to_string(::getpid()) + "-" +
+                                 std::to_string(counter++) + std::string(temporaryEnd));
     try {
       Descriptor file(name, O_WRONLY | O_CREAT | O_EXCL, mode);
       path = std::move(name);
-      return file;
+      ::flock(file.get(), LOCK_EX | LOCK_NB);
+      struct stat made = {};
+      // Somebody who sweeps may have come before the lock.
+      if (::fstat(file.get(), &made) != 0 || made.st_nlink != 0) return file;
     } catch (const std::system_error& error) {
       if (error.code() != std::errc::file_exists) throw;
     }
   }
+}
+
+bool isTemporaryName(std::string_view name) {
+  if (name.size() <= temporaryStart.size() + temporaryEnd.size()) return false;
+  if (!name.starts_with(temporaryStart) || !name.ends_with(temporaryEnd)) return false;
+  name.remove_prefix(temporaryStart.size());
+  name.remove_suffix(temporaryEnd.size());
+  return std::all_of(name.begin(), name.end(), [](char c) {
+    return c == '-' || std::isdigit(static_cast<unsigned char>(c)) != 0;
+  });
+}
+
+// The rename that fails where there is a file.
+int renameToNew(const char* from, const char* to) {
+  if (::syscall(SYS_renameat2, AT_FDCWD, from, AT_FDCWD, to, RENAME_NOREPLACE) == 0) return 0;
+  if (errno != ENOSYS && errno != EINVAL && errno != ENOTSUP) return -1;
+  // File systems without it: a second name is never given over a file.
+  if (::link(from, to) == 0) return ::unlink(from);
+  if (errno == EEXIST) return -1;
+  // And without second names: an empty file keeps the place.
+  const int place = ::open(to, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0600);
+  if (place < 0) return -1;
+  ::close(place);
+  if (::rename(from, to) == 0) return 0;
+  const int code = errno;
+  ::unlink(to);
+  errno = code;
+  return -1;
 }
 
 }  // namespace
@@ -114,7 +209,8 @@ std::vector<std::uint8_t> readFile(const std::string& path) {
 }
 
 // Delegates, so that the destructor also runs when this throws.
-Replacement::Replacement(const std::string& path, std::span<const std::uint8_t> bytes)
+Replacement::Replacement(const std::string& path, std::span<const std::uint8_t> bytes,
+                         const ReplaceOptions& options)
     : Replacement() {
   struct stat old = {};
   const bool exists = ::stat(path.c_str(), &old) == 0;
@@ -123,29 +219,59 @@ Replacement::Replacement(const std::string& path, std::span<const std::uint8_t> 
     // through its descriptor, has none to take over.
     Descriptor file(path, O_WRONLY | O_TRUNC);
     writeAll(file, path, bytes);
+    // A full disk may show only on closing.
+    if (::close(file.release()) != 0 && errno != EINTR) throwError(errno, path);
     return;
   }
+  if (exists && !options.mayReplace) throwError(EEXIST, path);
   // The rename needs only the folder; a protected file stays protected all the same.
   if (exists && ::faccessat(AT_FDCWD, path.c_str(), W_OK, AT_EACCESS) != 0) throwError(errno, path);
   const fs::path target = linkTarget(path);
   target_ = target;
+  folder_ = target.has_parent_path() ? target.parent_path().string() : ".";
+  mayReplace_ = options.mayReplace;
   Descriptor file = makeTemporary(target.parent_path(), exists ? 0600 : 0666, temporary_);
-  if (exists) takeAfter(old, file, temporary_);
+  if (exists) takeAfter(old, path, file, temporary_);
   writeAll(file, temporary_, bytes);
+  if (exists && options.keepTimes) takeTimes(old, file, temporary_);
+  sync(file, temporary_);
+  lock_ = file.release();
 }
 
 Replacement::~Replacement() {
   if (!temporary_.empty()) ::unlink(temporary_.c_str());
+  if (lock_ >= 0) ::close(lock_);
 }
 
 void Replacement::replace() {
   if (temporary_.empty()) return;
-  if (::rename(temporary_.c_str(), target_.c_str()) != 0) throwError(errno, target_);
+  const char* const from = temporary_.c_str();
+  const char* const to = target_.c_str();
+  if ((mayReplace_ ? ::rename(from, to) : renameToNew(from, to)) != 0) throwError(errno, target_);
   temporary_.clear();
+  ::close(std::exchange(lock_, -1));
+  syncFolder(folder_.c_str());
 }
 
-void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes) {
-  Replacement(path, bytes).replace();
+void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes,
+                         const ReplaceOptions& options) {
+  Replacement(path, bytes, options).replace();
+}
+
+void sweepLeftovers(const std::string& folder) {
+  std::error_code ignored;
+  for (fs::directory_iterator entry(folder.empty() ? "." : folder, ignored), end; entry != end;
+       entry.increment(ignored)) {
+    if (!isTemporaryName(entry->path().filename().native())) continue;
+    const int file = ::open(entry->path().c_str(), O_WRONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC);
+    if (file < 0) continue;
+    struct stat status = {};
+    // Once locked it is nobody's; without a name somebody else has removed it.
+    const bool isLeft = ::flock(file, LOCK_EX | LOCK_NB) == 0 && ::fstat(file, &status) == 0 &&
+                        S_ISREG(status.st_mode) && status.st_nlink != 0;
+    if (isLeft) ::unlink(entry->path().c_str());
+    ::close(file);
+  }
 }
 
 }  // namespace pelorin::photo

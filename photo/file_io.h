@@ -12,9 +12,18 @@ namespace pelorin::photo {
 ///         2 GiB.
 std::vector<std::uint8_t> readFile(const std::string& path);
 
+/// What becomes of a file that is there already.
+struct ReplaceOptions {
+  bool mayReplace = true;  ///< Else it stays, and to replace it is an error (EEXIST).
+  bool keepTimes = false;  ///< The new file has its times of access and change.
+};
+
 /// A file that is written beside another and then takes its place. A replaced file keeps its
-/// permissions, a symbolic link stays and the file it names is replaced. Pipes, devices and files
-/// without a name are written directly.
+/// permissions and extended attributes, and its owner where allowed; a symbolic link stays and the
+/// file it names is replaced. Pipes, devices and files without a name are written directly.
+///
+/// The data is on the disk before it takes its place, so that a power cut leaves the old file or
+/// the new one. A process that is killed leaves a temporary behind, which `sweepLeftovers` removes.
 ///
 /// A process that wants "file too large" as an error rather than as its end ignores SIGXFSZ, and
 /// SIGPIPE likewise.
@@ -22,25 +31,34 @@ class Replacement {
  public:
   /// Writes `bytes` to a temporary in the folder of `path`.
   /// @throws std::system_error when it cannot be written; nothing is then left behind.
-  Replacement(const std::string& path, std::span<const std::uint8_t> bytes);
+  Replacement(const std::string& path, std::span<const std::uint8_t> bytes,
+              const ReplaceOptions& options = {});
   /// Removes the temporary, unless it has taken its place.
   ~Replacement();
   Replacement(const Replacement&) = delete;
   Replacement& operator=(const Replacement&) = delete;
 
   /// Takes the place, once. Allocates nothing unless it throws.
-  /// @throws std::system_error when that fails; the old file is untouched.
+  /// @throws std::system_error when that fails, or when a file is there that may not be replaced,
+  ///         even since a moment ago; the old file is untouched.
   void replace();
 
  private:
   Replacement() = default;
 
-  std::string target_, temporary_;  // both empty when written directly
+  std::string target_, temporary_, folder_;  // all empty when written directly
+  bool mayReplace_ = true;
+  int lock_ = -1;  // the open temporary: others see from it that it is in use
 };
 
 /// Replaces `path` in one step: a `Replacement` that takes its place at once.
 /// @throws std::system_error when it cannot be written; the old file is then untouched and nothing
 ///         is left behind.
-void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes);
+void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes,
+                         const ReplaceOptions& options = {});
+
+/// Removes the temporaries that killed processes left in `folder` ("" is the current one). Those
+/// that a process still writes stay. Never fails: what cannot be removed stays.
+void sweepLeftovers(const std::string& folder);
 
 }  // namespace pelorin::photo

@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
+#include <sys/xattr.h>
 #include <unistd.h>
 
 #include <csignal>
@@ -253,6 +254,62 @@ TEST_F(FileIo, LeavesTheOldFileUntilTheReplacementTakesItsPlace) {
   replacement.replace();
   EXPECT_EQ(readFile(path("a")), countingBytes(9));
   EXPECT_EQ(entries(), 1u);
+}
+
+TEST_F(FileIo, DoesNotReplaceAFileThatAppearedMeanwhile) {
+  const ReplaceOptions newOnly = {.mayReplace = false};
+  Replacement replacement(path("file"), countingBytes(9), newOnly);
+  writeFileAtomically(path("file"), countingBytes(3));
+  EXPECT_EQ(errorNumberOf([&] { replacement.replace(); }), EEXIST);
+  EXPECT_EQ(errorNumberOf([&] { writeFileAtomically(path("file"), {}, newOnly); }), EEXIST);
+  EXPECT_EQ(readFile(path("file")), countingBytes(3));
+  writeFileAtomically(path("new"), countingBytes(4), newOnly);
+  EXPECT_EQ(readFile(path("new")), countingBytes(4));
+  writeFileAtomically("/dev/null", countingBytes(4), newOnly);  // nothing to lose
+}
+
+TEST_F(FileIo, KeepsTheTimesOfTheFileItReplacesWhenAsked) {
+  writeFileAtomically(path("file"), countingBytes(3));
+  const timespec times[] = {{1'000'000'000, 5}, {1'100'000'000, 7}};
+  ASSERT_EQ(::utimensat(AT_FDCWD, path("file").c_str(), times, 0), 0);
+  writeFileAtomically(path("file"), countingBytes(4), {.keepTimes = true});
+  struct stat status = {};
+  ASSERT_EQ(::stat(path("file").c_str(), &status), 0);
+  EXPECT_EQ(status.st_mtim.tv_sec, 1'100'000'000);
+  EXPECT_EQ(status.st_mtim.tv_nsec, 7);
+  EXPECT_EQ(status.st_size, 4);
+  writeFileAtomically(path("file"), countingBytes(5));
+  ASSERT_EQ(::stat(path("file").c_str(), &status), 0);
+  EXPECT_GT(status.st_mtim.tv_sec, 1'100'000'000);
+}
+
+TEST_F(FileIo, KeepsTheExtendedAttributesOfTheFileItReplaces) {
+  writeFileAtomically(path("file"), countingBytes(3));
+  const std::string tag = "holiday";
+  if (::setxattr(path("file").c_str(), "user.tag", tag.data(), tag.size(), 0) != 0) {
+    GTEST_SKIP() << "no extended attributes in the folder for temporary files";
+  }
+  writeFileAtomically(path("file"), countingBytes(4));
+  std::string kept(100, ' ');
+  const ssize_t size = ::getxattr(path("file").c_str(), "user.tag", kept.data(), kept.size());
+  ASSERT_EQ(size, static_cast<ssize_t>(tag.size()));
+  EXPECT_EQ(kept.substr(0, tag.size()), tag);
+}
+
+TEST_F(FileIo, SweepsWhatKilledProcessesLeft) {
+  for (const char* name : {".quenby-12-0.tmp", ".quenby-12-1.tmp", ".quenby-a-1.tmp", "a.tmp",
+                           ".quenby-.tmp", ".quenby-1-1.tmp.jpg"}) {
+    writeFileAtomically(path(name), countingBytes(3));
+  }
+  fs::create_directory(path(".quenby-3-3.tmp"));
+  Replacement written(path("file"), countingBytes(9));
+  sweepLeftovers(folder_.string());
+  EXPECT_FALSE(fs::exists(path(".quenby-12-0.tmp")));
+  EXPECT_FALSE(fs::exists(path(".quenby-12-1.tmp")));
+  EXPECT_EQ(entries(), 6u);
+  written.replace();
+  EXPECT_EQ(readFile(path("file")), countingBytes(9));
+  sweepLeftovers(path("missing"));
 }
 
 TEST_F(FileIo, LeavesOneWholeFileWhenSeveralThreadsWriteIt) {
