@@ -6,7 +6,6 @@
 #include <stdexcept>
 
 #include "bindings/java/cancellations.h"
-#include "bindings/java/filter_photo.h"
 #include "bindings/java/java_arrays.h"
 #include "bindings/java/photo_errors.h"
 #include "image_processing/dupe/cdf_distance.h"
@@ -16,20 +15,20 @@
 #include "jni/native_methods.h"
 #include "photo/collection/photo_record.h"
 #include "photo/collection/photo_score.h"
+#include "photo/filter_photo.h"
 #include "photo/photo.h"
 
 namespace pelorin::quenby {
 
-using image_processing::FaceFractions;
 using image_processing::GreenCDF;
 
 namespace {
 
-std::vector<FaceFractions> facesOf(JNIEnv* env, jfloatArray array) {
+std::vector<photo::Face> facesOf(JNIEnv* env, jfloatArray array) {
   const std::vector<float> sides = floatsOf(env, array);
   if (sides.size() % 4 != 0)
     throw std::invalid_argument("faces: needs left, top, right, bottom of each");
-  std::vector<FaceFractions> faces;
+  std::vector<photo::Face> faces;
   for (std::size_t i = 0; i < sides.size(); i += 4)
     faces.push_back({sides[i], sides[i + 1], sides[i + 2], sides[i + 3]});
   return faces;
@@ -48,15 +47,14 @@ GreenCDF cdfOf(JNIEnv* env, jfloatArray array) {
 jbyteArray filterBytes(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
                        jint length, jint quality, jint rotation, jfloatArray faces, jint scale,
                        jstring filter, jstring params, jlong cancel) {
-  const FilterRequest request{.filter = toString(env, filter),
-                              .params = toString(env, params),
-                              .quality = quality,
-                              .rotation = rotation,
-                              .scale = scale,
-                              .faces = facesOf(env, faces),
-                              .stop = cancellations().token(cancel)};
+  const std::stop_token stop = cancellations().token(cancel);
+  const photo::FilterRequest request{.filter = toString(env, filter),
+                                     .params = toString(env, params),
+                                     .faces = facesOf(env, faces),
+                                     .open = {.scale = scale, .rotate = rotation, .stop = stop},
+                                     .save = {.quality = quality, .stop = stop}};
   const FileBytes file(env, array, buffer, offset, length);
-  return javaArray(env, filterPhoto(file.bytes(), request));
+  return javaArray(env, photo::filterPhoto(file.bytes(), request, photo::formatNamed("JPEG")));
 }
 
 jfloat niqe(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset, jint length,

@@ -12,7 +12,7 @@ namespace pelorin::quenby {
 // beyond the limits, CancellationException after a cancellation, IllegalArgumentException that names
 // the argument, OutOfMemoryError.
 
-/// The file that `quenby enhance` makes of it, see FilterRequest.
+/// The file that `quenby enhance` makes of it, see photo::FilterRequest.
 /// @param faces  left, top, right, bottom of each as fractions of the upright, turned picture; null
 ///               is none. Those that the file knows of come with them.
 jbyteArray filterBytes(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset,

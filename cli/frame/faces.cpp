@@ -1,12 +1,9 @@
 #include "cli/frame/faces.h"
 
-#include <fmt/format.h>
-
 #include <algorithm>
 #include <array>
 #include <cmath>
 #include <limits>
-#include <memory>
 #include <string_view>
 
 #include "cli/frame/errors.h"
@@ -14,8 +11,6 @@
 
 namespace pelorin::cli {
 namespace {
-
-using image_processing::BoundingBox;
 
 // No face is twice as far to the right as the picture is wide.
 constexpr float largestFraction = 2.0f;
@@ -48,15 +43,6 @@ Face readFace(const std::string& text) {
   return {left, top, right, bottom, inPixels};
 }
 
-BoundingBox boxOf(const Face& face, std::uint32_t width, std::uint32_t height, int scale) {
-  // A division by a power of two is exact.
-  const float divisor = static_cast<float>(scale);
-  const float columns = face.inPixels ? 1.0f / divisor : static_cast<float>(width);
-  const float rows = face.inPixels ? 1.0f / divisor : static_cast<float>(height);
-  return image_processing::boxInPixels({face.left, face.top, face.right, face.bottom}, columns,
-                                       rows);
-}
-
 }  // namespace
 
 void addFaceOption(Verb verb, std::vector<std::string>& texts, std::string& source) {
@@ -72,35 +58,10 @@ void addFaceOption(Verb verb, std::vector<std::string>& texts, std::string& sour
       .oneOf({"xmp", "none"});
 }
 
-std::vector<Face> allFaces(std::vector<Face> faces, const photo::Photo& photo) {
-  for (const photo::KnownFace& face : photo.faces) {
-    if (face.right <= 0 || face.bottom <= 0 || face.left >= 1 || face.top >= 1) continue;
-    faces.push_back({static_cast<float>(face.left), static_cast<float>(face.top),
-                     static_cast<float>(face.right), static_cast<float>(face.bottom), false});
-  }
-  return faces;
-}
-
 std::vector<Face> readFaces(const std::vector<std::string>& texts) {
   std::vector<Face> faces;
   for (const std::string& text : texts) faces.push_back(readFace(text));
   return faces;
-}
-
-image_processing::ImageMetadata metadataWithFaces(const std::vector<Face>& faces,
-                                                  std::uint32_t width, std::uint32_t height,
-                                                  int scale) {
-  image_processing::ImageMetadata metadata;
-  for (const Face& face : faces) {
-    const BoundingBox box = boxOf(face, width, height, scale);
-    if (face.inPixels && (box.left >= static_cast<std::int64_t>(width) ||
-                          box.top >= static_cast<std::int64_t>(height))) {
-      throw FileError(fmt::format("--face {},{},{},{} lies outside the picture", face.left,
-                                  face.top, face.right, face.bottom));
-    }
-    metadata.faces.push_back(std::make_shared<BoundingBox>(box));
-  }
-  return metadata;
 }
 
 }  // namespace pelorin::cli

@@ -2,7 +2,6 @@
 
 #include <fmt/format.h>
 
-#include <memory>
 #include <optional>
 
 #include "cli/frame/each_photo.h"
@@ -13,15 +12,11 @@
 #include "cli/frame/photo_files.h"
 #include "cli/frame/raw_option.h"
 #include "cli/frame/recycled_memory.h"
-#include "image_processing/filters/default_filter_factory.h"
-#include "image_processing/filters/filtered_image.h"
+#include "photo/filter_photo.h"
 
 namespace pelorin::cli {
 namespace {
 
-using image_processing::defaultFilterConfigValue;
-using image_processing::DefaultFilterFactory;
-using image_processing::FilteredImage;
 using image_processing::Image;
 using image_processing::RGBA8Pixel;
 
@@ -65,16 +60,8 @@ Done process(const Work& work, const PlannedFile& file) {
   stopIfInterrupted();
   Image<RGBA8Pixel>& picture = *photo.image;
   Done done = {picture.width, picture.height, {}, photo.facts.notices};
-  {
-    // The session ends before the encoder begins: its masks are several times the picture.
-    FilteredImage session(
-        photo.image,
-        metadataWithFaces(allFaces(work.faces, photo), done.width, done.height, work.photo.scale),
-        "", defaultFilterConfigValue, DefaultFilterFactory::filterFactory());
-    session.applyFilterWithParams(work.filter.filter.name, work.filter.params,
-                                  defaultFilterConfigValue,
-                                  /*output=*/picture);
-  }
+  photo::filterInPlace(photo, work.filter.filter.name, work.filter.params, work.faces,
+                       work.photo.scale);
   stopIfInterrupted();
   done.lost = savePicture(file.output, picture, photo.metadata, work.save);
   if (!work.save.raw) spare.keep(picture);

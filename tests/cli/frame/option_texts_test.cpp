@@ -104,9 +104,9 @@ TEST(FaceOption, IsRefusedWhereItWouldBeIgnored) {
   }
   const auto beside = readFaces({"400,50,500,250"}), below = readFaces({"0,300,500,350"});
   EXPECT_NO_THROW(metadataWithFaces(beside, 401, 300));
-  EXPECT_THROW(metadataWithFaces(beside, 400, 300), FileError);
-  EXPECT_THROW(metadataWithFaces(below, 400, 300), FileError);
-  EXPECT_THROW(metadataWithFaces(beside, 100, 75, /*scale=*/4), FileError);
+  EXPECT_THROW(metadataWithFaces(beside, 400, 300), photo::PhotoError);
+  EXPECT_THROW(metadataWithFaces(below, 400, 300), photo::PhotoError);
+  EXPECT_THROW(metadataWithFaces(beside, 100, 75, /*scale=*/4), photo::PhotoError);
 }
 
 TEST(RawOption, IsTwoWholeNumbers) {

@@ -163,7 +163,7 @@ TEST(Enhance, FailsForAFaceBesideThePictureAndGoesOnWithTheOthers) {
   const Finished run = quenby({"enhance", small, large, "-o", out, "--face", "70,10,110,50", "-q"});
   EXPECT_EQ(run.exitCode, 1);
   EXPECT_EQ(run.errors,
-            "quenby enhance: " + small + ": --face 70,10,110,50 lies outside the picture\n");
+            "quenby enhance: " + small + ": the face 70,10,110,50 lies outside the picture\n");
   EXPECT_FALSE(folder.has("out/small_AE0.jpg"));
   EXPECT_TRUE(folder.has("out/large_AE0.jpg"));
 }
