@@ -14,9 +14,11 @@
 #include "image_processing/autoenhance/lightness/cdf.h"
 #include "image_processing/autoenhance/lightness/lightness_histogram.h"
 #include "image_processing/autoenhance/masks/flatness_mask.h"
+#include "image_processing/autoenhance/masks/flatness_rows.h"
 #include "image_processing/autoenhance/masks/grid_blur.h"
 #include "image_processing/autoenhance/masks/grid_slice.h"
 #include "image_processing/autoenhance/masks/grid_splat.h"
+#include "image_processing/autoenhance/masks/summed_area_rows.h"
 #include "image_processing/dupe/green_cdf.h"
 #include "image_processing/features/brief_bits.h"
 #include "image_processing/features/fast.h"
@@ -206,6 +208,78 @@ Kernel flatness(const Photo& photo) {
       out);
 }
 
+// The loops of the flatness mask.
+
+template <typename Mask>
+Kernel flatnessWeights(const Photo& photo) {
+  const Output<float> out(photo.width, photo.height);
+  return kernelOf(
+      weighRow<Mask>, weighRowScalar<Mask>,
+      [=, lightness = lightnessOf(photo), base = smoothed<Mask>(photo)](auto* kernel) {
+        kernel(flatnessWeight(2 * flatnessRadius + 1), lightness.data.get(), base.data.get(),
+               out.image.data.get(), photo.pixelCount());
+      },
+      out);
+}
+
+/// Weights of about the size that the mask's have, for a table that is larger by a window; behind
+/// each row, the padding.
+Image<float> tableWeights(const Photo& photo) {
+  const std::uint32_t n = 2 * flatnessRadius + 1, band = sumRowsAtOnce;
+  const Image<float> lightness = lightnessOf(photo);
+  Image<float> weights(photo.width + n + sumRowsPadding,
+                       (photo.height + n + band - 1) / band * band);
+  weights.set(0.0f);
+  for (std::uint32_t y = 0; y < weights.height; ++y) {
+    for (std::uint32_t x = 0; x < photo.width + n; ++x) {
+      const float one = lightness.row(y % photo.height)[x % photo.width];
+      weights.row(y)[x] = one / static_cast<float>(n * n);
+    }
+  }
+  return weights;
+}
+
+/// Turns weights into sums, and clears what the kernel left behind the rows.
+void sumTable(decltype(sumRows)* kernel, Image<float>& table) {
+  const std::uint32_t width = table.width - sumRowsPadding;
+  const std::vector<float> zeros(table.width);
+  const float* above = zeros.data();
+  for (std::uint32_t y = 0; y < table.height; y += sumRowsAtOnce) {
+    kernel(above, table.row(y), table.width, width);
+    above = table.row(y + sumRowsAtOnce - 1);
+  }
+  for (std::uint32_t y = 0; y < table.height; ++y)
+    std::fill_n(table.row(y) + width, sumRowsPadding, 0.0f);
+}
+
+Kernel flatnessSums(const Photo& photo) {
+  const Image<float> weights = tableWeights(photo);
+  const Output<float> out(weights.width, weights.height);
+  return kernelOf(
+      sumRows, sumRowsScalar,
+      [=, table = out.image](auto* kernel) mutable {
+        std::copy_n(weights.data.get(), weights.pixelCount(), table.data.get());
+        sumTable(kernel, table);
+      },
+      out);
+}
+
+template <typename Mask>
+Kernel flatnessShape(const Photo& photo) {
+  constexpr std::ptrdiff_t n = 2 * flatnessRadius + 1;
+  Image<float> table = tableWeights(photo);
+  sumTable(sumRowsScalar, table);
+  const Output<Mask> out(photo.width, photo.height);
+  return kernelOf(
+      shapeRow<Mask>, shapeRowScalar<Mask>,
+      [=, shape = std::make_shared<FlatnessShape>()](auto* kernel) {
+        for (std::uint32_t y = 0; y < photo.height; ++y) {
+          kernel(table.row(y), table.row(y + n), n, *shape, out.image.row(y), photo.width);
+        }
+      },
+      out);
+}
+
 /// The pass over the pixels as one slider position asks for it; both masks are the smoothing.
 template <typename Mask, bool withMasks>
 Kernel pass(const Photo& photo) {
@@ -373,9 +447,14 @@ const std::vector<KernelRow>& kernelRows() {
       {"blur", picture, gridBlur},
       {"slice/float", picture, gridSlice<float>},
       {"flatness/float", picture, flatness<float>},
+      {"flatness/weights/float", row, flatnessWeights<float>},
+      {"flatness/sums", picture, flatnessSums},
+      {"flatness/shape/float", picture, flatnessShape<float>},
       {"pass/float", row, pass<float, true>},
       {"slice/8bit", picture, gridSlice<Quantized>},
       {"flatness/8bit", picture, flatness<Quantized>},
+      {"flatness/weights/8bit", row, flatnessWeights<Quantized>},
+      {"flatness/shape/8bit", picture, flatnessShape<Quantized>},
       {"pass/8bit", row, pass<Quantized, true>},
       {"pass/no-masks", row, pass<float, false>},
       {"look/ZebraBW/vignette", picture, look<ZebraBWFilter, true>},
