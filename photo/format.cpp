@@ -13,7 +13,7 @@
 namespace pelorin::photo {
 namespace {
 
-// Raw pixels last: no bytes tell that they are some.
+// The usual one first; raw pixels last: no bytes tell that they are some.
 const std::array<Format, 3>& table() {
   static const std::array<Format, 3> rows = {jpegFormat, pngFormat, rawFormat};
   return rows;
@@ -52,6 +52,10 @@ std::span<const Format> formats() {
 
 const Format& rawPixels() {
   return table().back();
+}
+
+const Format& usualFormat() {
+  return table().front();
 }
 
 const Format& formatOf(std::span<const std::uint8_t> file) {
@@ -94,6 +98,14 @@ std::string pictureExtensions() {
   std::vector<std::string_view> names;
   for (const Format& format : pictureTable())
     names.insert(names.end(), format.extensions.begin(), format.extensions.end());
+  return listed(names);
+}
+
+std::string lossyFormats() {
+  std::vector<std::string_view> names;
+  for (const Format& format : pictureTable()) {
+    if (format.losesDetail) names.push_back(format.name);
+  }
   return listed(names);
 }
 

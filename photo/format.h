@@ -17,6 +17,7 @@ struct Format {
   std::span<const std::string_view> extensions;  ///< ".jpg" first: what results are called.
   bool scalesWhileDecoding;                      ///< Otherwise the scaling follows.
   bool keepsAlpha;
+  bool losesDetail;  ///< How much, `SaveOptions::quality` says.
 
   /// Whether bytes begin as a file of this format does.
   bool (*recognises)(std::span<const std::uint8_t> file);
@@ -42,6 +43,9 @@ std::span<const Format> formats();
 /// The one of packed RGBA bytes, which nothing in a file tells.
 const Format& rawPixels();
 
+/// What a picture is written in where nothing says it.
+const Format& usualFormat();
+
 /// The format that some bytes are in.
 /// @throws PhotoError when they are none; a known kind that cannot be read is named, and how to
 ///         convert it.
@@ -62,5 +66,8 @@ std::string pictureFormats();
 
 /// ".jpg, .jpeg, .jpe or .png"
 std::string pictureExtensions();
+
+/// "JPEG": those that `SaveOptions::quality` is for.
+std::string lossyFormats();
 
 }  // namespace pelorin::photo

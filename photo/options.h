@@ -20,11 +20,19 @@ struct OpenOptions {
   std::stop_token stop = {};  ///< Asked between steps; the default never stops.
 };
 
+/// How much colour a file holds, where its format has a choice.
+enum class ColourDetail {
+  usual,  ///< As photos have it: less of it than of brightness in formats that lose something.
+  full,   ///< For thin lines and text.
+  none,   ///< For grey pictures: one channel, red.
+};
+
 struct SaveOptions {
   int quality = 90;                   ///< 1 ... 100, for formats that lose something.
   std::stop_token stop = {};          ///< Asked between steps; the default never stops.
   KeepOptions keep = {};              ///< Of the metadata.
   std::optional<EditMark> mark = {};  ///< Added to the history, whatever else is kept.
+  ColourDetail colour = ColourDetail::usual;
 };
 
 /// @throws Stopped when `stop` asks for it.

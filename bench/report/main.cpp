@@ -17,7 +17,7 @@
 #include "bench/report/whole_file.h"
 #include "bench/support/instruction_sets.h"
 #include "photo/file_io.h"
-#include "photo/png/png_file.h"
+#include "photo/photo.h"
 
 namespace pelorin::bench {
 namespace {
@@ -59,8 +59,8 @@ std::string machine() {
 
 std::string scale(const std::string& folder) {
   const Scale measured = measureScale(QUENBY_COMMAND);
-  write(folder + "/performance_time.png", photo::encodePng(cli::drawPlot(measured.time)));
-  write(folder + "/performance_memory.png", photo::encodePng(cli::drawPlot(measured.memory)));
+  write(folder + "/performance_time.png", photo::save(cli::drawPlot(measured.time), "PNG"));
+  write(folder + "/performance_memory.png", photo::save(cli::drawPlot(measured.memory), "PNG"));
   return measured.tables;
 }
 

@@ -46,17 +46,16 @@ Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter)
   if (options.rotate % 90 != 0) throw UsageError("--rotate: must be a multiple of 90");
   work.photo = {
       .scale = options.scale, .rotate = options.rotate, .faces = options.knownFaces == "xmp"};
-  if (!options.raw.empty()) {
-    if (options.scale != 1) throw UsageError("--scale: raw pixels are read at their full size");
-    if (options.inputs.recursive) throw UsageError("--raw: name the files, folders hold JPEG");
-    work.photo.raw = readRawSize(options.raw);
+  work.photo.raw = readRawSize(options.raw, options.inputs);
+  if (work.photo.raw && options.scale != 1) {
+    throw UsageError("--scale: raw pixels are read at their full size");
   }
   return work;
 }
 
-Done process(const Work& work, const PlannedFile& file) {
+Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   thread_local photo::SparePixels spare;  // each worker's own
-  photo::Photo photo = loadPhoto(file.input, work.photo, &spare);
+  photo::Photo photo = loadPhoto(file.input, work.photo, talk, &spare);
   stopIfInterrupted();
   Image<RGBA8Pixel>& picture = *photo.image;
   Done done = {picture.width, picture.height, {}, photo.facts.notices};
@@ -102,11 +101,10 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
       .type("DEGREES");
   verb.option("--scale", options.scale, "Decode at 1/1, 1/2, 1/4 or 1/8 of the size")
       .oneOf({"1", "2", "4", "8"});
-  verb.option("--quality", options.quality, "JPEG quality, 90 unless given")
-      .between(1, 100)
-      .group("Output");
+  addQualityOption(verb, options.quality);
   addKeepOptions(verb, options.keep);
   addRawOption(verb, options.raw);
+  verb.named("--raw").help("Read and write packed RGBA bytes of this size instead of photos");
   addJobsOption(verb, options.jobs);
   addReportOptions(verb, options.report);
 }
@@ -142,7 +140,8 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
   const PhotoTally tally = eachPhoto<std::optional<Done>>(
       inputs, options.jobs, talk,
       {.work = [&](std::size_t index) -> std::optional<Done> {
-         return plan[index].skipped ? std::nullopt : std::optional(process(work, plan[index]));
+         return plan[index].skipped ? std::nullopt
+                                    : std::optional(process(work, plan[index], talk));
        },
        .done =
            [&](std::size_t index, const std::optional<Done>& done) {
@@ -160,9 +159,6 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
              object["lost"] = jsonOf(done->lost);
              object["notices"] = done->notices;
              json.add(object);
-             for (const std::string& notice : done->notices) {
-               talk.note(inputs[index].shownName() + ": " + notice);
-             }
              for (const photo::Loss& loss : done->lost) {
                talk.note(plan[index].output + ": " + lossText(loss));
              }

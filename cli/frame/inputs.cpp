@@ -102,6 +102,10 @@ void addInputOptions(Verb verb, InputOptions& options) {
       .group("Input");
 }
 
+std::string aPhotoFile() {
+  return "a " + photo::pictureFormats() + " file, or - (standard input)";
+}
+
 std::vector<Input> expandInputs(const InputOptions& options) {
   Expansion expansion(options.recursive);
   for (const std::string& name : options.names) expansion.addName(name);

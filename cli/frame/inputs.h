@@ -17,6 +17,9 @@ struct InputOptions {
 /// Adds the positional IN... and `-r` to a verb.
 void addInputOptions(Verb verb, InputOptions& options);
 
+/// "a JPEG or PNG file, or - (standard input)", for the help.
+std::string aPhotoFile();
+
 /// What messages call an input.
 inline std::string shownName(const std::string& path) {
   return path == "-" ? "standard input" : path;

@@ -2,8 +2,6 @@
 
 #include <fmt/format.h>
 
-#include <algorithm>
-#include <cctype>
 #include <filesystem>
 
 #include "cli/frame/errors.h"
@@ -48,6 +46,10 @@ void addLoneOutputOptions(Verb verb, LoneOutputOptions& options, const std::stri
       .group("Output");
 }
 
+void addLoneInput(Verb verb, std::string& name) {
+  verb.option("IN", name, "A photo: " + aPhotoFile()).required();
+}
+
 Input loneInput(const std::string& name) {
   std::error_code ignored;
   if (name.empty()) throw UsageError("the input has an empty name");
@@ -76,16 +78,6 @@ std::optional<ExitCode> stopBeforeWork(const std::vector<Input>& inputs,
   }
   json.add(plan);
   return kept ? ExitCode::nothingToDo : ExitCode::allDone;
-}
-
-void requireExtension(const std::string& path, const std::vector<std::string>& extensions) {
-  std::string extension = fs::path(path).extension().string();
-  for (char& letter : extension) {
-    letter = static_cast<char>(std::tolower(static_cast<unsigned char>(letter)));
-  }
-  const bool known = std::find(extensions.begin(), extensions.end(), extension) != extensions.end();
-  if (extension.empty() || known) return;
-  throw UsageError(path + ": would not be a " + extension + " file; name it " + extensions[0]);
 }
 
 }  // namespace pelorin::cli

@@ -25,6 +25,9 @@ struct LoneOutputOptions {
 void addLoneOutputOptions(Verb verb, LoneOutputOptions& options, const std::string& typeName,
                           const std::string& help);
 
+/// Adds the positional IN to a verb; `name` is for `loneInput`.
+void addLoneInput(Verb verb, std::string& name);
+
 /// The photo that a verb's only positional names.
 /// @throws UsageError when it is a folder.
 Input loneInput(const std::string& name);
@@ -38,10 +41,5 @@ std::optional<ExitCode> stopBeforeWork(const std::vector<Input>& inputs,
                                        const std::vector<std::string>& outputs,
                                        const LoneOutputOptions& options, Talk& talk,
                                        JsonOutput& json);
-
-/// Refuses a file name whose extension promises another kind of file than the verb makes.
-/// @param extensions  what the kind may be called, in small letters: ".jpg".
-/// @throws UsageError; names without an extension and "-" pass.
-void requireExtension(const std::string& path, const std::vector<std::string>& extensions);
 
 }  // namespace pelorin::cli

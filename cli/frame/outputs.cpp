@@ -48,8 +48,9 @@ std::string nameInFolder(const Input& input, const OutputOptions& options,
                          std::map<std::string, std::string> values) {
   const fs::path path = input.path;
   values["stem"] = input.isStandardInput() ? "stdin" : path.stem().string();
-  const photo::Format* format = photo::formatWithExtension(path.extension().string());
-  values["ext"] = format != nullptr ? format->extensions[0].substr(1) : "jpg";
+  const photo::Format* named = photo::formatWithExtension(path.extension().string());
+  const photo::Format& format = named != nullptr ? *named : photo::usualFormat();
+  values["ext"] = format.extensions[0].substr(1);
   const std::string name = fillIn(options.name, values);
   if (options.output.empty()) return (path.parent_path() / name).string();
   return (fs::path(options.output) / input.subfolder / name).string();
@@ -92,8 +93,9 @@ void refuseClashes(const std::vector<PlannedFile>& plan, bool overwrite) {
 void addOutputOptions(Verb verb, OutputOptions& options, const std::string& defaultName,
                       const std::string& placeholders) {
   verb.option("-o,--output", options.output,
-              "A file, an existing folder, or - (standard output); without it results stand "
-              "beside their inputs, called by --name")
+              "A " + photo::pictureExtensions() +
+                  " file, an existing folder, or - (standard output); without it results stand "
+                  "beside their inputs, called by --name")
       .type("FILE|DIR")
       .group("Output");
   verb.option("--name", options.name,

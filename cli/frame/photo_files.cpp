@@ -11,15 +11,30 @@ namespace fs = std::filesystem;
 
 namespace pelorin::cli {
 
-photo::Photo loadPhoto(const Input& input, photo::OpenOptions options, photo::SparePixels* spare) {
+photo::Photo loadPhoto(const Input& input, photo::OpenOptions options, Talk& talk,
+                       photo::SparePixels* spare) {
   options.stop = interruptToken();
-  return photo::open(readInput(input), options, spare);
+  photo::Photo photo = photo::open(readInput(input), options, spare);
+  for (const std::string& notice : photo.facts.notices) {
+    talk.noteOnce(notice, input.shownName() + ": " + notice + " (others like it are not named)");
+  }
+  return photo;
 }
 
-const photo::Format& outputFormat(const std::string& path, bool raw) {
-  if (raw) return photo::rawPixels();
+void addQualityOption(Verb verb, int& quality) {
+  verb.option("--quality", quality, photo::lossyFormats() + " quality, 90 unless given")
+      .between(1, 100)
+      .group("Output");
+}
+
+SaveChoice drawing() {
+  return {.unnamed = photo::formatNamed("PNG"), .quality = 95, .colour = photo::ColourDetail::full};
+}
+
+const photo::Format& outputFormat(const std::string& path, const SaveChoice& choice) {
+  if (choice.raw) return photo::rawPixels();
   const photo::Format* named = photo::formatWithExtension(fs::path(path).extension().string());
-  return named != nullptr ? *named : *photo::formatNamed("JPEG");
+  return named != nullptr ? *named : *choice.unnamed;
 }
 
 void requireFormatOf(const std::string& path, bool raw) {
@@ -34,7 +49,7 @@ void requireFormatOf(const std::string& path, bool raw) {
                      std::string(photo::rawPixels().extensions[0]));
   }
   if (namesRaw) {
-    throw UsageError(path + ": raw pixels come of raw pixels (--raw); name it " +
+    throw UsageError(path + ": a picture is no " + extension + " file; name it " +
                      photo::pictureExtensions());
   }
   throw UsageError(path + ": " + extension + " is no format that can be written; name it " +
@@ -45,9 +60,12 @@ std::vector<photo::Loss> savePicture(
     const std::string& path, const image_processing::Image<image_processing::RGBA8Pixel>& picture,
     const photo::Metadata& metadata, const SaveChoice& choice) {
   std::vector<photo::Loss> lost;
-  const std::vector<std::uint8_t> file =
-      photo::save(picture, outputFormat(path, choice.raw), metadata,
-                  {choice.quality, interruptToken(), choice.keep}, &lost);
+  const std::vector<std::uint8_t> file = photo::save(picture, outputFormat(path, choice), metadata,
+                                                     {.quality = choice.quality,
+                                                      .stop = interruptToken(),
+                                                      .keep = choice.keep,
+                                                      .colour = choice.colour},
+                                                     &lost);
   refuseLosses(lost, choice.strict);
   writeOutput(path, file);
   return lost;

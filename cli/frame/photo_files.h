@@ -4,25 +4,36 @@
 #include <vector>
 
 #include "cli/frame/inputs.h"
+#include "cli/frame/talk.h"
+#include "cli/frame/verb.h"
 #include "photo/photo.h"
 
 namespace pelorin::cli {
 
-/// Reads a photo, decodes it and turns it upright, unless Ctrl-C comes between.
+/// Reads a photo, decodes it and turns it upright, unless Ctrl-C comes between. What a user should
+/// know of the photo is said, each thing once in a run.
 /// @param spare  where the pixels of a decoded one may come from; may be null.
 /// @throws what reading and decoding throw, for `explain`; Interrupted on Ctrl-C.
-photo::Photo loadPhoto(const Input& input, photo::OpenOptions options,
+photo::Photo loadPhoto(const Input& input, photo::OpenOptions options, Talk& talk,
                        photo::SparePixels* spare = nullptr);
+
+/// Adds `--quality` to a verb.
+void addQualityOption(Verb verb, int& quality);
 
 struct SaveChoice {
   bool raw = false;  ///< As raw pixels, else in the format that the name says.
+  const photo::Format* unnamed = &photo::usualFormat();  ///< Where the name says none.
   int quality = 90;
+  photo::ColourDetail colour = photo::ColourDetail::usual;
   photo::KeepOptions keep = {};
   bool strict = false;  ///< Fail where metadata would be lost.
 };
 
-/// The format of a file called `path`, which says it by its extension: JPEG without one.
-const photo::Format& outputFormat(const std::string& path, bool raw);
+/// For plots and drawings: without loss where the name says no format, thin lines in full colour.
+SaveChoice drawing();
+
+/// The format of a file called `path`, which says it by its extension.
+const photo::Format& outputFormat(const std::string& path, const SaveChoice& choice);
 
 /// Refuses a name whose extension is no format, or another than what is written; names without an
 /// extension, "-" and special files (/dev/null) pass.

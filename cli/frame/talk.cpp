@@ -31,20 +31,31 @@ Talk::~Talk() {
 }
 
 void Talk::error(const std::string& file, const std::string& clause) {
-  hideBar();
-  fmt::print(stderr, "quenby {}: {}: {}\n", verb_, file, clause);
-  showBar();
+  const std::lock_guard lock(mutex_);
+  say(fmt::format("quenby {}: {}: {}", verb_, file, clause));
 }
 
 void Talk::note(const std::string& line) {
   if (quiet_) return;
-  hideBar();
-  fmt::print(stderr, "{}\n", line);
-  showBar();
+  const std::lock_guard lock(mutex_);
+  say(line);
+}
+
+void Talk::noteOnce(const std::string& topic, const std::string& line) {
+  if (quiet_) return;
+  const std::lock_guard lock(mutex_);
+  if (topics_.insert(topic).second) say(line);
 }
 
 void Talk::fileDone() {
+  const std::lock_guard lock(mutex_);
   ++done_;
+  showBar();
+}
+
+void Talk::say(const std::string& line) {
+  hideBar();
+  fmt::print(stderr, "{}\n", line);
   showBar();
 }
 

@@ -1,6 +1,8 @@
 #pragma once
 
 #include <cstddef>
+#include <mutex>
+#include <set>
 #include <string>
 
 #include "cli/frame/verb.h"
@@ -18,7 +20,7 @@ struct ReportOptions {
 void addReportOptions(Verb verb, ReportOptions& options);
 
 /// Everything that is said to a person, on stderr: errors, notes, and one progress bar when stderr
-/// is a terminal and there are several files. Not for several threads.
+/// is a terminal and there are several files. Any thread may speak.
 class Talk {
  public:
   Talk(std::string verb, bool quiet, std::size_t files);
@@ -29,16 +31,21 @@ class Talk {
   /// "quenby enhance: a.jpg: is empty, not a JPEG file". Said even when quiet.
   void error(const std::string& file, const std::string& clause);
   void note(const std::string& line);
+  /// A note that is not said again when one with the same topic was said.
+  void noteOnce(const std::string& topic, const std::string& line);
   /// Moves the bar on by one file.
   void fileDone();
 
  private:
+  void say(const std::string& line);
   void hideBar();
   void showBar();
 
   std::string verb_;
   bool quiet_, hasBar_;
   std::size_t files_, done_ = 0;
+  std::set<std::string> topics_;
+  std::mutex mutex_;
 };
 
 }  // namespace pelorin::cli

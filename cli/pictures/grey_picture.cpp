@@ -7,13 +7,15 @@
 namespace pelorin::cli {
 
 using image_processing::Image;
+using image_processing::RGBA8Pixel;
 
-Image<unsigned char> greyPicture(const Image<float>& plane) {
-  Image<unsigned char> grey(plane.width, plane.height);
-  std::transform(plane.data.get(), plane.data.get() + plane.pixelCount(), grey.data.get(),
-                 [](float value) {
-                   return image_processing::truncateTo<unsigned char>(value * 255.0f + 0.5f);
-                 });
+Image<RGBA8Pixel> greyPicture(const Image<float>& plane) {
+  Image<RGBA8Pixel> grey(plane.width, plane.height);
+  std::transform(
+      plane.data.get(), plane.data.get() + plane.pixelCount(), grey.data.get(), [](float value) {
+        const auto shade = image_processing::truncateTo<std::uint8_t>(value * 255.0f + 0.5f);
+        return RGBA8Pixel{shade, shade, shade, 255};
+      });
   return grey;
 }
 

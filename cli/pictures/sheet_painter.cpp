@@ -4,7 +4,6 @@
 #include <utility>
 
 #include "cli/pictures/canvas.h"
-#include "cli/pictures/jpeg_band_encoder.h"
 #include "cli/pictures/text.h"
 
 namespace pelorin::cli {
@@ -55,7 +54,7 @@ std::uint64_t SheetPainter::height() const {
 }
 
 bool SheetPainter::fits() const {
-  return width() <= Canvas::largestSide && height() <= JpegBandEncoder::largestSide;
+  return width() <= Canvas::largestSide && height() <= greatestHeight;
 }
 
 Image<RGBA8Pixel> SheetPainter::heading() const {

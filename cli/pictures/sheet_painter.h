@@ -21,13 +21,15 @@ struct SheetPlan {
 /// then each row, all of them `width()` wide. Keeps no state between bands.
 class SheetPainter {
  public:
+  static constexpr std::uint32_t greatestHeight = 65500;  ///< What a JPEG file holds.
+
   explicit SheetPainter(SheetPlan plan);
 
   /// Size of the whole sheet; 64-bit, since nothing bounds a plan.
   std::uint64_t width() const;
   std::uint64_t height() const;
 
-  /// Whether the sheet is within what Cairo draws and a JPEG file holds. Only then may the bands be
+  /// Whether the sheet is no wider than Cairo draws and no higher than `greatestHeight`. Only then may the bands be
   /// asked for.
   bool fits() const;
 

@@ -30,8 +30,8 @@ struct CompareOptions {
   ReportOptions report;
 };
 
-photo::Shot readShot(const Input& input, const photo::OpenOptions& options) {
-  const photo::Photo photo = loadPhoto(input, options);
+photo::Shot readShot(const Input& input, const photo::OpenOptions& options, Talk& talk) {
+  const photo::Photo photo = loadPhoto(input, options, talk);
   photo::Shot shot;
   image_processing::computeGreenCDF(*photo.image, shot.cdf);
   shot.orientation = photo.facts.orientation;
@@ -42,7 +42,7 @@ photo::Shot readShot(const Input& input, const photo::OpenOptions& options) {
 photo::OpenOptions openOptions(int scale, const std::string& raw) {
   photo::OpenOptions options;
   options.scale = scale;
-  if (!raw.empty()) options.raw = readRawSize(raw);
+  options.raw = readRawSize(raw);
   return options;
 }
 
@@ -66,7 +66,7 @@ ExitCode runCompare(const CompareOptions& options) {
   Talk talk("compare", options.report.quiet, 0);
   const PhotoTally tally = eachPhoto<photo::Shot>(
       inputs, /*jobs=*/1, talk,
-      {.work = [&](std::size_t index) { return readShot(inputs[index], open[index]); },
+      {.work = [&](std::size_t index) { return readShot(inputs[index], open[index], talk); },
        .done = [&](std::size_t index, const photo::Shot& shot) { shots[index] = shot; }});
   if (tally.done < shots.size()) return tally.exitCode(talk);
   const char* timeSource = a.time && b.time ? "camera" : "unknown";
@@ -114,10 +114,7 @@ void addCompare(CommandLine& commandLine) {
                           "quenby compare a.jpg b.jpg --dt 2.5 --same-orientation yes --json\n"
                           "quenby compare a.rgba b.rgba --raw 640x480 --raw2 480x640",
                           [options] { return runCompare(*options); });
-  verb.option("A", options->a, "A JPEG file, or - (standard input)")
-      .type("FILE")
-      .required()
-      .group("Input");
+  verb.option("A", options->a, "One photo: " + aPhotoFile()).type("FILE").required().group("Input");
   verb.option("B", options->b, "Another").type("FILE").required().group("Input");
   verb.option("--dt", options->dt,
               "Seconds between the two; from the cameras' times unless given, 0 where those "

@@ -7,7 +7,6 @@
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/faces.h"
-#include "cli/frame/file_bytes.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/lone_files.h"
 #include "cli/frame/number_text.h"
@@ -18,7 +17,6 @@
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
 #include "image_processing/autoenhance/lightness/image_statistics.h"
 #include "image_processing/filters/filter_config.h"
-#include "photo/png/png_file.h"
 
 namespace pelorin::cli {
 namespace {
@@ -85,7 +83,7 @@ ExitCode runCurve(const CurveOptions& options) {
   const float slider = readSlider("--slider", options.slider);
   const std::vector<Face> faces = readFaces(options.faces);
   photo::OpenOptions photoOptions = {.faces = options.knownFaces == "xmp"};
-  if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
+  photoOptions.raw = readRawSize(options.raw);
   const Input input = loneInput(options.input);
   const std::string& output = options.outputs.output;
   JsonOutput json(options.report, true);
@@ -95,7 +93,7 @@ ExitCode runCurve(const CurveOptions& options) {
   if ((output == "-") + options.text + json.wanted() > 1) {
     throw UsageError("standard output takes one of -o -, --text and --json");
   }
-  requireExtension(output, {".png"});
+  requireFormatOf(output, /*raw=*/false);
   Talk talk("curve", options.report.quiet, 1);
   const bool plotted = !output.empty();
   const std::vector<std::string> outputs(plotted ? 1 : 0, output);
@@ -105,9 +103,9 @@ ExitCode runCurve(const CurveOptions& options) {
       {input}, /*jobs=*/1, talk,
       {.work =
            [&](std::size_t) {
-             const Curve curve = curveOf(loadPhoto(input, photoOptions), slider, faces);
+             const Curve curve = curveOf(loadPhoto(input, photoOptions, talk), slider, faces);
              if (plotted) {
-               writeOutput(output, photo::encodePng(drawPlot(plotOf(curve, input, slider))));
+               savePicture(output, drawPlot(plotOf(curve, input, slider)), {}, drawing());
              }
              return curve;
            },
@@ -131,16 +129,16 @@ void addCurve(CommandLine& commandLine) {
                           "quenby curve photo.jpg --slider 0.6 --text\n"
                           "quenby curve photo.jpg --json\n",
                           [options] { return runCurve(*options); });
-  verb.option("IN", options->input, "A photo: a JPEG file or - (standard input)").required();
+  addLoneInput(verb, options->input);
   verb.option("--slider", options->slider, "Strength from 0 (none) to 1; 0.4 unless given")
       .type("NUMBER");
   addFaceOption(verb, options->faces, options->knownFaces);
   verb.flag("--text", options->text,
             "Print the 51 samples, one a line, with nine significant digits");
-  addLoneOutputOptions(verb, options->outputs, "FILE",
-                       "The PNG file for the plot, or - (standard output)");
+  addLoneOutputOptions(
+      verb, options->outputs, "FILE",
+      "The " + photo::pictureExtensions() + " file for the plot, or - (standard output)");
   addRawOption(verb, options->raw);
-  verb.named("--raw").help("Read packed RGBA bytes of this size");
   addReportOptions(verb, options->report);
 }
 

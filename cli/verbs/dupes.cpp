@@ -125,7 +125,7 @@ bool writeHtml(const DupesOptions& options, DupeReport& report) {
     Talk talk(verbName, options.report.quiet, inputs.size());
     const PhotoTally tally = eachPhoto<Thumbnail>(
         inputs, options.jobs, talk,
-        {.work = [&](std::size_t job) { return thumbnailOf(report.photos[shown[job]]); },
+        {.work = [&](std::size_t job) { return thumbnailOf(report.photos[shown[job]], talk); },
          .done = [&](std::size_t job,
                      const Thumbnail& thumbnail) { thumbnails[shown[job]] = thumbnail; },
          .failed =

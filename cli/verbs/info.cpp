@@ -43,8 +43,8 @@ struct Info {
 };
 
 Info inspect(const Input& input, const photo::OpenOptions& options, const std::vector<Face>& faces,
-             float slider) {
-  const photo::Photo photo = loadPhoto(input, options);
+             float slider, Talk& talk) {
+  const photo::Photo photo = loadPhoto(input, options, talk);
   Info info = {photo.image->width, photo.image->height, std::nullopt, photo.faces, {}, {}};
   if (!options.raw) info.facts = photo.facts;
   image_processing::analyzeImage(*photo.image,
@@ -139,14 +139,15 @@ ExitCode runInfo(const InfoOptions& options) {
   const float slider = readSlider("--slider", options.slider);
   const std::vector<Face> faces = readFaces(options.faces);
   photo::OpenOptions photo = {.faces = options.knownFaces == "xmp"};
-  if (!options.raw.empty()) photo.raw = readRawSize(options.raw);
+  photo.raw = readRawSize(options.raw, options.inputs);
   const std::vector<Input> inputs = expandInputs(options.inputs);
 
   JsonOutput json(options.report, isSingleFile(options.inputs, inputs));
   Talk talk("info", options.report.quiet, inputs.size());
   const PhotoTally tally = eachPhoto<Info>(
       inputs, options.jobs, talk,
-      {.work = [&](std::size_t index) { return inspect(inputs[index], photo, faces, slider); },
+      {.work =
+           [&](std::size_t index) { return inspect(inputs[index], photo, faces, slider, talk); },
        .done =
            [&](std::size_t index, const Info& info) {
              if (json.wanted()) {

@@ -8,7 +8,6 @@
 
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
-#include "cli/frame/file_bytes.h"
 #include "cli/frame/lone_files.h"
 #include "cli/frame/photo_files.h"
 #include "cli/frame/raw_option.h"
@@ -16,10 +15,12 @@
 #include "cli/verbs/corners.h"
 #include "cli/verbs/verbs.h"
 #include "image_processing/dupe/grayscale.h"
-#include "photo/png/png_file.h"
 
 namespace pelorin::cli {
 namespace {
+
+using image_processing::Image;
+using image_processing::RGBA8Pixel;
 
 struct KeypointsOptions {
   std::string input, raw;
@@ -40,9 +41,8 @@ std::string countText(std::size_t count, const CornerSearch& search) {
                      search.arc, search.threshold, search.suppressed ? "" : ", not suppressed");
 }
 
-std::vector<std::uint8_t> drawingOf(const photo::Photo& photo, const Input& input,
-                                    const std::vector<Corner>& corners,
-                                    const CornerSearch& search) {
+Image<RGBA8Pixel> drawingOf(const photo::Photo& photo, const Input& input,
+                            const std::vector<Corner>& corners, const CornerSearch& search) {
   std::vector<MarkedPixel> marks;
   for (const Corner& corner : corners) {
     marks.push_back({corner.position.x, corner.position.y, static_cast<float>(corner.score)});
@@ -52,9 +52,8 @@ std::vector<std::uint8_t> drawingOf(const photo::Photo& photo, const Input& inpu
                                : std::filesystem::path(input.path).filename().string();
   const std::string about = fmt::format("{} \xC3\x97 {} pixels, {}", photo.image->width,
                                         photo.image->height, countText(corners.size(), search));
-  return photo::encodePng(
-      drawCorners(*photo.image, std::move(marks), "Corners of " + name, about,
-                  "Score: the largest threshold at which it is still a corner"));
+  return drawCorners(*photo.image, std::move(marks), "Corners of " + name, about,
+                     "Score: the largest threshold at which it is still a corner");
 }
 
 Json jsonOf(const Input& input, const Keypoints& keypoints, const CornerSearch& search) {
@@ -101,16 +100,16 @@ void printSummary(const Input& input, const Keypoints& keypoints, const CornerSe
 
 ExitCode runKeypoints(const KeypointsOptions& options) {
   photo::OpenOptions photoOptions;
-  if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
+  photoOptions.raw = readRawSize(options.raw);
   CornerSearch search = options.search;
   search.suppressed = !options.unsuppressed;
   const Input input = loneInput(options.input);
-  const std::string& drawing = options.drawing.output;
-  if (drawing == "-") {
+  const std::string& path = options.drawing.output;
+  if (path == "-") {
     throw UsageError("--draw: name a file; standard output has the corners");
   }
-  requireExtension(drawing, {".png"});
-  const std::vector<std::string> outputs(drawing.empty() ? 0 : 1, drawing);
+  requireFormatOf(path, /*raw=*/false);
+  const std::vector<std::string> outputs(path.empty() ? 0 : 1, path);
   Talk talk("keypoints", options.report.quiet, 1);
   JsonOutput json(options.report, true);
   if (const auto code = stopBeforeWork({input}, outputs, options.drawing, talk, json)) return *code;
@@ -119,12 +118,13 @@ ExitCode runKeypoints(const KeypointsOptions& options) {
       {input}, /*jobs=*/1, talk,
       {.work =
            [&](std::size_t) {
-             const photo::Photo photo = loadPhoto(input, photoOptions);
+             const photo::Photo photo = loadPhoto(input, photoOptions, talk);
              Keypoints keypoints = {
                  photo.image->width, photo.image->height,
                  findCorners(image_processing::imageMakeGrayscale(*photo.image), search)};
-             if (!drawing.empty()) {
-               writeOutput(drawing, drawingOf(photo, input, keypoints.corners, search));
+             if (!path.empty()) {
+               const auto picture = drawingOf(photo, input, keypoints.corners, search);
+               savePicture(path, picture, {}, drawing());
              }
              return keypoints;
            },
@@ -153,7 +153,7 @@ void addKeypoints(CommandLine& commandLine) {
                           "quenby keypoints photo.jpg --json --brief\n"
                           "quenby keypoints --text --raw 640x480 - < in.rgba",
                           [options] { return runKeypoints(*options); });
-  verb.option("IN", options->input, "A photo: a JPEG file or - (standard input)").required();
+  addLoneInput(verb, options->input);
   verb.option("--n", options->search.arc,
               "How many neighbouring pixels of the 16 on a circle of radius 3 must all be "
               "brighter or all darker than its centre; 9 unless given")
@@ -166,14 +166,14 @@ void addKeypoints(CommandLine& commandLine) {
   verb.flag("--brief", options->search.described,
             "Add descriptors, 64 hexadecimal digits, bit 255 first, to the corners that are "
             "more than 15 pixels from every border");
-  verb.option("--draw", options->drawing.output, "Draw the corners over the photo, as PNG")
+  verb.option("--draw", options->drawing.output,
+              "Draw the corners over the photo; a " + photo::pictureExtensions() + " file")
       .type("FILE")
       .group("Output");
   verb.flag("--overwrite", options->drawing.overwrite, "Replace a drawing that is there")
       .needs(verb.named("--draw"))
       .group("Output");
   addRawOption(verb, options->raw);
-  verb.named("--raw").help("Read packed RGBA bytes of this size, not a JPEG file");
   Option text =
       verb.flag("--text", options->text,
                 "Print a line `x y score` for each corner, row by row, and its descriptor "

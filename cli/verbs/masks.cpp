@@ -17,7 +17,6 @@
 #include "image_processing/autoenhance/auto_enhance_filter.h"
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/filtered_image.h"
-#include "photo/png/png_file.h"
 
 namespace pelorin::cli {
 namespace {
@@ -55,7 +54,7 @@ void writeMask(const std::string& path, const Image<float>& mask, bool raw) {
   if (raw) {
     writeOutput(path, {reinterpret_cast<const std::uint8_t*>(mask.data.get()), mask.byteSize()});
   } else {
-    writeOutput(path, photo::encodePng(greyPicture(mask)));
+    savePicture(path, greyPicture(mask), {}, {.colour = photo::ColourDetail::none});
   }
 }
 
@@ -79,13 +78,14 @@ ExitCode runMasks(const MasksOptions& options) {
   }
   const std::vector<Face> faces = readFaces(options.faces);
   photo::OpenOptions photoOptions = {.faces = options.knownFaces == "xmp"};
-  if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
+  photoOptions.raw = readRawSize(options.raw);
   const bool raw = photoOptions.raw.has_value();
 
   const Input input = loneInput(options.input);
   const std::filesystem::path folder = options.outputs.output;
-  const std::string bilateralPath = folder / (raw ? "bilateral.f32" : "bilateral.png");
-  const std::string ltmPath = folder / (raw ? "ltm.f32" : "ltm.png");
+  const std::string extension = raw ? ".f32" : ".png";
+  const std::string bilateralPath = folder / ("bilateral" + extension);
+  const std::string ltmPath = folder / ("ltm" + extension);
   const std::vector<std::string> paths = {bilateralPath, ltmPath};
   Talk talk("masks", options.report.quiet, 1);
   JsonOutput json(options.report, true);
@@ -95,7 +95,7 @@ ExitCode runMasks(const MasksOptions& options) {
       eachPhoto<Masks>({input}, /*jobs=*/1, talk,
                        {.work =
                             [&](std::size_t) {
-                              const Masks masks = masksOf(loadPhoto(input, photoOptions),
+                              const Masks masks = masksOf(loadPhoto(input, photoOptions, talk),
                                                           options.filter, faces, options.exact);
                               writeMasks(masks, bilateralPath, ltmPath, raw);
                               return masks;
@@ -121,7 +121,7 @@ void addMasks(CommandLine& commandLine) {
       "quenby masks photo.jpg -o masks/ --face 0.4,0.1,0.6,0.4\n"
       "quenby masks pixels.rgba --raw 640x480 -o planes/\n",
       [options] { return runMasks(*options); });
-  verb.option("IN", options->input, "A photo: a JPEG file or - (standard input)").required();
+  addLoneInput(verb, options->input);
   addLoneOutputOptions(verb, options->outputs, "DIR",
                        "The folder for bilateral.png, the smoothed lightness, and ltm.png, the "
                        "flatness; with --raw bilateral.f32 and ltm.f32");

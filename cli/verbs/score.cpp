@@ -8,10 +8,8 @@
 
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
-#include "cli/frame/file_bytes.h"
 #include "cli/frame/interrupt.h"
 #include "cli/frame/jobs.h"
-#include "cli/frame/lone_files.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/outputs.h"
 #include "cli/frame/photo_files.h"
@@ -20,12 +18,13 @@
 #include "cli/verbs/score_output.h"
 #include "cli/verbs/verbs.h"
 #include "image_processing/quality/block_features.h"
-#include "photo/png/png_file.h"
 
 namespace pelorin::cli {
 namespace {
 
+using image_processing::Image;
 using image_processing::niqeBlockSize;
+using image_processing::RGBA8Pixel;
 
 struct ScoreOptions {
   InputOptions inputs;
@@ -37,8 +36,8 @@ struct ScoreOptions {
   int jobs = 1;
 };
 
-std::vector<std::uint8_t> heatMapOf(const photo::Photo& photo, const Input& input,
-                                    const ScoredPhoto& scored) {
+Image<RGBA8Pixel> heatMapOf(const photo::Photo& photo, const Input& input,
+                            const ScoredPhoto& scored) {
   const std::string name = input.isStandardInput()
                                ? input.shownName()
                                : std::filesystem::path(input.path).filename().string();
@@ -46,20 +45,21 @@ std::vector<std::uint8_t> heatMapOf(const photo::Photo& photo, const Input& inpu
   const std::string about =
       fmt::format("NIQE {:.2f}, {} \xC3\x97 {} pixels, {} \xC3\x97 {} blocks", niqe.score,
                   scored.width, scored.height, niqe.blockColumns, niqe.blockRows);
-  return photo::encodePng(drawHeatMap(
+  return drawHeatMap(
       *photo.image, {niqeBlockSize, niqe.blockColumns, niqe.blockRows, niqe.blockDistances},
-      "Quality of " + name, about, "Distance of each block from natural photos; lower is better"));
+      "Quality of " + name, about, "Distance of each block from natural photos; lower is better");
 }
 
 /// @param map  where the heat map goes; null for none.
-ScoredPhoto score(const Input& input, const photo::OpenOptions& options, const PlannedFile* map) {
-  const photo::Photo photo = loadPhoto(input, options);
+ScoredPhoto score(const Input& input, const photo::OpenOptions& options, const PlannedFile* map,
+                  Talk& talk) {
+  const photo::Photo photo = loadPhoto(input, options, talk);
   stopIfInterrupted();
   ScoredPhoto scored = {photo.image->width, photo.image->height,
                         image_processing::analyzeNiqe(*photo.image)};
   stopIfInterrupted();
   if (map != nullptr && !map->skipped && !scored.isTooSmall()) {
-    writeOutput(map->output, heatMapOf(photo, input, scored));
+    savePicture(map->output, heatMapOf(photo, input, scored), {}, drawing());
   }
   return scored;
 }
@@ -70,15 +70,16 @@ std::vector<PlannedFile> planMaps(const ScoreOptions& options, const std::vector
   if (output.empty() || output == "-") {
     throw UsageError("--map: name a file or an existing folder; standard output has the scores");
   }
-  if (!std::filesystem::is_directory(output)) requireExtension(output, {".png"});
-  return planOutputs(inputs, options.inputs, options.maps, {});
+  std::vector<PlannedFile> plan = planOutputs(inputs, options.inputs, options.maps, {});
+  for (const PlannedFile& file : plan) requireFormatOf(file.output, /*raw=*/false);
+  return plan;
 }
 
 ExitCode runScore(const ScoreOptions& options) {
   std::optional<float> limit;
   if (options.failAbove) limit = readFiniteNumber("--fail-above", *options.failAbove);
   photo::OpenOptions photoOptions;
-  if (!options.raw.empty()) photoOptions.raw = readRawSize(options.raw);
+  photoOptions.raw = readRawSize(options.raw, options.inputs);
   const std::vector<Input> inputs = expandInputs(options.inputs);
   const std::vector<PlannedFile> maps = planMaps(options, inputs);
   const OutputFolders folders(maps);
@@ -110,7 +111,7 @@ ExitCode runScore(const ScoreOptions& options) {
       inputs, options.jobs, talk,
       {.work =
            [&](std::size_t index) {
-             return score(inputs[index], photoOptions, maps.empty() ? nullptr : &maps[index]);
+             return score(inputs[index], photoOptions, maps.empty() ? nullptr : &maps[index], talk);
            },
        .done = report,
        .failed = [&](std::size_t index,
@@ -154,7 +155,8 @@ void addScore(CommandLine& commandLine) {
   options->mapGiven =
       verb.option("--map", options->maps.output,
                   "Write each photo's heat map, the distances of its blocks over the photo, "
-                  "to this PNG file or into this folder")
+                  "to this " +
+                      photo::pictureExtensions() + " file or into this folder")
           .type("FILE|DIR")
           .group("Output");
   options->maps.name = "{stem}_niqe.png";
@@ -167,7 +169,6 @@ void addScore(CommandLine& commandLine) {
       .needs(options->mapGiven)
       .group("Output");
   addRawOption(verb, options->raw);
-  verb.named("--raw").help("Read packed RGBA bytes of this size, not JPEG files");
   addJobsOption(verb, options->jobs);
   addReportOptions(verb, options->format.report);
   csv.excludes(verb.named("--json")).excludes(verb.named("--jsonl"));

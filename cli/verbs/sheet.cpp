@@ -17,7 +17,6 @@
 #include "cli/frame/photo_files.h"
 #include "cli/frame/raw_option.h"
 #include "cli/pictures/canvas.h"
-#include "cli/pictures/jpeg_band_encoder.h"
 #include "cli/pictures/sheet_painter.h"
 #include "cli/verbs/sheet_columns.h"
 #include "cli/verbs/verbs.h"
@@ -81,8 +80,8 @@ photo::PictureSize roomFor(const Input& input, const photo::OpenOptions& options
   }
 }
 
-SheetRow makeRow(const SheetWork& work, const Input& input, photo::PictureSize room) {
-  photo::Photo photo = loadPhoto(input, work.photo);
+SheetRow makeRow(const SheetWork& work, const Input& input, photo::PictureSize room, Talk& talk) {
+  photo::Photo photo = loadPhoto(input, work.photo, talk);
   const photo::PictureSize size{photo.image->width, photo.image->height};
   const photo::PictureSize small = photo::fitWithin(size, room);
   const std::string name = input.isStandardInput()
@@ -121,12 +120,9 @@ ExitCode runSheet(const SheetOptions& options) {
   });
   if (!work.faces.empty() && !facesMatter) throw UsageError("--face: has no effect on these looks");
   work.photo.faces = options.knownFaces == "xmp";
-  if (!options.raw.empty()) {
-    if (options.inputs.recursive) throw UsageError("--raw: name the files, folders hold JPEG");
-    work.photo.raw = readRawSize(options.raw);
-  }
+  work.photo.raw = readRawSize(options.raw, options.inputs);
   const std::string& output = options.outputs.output;
-  requireExtension(output, {".jpg", ".jpeg", ".jpe"});
+  requireFormatOf(output, /*raw=*/false);
   const std::vector<Input> inputs = expandInputs(options.inputs);
   JsonOutput json(options.report, true);
   if (output == "-" && json.wanted()) {
@@ -144,26 +140,34 @@ ExitCode runSheet(const SheetOptions& options) {
     throw UsageError(fmt::format(
         "the sheet would be {} x {} pixels, above {} x {}; name fewer photos or looks, or a "
         "smaller --cell",
-        painter.width(), painter.height(), Canvas::largestSide, JpegBandEncoder::largestSide));
+        painter.width(), painter.height(), Canvas::largestSide, SheetPainter::greatestHeight));
   }
-  JpegBandEncoder encoder(static_cast<std::uint32_t>(painter.width()),
-                          static_cast<std::uint32_t>(painter.height()), options.quality);
-  encoder.add(painter.heading());
+  const auto writer =
+      outputFormat(output, {})
+          .writer({static_cast<std::uint32_t>(painter.width()),
+                   static_cast<std::uint32_t>(painter.height())},
+                  /*hasAlpha=*/false, {},
+                  // Thin text is a large part of the picture.
+                  {.quality = options.quality, .colour = photo::ColourDetail::full});
+  const auto add = [&](const Image<RGBA8Pixel>& band) {
+    writer->write(band.data.get(), band.height);
+  };
+  add(painter.heading());
   Json rows = Json::array();
   const PhotoTally tally = eachPhoto<SheetRow>(
       inputs, options.jobs, talk,
       {.work =
            [&](std::size_t index) {
-             return makeRow(work, inputs[index], painter.thumbnailSize(index));
+             return makeRow(work, inputs[index], painter.thumbnailSize(index), talk);
            },
        .done =
            [&](std::size_t index, const SheetRow& row) {
-             encoder.add(painter.row(index, row.label, row.thumbnails));
+             add(painter.row(index, row.label, row.thumbnails));
              rows.push_back({{"input", inputs[index].path}, {"status", "done"}});
            },
        .failed =
            [&](std::size_t index, const std::string& reason) {
-             encoder.add(painter.row(index, inputs[index].shownName(), {}, reason));
+             add(painter.row(index, inputs[index].shownName(), {}, reason));
              rows.push_back(
                  {{"input", inputs[index].path}, {"status", "failed"}, {"error", reason}});
            }});
@@ -172,7 +176,7 @@ ExitCode runSheet(const SheetOptions& options) {
     return ExitCode::interrupted;
   }
   const bool something = tally.done > 0;
-  if (something) writeOutput(output, encoder.finish());
+  if (something) writeOutput(output, writer->finish());
   json.add({{"output", output},
             {"status", something ? "done" : "failed"},
             {"width", painter.width()},
@@ -194,8 +198,9 @@ void addSheet(CommandLine& commandLine) {
   addInputOptions(verb, options->inputs);
   addSheetColumnOptions(verb, options->columns);
   addFaceOption(verb, options->faces, options->knownFaces);
-  addLoneOutputOptions(verb, options->outputs, "FILE",
-                       "The JPEG file for the sheet, or - (standard output)");
+  addLoneOutputOptions(
+      verb, options->outputs, "FILE",
+      "The " + photo::pictureExtensions() + " file for the sheet, or - (standard output)");
   verb.named("--output").required();
   verb.option("--title", options->title, "What stands above the sheet")
       .type("TEXT")
@@ -204,11 +209,8 @@ void addSheet(CommandLine& commandLine) {
               "Longest side of a small picture in pixels; 320 unless given")
       .between(32, 4096)
       .group("Output");
-  verb.option("--quality", options->quality, "JPEG quality, 90 unless given")
-      .between(1, 100)
-      .group("Output");
+  addQualityOption(verb, options->quality);
   addRawOption(verb, options->raw);
-  verb.named("--raw").help("Read packed RGBA bytes of this size");
   addJobsOption(verb, options->jobs);
   addReportOptions(verb, options->report);
 }

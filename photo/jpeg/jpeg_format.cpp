@@ -69,7 +69,8 @@ class JpegRowWriter : public RowWriter {
       : stop_(options.stop),
         width_(size.width),
         tail_(std::move(kept.tail)),
-        picture_(size.width, size.height, options.quality, kept.segments) {}
+        picture_(size.width, size.height, options.quality, kept.segments,
+                 options.colour == ColourDetail::full ? Chroma::whole : Chroma::halved) {}
 
   void write(const RGBA8Pixel* rows, std::uint32_t count) override {
     while (count > 0) {
@@ -103,6 +104,7 @@ constinit const Format jpegFormat = {
     .extensions = extensions,
     .scalesWhileDecoding = true,
     .keepsAlpha = false,
+    .losesDetail = true,
     .recognises =
         [](std::span<const std::uint8_t> file) {
           return file.size() >= 2 && file[0] == 0xFF && file[1] == 0xD8;

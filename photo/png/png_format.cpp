@@ -223,7 +223,9 @@ class PngRowWriter : public RowWriter {
  public:
   PngRowWriter(PictureSize size, bool hasAlpha, const KeptMetadata& kept,
                const SaveOptions& options)
-      : stop_(options.stop), width_(size.width) {
+      : stop_(options.stop),
+        width_(size.width),
+        greyRow_(options.colour == ColourDetail::none ? size.width : 0) {
     if (size.width < 1 || size.height < 1 || size.width > PNG_UINT_31_MAX ||
         size.height > PNG_UINT_31_MAX) {
       throw PhotoError(PhotoError::Kind::invalidRequest,
@@ -244,14 +246,16 @@ class PngRowWriter : public RowWriter {
         png_set_write_fn(png_, this, append, [](png_structp) {});
         png_set_user_limits(png_, PNG_UINT_31_MAX, PNG_UINT_31_MAX);
         png_set_IHDR(png_, info_, size.width, size.height, 8,
-                     hasAlpha ? PNG_COLOR_TYPE_RGB_ALPHA : PNG_COLOR_TYPE_RGB, PNG_INTERLACE_NONE,
-                     PNG_COMPRESSION_TYPE_DEFAULT, PNG_FILTER_TYPE_DEFAULT);
+                     isGrey()   ? PNG_COLOR_TYPE_GRAY
+                     : hasAlpha ? PNG_COLOR_TYPE_RGB_ALPHA
+                                : PNG_COLOR_TYPE_RGB,
+                     PNG_INTERLACE_NONE, PNG_COMPRESSION_TYPE_DEFAULT, PNG_FILTER_TYPE_DEFAULT);
         png_write_info(png_, info_);
         for (const PngChunk& chunk : chunks) {
           png_write_chunk(png_, reinterpret_cast<png_const_bytep>(chunk.type.c_str()),
                           chunk.data.data(), chunk.data.size());
         }
-        if (!hasAlpha) png_set_filler(png_, 0, PNG_FILLER_AFTER);
+        if (!hasAlpha && !isGrey()) png_set_filler(png_, 0, PNG_FILLER_AFTER);
       });
     } catch (...) {
       png_destroy_write_struct(&png_, &info_);
@@ -269,7 +273,7 @@ class PngRowWriter : public RowWriter {
       errors_.run([&] {
         for (std::uint32_t y = 0; y < some; ++y) {
           const RGBA8Pixel* row = rows + std::size_t{y} * width_;
-          png_write_row(png_, reinterpret_cast<png_const_bytep>(row));
+          png_write_row(png_, isGrey() ? greyOf(row) : reinterpret_cast<png_const_bytep>(row));
         }
       });
       rows += std::size_t{some} * width_;
@@ -283,6 +287,13 @@ class PngRowWriter : public RowWriter {
   }
 
  private:
+  bool isGrey() const { return !greyRow_.empty(); }
+
+  png_const_bytep greyOf(const RGBA8Pixel* row) {
+    std::transform(row, row + width_, greyRow_.begin(), [](const RGBA8Pixel& p) { return p.r; });
+    return greyRow_.data();
+  }
+
   static void append(png_structp png, png_bytep bytes, std::size_t count) {
     auto* self = static_cast<PngRowWriter*>(png_get_io_ptr(png));
     bool done = false;
@@ -296,6 +307,7 @@ class PngRowWriter : public RowWriter {
 
   std::stop_token stop_;
   std::uint32_t width_;
+  std::vector<std::uint8_t> greyRow_;  // empty unless the file is grey
   std::vector<std::uint8_t> file_;
   PngErrors errors_;
   png_structp png_ = nullptr;
@@ -327,6 +339,7 @@ constinit const Format pngFormat = {
     .extensions = extensions,
     .scalesWhileDecoding = false,
     .keepsAlpha = true,
+    .losesDetail = false,
     .recognises =
         [](std::span<const std::uint8_t> file) {
           constexpr std::size_t signatureSize = 8;

@@ -71,6 +71,7 @@ constinit const Format rawFormat = {
     .extensions = extensions,
     .scalesWhileDecoding = false,
     .keepsAlpha = true,
+    .losesDetail = false,
     .recognises = [](std::span<const std::uint8_t>) { return false; },
     .reader = [](std::span<const std::uint8_t> file, const OpenOptions& options)
         -> std::unique_ptr<RowReader> { return std::make_unique<RawReader>(file, options); },

@@ -50,6 +50,8 @@ TEST(FormatTable, FindsFormatsByNameExtensionAndContent) {
   EXPECT_FALSE(isPictureExtension(".rgba"));
   EXPECT_EQ(pictureFormats(), "JPEG or PNG");
   EXPECT_EQ(pictureExtensions(), ".jpg, .jpeg, .jpe or .png");
+  EXPECT_EQ(lossyFormats(), "JPEG");
+  EXPECT_EQ(usualFormat().name, "JPEG");
 }
 
 TEST(FormatTable, NamesWhatItCannotRead) {

@@ -110,12 +110,14 @@ TEST(FaceOption, IsRefusedWhereItWouldBeIgnored) {
 }
 
 TEST(RawOption, IsTwoWholeNumbers) {
-  EXPECT_EQ(readRawSize("640x480").width, 640u);
-  EXPECT_EQ(readRawSize("640x480").height, 480u);
-  for (const char* text :
-       {"", "640", "x", "640x", "x480", "0x5", "5x0", "640X480", "6x4x8", "-1x5"}) {
+  EXPECT_EQ(readRawSize("640x480"), (photo::PictureSize{640, 480}));
+  EXPECT_EQ(readRawSize(""), std::nullopt);
+  for (const char* text : {"640", "x", "640x", "x480", "0x5", "5x0", "640X480", "6x4x8", "-1x5"}) {
     EXPECT_THROW(readRawSize(text), UsageError) << text;
   }
+  EXPECT_EQ(readRawSize("6x4", {{}, false}), (photo::PictureSize{6, 4}));
+  EXPECT_THROW(readRawSize("6x4", {{}, true}), UsageError);
+  EXPECT_EQ(readRawSize("", {{}, true}), std::nullopt);
 }
 
 TEST(FilterOptions, AreCalledAsTheirKeys) {

@@ -9,12 +9,16 @@ namespace pelorin::cli {
 namespace {
 
 using image_processing::Image;
+using image_processing::RGBA8Pixel;
 
 TEST(GreyPicture, GivesBackEveryByteOverItsLargest) {
   Image<float> plane(256, 1);
   for (int i = 0; i < 256; ++i) plane.data.get()[i] = static_cast<float>(i) / 255.0f;
   const auto grey = greyPicture(plane);
-  for (int i = 0; i < 256; ++i) ASSERT_EQ(grey.data.get()[i], i);
+  for (int i = 0; i < 256; ++i) {
+    const auto shade = static_cast<std::uint8_t>(i);
+    ASSERT_EQ(grey.data.get()[i], (RGBA8Pixel{shade, shade, shade, 255}));
+  }
 }
 
 TEST(GreyPicture, KeepsValuesOutsideAtTheEnds) {
@@ -24,7 +28,7 @@ TEST(GreyPicture, KeepsValuesOutsideAtTheEnds) {
   Image<float> plane(7, 1);
   std::copy(std::begin(values), std::end(values), plane.data.get());
   const auto grey = greyPicture(plane);
-  for (int i = 0; i < 7; ++i) EXPECT_EQ(grey.data.get()[i], expected[i]) << i;
+  for (int i = 0; i < 7; ++i) EXPECT_EQ(grey.data.get()[i].r, expected[i]) << i;
 }
 
 TEST(GreyPicture, OfNoPixelsHasNone) {

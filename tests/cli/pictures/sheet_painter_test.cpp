@@ -3,7 +3,6 @@
 #include <gtest/gtest.h>
 
 #include "cli/pictures/canvas.h"
-#include "cli/pictures/jpeg_band_encoder.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::cli {

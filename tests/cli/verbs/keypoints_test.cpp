@@ -7,7 +7,7 @@
 
 #include "image_processing/features/brief.h"
 #include "image_processing/features/fast.h"
-#include "photo/png/png_file.h"
+#include "photo/photo.h"
 #include "photo/turned_image.h"
 #include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
@@ -222,7 +222,7 @@ TEST_F(Keypoints, AreThoseOfTheUprightPicture) {
 
 TEST_F(Keypoints, AreDrawnOverThePhoto) {
   const auto colourful = [&](const std::string& name) {
-    const Image<RGBA8Pixel> drawing = photo::decodePng(folder.read(name));
+    const Image<RGBA8Pixel> drawing = *photo::open(folder.read(name)).image;
     int pixels = 0;
     for (std::uint32_t y = 90; y + 120 < drawing.height; ++y) {
       for (std::uint32_t x = 0; x < drawing.width; ++x) {
@@ -249,7 +249,7 @@ TEST_F(Keypoints, AreDrawnOverAnOldFileOnlyWhenAsked) {
   EXPECT_THAT(kept.errors, HasSubstr("old.png: exists already; add --overwrite"));
   EXPECT_EQ(folder.read("old.png").size(), 3u);
   EXPECT_EQ(onRaw(picture, {"--draw", drawing, "--overwrite"}).exitCode, 0);
-  EXPECT_GT(photo::decodePng(folder.read("old.png")).width, 0u);
+  EXPECT_GT(photo::open(folder.read("old.png")).image->width, 0u);
 }
 
 TEST_F(Keypoints, OfABadFileAreOneLineAndLeaveNothing) {
@@ -269,11 +269,19 @@ TEST_F(Keypoints, OfABadFileAreOneLineAndLeaveNothing) {
 
 TEST_F(Keypoints, RefuseWhatTheyCannotMean) {
   const std::vector<std::vector<std::string>> usages = {
-      {"--n", "8"},           {"--n", "13"},         {"--n", "9.5"},
-      {"--n", "x"},           {"--threshold", "-1"}, {"--threshold", "256"},
-      {"--threshold", "1e9"}, {"--text", "--json"},  {"--text", "--jsonl"},
-      {"--draw", "-"},        {"--draw", "out.jpg"}, {"--draw", folder / "none/out.png"},
-      {"--overwrite"},        {"other.jpg"},
+      {"--n", "8"},
+      {"--n", "13"},
+      {"--n", "9.5"},
+      {"--n", "x"},
+      {"--threshold", "-1"},
+      {"--threshold", "256"},
+      {"--threshold", "1e9"},
+      {"--text", "--json"},
+      {"--text", "--jsonl"},
+      {"--draw", "-"},
+      {"--draw", folder / "none/out.png"},
+      {"--overwrite"},
+      {"other.jpg"},
   };
   for (const auto& options : usages) {
     const Finished run = onRaw(noise, options);

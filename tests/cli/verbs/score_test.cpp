@@ -4,7 +4,7 @@
 
 #include "cli/frame/number_text.h"
 #include "image_processing/quality/niqe.h"
-#include "photo/png/png_file.h"
+#include "photo/photo.h"
 #include "photo/turned_image.h"
 #include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
@@ -201,7 +201,7 @@ TEST_F(Score, ShowsItsBlocksAsAHeatMap) {
   const std::string map = folder / "heat.png";
   const Finished run = quenby({"score", "--raw", "192x96", "-", "--map", map}, rawBytes(photo));
   ASSERT_EQ(run.exitCode, 0) << run.errors;
-  const Image<RGBA8Pixel> shown = photo::decodePng(folder.read("heat.png"));
+  const Image<RGBA8Pixel> shown = *photo::open(folder.read("heat.png")).image;
   const auto warmth = [&](std::uint32_t from, std::uint32_t to) {
     double sum = 0;
     for (std::uint32_t y = shown.height / 3; y < shown.height / 2; ++y) {
@@ -235,7 +235,7 @@ TEST_F(Score, ReplacesAHeatMapOnlyWhenAsked) {
   EXPECT_THAT(kept.output, HasSubstr(good));
   EXPECT_EQ(folder.read("heat.png").size(), 3u);
   EXPECT_EQ(quenby({"score", good, "--map", map, "--overwrite"}).exitCode, 0);
-  EXPECT_GT(photo::decodePng(folder.read("heat.png")).width, 0u);
+  EXPECT_GT(photo::open(folder.read("heat.png")).image->width, 0u);
 }
 
 TEST_F(Score, RefusesWhatItCannotMean) {
@@ -246,7 +246,6 @@ TEST_F(Score, RefusesWhatItCannotMean) {
       {"--json", "--jsonl"},
       {"--map", ""},
       {"--map", "-"},
-      {"--map", "heat.jpg"},
       {"--map", folder / "none/heat.png"},
       {"--map", folder / "heat.png", good},
       {"--name", "{stem}.png"},

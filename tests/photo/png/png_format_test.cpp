@@ -129,6 +129,26 @@ TEST(PngFormat, ReadsWhatItWroteAlphaIncluded) {
   }
 }
 
+TEST(PngFormat, WritesGreyPicturesInOneChannel) {
+  Image<RGBA8Pixel> grey(256, 2);
+  for (std::size_t i = 0; i < grey.pixelCount(); ++i) {
+    const auto shade = static_cast<std::uint8_t>(i);
+    grey.data.get()[i] = {shade, shade, shade, 255};
+  }
+  const Photo photo = open(save(grey, "PNG", {}, {.colour = ColourDetail::none}));
+  EXPECT_EQ(photo.facts.channels, 1);
+  expectSamePixels(*photo.image, grey);
+}
+
+TEST(PngFormat, TakesTheLongestThinPicturesAndRefusesThoseWithoutPixels) {
+  for (const auto& [width, height] : {std::pair{65500u, 1u}, {1u, 65500u}}) {
+    const Image<RGBA8Pixel> picture = test_support::noisePicture(width, height, 3);
+    expectSamePixels(*open(save(picture, "PNG")).image, picture);
+  }
+  EXPECT_THROW(save(Image<RGBA8Pixel>(0, 5), "PNG"), PhotoError);
+  EXPECT_THROW(save(Image<RGBA8Pixel>(5, 0), "PNG"), PhotoError);
+}
+
 TEST(PngFormat, ReadsEveryKindAndInterlacedOnesAlike) {
   const int grey = PNG_COLOR_TYPE_GRAY, greyAlpha = PNG_COLOR_TYPE_GRAY_ALPHA;
   const int palette = PNG_COLOR_TYPE_PALETTE, alpha = PNG_COLOR_TYPE_RGB_ALPHA;
