@@ -71,10 +71,11 @@ function(pelorin_run_early test)
   set_tests_properties(${test} PROPERTIES COST 100)
 endfunction()
 
-# pelorin_test(<file> [THREADS] [SOURCES ...] DEPENDS ...): the tests in <file>.cpp, run by ctest one
-# by one. THREADS marks tests that start threads: the thread sanitizer's run builds and runs those.
+# pelorin_test(<file> [THREADS] [LABEL <label>] [SOURCES ...] DEPENDS ...): the tests in <file>.cpp,
+# run by ctest one by one. THREADS marks tests that start threads: the thread sanitizer's run builds
+# and runs those; their label is "threads", whatever LABEL says.
 function(pelorin_test file)
-  cmake_parse_arguments(PARSE_ARGV 1 arg "THREADS" "" "SOURCES;DEPENDS")
+  cmake_parse_arguments(PARSE_ARGV 1 arg "THREADS" "LABEL" "SOURCES;DEPENDS")
   if(NOT arg_SOURCES)
     set(arg_SOURCES ${file}.cpp)
   endif()
@@ -83,6 +84,9 @@ function(pelorin_test file)
   target_link_libraries(${name} PRIVATE ${arg_DEPENDS} pelorin_test_support GTest::gmock_main)
   pelorin_compile_as_test(${name})
   set(labels "")
+  if(arg_LABEL)
+    set(labels LABELS ${arg_LABEL})
+  endif()
   if(arg_THREADS)
     set(labels LABELS threads)
     add_dependencies(thread_tests ${name})

@@ -32,7 +32,7 @@ class Process {
   pid_t id_ = -1;
 };
 
-/// The path of the built command.
+/// The path of the command: the built one, unless QUENBY_COMMAND in the environment names another.
 std::string quenbyPath();
 
 /// Runs `quenby` with these arguments and input.
