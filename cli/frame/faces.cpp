@@ -12,9 +12,6 @@
 namespace pelorin::cli {
 namespace {
 
-// No face is twice as far to the right as the picture is wide.
-constexpr float largestFraction = 2.0f;
-
 Face readFace(const std::string& text) {
   const auto refuse = [&text](const std::string& reason) {
     throw UsageError("--face: '" + text + "' " + reason);
@@ -30,32 +27,26 @@ Face readFace(const std::string& text) {
     if (comma != std::string_view::npos) rest.remove_prefix(comma + 1);
   }
   const auto [left, top, right, bottom] = bounds;
-  const bool inPixels = std::ranges::max(bounds) > largestFraction;
+  const bool inPixels = std::ranges::max(bounds) > largestFaceFraction;
   if (inPixels && !std::ranges::all_of(bounds, [](float b) { return b == std::trunc(b); })) {
     refuse("is neither fractions of the picture, from 0 to 1, nor whole pixels");
   }
-  if (left > right) refuse("has its left side right of its right one; it is left,top,right,bottom");
-  if (top > bottom) refuse("has its top below its bottom; it is left,top,right,bottom");
-  const float end = inPixels ? std::numeric_limits<float>::infinity() : 1.0f;
-  if (right < 0.0f || bottom < 0.0f || left >= end || top >= end) {
-    refuse("lies outside the picture");
-  }
-  return {left, top, right, bottom, inPixels};
+  const Face face = {left, top, right, bottom, inPixels};
+  const std::string wrong = whatIsWrongWith(face);
+  if (!wrong.empty()) refuse(wrong);
+  return face;
 }
 
 }  // namespace
 
-void addFaceOption(Verb verb, std::vector<std::string>& texts, std::string& source) {
-  verb.option("--face", texts,
-              "A face as left,top,right,bottom of the upright picture, in fractions (0,0 its top "
-              "left corner, 1,1 the opposite one) or, when a number is above 2, in pixels of its "
-              "full size; may be repeated")
-      .oneValueEach()
-      .type("L,T,R,B");
-  verb.option("--faces", source,
-              "Use the faces that the photo's XMP knows of, or none; xmp unless given. --face adds "
-              "to them")
-      .oneOf({"xmp", "none"});
+std::string whatIsWrongWith(const Face& face) {
+  if (face.left > face.right)
+    return "has its left side right of its right one; it is left,top,right,bottom";
+  if (face.top > face.bottom) return "has its top below its bottom; it is left,top,right,bottom";
+  const float end = face.inPixels ? std::numeric_limits<float>::infinity() : 1.0f;
+  if (face.right < 0.0f || face.bottom < 0.0f || face.left >= end || face.top >= end)
+    return "lies outside the picture";
+  return "";
 }
 
 std::vector<Face> readFaces(const std::vector<std::string>& texts) {

@@ -3,7 +3,6 @@
 #include <string>
 #include <vector>
 
-#include "cli/frame/verb.h"
 #include "photo/faces.h"
 
 namespace pelorin::cli {
@@ -12,9 +11,12 @@ using photo::allFaces;
 using photo::Face;
 using photo::metadataWithFaces;
 
-/// Adds `--face l,t,r,b`, repeatable, whose `texts` are for `readFaces`, and `--faces`.
-/// @param source  where other faces come from: "xmp", the photo's file, or "none".
-void addFaceOption(Verb verb, std::vector<std::string>& texts, std::string& source);
+/// No face is twice as far to the right as the picture is wide.
+constexpr float largestFaceFraction = 2.0f;
+
+/// What is wrong with a face, one clause: it is upside down, or fractions put it outside the
+/// picture. Empty when nothing is.
+std::string whatIsWrongWith(const Face& face);
 
 /// Four numbers are pixels when one is above 2, and fractions otherwise.
 /// @throws UsageError when a text is not four finite numbers, when they are pixels and not all whole,

@@ -22,7 +22,7 @@ using image_processing::RGBA8Pixel;
 
 struct Work {
   FilterToApply filter;
-  std::vector<Face> faces;
+  FaceChoice faces;
   photo::OpenOptions photo;
   SaveChoice save;
   bool overwrite;
@@ -35,17 +35,16 @@ struct Done {
 };
 
 Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter) {
-  Work work = {filter, readFaces(options.faces), {}, {}, options.outputs.overwrite};
+  Work work = {filter, FaceChoice(options.faces), {}, {}, options.outputs.overwrite};
   work.save = {.raw = !options.raw.empty(),
                .quality = options.quality,
                .keep = keepOptions(options.keep),
                .strict = options.keep.strict};
-  if (!work.faces.empty() && !filter.filter.parameters().readsFaces) {
+  if (work.faces.areNamed() && !filter.filter.parameters().readsFaces) {
     throw UsageError("--face: has no effect on " + filter.filter.name);
   }
   if (options.rotate % 90 != 0) throw UsageError("--rotate: must be a multiple of 90");
-  work.photo = {
-      .scale = options.scale, .rotate = options.rotate, .faces = options.knownFaces == "xmp"};
+  work.photo = {.scale = options.scale, .rotate = options.rotate, .faces = work.faces.asksPhoto()};
   work.photo.raw = readRawSize(options.raw, options.inputs);
   if (work.photo.raw && options.scale != 1) {
     throw UsageError("--scale: raw pixels are read at their full size");
@@ -59,8 +58,8 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   stopIfInterrupted();
   Image<RGBA8Pixel>& picture = *photo.image;
   Done done = {picture.width, picture.height, {}, photo.facts.notices};
-  photo::filterInPlace(photo, work.filter.filter.name, work.filter.params, work.faces,
-                       work.photo.scale);
+  photo::filterInPlace(photo, work.filter.filter.name, work.filter.params,
+                       work.faces.of(file.input), work.photo.scale);
   stopIfInterrupted();
   done.lost = savePicture(file.output, picture, photo.metadata, work.save);
   if (!work.save.raw) spare.keep(picture);
@@ -95,7 +94,7 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
                            const std::string& placeholders) {
   addInputOptions(verb, options.inputs);
   addOutputOptions(verb, options.outputs, "{stem}_{filter}.{ext}", placeholders);
-  addFaceOption(verb, options.faces, options.knownFaces);
+  addFaceOptions(verb, options.faces);
   verb.option("--rotate", options.rotate,
               "Turn further by so many degrees clockwise, a multiple of 90")
       .type("DEGREES");

@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "cli/frame/exit_code.h"
-#include "cli/frame/faces.h"
+#include "cli/frame/face_choice.h"
 #include "cli/frame/inputs.h"
 #include "cli/frame/keep_option.h"
 #include "cli/frame/outputs.h"
@@ -21,8 +21,7 @@ struct FilterFilesOptions {
   OutputOptions outputs;
   ReportOptions report;
   KeepChoice keep;
-  std::vector<std::string> faces;
-  std::string knownFaces = "xmp";
+  FaceOptions faces;
   std::string raw;
   int rotate = 0;
   int scale = 1;

@@ -6,7 +6,7 @@
 
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
-#include "cli/frame/faces.h"
+#include "cli/frame/face_choice.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/lone_files.h"
 #include "cli/frame/number_text.h"
@@ -28,8 +28,7 @@ struct CurveOptions {
   std::string slider = "0.4";
   LoneOutputOptions outputs;
   ReportOptions report;
-  std::vector<std::string> faces;
-  std::string knownFaces = "xmp";
+  FaceOptions faces;
   bool text = false;
 };
 
@@ -40,8 +39,7 @@ struct Curve {
   std::vector<float> samples;
 };
 
-Curve curveOf(const photo::Photo& photo, float slider, const std::vector<Face>& given) {
-  const std::vector<Face> faces = allFaces(given, photo);
+Curve curveOf(const photo::Photo& photo, float slider, const std::vector<Face>& faces) {
   Curve curve{photo.image->width, photo.image->height, faces.size(), {}, {}};
   image_processing::analyzeImage(*photo.image, metadataWithFaces(faces, curve.width, curve.height),
                                  curve.statistics);
@@ -81,8 +79,8 @@ Json describe(const Curve& curve, const Input& input, float slider) {
 
 ExitCode runCurve(const CurveOptions& options) {
   const float slider = readSlider("--slider", options.slider);
-  const std::vector<Face> faces = readFaces(options.faces);
-  photo::OpenOptions photoOptions = {.faces = options.knownFaces == "xmp"};
+  const FaceChoice faces(options.faces);
+  photo::OpenOptions photoOptions = {.faces = faces.asksPhoto()};
   photoOptions.raw = readRawSize(options.raw);
   const Input input = loneInput(options.input);
   const std::string& output = options.outputs.output;
@@ -103,7 +101,8 @@ ExitCode runCurve(const CurveOptions& options) {
       {input}, /*jobs=*/1, talk,
       {.work =
            [&](std::size_t) {
-             const Curve curve = curveOf(loadPhoto(input, photoOptions, talk), slider, faces);
+             const photo::Photo photo = loadPhoto(input, photoOptions, talk);
+             const Curve curve = curveOf(photo, slider, allFaces(faces.of(input), photo));
              if (plotted) {
                savePicture(output, drawPlot(plotOf(curve, input, slider)), {}, drawing());
              }
@@ -132,7 +131,7 @@ void addCurve(CommandLine& commandLine) {
   addLoneInput(verb, options->input);
   verb.option("--slider", options->slider, "Strength from 0 (none) to 1; 0.4 unless given")
       .type("NUMBER");
-  addFaceOption(verb, options->faces, options->knownFaces);
+  addFaceOptions(verb, options->faces);
   verb.flag("--text", options->text,
             "Print the 51 samples, one a line, with nine significant digits");
   addLoneOutputOptions(

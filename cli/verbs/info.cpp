@@ -6,7 +6,7 @@
 #include <vector>
 
 #include "cli/frame/each_photo.h"
-#include "cli/frame/faces.h"
+#include "cli/frame/face_choice.h"
 #include "cli/frame/inputs.h"
 #include "cli/frame/jobs.h"
 #include "cli/frame/json_output.h"
@@ -27,8 +27,7 @@ using image_processing::ImageStatistics;
 struct InfoOptions {
   InputOptions inputs;
   ReportOptions report;
-  std::vector<std::string> faces;
-  std::string knownFaces = "xmp";
+  FaceOptions faces;
   std::string raw;
   std::string slider = "0.4";
   int jobs = 1;
@@ -42,14 +41,14 @@ struct Info {
   std::vector<float> curve;
 };
 
-Info inspect(const Input& input, const photo::OpenOptions& options, const std::vector<Face>& faces,
+Info inspect(const Input& input, const photo::OpenOptions& options, const FaceChoice& faces,
              float slider, Talk& talk) {
   const photo::Photo photo = loadPhoto(input, options, talk);
   Info info = {photo.image->width, photo.image->height, std::nullopt, photo.faces, {}, {}};
   if (!options.raw) info.facts = photo.facts;
-  image_processing::analyzeImage(*photo.image,
-                                 metadataWithFaces(allFaces(faces, photo), info.width, info.height),
-                                 info.statistics);
+  image_processing::analyzeImage(
+      *photo.image, metadataWithFaces(allFaces(faces.of(input), photo), info.width, info.height),
+      info.statistics);
   FilterConfig config = image_processing::defaultFilterConfigValue;
   image_processing::updateFilterConfigForSliderValue(slider, &config);
   info.curve = image_processing::buildToneCurve(info.statistics, config);
@@ -137,8 +136,8 @@ void printText(const Input& input, const Info& info, const std::string& slider) 
 
 ExitCode runInfo(const InfoOptions& options) {
   const float slider = readSlider("--slider", options.slider);
-  const std::vector<Face> faces = readFaces(options.faces);
-  photo::OpenOptions photo = {.faces = options.knownFaces == "xmp"};
+  const FaceChoice faces(options.faces);
+  photo::OpenOptions photo = {.faces = faces.asksPhoto()};
   photo.raw = readRawSize(options.raw, options.inputs);
   const std::vector<Input> inputs = expandInputs(options.inputs);
 
@@ -178,7 +177,7 @@ void addInfo(CommandLine& commandLine) {
   verb.option("--slider", options->slider,
               "Strength, 0 to 1, whose tone curve is shown; 0.4 unless given")
       .type("S");
-  addFaceOption(verb, options->faces, options->knownFaces);
+  addFaceOptions(verb, options->faces);
   addRawOption(verb, options->raw);
   addJobsOption(verb, options->jobs);
   addReportOptions(verb, options->report);

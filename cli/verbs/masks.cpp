@@ -5,7 +5,7 @@
 
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
-#include "cli/frame/faces.h"
+#include "cli/frame/face_choice.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/lone_files.h"
@@ -28,8 +28,7 @@ struct MasksOptions {
   LoneOutputOptions outputs;
   ReportOptions report;
   std::string filter = "AE0";
-  std::vector<std::string> faces;
-  std::string knownFaces = "xmp";
+  FaceOptions faces;
   bool exact = false;
 };
 
@@ -42,9 +41,8 @@ Masks masksOf(photo::Photo photo, const std::string& filter, const std::vector<F
   image_processing::FilterConfig config = image_processing::defaultFilterConfigValue;
   config.useBilateralGrid = exact ? 0 : 1;
   image_processing::FilteredImage session(
-      photo.image,
-      metadataWithFaces(allFaces(faces, photo), photo.image->width, photo.image->height), "",
-      config, image_processing::DefaultFilterFactory::filterFactory());
+      photo.image, metadataWithFaces(faces, photo.image->width, photo.image->height), "", config,
+      image_processing::DefaultFilterFactory::filterFactory());
   const auto prepared = session.setupFilter(filter, "");
   const auto& withMasks = dynamic_cast<const image_processing::AEFilterBase&>(*prepared);
   return {withMasks.getBilateralMask(), withMasks.getLtmMask()};
@@ -76,8 +74,8 @@ ExitCode runMasks(const MasksOptions& options) {
   if (std::find(filters.begin(), filters.end(), options.filter) == filters.end()) {
     throw UsageError("--filter: " + unknownName("filter with masks", options.filter, filters));
   }
-  const std::vector<Face> faces = readFaces(options.faces);
-  photo::OpenOptions photoOptions = {.faces = options.knownFaces == "xmp"};
+  const FaceChoice faces(options.faces);
+  photo::OpenOptions photoOptions = {.faces = faces.asksPhoto()};
   photoOptions.raw = readRawSize(options.raw);
   const bool raw = photoOptions.raw.has_value();
 
@@ -91,23 +89,24 @@ ExitCode runMasks(const MasksOptions& options) {
   JsonOutput json(options.report, true);
   if (const auto code = stopBeforeWork({input}, paths, options.outputs, talk, json)) return *code;
 
-  const PhotoTally tally =
-      eachPhoto<Masks>({input}, /*jobs=*/1, talk,
-                       {.work =
-                            [&](std::size_t) {
-                              const Masks masks = masksOf(loadPhoto(input, photoOptions, talk),
-                                                          options.filter, faces, options.exact);
-                              writeMasks(masks, bilateralPath, ltmPath, raw);
-                              return masks;
-                            },
-                        .done =
-                            [&](std::size_t, const Masks& masks) {
-                              json.add({{"file", input.path},
-                                        {"width", masks.ltm->width},
-                                        {"height", masks.ltm->height},
-                                        {"filter", options.filter},
-                                        {"outputs", paths}});
-                            }});
+  const PhotoTally tally = eachPhoto<Masks>(
+      {input}, /*jobs=*/1, talk,
+      {.work =
+           [&](std::size_t) {
+             photo::Photo photo = loadPhoto(input, photoOptions, talk);
+             const std::vector<Face> known = allFaces(faces.of(input), photo);
+             const Masks masks = masksOf(std::move(photo), options.filter, known, options.exact);
+             writeMasks(masks, bilateralPath, ltmPath, raw);
+             return masks;
+           },
+       .done =
+           [&](std::size_t, const Masks& masks) {
+             json.add({{"file", input.path},
+                       {"width", masks.ltm->width},
+                       {"height", masks.ltm->height},
+                       {"filter", options.filter},
+                       {"outputs", paths}});
+           }});
   return tally.exitCode(talk);
 }
 
@@ -127,7 +126,7 @@ void addMasks(CommandLine& commandLine) {
                        "flatness; with --raw bilateral.f32 and ltm.f32");
   verb.named("--output").required();
   verb.option("--filter", options->filter, "AE0 (unless given) or AE08bit").type("NAME");
-  addFaceOption(verb, options->faces, options->knownFaces);
+  addFaceOptions(verb, options->faces);
   verb.flag("--exact", options->exact,
             "Smooth with the exact bilateral filter in place of the grid; slow");
   addRawOption(verb, options->raw);

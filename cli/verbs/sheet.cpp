@@ -8,7 +8,7 @@
 
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
-#include "cli/frame/faces.h"
+#include "cli/frame/face_choice.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/interrupt.h"
 #include "cli/frame/jobs.h"
@@ -39,8 +39,7 @@ struct SheetOptions {
   LoneOutputOptions outputs;
   ReportOptions report;
   SheetColumnOptions columns;
-  std::vector<std::string> faces;
-  std::string knownFaces = "xmp";
+  FaceOptions faces;
   std::string raw;
   std::optional<std::string> title;
   std::uint32_t cell = 320;
@@ -56,7 +55,7 @@ struct SheetRow {
 
 struct SheetWork {
   std::vector<SheetColumn> columns;
-  std::vector<Face> faces;
+  FaceChoice faces;
   photo::OpenOptions photo;
 };
 
@@ -90,7 +89,8 @@ SheetRow makeRow(const SheetWork& work, const Input& input, photo::PictureSize r
   SheetRow row{fmt::format("{}  \xC2\xB7  {} \xC3\x97 {}", name, size.width, size.height), {}};
   row.thumbnails.push_back(photo::areaAverage(*photo.image, small));
   image_processing::FilteredImage session(
-      photo.image, metadataWithFaces(allFaces(work.faces, photo), size.width, size.height), "",
+      photo.image,
+      metadataWithFaces(allFaces(work.faces.of(input), photo), size.width, size.height), "",
       defaultFilterConfigValue, image_processing::DefaultFilterFactory::filterFactory());
   Image<RGBA8Pixel> filtered(size.width, size.height);
   for (const SheetColumn& column : work.columns) {
@@ -114,12 +114,13 @@ SheetPlan planOf(const SheetOptions& options, const SheetWork& work,
 }
 
 ExitCode runSheet(const SheetOptions& options) {
-  SheetWork work{sheetColumns(options.columns), readFaces(options.faces), {}};
+  SheetWork work{sheetColumns(options.columns), FaceChoice(options.faces), {}};
   const bool facesMatter = std::ranges::any_of(work.columns, [](const SheetColumn& column) {
     return column.filter->parameters().readsFaces;
   });
-  if (!work.faces.empty() && !facesMatter) throw UsageError("--face: has no effect on these looks");
-  work.photo.faces = options.knownFaces == "xmp";
+  if (work.faces.areNamed() && !facesMatter)
+    throw UsageError("--face: has no effect on these looks");
+  work.photo.faces = work.faces.asksPhoto();
   work.photo.raw = readRawSize(options.raw, options.inputs);
   const std::string& output = options.outputs.output;
   requireFormatOf(output, /*raw=*/false);
@@ -197,7 +198,7 @@ void addSheet(CommandLine& commandLine) {
                           [options] { return runSheet(*options); });
   addInputOptions(verb, options->inputs);
   addSheetColumnOptions(verb, options->columns);
-  addFaceOption(verb, options->faces, options->knownFaces);
+  addFaceOptions(verb, options->faces);
   addLoneOutputOptions(
       verb, options->outputs, "FILE",
       "The " + photo::pictureExtensions() + " file for the sheet, or - (standard output)");

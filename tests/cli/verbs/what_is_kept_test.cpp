@@ -142,6 +142,13 @@ TEST(WhatIsKept, FacesOfAFileAreUsedUnlessItIsSaidOtherwise) {
   EXPECT_NE(known, enhanced({"--faces", "none"}));
   const Finished info = quenby({"info", in});
   EXPECT_THAT(info.output, testing::HasSubstr("0.400,0.200,0.600,0.300"));
+  const std::string told = quenby({"info", in, "--json"}).output;
+  const std::string faces = folder.write("faces.json", told);
+  EXPECT_EQ(known, enhanced({"--faces", faces}));
+  folder.write("faces.json", std::string("[{\"file\": \"c.jpg\", \"faces\": []}]"));
+  const Finished without = quenby({"enhance", in, "-o", folder / "c.jpg", "--faces", faces});
+  EXPECT_EQ(without.exitCode, 1);
+  EXPECT_THAT(without.errors, testing::HasSubstr("has no entry for this photo"));
 }
 
 TEST(WhatIsKept, PassesExifToolWithGainMapsAndVideos) {
