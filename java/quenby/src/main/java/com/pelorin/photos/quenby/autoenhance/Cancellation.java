@@ -6,8 +6,8 @@ import java.util.concurrent.CancellationException;
 
 /**
  * A way to give work up from another thread. Work that was given one throws
- * {@link CancellationException} soon after {@link #cancel}, and at once when that came before it.
- * One may serve any number of calls; any thread may call.
+ * {@link CancellationException} soon after {@link #cancel}, and at once when that came before it;
+ * how soon, its methods say. One may serve any number of calls; any thread may call.
  */
 public final class Cancellation {
     private final Set<Long> atWork = new HashSet<>();
@@ -33,9 +33,18 @@ public final class Cancellation {
         return cancelled;
     }
 
-    static void check(Cancellation cancellation) {
+    static void checkBefore(Cancellation cancellation) {
+        check(cancellation, "cancelled before it began");
+    }
+
+    /** For work that cannot be interrupted. */
+    static void checkAfter(Cancellation cancellation) {
+        check(cancellation, "cancelled while it was at work");
+    }
+
+    private static void check(Cancellation cancellation, String message) {
         if (cancellation != null && cancellation.isCancelled()) {
-            throw new CancellationException("cancelled before it began");
+            throw new CancellationException(message);
         }
     }
 
@@ -45,7 +54,7 @@ public final class Cancellation {
             return 0;
         }
         synchronized (cancellation) {
-            check(cancellation);
+            checkBefore(cancellation);
             long handle = PhotoBytes.newCancel();
             cancellation.atWork.add(handle);
             return handle;

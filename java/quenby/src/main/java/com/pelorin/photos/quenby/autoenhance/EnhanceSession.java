@@ -184,8 +184,9 @@ public final class EnhanceSession implements AutoCloseable {
     }
 
     /**
-     * Writes the filtered photo into a bitmap unless another thread gives it up before. A call that
-     * has begun is not interrupted yet: it writes and returns.
+     * Writes the filtered photo into a bitmap unless another thread gives it up. That is looked for
+     * before the filter begins and after it has ended; the filter itself runs to its end, which for
+     * the first use of {@link Filter#AUTO} on a large photo may be a second.
      *
      * @param filter       which filter
      * @param params       as above
@@ -195,8 +196,9 @@ public final class EnhanceSession implements AutoCloseable {
      * @throws IllegalArgumentException  when a parameter is unknown, missing or unreadable; the
      *                                   message says what the filter wants
      * @throws SessionClosedException    after {@link #close}
-     * @throws java.util.concurrent.CancellationException when it was given up; the output is then
-     *                                   as it was
+     * @throws java.util.concurrent.CancellationException when it was given up before this returned;
+     *                                   what the output holds then is not to be relied on, and the
+     *                                   session is as good as before
      * @throws OutOfMemoryError          when memory does not suffice; the output is then as it was
      */
     public void apply(Filter filter, String params, Bitmap output, Cancellation cancellation) {
@@ -205,13 +207,14 @@ public final class EnhanceSession implements AutoCloseable {
         }
         filter.keys().check(filter.key(), params);
         Bitmaps.requireRoomFor(width, height, output);
-        Cancellation.check(cancellation);
+        Cancellation.checkBefore(cancellation);
         long session = handle.beginCall();
         try {
             ENGINE.applyAutoEnhanceFilter(session, output, filter.key(), params);
         } finally {
             handle.endCall();
         }
+        Cancellation.checkAfter(cancellation);
         if (output.isRecycled()) { // meanwhile, perhaps before it was written
             throw new UnsuitableBitmapException("the output was recycled by another thread");
         }

@@ -6,17 +6,15 @@ import java.nio.file.AccessDeniedException;
 import java.nio.file.Files;
 import java.nio.file.NoSuchFileException;
 import java.nio.file.Path;
-import java.nio.file.StandardCopyOption;
 import java.util.Arrays;
 import java.util.Collections;
 import java.util.List;
-import java.util.UUID;
 
 /**
  * Filters a photo's file into a JPEG file, as the {@code quenby} command does: upright, turned,
  * filtered, encoded at quality 90, with the metadata kept as far as it still holds. The output
- * appears whole or not at all, whatever fails; it may be the input. Immutable: each
- * setting gives a new job, and any thread may run it.
+ * appears whole or not at all, whatever fails, and it may be the input; a file that is replaced
+ * keeps its permissions. Immutable: each setting gives a new job, and any thread may run it.
  *
  * <pre>{@code
  * JpegJob.of(input, output).rotation(90).filter(Filter.AUTO, "slider=0.4;").run();
@@ -144,21 +142,6 @@ public final class JpegJob {
         } catch (PhotoException error) {
             throw new JpegException(input.toString(), error);
         }
-        if (Files.exists(output) && !Files.isRegularFile(output)) { // a pipe, a device
-            Files.write(output, made);
-            return;
-        }
-        replace(Files.isSymbolicLink(output) ? output.toRealPath() : output, made);
-    }
-
-    private static void replace(Path file, byte[] content) throws IOException {
-        Path beside = file.resolveSibling("." + file.getFileName() + "." + UUID.randomUUID());
-        try {
-            Files.write(beside, content);
-            Files.move(beside, file, StandardCopyOption.ATOMIC_MOVE,
-                    StandardCopyOption.REPLACE_EXISTING);
-        } finally {
-            Files.deleteIfExists(beside);
-        }
+        FileReplacement.write(output, made);
     }
 }

@@ -215,4 +215,36 @@ class EnhanceSessionTest {
             assertTrue(!Arrays.equals(before, Pictures.bytes(output)));
         }
     }
+
+    @Test
+    void aCallThatIsCancelledAtWorkThrows() throws Exception {
+        ExecutorService threads = Executors.newFixedThreadPool(1);
+        Bitmap large = Pictures.photo(600, 450, 2);
+        Bitmap own = Pictures.sameSize(large);
+        String message = "";
+        // A call that has its result before it is cancelled, or never begins, proves nothing.
+        for (int round = 0; round < 100 && !message.contains("at work"); ++round) {
+            Cancellation cancellation = new Cancellation();
+            try (EnhanceSession session = EnhanceSession.open(large)) {
+                int delay = round % 30;
+                Future<?> other = threads.submit(() -> {
+                    Thread.sleep(delay);
+                    cancellation.cancel();
+                    return null;
+                });
+                try {
+                    session.apply(Filter.AUTO, "slider=0.4;", own, cancellation);
+                } catch (CancellationException error) {
+                    message = error.getMessage();
+                    assertTrue(cancellation.isCancelled());
+                }
+                other.get();
+                own.eraseColor(0);
+                session.enhance(0.4f, own); // the session is as good as before
+                assertTrue(own.getPixel(0, 0) != 0);
+            }
+        }
+        threads.shutdown();
+        assertTrue(message.contains("at work"), "no call was cancelled at work: " + message);
+    }
 }

@@ -5,16 +5,21 @@ import static org.junit.jupiter.api.Assertions.assertEquals;
 import static org.junit.jupiter.api.Assertions.assertFalse;
 import static org.junit.jupiter.api.Assertions.assertThrows;
 import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assumptions.assumeFalse;
 
 import android.graphics.RectF;
 import java.awt.image.BufferedImage;
 import java.io.IOException;
+import java.nio.file.AccessDeniedException;
 import java.nio.file.Files;
 import java.nio.file.NoSuchFileException;
 import java.nio.file.Path;
 import java.nio.file.attribute.FileTime;
+import java.nio.file.attribute.PosixFilePermission;
+import java.nio.file.attribute.PosixFilePermissions;
 import java.util.Arrays;
 import java.util.List;
+import java.util.Set;
 import java.util.concurrent.CancellationException;
 import java.util.stream.Collectors;
 import java.util.stream.Stream;
@@ -131,6 +136,14 @@ class JpegFileTest {
                     System.out.println(expected);
                 }
             }
+            try {
+                JpegJob.of(Path.of(paths[0]), Path.of(paths[1])).run();
+                System.exit(1);
+            } catch (JpegException unexpected) {
+                throw unexpected;
+            } catch (IOException expected) {
+                System.out.println(expected);
+            }
         }
     }
 
@@ -201,6 +214,40 @@ class JpegFileTest {
         Path device = Path.of("/dev/null");
         JpegJob.of(input, device).rotation(90).run();
         assertFalse(Files.isRegularFile(device));
+    }
+
+    @Test
+    void aJobMakesTheFileThatALinkNames() throws IOException {
+        Path link = Files.createSymbolicLink(folder.resolve("link.jpg"), Path.of("new.jpg"));
+        JpegJob.of(input, link).run();
+        assertTrue(Files.isSymbolicLink(link));
+        assertEquals(List.of("in.jpg", "link.jpg", "new.jpg"), names());
+        Path loop = folder.resolve("loop.jpg");
+        Files.createSymbolicLink(loop, loop);
+        assertThrows(IOException.class, () -> JpegJob.of(input, loop).run());
+    }
+
+    @Test
+    void aReplacedFileKeepsItsPermissions() throws IOException {
+        Path plain = Files.createFile(folder.resolve("plain"));
+        JpegJob.of(input, output).run();
+        assertEquals(Files.getPosixFilePermissions(plain), Files.getPosixFilePermissions(output));
+        for (String text : List.of("rw-------", "rwxr-x--x", "rw-rw-rw-")) {
+            Set<PosixFilePermission> permissions = PosixFilePermissions.fromString(text);
+            Files.setPosixFilePermissions(output, permissions);
+            JpegJob.of(input, output).run();
+            assertEquals(permissions, Files.getPosixFilePermissions(output));
+        }
+    }
+
+    @Test
+    void aProtectedFileIsNotReplaced() throws IOException {
+        Files.write(output, new byte[] {1, 2, 3});
+        Files.setPosixFilePermissions(output, PosixFilePermissions.fromString("r--r--r--"));
+        assumeFalse(Files.isWritable(output), "this user may write everything");
+        assertThrows(AccessDeniedException.class, () -> JpegJob.of(input, output).run());
+        assertArrayEquals(new byte[] {1, 2, 3}, Files.readAllBytes(output));
+        assertEquals(List.of("in.jpg", "out.jpg"), names());
     }
 
     @Test
