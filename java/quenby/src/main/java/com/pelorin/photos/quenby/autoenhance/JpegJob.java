@@ -43,7 +43,8 @@ public final class JpegJob {
     }
 
     /**
-     * Begins with automatic enhancement at slider 0.4, full size, no rotation and no faces.
+     * Begins with automatic enhancement at slider 0.4, full size, no rotation and the faces that the
+     * file knows of.
      *
      * @param input  the file to read
      * @param output the file to write
@@ -84,7 +85,7 @@ public final class JpegJob {
     }
 
     /**
-     * Takes care of faces.
+     * Takes care of faces, beside those that the file knows of: those that its XMP metadata names.
      *
      * @param faces in fractions of the upright and turned photo
      * @return a job that does

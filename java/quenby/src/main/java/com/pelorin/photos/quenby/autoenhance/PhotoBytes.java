@@ -55,7 +55,7 @@ public final class PhotoBytes {
     }
 
     /**
-     * Takes a file's bytes: quality 90, upright, full size and no faces.
+     * Takes a file's bytes: quality 90, upright, full size, and the faces that the file knows of.
      *
      * @param file all of them
      * @return the photo
@@ -148,7 +148,7 @@ public final class PhotoBytes {
     }
 
     /**
-     * Takes care of faces.
+     * Takes care of faces, beside those that the file knows of: those that its XMP metadata names.
      *
      * @param faces in fractions of the upright and turned picture
      * @return a photo that does

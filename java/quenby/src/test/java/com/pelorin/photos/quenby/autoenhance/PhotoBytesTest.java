@@ -8,7 +8,11 @@ import static org.junit.jupiter.api.Assertions.assertTrue;
 import static org.junit.jupiter.api.Assumptions.assumeFalse;
 
 import android.graphics.RectF;
+import java.awt.Transparency;
+import java.awt.color.ColorSpace;
 import java.awt.image.BufferedImage;
+import java.awt.image.ComponentColorModel;
+import java.awt.image.DataBuffer;
 import java.io.ByteArrayInputStream;
 import java.io.ByteArrayOutputStream;
 import java.io.IOException;
@@ -269,21 +273,71 @@ class PhotoBytesTest {
         threads.shutdown();
     }
 
-    @Test
-    void aFileIsTheCommands() throws Exception {
+    private byte[] ofTheCommand(byte[] file, String name) throws Exception {
         String command = System.getProperty("quenby.command", "");
         assumeFalse(command.isEmpty(),
                 "quenby.command names no quenby to compare with");
-        Path input = Files.write(folder.resolve("turned.jpg"), turned);
+        Path input = Files.write(folder.resolve(name), file);
         Path output = folder.resolve("command.jpg");
         Process process = new ProcessBuilder(command, "enhance", input.toString(), "-o",
-                output.toString(), "--slider", "0.7").redirectErrorStream(true).start();
+                output.toString(), "--slider", "0.7", "--overwrite").redirectErrorStream(true)
+                        .start();
         String said = new String(process.getInputStream().readAllBytes());
         assertEquals(0, process.waitFor(), said);
-        byte[] expected = Files.readAllBytes(output);
+        return Files.readAllBytes(output);
+    }
+
+    @Test
+    void aFileIsTheCommands() throws Exception {
+        byte[] expected = ofTheCommand(turned, "turned.jpg");
         assertArrayEquals(expected, PhotoBytes.of(turned).enhance(0.7f));
         Path own = folder.resolve("own.jpg");
-        JpegJob.of(input, own).filter(Filter.AUTO, "slider=0.7;").run();
+        JpegJob.of(folder.resolve("turned.jpg"), own).filter(Filter.AUTO, "slider=0.7;").run();
         assertArrayEquals(expected, Files.readAllBytes(own));
+    }
+
+    /** A picture of 110 x 100 with alpha, and one with 16 bits a channel. */
+    private static List<byte[]> pngFiles() throws IOException {
+        BufferedImage eight = new BufferedImage(110, 100, BufferedImage.TYPE_INT_ARGB);
+        ComponentColorModel model = new ComponentColorModel(
+                ColorSpace.getInstance(ColorSpace.CS_sRGB), false, false, Transparency.OPAQUE,
+                DataBuffer.TYPE_USHORT);
+        BufferedImage sixteen = new BufferedImage(
+                model, model.createCompatibleWritableRaster(110, 100), false, null);
+        for (int y = 0; y < 100; ++y) {
+            for (int x = 0; x < 110; ++x) {
+                int[] rgb = {600 * x + 37 * y, 600 * y + 11 * x, x * y * 6};
+                eight.setRGB(x, y, (x < 9 ? 0x80 : 0xFF) << 24 | rgb[0] >> 8 << 16
+                        | rgb[1] >> 8 << 8 | rgb[2] >> 8);
+                sixteen.getRaster().setPixel(x, y, rgb);
+            }
+        }
+        List<byte[]> files = new ArrayList<>();
+        for (BufferedImage image : List.of(eight, sixteen)) {
+            ByteArrayOutputStream file = new ByteArrayOutputStream();
+            ImageIO.write(image, "png", file);
+            files.add(file.toByteArray());
+        }
+        assertEquals(8, files.get(0)[24]);
+        assertEquals(16, files.get(1)[24]);
+        return files;
+    }
+
+    @Test
+    void aPngFileIsAPhotoToo() throws Exception {
+        for (byte[] png : pngFiles()) {
+            byte[] made = PhotoBytes.of(png).enhance(0.7f);
+            assertArrayEquals(ofTheCommand(png, "in.png"), made);
+            PhotoBytes photo = PhotoBytes.of(direct(png));
+            assertArrayEquals(made, photo.enhance(0.7f));
+            assertEquals(110, photo.facts().width());
+            assertEquals(100, photo.facts().height());
+            assertEquals(PhotoBytes.of(png).niqe(), photo.niqe());
+            assertTrue(photo.niqe() > 0);
+            assertEquals(36, photo.niqeFeatures().length);
+            assertEquals(PhotoBytes.of(png).greenCdf(), photo.greenCdf());
+            byte[] cut = Arrays.copyOf(png, png.length * 2 / 3);
+            assertEquals(PhotoException.Kind.TRUNCATED, kindOf(cut));
+        }
     }
 }
