@@ -35,6 +35,8 @@ public final class Bitmap {
     public static final int DENSITY_NONE = 0;
 
     private static final int DENSITY_DEFAULT = 160;
+    /** Pixels that are converted at a time, few enough for the nearest cache. */
+    private static final int PART = 1024;
 
     /** How a pixel is stored. Only {@link #ARGB_8888} can be enhanced. */
     public enum Config {
@@ -380,17 +382,19 @@ public final class Bitmap {
         ByteBuffer stored = ofRectangle(colors, offset, stride, x, y, width, height);
         boolean translucent = hasAlpha();
         boolean divided = isPremultiplied();
-        int[] row = new int[width];
+        int[] part = new int[Math.min(width, PART)];
         for (int i = 0; i < height; ++i) {
             stored.position((y + i) * this.stride + x * 4);
-            stored.asIntBuffer().get(row);
-            if (!translucent) {
-                for (int j = 0; j < width; ++j) {
-                    row[j] |= 0xFF000000;
+            IntBuffer row = stored.asIntBuffer();
+            for (int j = 0; j < width; j += PART) {
+                int count = Math.min(PART, width - j);
+                row.get(part, 0, count);
+                StoredPixels.toColors(part, count, divided);
+                if (!translucent) {
+                    StoredPixels.makeOpaque(part, count);
                 }
+                System.arraycopy(part, 0, colors, offset + i * stride + j, count);
             }
-            StoredPixels.toColors(row, divided);
-            System.arraycopy(row, 0, colors, offset + i * stride, width);
         }
     }
 
@@ -414,12 +418,16 @@ public final class Bitmap {
         requireMutable();
         ByteBuffer stored = ofRectangle(colors, offset, stride, x, y, width, height);
         boolean multiplied = isPremultiplied();
-        int[] row = new int[width];
+        int[] part = new int[Math.min(width, PART)];
         for (int i = 0; i < height; ++i) {
-            System.arraycopy(colors, offset + i * stride, row, 0, width);
-            StoredPixels.fromColors(row, multiplied);
             stored.position((y + i) * this.stride + x * 4);
-            stored.asIntBuffer().put(row);
+            IntBuffer row = stored.asIntBuffer();
+            for (int j = 0; j < width; j += PART) {
+                int count = Math.min(PART, width - j);
+                System.arraycopy(colors, offset + i * stride + j, part, 0, count);
+                StoredPixels.fromColors(part, count, multiplied);
+                row.put(part, 0, count);
+            }
         }
     }
 

@@ -24,42 +24,46 @@ final class StoredPixels {
         }
     }
 
-    // In place, over whole arrays: such loops become vectors.
+    // In place and over the first `count` of an array: such loops become vectors.
 
-    /** Makes stored pixels of a row of colours. */
-    static void fromColors(int[] row, boolean premultiplied) {
-        boolean multiply = premultiplied && !opaque(row);
-        swapRedAndBlue(row);
-        if (multiply) {
-            for (int i = 0; i < row.length; ++i) {
-                row[i] = premultiply(row[i]);
+    /** Makes stored pixels of colours. */
+    static void fromColors(int[] pixels, int count, boolean premultiplied) {
+        swapRedAndBlue(pixels, count);
+        if (premultiplied) { // opaque ones too: looking for others takes longer
+            for (int i = 0; i < count; ++i) {
+                pixels[i] = premultiply(pixels[i]);
             }
         }
     }
 
-    /** Makes colours of a row of stored pixels. */
-    static void toColors(int[] row, boolean premultiplied) {
-        boolean divide = premultiplied && !opaque(row);
-        swapRedAndBlue(row);
-        if (divide) {
-            for (int i = 0; i < row.length; ++i) {
-                row[i] = unpremultiply(row[i]);
+    /** Makes colours of stored pixels. */
+    static void toColors(int[] pixels, int count, boolean premultiplied) {
+        swapRedAndBlue(pixels, count);
+        if (premultiplied && sumOfAlphas(pixels, count) < 255 * count) {
+            for (int i = 0; i < count; ++i) {
+                pixels[i] = unpremultiply(pixels[i]);
             }
         }
     }
 
-    private static boolean opaque(int[] row) {
-        int all = -1;
-        for (int i = 0; i < row.length; ++i) {
-            all &= row[i];
+    static void makeOpaque(int[] pixels, int count) {
+        for (int i = 0; i < count; ++i) {
+            pixels[i] |= 0xFF000000;
         }
-        return all >>> 24 == 255;
     }
 
-    private static void swapRedAndBlue(int[] row) {
-        for (int i = 0; i < row.length; ++i) {
-            int pixel = row[i];
-            row[i] = pixel & 0xFF00FF00 | pixel << 16 & 0xFF0000 | pixel >>> 16 & 0xFF;
+    private static int sumOfAlphas(int[] pixels, int count) {
+        int sum = 0;
+        for (int i = 0; i < count; ++i) {
+            sum += pixels[i] >>> 24;
+        }
+        return sum;
+    }
+
+    private static void swapRedAndBlue(int[] pixels, int count) {
+        for (int i = 0; i < count; ++i) {
+            int pixel = pixels[i];
+            pixels[i] = pixel & 0xFF00FF00 | pixel << 16 & 0xFF0000 | pixel >>> 16 & 0xFF;
         }
     }
 

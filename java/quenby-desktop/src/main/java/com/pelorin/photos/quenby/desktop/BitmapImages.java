@@ -17,14 +17,17 @@ public final class BitmapImages {
      */
     public static Bitmap toBitmap(BufferedImage image) {
         int width = image.getWidth();
-        Bitmap bitmap = Bitmap.createBitmap(width, image.getHeight(), Bitmap.Config.ARGB_8888);
+        int height = image.getHeight();
+        Bitmap bitmap = Bitmap.createBitmap(width, height, Bitmap.Config.ARGB_8888);
+        int band = rowsAtATime(width, height);
         ColorRows rows = ColorRows.of(image);
         bitmap.setHasAlpha(image.getColorModel().hasAlpha());
         bitmap.setPremultiplied(!rows.premultiplied()); // what is, is stored as it is
-        int[] row = new int[width];
-        for (int y = 0; y < image.getHeight(); ++y) {
-            rows.read(y, row);
-            bitmap.setPixels(row, 0, width, 0, y, width, 1);
+        int[] colors = new int[band * width];
+        for (int y = 0; y < height; y += band) {
+            int count = Math.min(band, height - y);
+            rows.read(y, count, colors);
+            bitmap.setPixels(colors, 0, width, 0, y, width, count);
         }
         bitmap.setPremultiplied(true);
         return bitmap;
@@ -63,16 +66,23 @@ public final class BitmapImages {
         int height = bitmap.getHeight();
         BufferedImage image = new BufferedImage(width, height, type);
         WritableRaster raster = image.getRaster();
-        int[] row = new int[width];
-        for (int y = 0; y < height; ++y) {
-            bitmap.getPixels(row, 0, width, 0, y, width, 1);
+        int band = rowsAtATime(width, height);
+        int[] colors = new int[band * width];
+        for (int y = 0; y < height; y += band) {
+            int count = Math.min(band, height - y);
+            bitmap.getPixels(colors, 0, width, 0, y, width, count);
             if (type == BufferedImage.TYPE_INT_RGB) {
-                for (int x = 0; x < width; ++x) {
-                    row[x] &= 0xFFFFFF;
+                for (int i = 0; i < colors.length; ++i) {
+                    colors[i] &= 0xFFFFFF;
                 }
             }
-            raster.setDataElements(0, y, width, 1, row);
+            raster.setDataElements(0, y, width, count, colors);
         }
         return image;
+    }
+
+    /** Few enough for a cache. */
+    private static int rowsAtATime(int width, int height) {
+        return Math.max(1, Math.min(height, 8192 / width));
     }
 }

@@ -1,5 +1,6 @@
 package com.pelorin.photos.quenby.desktop;
 
+import java.awt.Graphics2D;
 import java.awt.image.BufferedImage;
 import java.awt.image.ColorModel;
 import java.awt.image.ComponentSampleModel;
@@ -18,8 +19,11 @@ abstract class ColorRows {
         this.width = image.getWidth();
     }
 
-    /** Writes row {@code y} into {@code colors} from 0 on; opaque images have alpha 255. */
-    abstract void read(int y, int[] colors);
+    /**
+     * Writes {@code count} rows from {@code y} on into {@code colors} from 0 on, no more than the
+     * first time; opaque images have alpha 255.
+     */
+    abstract void read(int y, int count, int[] colors);
 
     /** Whether the colours are multiplied by their alpha. */
     boolean premultiplied() {
@@ -30,13 +34,13 @@ abstract class ColorRows {
     static ColorRows of(BufferedImage image) {
         switch (image.getType()) {
             case BufferedImage.TYPE_INT_ARGB:
-                return new Ints(image, 0, false);
+                return new Ints(image, false, false);
             case BufferedImage.TYPE_INT_ARGB_PRE:
-                return new Ints(image, 0, true);
+                return new Ints(image, false, true);
             case BufferedImage.TYPE_INT_RGB:
-                return new Ints(image, 0xFF000000, false);
+                return new Ints(image, true, false);
             case BufferedImage.TYPE_3BYTE_BGR:
-                return new ThreeBytes(image);
+                return new Drawn(image);
             case BufferedImage.TYPE_4BYTE_ABGR:
                 return new FourBytes(image);
             case BufferedImage.TYPE_BYTE_GRAY:
@@ -46,34 +50,59 @@ abstract class ColorRows {
         }
     }
 
+    private static void makeOpaque(int[] colors) {
+        for (int i = 0; i < colors.length; ++i) {
+            colors[i] |= 0xFF000000;
+        }
+    }
+
     private static final class Any extends ColorRows {
         Any(BufferedImage image) {
             super(image);
         }
 
         @Override
-        void read(int y, int[] colors) {
-            image.getRGB(0, y, width, 1, colors, 0, width);
+        void read(int y, int count, int[] colors) {
+            image.getRGB(0, y, width, count, colors, 0, width);
+        }
+    }
+
+    /** An opaque image's, which Java's own drawing unpacks. */
+    private static final class Drawn extends ColorRows {
+        private BufferedImage band;
+
+        Drawn(BufferedImage image) {
+            super(image);
+        }
+
+        @Override
+        void read(int y, int count, int[] colors) {
+            if (band == null) { // no later one is larger
+                band = new BufferedImage(width, count, BufferedImage.TYPE_INT_RGB);
+            }
+            Graphics2D onto = band.createGraphics();
+            onto.drawImage(image, 0, -y, null);
+            onto.dispose();
+            band.getRaster().getDataElements(0, 0, width, count, colors);
+            makeOpaque(colors);
         }
     }
 
     private static final class Ints extends ColorRows {
-        private final int alpha;
+        private final boolean opaque;
         private final boolean premultiplied;
 
-        Ints(BufferedImage image, int alpha, boolean premultiplied) {
+        Ints(BufferedImage image, boolean opaque, boolean premultiplied) {
             super(image);
-            this.alpha = alpha;
+            this.opaque = opaque;
             this.premultiplied = premultiplied;
         }
 
         @Override
-        void read(int y, int[] colors) {
-            raster.getDataElements(0, y, width, 1, colors);
-            if (alpha != 0) {
-                for (int x = 0; x < width; ++x) {
-                    colors[x] |= alpha;
-                }
+        void read(int y, int count, int[] colors) {
+            raster.getDataElements(0, y, width, count, colors);
+            if (opaque) {
+                makeOpaque(colors);
             }
         }
 
@@ -101,21 +130,13 @@ abstract class ColorRows {
                     - raster.getSampleModelTranslateX() * model.getPixelStride();
         }
 
-        final int rowStart(int y) {
-            return first + y * stride;
-        }
-    }
-
-    private static final class ThreeBytes extends Bytes {
-        ThreeBytes(BufferedImage image) {
-            super(image);
-        }
+        /** Writes one row, whose bytes begin at {@code start}, into {@code colors} from {@code to} on. */
+        abstract void readRow(int start, int[] colors, int to);
 
         @Override
-        void read(int y, int[] colors) {
-            for (int x = 0, i = rowStart(y); x < width; ++x, i += 3) {
-                colors[x] = 0xFF000000 | bytes.getElem(i + 2) << 16 | bytes.getElem(i + 1) << 8
-                        | bytes.getElem(i);
+        final void read(int y, int count, int[] colors) {
+            for (int i = 0; i < count; ++i) {
+                readRow(first + (y + i) * stride, colors, i * width);
             }
         }
     }
@@ -126,9 +147,9 @@ abstract class ColorRows {
         }
 
         @Override
-        void read(int y, int[] colors) {
-            for (int x = 0, i = rowStart(y); x < width; ++x, i += 4) {
-                colors[x] = bytes.getElem(i) << 24 | bytes.getElem(i + 3) << 16
+        void readRow(int start, int[] colors, int to) {
+            for (int x = 0, i = start; x < width; ++x, i += 4) {
+                colors[to + x] = bytes.getElem(i) << 24 | bytes.getElem(i + 3) << 16
                         | bytes.getElem(i + 2) << 8 | bytes.getElem(i + 1);
             }
         }
@@ -146,9 +167,9 @@ abstract class ColorRows {
         }
 
         @Override
-        void read(int y, int[] colors) {
-            for (int x = 0, i = rowStart(y); x < width; ++x, ++i) {
-                colors[x] = colorOf[bytes.getElem(i)];
+        void readRow(int start, int[] colors, int to) {
+            for (int x = 0, i = start; x < width; ++x, ++i) {
+                colors[to + x] = colorOf[bytes.getElem(i)];
             }
         }
     }

@@ -48,9 +48,10 @@ class BitmapImagesTest {
         Random random = new Random(5);
         for (int type = BufferedImage.TYPE_INT_RGB; type <= BufferedImage.TYPE_BYTE_INDEXED;
                 ++type) {
-            BufferedImage whole = new BufferedImage(67, 9, type);
-            for (int i = 0; i < 67 * 9; ++i) {
-                whole.setRGB(i % 67, i / 67, random.nextInt() | (i % 3 == 0 ? 0xFF000000 : 0));
+            BufferedImage whole = new BufferedImage(1100, 9, type); // in several bands and parts
+            for (int i = 0; i < 1100 * 9; ++i) {
+                boolean opaque = i % 3 == 0 || i % 1100 > 900;
+                whole.setRGB(i % 1100, i / 1100, random.nextInt() | (opaque ? 0xFF000000 : 0));
             }
             for (BufferedImage image : new BufferedImage[] {
                 whole, whole.getSubimage(5, 2, 31, 6), whole.getSubimage(8, 1, 1, 1)}) {
