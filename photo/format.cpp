@@ -14,13 +14,13 @@ namespace pelorin::photo {
 namespace {
 
 // The usual one first; raw pixels last: no bytes tell that they are some.
-const std::array<Format, 3>& table() {
-  static const std::array<Format, 3> rows = {jpegFormat, pngFormat, rawFormat};
+std::span<const Format> table() {
+  static const std::array rows = {jpegFormat, pngFormat, rawFormat};
   return rows;
 }
 
 std::span<const Format> pictureTable() {
-  return std::span(table()).first(table().size() - 1);
+  return table().first(table().size() - 1);
 }
 
 bool sameExtension(std::string_view a, std::string_view b) {

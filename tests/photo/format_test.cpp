@@ -15,6 +15,7 @@ namespace {
 
 using namespace std::string_view_literals;
 using testing::HasSubstr;
+using testing::MatchesRegex;
 using testing::StartsWith;
 
 std::vector<std::uint8_t> fileOf(std::string_view beginning) {
@@ -48,9 +49,16 @@ TEST(FormatTable, FindsFormatsByNameExtensionAndContent) {
   EXPECT_EQ(formatNamed("GIF"), nullptr);
   EXPECT_TRUE(isPictureExtension(".png"));
   EXPECT_FALSE(isPictureExtension(".rgba"));
-  EXPECT_EQ(pictureFormats(), "JPEG or PNG");
-  EXPECT_EQ(pictureExtensions(), ".jpg, .jpeg, .jpe or .png");
-  EXPECT_EQ(lossyFormats(), "JPEG");
+  EXPECT_THAT(pictureFormats(), MatchesRegex("JPEG(, [^ ]+)* or [^ ]+"));
+  EXPECT_THAT(pictureExtensions(),
+              MatchesRegex("\\.jpg, \\.jpeg, \\.jpe(, \\.[^ ]+)* or \\.[^ ]+"));
+  for (const Format& format : formats()) {
+    const bool isPicture = &format != &rawPixels();
+    EXPECT_EQ(pictureFormats().find(format.name) != std::string::npos, isPicture) << format.name;
+    for (const std::string_view extension : format.extensions)
+      EXPECT_EQ(pictureExtensions().find(extension) != std::string::npos, isPicture) << extension;
+    EXPECT_EQ(lossyFormats().find(format.name) != std::string::npos, format.losesDetail);
+  }
   EXPECT_EQ(usualFormat().name, "JPEG");
 }
 
@@ -88,8 +96,25 @@ TEST(FormatTable, NamesWhatItCannotRead) {
   }
 }
 
+TEST(FormatTable, NamesTransparencyThatAFormatCannotHold) {
+  for (const Format& format : formats()) {
+    auto picture = test_support::flatPicture(37, 131, {9, 8, 7, 255});
+    std::vector<Loss> lost;
+    save(picture, format, {}, {}, &lost);
+    EXPECT_TRUE(lost.empty()) << format.name;
+    for (const std::size_t pixel :
+         {std::size_t{0}, std::size_t{37 * 100}, picture.pixelCount() - 1}) {
+      picture.data.get()[pixel].a = 254;
+      save(picture, format, {}, {}, &lost);
+      EXPECT_EQ(lost.size(), format.keepsAlpha ? 0u : 1u) << format.name << ", pixel " << pixel;
+      picture.data.get()[pixel].a = 255;
+    }
+  }
+}
+
 TEST(FormatTable, RefusesWhatIsNoPhoto) {
-  EXPECT_EQ(errorOf("a letter to a friend", PhotoError::Kind::notAPhoto), "not a JPEG or PNG file");
+  EXPECT_EQ(errorOf("a letter to a friend", PhotoError::Kind::notAPhoto),
+            "not a " + pictureFormats() + " file");
   try {
     open({});
     ADD_FAILURE();

@@ -130,7 +130,8 @@ TEST(Formats, StandInTheHelpOfEveryVerb) {
     EXPECT_THAT(help, HasSubstr(photo::pictureFormats() + " file")) << verb;
   }
   for (const auto& verb : drawingVerbs) {
-    EXPECT_THAT(quenby({verb[0], "--help"}).output, HasSubstr(".jpe or .png")) << verb[0];
+    EXPECT_THAT(quenby({verb[0], "--help"}).output, HasSubstr(photo::pictureExtensions()))
+        << verb[0];
   }
   EXPECT_THAT(quenby({"enhance", "--help"}).output, HasSubstr(photo::lossyFormats() + " quality"));
 }
