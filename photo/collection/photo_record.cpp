@@ -18,11 +18,13 @@ int scaleFor(std::uint32_t width, std::uint32_t height) {
   return scale;
 }
 
-PhotoRecord readPhotoRecord(std::span<const std::uint8_t> file, int scale, std::stop_token stop) {
+PhotoRecord readPhotoRecord(std::span<const std::uint8_t> file, int scale, std::stop_token stop,
+                            const DecodeLimits& limits) {
   const PhotoFacts facts = readFacts(file);
   if (scale == automaticScale) scale = scaleFor(facts.width, facts.height);
   PhotoRecord record{facts.width, facts.height, facts.orientation, facts.captureTime, {}};
-  const Photo photo = open(file, {.scale = scale, .upright = false, .stop = std::move(stop)});
+  const Photo photo =
+      open(file, {.scale = scale, .upright = false, .limits = limits, .stop = std::move(stop)});
   computeGreenCDF(*photo.image, record.cdf);
   return record;
 }

@@ -8,6 +8,7 @@
 
 #include "image_processing/dupe/green_cdf.h"
 #include "photo/collection/shot.h"
+#include "photo/decode_limits.h"
 #include "photo/metadata/capture_time.h"
 
 namespace pelorin::photo {
@@ -30,7 +31,7 @@ int scaleFor(std::uint32_t width, std::uint32_t height);
 /// Decodes a photo once; its pixels are counted as they are stored, not turned.
 /// @throws PhotoError as `open`, Stopped when `stop` says so.
 PhotoRecord readPhotoRecord(std::span<const std::uint8_t> file, int scale = automaticScale,
-                            std::stop_token stop = {});
+                            std::stop_token stop = {}, const DecodeLimits& limits = {});
 
 /// What tells a changed file from the one that was read.
 struct FileStamp {

@@ -17,3 +17,21 @@ if(with_photo)
   execute_process(COMMAND ${SCRATCH}/build/uses_photo ${SCRATCH}/in.jpg ${SCRATCH}/out.jpg
                   COMMAND_ERROR_IS_FATAL ANY)
 endif()
+
+# In C, by CMake and by pkg-config.
+file(GLOB_RECURSE with_c ${SCRATCH}/prefix/*/QuenbyCTargets.cmake)
+file(GLOB_RECURSE pc ${SCRATCH}/prefix/*/quenby.pc)
+if(with_c)
+  get_filename_component(pc_folder ${pc} DIRECTORY)
+  get_filename_component(lib_folder ${pc_folder} DIRECTORY)
+  set(photos ${SCRATCH}/in.jpg ${SCRATCH}/by_c.jpg)
+  foreach(step
+          "${CMAKE_COMMAND};-S;${SOURCE}/uses_c;-B;${SCRATCH}/build_c;-G;${GENERATOR};-DCMAKE_PREFIX_PATH=${SCRATCH}/prefix"
+          "${CMAKE_COMMAND};--build;${SCRATCH}/build_c"
+          "${SCRATCH}/build_c/uses_quenby;${photos}"
+          "sh;-c;cc -Wall -Werror -o ${SCRATCH}/by_pkg_config ${SOURCE}/uses_c/uses_quenby.c \
+              $(PKG_CONFIG_PATH=${pc_folder} pkg-config --cflags --libs quenby)"
+          "${CMAKE_COMMAND};-E;env;LD_LIBRARY_PATH=${lib_folder};${SCRATCH}/by_pkg_config;${photos}")
+    execute_process(COMMAND ${step} COMMAND_ERROR_IS_FATAL ANY)
+  endforeach()
+endif()

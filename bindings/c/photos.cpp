@@ -1,0 +1,223 @@
+#include "bindings/c/photos.h"
+
+#include <limits>
+#include <memory>
+
+#include "bindings/c/pixels.h"
+#include "photo/collection/photo_record.h"
+#include "photo/filter_photo.h"
+
+using namespace pelorin;
+using namespace pelorin::c_api;
+
+namespace pelorin::c_api {
+
+std::span<const std::uint8_t> bytesOf(const std::uint8_t* file, std::size_t size) {
+  return {array(file, size, "file"), size};
+}
+
+photo::OpenOptions openOptions(const quenby_open_options* given, const quenby_cancel* cancel) {
+  const quenby_open_options options = optionsOf(given, "options");
+  if ((options.flags & ~(QUENBY_AS_STORED | QUENBY_IGNORE_KNOWN_FACES)) != 0) {
+    refuse("options", "unknown flags");
+  }
+  photo::OpenOptions open{.scale = options.scale == 0 ? 1 : options.scale,
+                          .rotate = options.rotate,
+                          .upright = (options.flags & QUENBY_AS_STORED) == 0,
+                          .faces = (options.flags & QUENBY_IGNORE_KNOWN_FACES) == 0,
+                          .stop = tokenOf(cancel)};
+  if (open.scale != 1 && open.scale != 2 && open.scale != 4 && open.scale != 8) {
+    refuse("scale", "is not 1, 2, 4 or 8");
+  }
+  if (open.rotate % 90 != 0) refuse("rotate", "is no multiple of 90");
+  if (options.max_pixels != 0) open.limits.pixels = options.max_pixels;
+  if (options.max_scans < 0) refuse("max_scans", "is negative");
+  if (options.max_scans != 0) open.limits.scans = options.max_scans;
+  return open;
+}
+
+}  // namespace pelorin::c_api
+
+namespace {
+
+photo::SaveOptions saveOptions(const quenby_save_options* given, const quenby_cancel* cancel) {
+  const quenby_save_options options = optionsOf(given, "options");
+  const auto keeps = [&](uint32_t flag) { return (options.flags & flag) == 0; };
+  if (options.flags > (QUENBY_DROP_METADATA | QUENBY_DROP_LOCATION | QUENBY_DROP_THUMBNAIL |
+                       QUENBY_DROP_GAIN_MAP)) {
+    refuse("options", "unknown flags");
+  }
+  photo::SaveOptions save{.stop = tokenOf(cancel),
+                          .keep = {.everything = keeps(QUENBY_DROP_METADATA),
+                                   .location = keeps(QUENBY_DROP_LOCATION),
+                                   .thumbnail = keeps(QUENBY_DROP_THUMBNAIL),
+                                   .gainMap = keeps(QUENBY_DROP_GAIN_MAP)}};
+  if (options.quality != 0) save.quality = options.quality;
+  if (save.quality < 1 || save.quality > 100) refuse("quality", "is not from 1 to 100");
+  return save;
+}
+
+const photo::Format& formatCalled(const char* name) {
+  const photo::Format* const format = photo::formatNamed(&required(name, "format"));
+  if (format == nullptr || format == &photo::rawPixels()) {
+    refuse("format", std::string(name) + " is none that can be written");
+  }
+  return *format;
+}
+
+quenby_facts factsOf(const photo::PhotoFacts& from) {
+  quenby_facts facts{};
+  facts.width = from.width;
+  facts.height = from.height;
+  facts.channels = from.channels;
+  facts.orientation = from.orientation;
+  facts.progressive = from.progressive;
+  facts.has_alpha = from.hasAlpha;
+  copyText(facts.format, std::string(from.format));
+  constexpr double unknown = std::numeric_limits<double>::quiet_NaN();
+  facts.wall_clock = facts.utc = unknown;
+  if (from.captureTime) {
+    const photo::ShotTime time = photo::shotTime(*from.captureTime);
+    facts.wall_clock = time.wallClock;
+    facts.utc = time.utc.value_or(unknown);
+    copyText(facts.capture_time, from.captureTime->text);
+  }
+  return facts;
+}
+
+}  // namespace
+
+int32_t quenby_read_facts(const uint8_t* file, size_t size, quenby_facts* facts,
+                          quenby_error* error) {
+  return guarded(error, [&] {
+    checkStructSize(required(facts, "facts"), "facts");
+    give(facts, factsOf(photo::readFacts(bytesOf(file, size))), "facts");
+  });
+}
+
+int32_t quenby_photo_open(const uint8_t* file, size_t size, const quenby_open_options* options,
+                          const quenby_cancel* cancel, quenby_photo** photo, quenby_error* error) {
+  if (photo != nullptr) *photo = nullptr;
+  return guarded(error, [&] {
+    required(photo, "photo");
+    const photo::OpenOptions open = openOptions(options, cancel);
+    *photo = new quenby_photo{photo::open(bytesOf(file, size), open), open.scale};
+  });
+}
+
+void quenby_photo_free(quenby_photo* photo) {
+  delete photo;
+}
+
+int32_t quenby_photo_pixels(const quenby_photo* photo, quenby_pixels* pixels, quenby_error* error) {
+  return guarded(error, [&] {
+    const Picture& picture = *required(photo, "photo").photo.image;
+    required(pixels, "pixels") = {&picture.data.get()->r, picture.width, picture.height,
+                                  size_t{picture.width} * picture.bytesPerPixel};
+  });
+}
+
+int32_t quenby_photo_facts(const quenby_photo* photo, quenby_facts* facts, quenby_error* error) {
+  return guarded(error,
+                 [&] { give(facts, factsOf(required(photo, "photo").photo.facts), "facts"); });
+}
+
+int32_t quenby_photo_faces(const quenby_photo* photo, quenby_known_face* faces, size_t capacity,
+                           size_t* count, quenby_error* error) {
+  if (count != nullptr) *count = 0;
+  return guarded(error, [&] {
+    required(count, "count");
+    array(faces, capacity, "faces");
+    const std::vector<photo::KnownFace>& known = required(photo, "photo").photo.faces;
+    for (size_t i = 0; i < known.size() && i < capacity; ++i) {
+      faces[i] = {known[i].left, known[i].top, known[i].right, known[i].bottom, {}};
+      copyText(faces[i].name, known[i].name);
+    }
+    *count = known.size();
+  });
+}
+
+const char* quenby_photo_notice(const quenby_photo* photo, size_t index) {
+  if (photo == nullptr || index >= photo->photo.facts.notices.size()) return nullptr;
+  return photo->photo.facts.notices[index].c_str();
+}
+
+int32_t quenby_photo_save(const quenby_photo* photo, const quenby_pixels* pixels,
+                          const char* format, const quenby_save_options* options,
+                          const quenby_cancel* cancel, quenby_file** file, quenby_error* error) {
+  if (file != nullptr) *file = nullptr;
+  return guarded(error, [&] {
+    required(file, "file");
+    const photo::Photo& from = required(photo, "photo").photo;
+    const photo::SaveOptions save = saveOptions(options, cancel);
+    const photo::Format& as =
+        format == nullptr ? *photo::formatNamed(from.facts.format) : formatCalled(format);
+    const auto picture = pixels == nullptr ? from.image : viewOf(pixels);
+    if (picture->width != from.image->width || picture->height != from.image->height) {
+      refuse("pixels", "are of another size than the photo's");
+    }
+    auto made = std::make_unique<quenby_file>();
+    made->bytes = photo::save(*picture, as, from.metadata, save, &made->lost);
+    *file = made.release();
+  });
+}
+
+int32_t quenby_write(const quenby_pixels* pixels, const char* format,
+                     const quenby_save_options* options, const quenby_cancel* cancel,
+                     quenby_file** file, quenby_error* error) {
+  if (file != nullptr) *file = nullptr;
+  return guarded(error, [&] {
+    required(file, "file");
+    const photo::SaveOptions save = saveOptions(options, cancel);
+    const photo::Format& as = formatCalled(format);
+    auto made = std::make_unique<quenby_file>();
+    made->bytes = photo::save(*viewOf(pixels), as, {}, save, &made->lost);
+    *file = made.release();
+  });
+}
+
+int32_t quenby_filter_file(const uint8_t* file, size_t size, const char* filter, const char* params,
+                           const quenby_face* faces, size_t face_count,
+                           const quenby_open_options* open, const char* format,
+                           const quenby_save_options* save, const quenby_cancel* cancel,
+                           quenby_file** result, quenby_error* error) {
+  if (result != nullptr) *result = nullptr;
+  return guarded(error, [&] {
+    required(result, "result");
+    const photo::FilterRequest request{.filter = &required(filter, "filter"),
+                                       .params = params == nullptr ? "" : params,
+                                       .faces = facesOf(faces, face_count),
+                                       .open = openOptions(open, cancel),
+                                       .save = saveOptions(save, cancel)};
+    auto made = std::make_unique<quenby_file>();
+    made->bytes =
+        photo::filterPhoto(bytesOf(file, size), request,
+                           format == nullptr ? nullptr : &formatCalled(format), &made->lost);
+    *result = made.release();
+  });
+}
+
+const uint8_t* quenby_file_data(const quenby_file* file) {
+  return file == nullptr ? nullptr : file->bytes.data();
+}
+
+size_t quenby_file_size(const quenby_file* file) {
+  return file == nullptr ? 0 : file->bytes.size();
+}
+
+size_t quenby_file_loss_count(const quenby_file* file) {
+  return file == nullptr ? 0 : file->lost.size();
+}
+
+int32_t quenby_file_loss(const quenby_file* file, size_t index, quenby_loss* loss,
+                         quenby_error* error) {
+  return guarded(error, [&] {
+    const auto& lost = required(file, "file").lost;
+    if (index >= lost.size()) refuse("index", "there are " + std::to_string(lost.size()));
+    give(loss, {0, lost[index].what.c_str(), lost[index].why.c_str()}, "loss");
+  });
+}
+
+void quenby_file_free(quenby_file* file) {
+  delete file;
+}

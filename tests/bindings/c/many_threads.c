@@ -1,0 +1,125 @@
+/* Eight threads at once, and calls that another thread cancels. */
+#define _POSIX_C_SOURCE 200809L
+#include <pthread.h>
+#include <stdlib.h>
+#include <string.h>
+
+#include "checks.h"
+
+enum { threads = 8, moves = 3, width = 120, height = 90, bytes = width * height * 4 };
+
+static const char* const params[moves] = {"slider=0.2;", "slider=0.5;", "slider=1;"};
+static struct bytes photo;
+static quenby_pixels pixels;
+static quenby_session* shared;
+static uint8_t wanted[moves][bytes];
+
+static int apply_all(quenby_session* session) {
+  uint8_t out[bytes];
+  int same = 1;
+  for (int move = 0; move < moves; ++move) {
+    memset(out, 0, bytes);
+    quenby_error own;
+    const int32_t kind =
+        quenby_session_apply(session, "AE0", params[move], out, width * 4, NULL, &own);
+    same = same && kind == QUENBY_OK && memcmp(out, wanted[move], bytes) == 0;
+  }
+  return same;
+}
+
+static void* one_thread(void* of_its_own) {
+  quenby_session* session = shared;
+  if (of_its_own != NULL) quenby_session_open(&pixels, NULL, 0, 0, &session, NULL);
+  const int same = apply_all(session);
+  if (of_its_own != NULL) quenby_session_free(session);
+  return same ? wanted : NULL;
+}
+
+static void same_bytes(int sessions_of_their_own) {
+  pthread_t all[threads];
+  for (int i = 0; i < threads; ++i)
+    CHECK(pthread_create(&all[i], NULL, one_thread, sessions_of_their_own ? wanted : NULL) == 0);
+  for (int i = 0; i < threads; ++i) {
+    void* same = NULL;
+    CHECK(pthread_join(all[i], &same) == 0 && same != NULL);
+  }
+}
+
+/* Works until it is cancelled. */
+static void* until_cancelled(void* cancel) {
+  int32_t kind = QUENBY_OK;
+  while (kind == QUENBY_OK) {
+    quenby_file* file = NULL;
+    kind = quenby_filter_file(photo.data, photo.size, "AE0", "slider=0.4;", NULL, 0, NULL, NULL,
+                              NULL, cancel, &file, NULL);
+    quenby_file_free(file);
+  }
+  return kind == QUENBY_CANCELLED ? wanted : NULL;
+}
+
+static void cancelled_by_another_thread(void) {
+  quenby_cancel* cancel = NULL;
+  DONE(quenby_cancel_new(&cancel, &error));
+  pthread_t all[2];
+  for (int i = 0; i < 2; ++i) CHECK(pthread_create(&all[i], NULL, until_cancelled, cancel) == 0);
+  quenby_file* file = NULL; /* gives them time to begin */
+  DONE(quenby_filter_file(photo.data, photo.size, "AE0", "slider=0.4;", NULL, 0, NULL, NULL, NULL,
+                          NULL, &file, &error));
+  quenby_file_free(file);
+  quenby_cancel_request(cancel);
+  for (int i = 0; i < 2; ++i) {
+    void* right = NULL;
+    CHECK(pthread_join(all[i], &right) == 0 && right != NULL);
+  }
+  quenby_cancel_free(cancel);
+}
+
+/* Every function that looks at one. */
+static void cancelled_before(void) {
+  quenby_cancel *cancel = NULL, *other = NULL;
+  DONE(quenby_cancel_new(&cancel, &error));
+  DONE(quenby_cancel_new(&other, &error));
+  quenby_photo *made = NULL, *open = NULL;
+  quenby_file* file = NULL;
+  quenby_shot shots[2];
+  quenby_pairs pairs;
+  uint8_t out[bytes];
+  DONE(quenby_read_shot(photo.data, photo.size, NULL, other, &shots[0], &error));
+  shots[1] = shots[0];
+  DONE(quenby_photo_open(photo.data, photo.size, NULL, other, &open, &error));
+  quenby_cancel_request(cancel);
+  quenby_cancel_request(cancel);
+  const int32_t c = QUENBY_CANCELLED;
+  REFUSED(c, quenby_photo_open(photo.data, photo.size, NULL, cancel, &made, &error));
+  REFUSED(c, quenby_photo_save(open, NULL, NULL, NULL, cancel, &file, &error));
+  REFUSED(c, quenby_write(&pixels, "PNG", NULL, cancel, &file, &error));
+  REFUSED(c, quenby_filter_file(photo.data, photo.size, "AE0", "slider=0.4;", NULL, 0, NULL, NULL,
+                                NULL, cancel, &file, &error));
+  REFUSED(c, quenby_read_shot(photo.data, photo.size, NULL, cancel, &shots[0], &error));
+  REFUSED(c, quenby_find_pairs(shots, 2, 0, cancel, &pairs, &error));
+  REFUSED(c, quenby_session_apply(shared, "AE0", params[0], out, width * 4, cancel, &error));
+  CHECK(made == NULL && file == NULL && pairs.count == 0);
+  DONE(quenby_session_apply(shared, "AE0", params[0], out, width * 4, other, &error));
+  CHECK(memcmp(out, wanted[0], bytes) == 0);
+  quenby_photo_free(open);
+  quenby_cancel_free(cancel);
+  quenby_cancel_free(other);
+}
+
+int main(void) {
+  photo = made_photo(200, 150, 1);
+  pixels = made_pixels(width, height, 4);
+  DONE(quenby_session_open(&pixels, NULL, 0, 0, &shared, &error));
+  for (int move = 0; move < moves; ++move)
+    DONE(quenby_session_apply(shared, "AE0", params[move], wanted[move], width * 4, NULL, &error));
+  quenby_session_free(shared);
+  DONE(quenby_session_open(&pixels, NULL, 0, QUENBY_BORROW_PIXELS, &shared, &error));
+  same_bytes(0);
+  same_bytes(1);
+  cancelled_before();
+  cancelled_by_another_thread();
+  quenby_session_free(shared);
+  free_pixels(&pixels);
+  free(photo.data);
+  return failures > 0;
+}
