@@ -3,8 +3,10 @@
 #include <algorithm>
 #include <stdexcept>
 
+#include "image_processing/autoenhance/enhance_rows.h"
 #include "image_processing/autoenhance/lab_tone_pass.h"
 #include "image_processing/core/parameter_strings.h"
+#include "image_processing/filters/through_picture.h"
 
 namespace pelorin::image_processing {
 namespace {
@@ -38,6 +40,15 @@ FilterParameters AEFilterT<TB, TL>::parameters() {
                     .onlyWith = "gtmOnly"}},
           .reader = ParameterReader::filterParams,
           .readsFaces = true};
+}
+
+template <typename TB, typename TL>
+std::unique_ptr<RowFilter> AEFilterT<TB, TL>::forRows(const RowRequest& request) {
+  if (request.config.useBilateralGrid != 0) return enhanceRowFilter<TB>(request);
+  // The exact filter's windows are a good part of the picture.
+  return throughPicture(
+      [](std::shared_ptr<FilteredImageState>& state) { return std::make_unique<AEFilterT>(state); },
+      request);
 }
 
 template <typename TB, typename TL>

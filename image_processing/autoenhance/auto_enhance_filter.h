@@ -6,6 +6,7 @@
 #include "image_processing/autoenhance/lightness/image_statistics.h"
 #include "image_processing/autoenhance/masks/image_masks.h"
 #include "image_processing/filters/abstract_filter.h"
+#include "image_processing/filters/row_filter.h"
 
 namespace pelorin::image_processing {
 
@@ -33,6 +34,7 @@ class AEFilterT : public AbstractFilter, public AEFilterBase {
   using AbstractFilter::AbstractFilter;
 
   static FilterParameters parameters();
+  static std::unique_ptr<RowFilter> forRows(const RowRequest& request);
 
   /// Starts anew: what an earlier `init` prepared is gone. When it throws, there are no masks, but
   /// unless memory ran out for them too there are statistics, so that global applications work.

@@ -3,6 +3,7 @@
 #include <cstddef>
 #include <vector>
 
+#include "image_processing/autoenhance/colour/companding_steps.h"
 #include "image_processing/core/pixel_types.h"
 
 namespace pelorin::image_processing {
@@ -31,6 +32,30 @@ struct TonePass {
 template <typename Mask>
 void enhanceRow(const TonePass& pass, const RGBA8Pixel* in, const Mask* bilateral, const Mask* ltm,
                 RGBA8Pixel* out, std::size_t count);
+
+/// `enhanceRow` for a picture that comes in pieces: what depends on the pass alone is found once. Some
+/// 40 KB. Any thread may use it.
+class PreparedTonePass {
+ public:
+  /// Holds on to `pass`. Never throws.
+  explicit PreparedTonePass(const TonePass& pass);
+
+  /// As `enhanceRow`, for the same masks.
+  template <typename Mask>
+  void enhance(const RGBA8Pixel* in, const Mask* bilateral, const Mask* ltm, RGBA8Pixel* out,
+               std::size_t count) const;
+
+  /// The tone curve, and its values where the argument is one of a few.
+  struct Tables {
+    alignas(64) float ofSteps[compandingStepCount];  ///< At the L of a step of Y.
+    alignas(64) float ofBytes[256];                  ///< At the L that a byte of a mask stands for.
+    alignas(64) float samples[65];                   ///< The last one repeated to the end.
+  };
+
+ private:
+  const TonePass& pass_;
+  Tables tables_;  // written when the pass is ordinary
+};
 
 /// The definition of `enhanceRow`.
 template <typename Mask>

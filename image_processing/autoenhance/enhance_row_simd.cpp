@@ -83,43 +83,45 @@ HWY_INLINE F valueOf(I byte) {
   return simd::divide(toFloats(byte), Divisor(Quantized::codesPerUnit));
 }
 
-/// The tone curve, and its values where the argument is one of a few. Some 40 KB, for the stack.
+/// The tone curve in vectors.
 class ToneMap {
  public:
-  explicit ToneMap(const TonePass& pass) : perUnit_(pass.samplesPerUnit) {
-    std::fill(std::copy(pass.curve.begin(), pass.curve.end(), samples_), std::end(samples_),
-              pass.curve.back());
-    const float* const fy = colourTables().xyzToLab.samples().data();
-    for (std::size_t i = 0; i < compandingStepCount; i += hn::Lanes(Floats())) {
-      hn::Store((*this)(lab::lightness(hn::LoadU(Floats(), fy + i))), Floats(), ofSteps_ + i);
-    }
-    for (std::size_t i = 0; i < 256; i += hn::Lanes(Floats())) {
-      const I byte = hn::Iota(Ints(), static_cast<std::int32_t>(i));
-      hn::Store((*this)(hn::Mul(set(pass.scale), valueOf(byte))), Floats(), ofBytes_ + i);
-    }
-  }
+  ToneMap(const TonePass& pass, const PreparedTonePass::Tables& tables)
+      : tables_(tables), perUnit_(pass.samplesPerUnit) {}
 
   /// The curve at L from 0 on, less than one sample beyond the last.
   HWY_INLINE F operator()(F L) const {
     const F place = hn::Mul(L, set(perUnit_));
     const I index = simd::truncate(place);
     const F fraction = hn::Sub(place, toFloats(index));
-    const F upper = simd::SmallTable(samples_ + 1)(index);
-    const F lower = simd::SmallTable(samples_)(index);
+    const F upper = simd::SmallTable(tables_.samples + 1)(index);
+    const F lower = simd::SmallTable(tables_.samples)(index);
     return hn::Add(hn::Mul(fraction, upper), hn::Mul(hn::Sub(set(1.0f), fraction), lower));
   }
   /// The curve at the L of a step of Y.
-  HWY_INLINE F ofStep(I step) const { return lookUp(ofSteps_, step); }
+  HWY_INLINE F ofStep(I step) const { return lookUp(tables_.ofSteps, step); }
   /// The curve at the L that a byte of a mask stands for.
-  HWY_INLINE F ofByte(I byte) const { return lookUp(ofBytes_, byte); }
+  HWY_INLINE F ofByte(I byte) const { return lookUp(tables_.ofBytes, byte); }
 
  private:
-  static_assert(compandingStepCount % hn::MaxLanes(Floats()) == 0);
-  HWY_ALIGN float ofSteps_[compandingStepCount];
-  HWY_ALIGN float ofBytes_[256];
-  HWY_ALIGN float samples_[65];  // the last one repeated to the end
+  const PreparedTonePass::Tables& tables_;
   float perUnit_;
 };
+
+void fillTables(const TonePass& pass, PreparedTonePass::Tables& tables) {
+  static_assert(compandingStepCount % hn::MaxLanes(Floats()) == 0);
+  std::fill(std::copy(pass.curve.begin(), pass.curve.end(), tables.samples),
+            std::end(tables.samples), pass.curve.back());
+  const ToneMap toneMap(pass, tables);
+  const float* const fy = colourTables().xyzToLab.samples().data();
+  for (std::size_t i = 0; i < compandingStepCount; i += hn::Lanes(Floats())) {
+    hn::Store(toneMap(lab::lightness(hn::LoadU(Floats(), fy + i))), Floats(), tables.ofSteps + i);
+  }
+  for (std::size_t i = 0; i < 256; i += hn::Lanes(Floats())) {
+    const I byte = hn::Iota(Ints(), static_cast<std::int32_t>(i));
+    hn::Store(toneMap(hn::Mul(set(pass.scale), valueOf(byte))), Floats(), tables.ofBytes + i);
+  }
+}
 
 /// What recombination needs of one vector of the masks.
 struct MaskTerms {
@@ -230,9 +232,10 @@ HWY_NOINLINE void finish(float vibrance, const RGBA8Pixel* in, RGBA8Pixel* out, 
 }
 
 template <bool masked, typename Mask>
-HWY_INLINE void enhanceBlocks(const TonePass& pass, const RGBA8Pixel* in, const Mask* bilateral,
-                              const Mask* ltm, RGBA8Pixel* out, std::size_t count) {
-  const ToneMap toneMap(pass);
+HWY_INLINE void enhanceBlocks(const TonePass& pass, const PreparedTonePass::Tables& tables,
+                              const RGBA8Pixel* in, const Mask* bilateral, const Mask* ltm,
+                              RGBA8Pixel* out, std::size_t count) {
+  const ToneMap toneMap(pass, tables);
   Block block;
   while (count >= hn::Lanes(Floats())) {
     const std::size_t size = std::min(blockPixels, count - count % hn::Lanes(Floats()));
@@ -256,18 +259,21 @@ HWY_INLINE void enhanceBlocks(const TonePass& pass, const RGBA8Pixel* in, const 
 }
 
 template <typename Mask>
-void enhanceRowVector(const TonePass& pass, const RGBA8Pixel* in, const Mask* bilateral,
-                      const Mask* ltm, RGBA8Pixel* out, std::size_t count) {
+void enhanceByTables(const TonePass& pass, const PreparedTonePass::Tables& tables,
+                     const RGBA8Pixel* in, const Mask* bilateral, const Mask* ltm, RGBA8Pixel* out,
+                     std::size_t count) {
   if (bilateral != nullptr) {
-    enhanceBlocks<true>(pass, in, bilateral, ltm, out, count);
+    enhanceBlocks<true>(pass, tables, in, bilateral, ltm, out, count);
   } else {
-    enhanceBlocks<false>(pass, in, bilateral, ltm, out, count);
+    enhanceBlocks<false>(pass, tables, in, bilateral, ltm, out, count);
   }
 }
 
-/// The kernel for every kind of mask. The types are those of every instruction set.
-std::tuple<decltype(&enhanceRow<float>), decltype(&enhanceRow<Quantized>)> entries() {
-  return {enhanceRowVector<float>, enhanceRowVector<Quantized>};
+/// Every kernel of this file, for every kind of mask. The types are those of every instruction set.
+using Entries = std::tuple<decltype(&fillTables), decltype(&enhanceByTables<float>),
+                           decltype(&enhanceByTables<Quantized>)>;
+Entries entries() {
+  return {fillTables, enhanceByTables<float>, enhanceByTables<Quantized>};
 }
 
 }  // namespace
@@ -279,15 +285,30 @@ namespace pelorin::image_processing {
 
 HWY_EXPORT(entries);
 
+PreparedTonePass::PreparedTonePass(const TonePass& pass) : pass_(pass) {
+  if (!pass.ordinary) return;
+  std::get<decltype(&HWY_NAMESPACE::fillTables)>(HWY_DYNAMIC_DISPATCH(entries)())(pass, tables_);
+}
+
+template <typename Mask>
+void PreparedTonePass::enhance(const RGBA8Pixel* in, const Mask* bilateral, const Mask* ltm,
+                               RGBA8Pixel* out, std::size_t count) const {
+  if (!pass_.ordinary) return enhanceRowScalar(pass_, in, bilateral, ltm, out, count);
+  std::get<decltype(&HWY_NAMESPACE::enhanceByTables<Mask>)>(HWY_DYNAMIC_DISPATCH(entries)())(
+      pass_, tables_, in, bilateral, ltm, out, count);
+}
+
 template <typename Mask>
 void enhanceRow(const TonePass& pass, const RGBA8Pixel* in, const Mask* bilateral, const Mask* ltm,
                 RGBA8Pixel* out, std::size_t count) {
-  if (!pass.ordinary) return enhanceRowScalar(pass, in, bilateral, ltm, out, count);
-  std::get<decltype(&enhanceRow<Mask>)>(HWY_DYNAMIC_DISPATCH(entries)())(pass, in, bilateral, ltm,
-                                                                         out, count);
+  PreparedTonePass(pass).enhance(in, bilateral, ltm, out, count);
 }
 
 using Quantized = QuantizedFloat<unsigned char>;
+template void PreparedTonePass::enhance(const RGBA8Pixel*, const float*, const float*, RGBA8Pixel*,
+                                        std::size_t) const;
+template void PreparedTonePass::enhance(const RGBA8Pixel*, const Quantized*, const Quantized*,
+                                        RGBA8Pixel*, std::size_t) const;
 template void enhanceRow(const TonePass&, const RGBA8Pixel*, const float*, const float*,
                          RGBA8Pixel*, std::size_t);
 template void enhanceRow(const TonePass&, const RGBA8Pixel*, const Quantized*, const Quantized*,

@@ -2,8 +2,11 @@
 
 #include <memory>
 #include <string>
+#include <utility>
 
 #include "image_processing/filters/abstract_filter.h"
+#include "image_processing/filters/row_filter.h"
+#include "image_processing/filters/through_picture.h"
 
 namespace pelorin::image_processing {
 
@@ -19,6 +22,13 @@ class FilterDescription {
   /// A new filter bound to `state`; not initialised yet.
   virtual std::unique_ptr<AbstractFilter> makeFilter(
       std::shared_ptr<FilteredImageState>& state) const = 0;
+  /// A filter for one picture that comes as rows.
+  /// @throws std::bad_alloc, and what the filter throws for such parameters, here or at its work.
+  virtual std::unique_ptr<RowFilter> makeRowFilter(RowRequest request) const {
+    return throughPicture(
+        [this](std::shared_ptr<FilteredImageState>& state) { return makeFilter(state); },
+        std::move(request));
+  }
   virtual ~FilterDescription() = default;
   /// What its filters take beside the photo.
   virtual FilterParameters parameters() const { return {}; }
@@ -28,7 +38,8 @@ class FilterDescription {
   const std::string description;  ///< One or more sentences for users.
 };
 
-/// The description of a filter class `F`, constructible from the session's state.
+/// The description of a filter class `F`, constructible from the session's state. A filter that can
+/// do without the whole picture has a static function `forRows`, which takes a `RowRequest`.
 template <typename F>
 class ConcreteDescription : public FilterDescription {
  public:
@@ -37,6 +48,13 @@ class ConcreteDescription : public FilterDescription {
   std::unique_ptr<AbstractFilter> makeFilter(
       std::shared_ptr<FilteredImageState>& state) const override {
     return std::make_unique<F>(state);
+  }
+  std::unique_ptr<RowFilter> makeRowFilter(RowRequest request) const override {
+    if constexpr (requires { F::forRows(request); }) {
+      return F::forRows(request);
+    } else {
+      return FilterDescription::makeRowFilter(std::move(request));
+    }
   }
   FilterParameters parameters() const override { return F::parameters(); }
 };

@@ -3,7 +3,29 @@
 #include <algorithm>
 #include <cstring>
 
+#include "image_processing/filters/mapped_rows.h"
+
 namespace pelorin::image_processing {
+namespace {
+
+class PassThroughRows : public RowFilter {
+ public:
+  PassThroughRows(std::uint32_t width, std::uint32_t height) : width_(width), height_(height) {}
+
+  bool filter(RowSource& rows, RowSink& filtered, const RowWork& work) override {
+    return mapRows(width_, height_, rows, filtered, work,
+                   [](auto, const RGBA8Pixel* from, auto...) { return from; });
+  }
+
+ private:
+  std::uint32_t width_, height_;
+};
+
+}  // namespace
+
+std::unique_ptr<RowFilter> PassThrough::forRows(const RowRequest& request) {
+  return std::make_unique<PassThroughRows>(request.width, request.height);
+}
 
 void PassThrough::init(const std::string&) {}
 

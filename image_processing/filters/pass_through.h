@@ -1,6 +1,9 @@
 #pragma once
 
+#include <memory>
+
 #include "image_processing/filters/abstract_filter.h"
+#include "image_processing/filters/row_filter.h"
 
 namespace pelorin::image_processing {
 
@@ -12,6 +15,8 @@ class PassThrough : public AbstractFilter {
   void init(const std::string& params) override;
   void applyConfig(const std::string& params, const FilterConfig& config,
                    Image<RGBA8Pixel>& output) override;
+
+  static std::unique_ptr<RowFilter> forRows(const RowRequest& request);
 };
 
 }  // namespace pelorin::image_processing

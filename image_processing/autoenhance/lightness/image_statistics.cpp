@@ -4,7 +4,7 @@
 #include "image_processing/autoenhance/lightness/cdf.h"
 #include "image_processing/autoenhance/lightness/face_lightness.h"
 #include "image_processing/autoenhance/lightness/lightness_histogram.h"
-#include "image_processing/autoenhance/lightness/lightness_rows.h"
+#include "image_processing/autoenhance/lightness/lightness_row.h"
 
 namespace pelorin::image_processing {
 namespace {
@@ -22,8 +22,10 @@ std::int32_t faceMedianBin(const Image<RGBA8Pixel>& image, const ImageMetadata& 
 void analyzeImage(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata,
                   ImageStatistics& statistics) {
   LightnessHistogramSimd counter;
-  LightnessRows lightness(image);
-  for (std::uint32_t y = 0; y < image.height; ++y) counter.add(lightness.row(y), image.width);
+  LightnessRow lightness(image.width);
+  for (std::uint32_t y = 0; y < image.height; ++y) {
+    counter.add(lightness.of(image.row(y)), image.width);
+  }
   analyzeImage(counter, image, metadata, statistics);
 }
 
@@ -31,6 +33,13 @@ void analyzeImage(const LightnessHistogramSimd& counted, const Image<RGBA8Pixel>
                   const ImageMetadata& metadata, ImageStatistics& statistics) {
   computeCDF(normalised(counted.counts()), statistics.cdf);
   statistics.faceMedianBin = faceMedianBin(image, metadata, lightnessBins, lightnessScale);
+}
+
+ImageStatistics analyzeImage(const LightnessHistogramSimd& counted, const FaceLightness& faces) {
+  ImageStatistics statistics;
+  computeCDF(normalised(counted.counts()), statistics.cdf);
+  statistics.faceMedianBin = faces.medianBin();
+  return statistics;
 }
 
 void computeImageStatistics(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata, int bins,

@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <vector>
 
+#include "image_processing/autoenhance/lightness/face_lightness.h"
 #include "image_processing/autoenhance/lightness/lightness_histogram.h"
 #include "image_processing/core/image.h"
 #include "image_processing/core/image_metadata.h"
@@ -27,6 +28,9 @@ void analyzeImage(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata,
 /// The same where every pixel of `image` has been counted.
 void analyzeImage(const LightnessHistogramSimd& counted, const Image<RGBA8Pixel>& image,
                   const ImageMetadata& metadata, ImageStatistics& statistics);
+
+/// The same where those of the faces have been counted as well, in the same bins.
+ImageStatistics analyzeImage(const LightnessHistogramSimd& counted, const FaceLightness& faces);
 
 /// Statistics in `bins` bins (at least 1) over L in [0, scale].
 void computeImageStatistics(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata, int bins,

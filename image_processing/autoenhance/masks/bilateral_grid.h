@@ -1,8 +1,6 @@
 #pragma once
 
 #include "image_processing/autoenhance/masks/grid.h"
-#include "image_processing/autoenhance/masks/grid_slice.h"
-#include "image_processing/autoenhance/masks/image_rows.h"
 #include "image_processing/core/image.h"
 
 namespace pelorin::image_processing {
@@ -36,35 +34,5 @@ float gridCellSize(float spatial);
 
 /// An empty grid over a picture of at least one pixel. @throws std::bad_alloc.
 Grid makeGrid(std::uint32_t width, std::uint32_t height, float cellSize);
-
-/// The rows that a splat and blurred grid smooths a picture to, each made when one from it on is
-/// first asked for.
-template <typename T>
-class SmoothedRows : public RowSource<T> {
- public:
-  /// Holds on to all but the cell size.
-  /// @param smoothed  written row by row.
-  /// @throws std::bad_alloc.
-  SmoothedRows(const Grid& grid, float cellSize, RowSource<float>& lightness, Image<T>& smoothed)
-      : slicer_(grid, smoothed.width, cellSize), lightness_(lightness), smoothed_(smoothed) {}
-
-  const T* row(std::uint32_t y) override {
-    makeUpTo(y + 1);
-    return smoothed_.row(y);
-  }
-
-  /// Makes the first `end` rows.
-  void makeUpTo(std::uint32_t end) {
-    for (; made_ < end; ++made_) {
-      slicer_.sliceRow(made_, lightness_.row(made_), smoothed_.row(made_));
-    }
-  }
-
- private:
-  GridSlicer slicer_;
-  RowSource<float>& lightness_;
-  Image<T>& smoothed_;
-  std::uint32_t made_ = 0;
-};
 
 }  // namespace pelorin::image_processing

@@ -1,6 +1,5 @@
 #pragma once
 
-#include "image_processing/autoenhance/masks/image_rows.h"
 #include "image_processing/core/image.h"
 
 namespace pelorin::image_processing {
@@ -18,13 +17,6 @@ namespace pelorin::image_processing {
 /// Keeps no state. For (float, float) and (QuantizedFloat<unsigned char>, the same).
 template <typename TB, typename TL>
 void computeFlatnessMask(const Image<float>& lightness, const Image<TB>& smoothed, int radius,
-                         Image<TL>& mask);
-
-/// The same from rows that are made when they are asked for, about once each and from the top but
-/// near the borders. Of a row, the smoothing is asked for first. The picture has the size of
-/// `mask`.
-template <typename TB, typename TL>
-void computeFlatnessMask(RowSource<float>& lightness, RowSource<TB>& smoothed, int radius,
                          Image<TL>& mask);
 
 /// The definition of `computeFlatnessMask`.

@@ -3,13 +3,15 @@
 #include <algorithm>
 
 #include "image_processing/autoenhance/lightness/lightness_histogram.h"
-#include "image_processing/autoenhance/lightness/lightness_rows.h"
+#include "image_processing/autoenhance/lightness/lightness_row.h"
 #include "image_processing/autoenhance/masks/bilateral_filter.h"
 #include "image_processing/autoenhance/masks/bilateral_grid.h"
 #include "image_processing/autoenhance/masks/face_blend_rows.h"
 #include "image_processing/autoenhance/masks/flatness_mask.h"
 #include "image_processing/autoenhance/masks/grid_blur.h"
 #include "image_processing/autoenhance/masks/grid_splat.h"
+#include "image_processing/autoenhance/masks/mask_rows.h"
+#include "image_processing/autoenhance/masks/spatial_extent.h"
 
 namespace pelorin::image_processing {
 namespace {
@@ -21,12 +23,6 @@ void fillWithZero(Image<T>& mask) {
   T zero;
   zero = 0.0f;
   mask.set(zero);
-}
-
-float spatialExtent(const Image<RGBA8Pixel>& photo, const FilterConfig& config) {
-  const float shorterSide = static_cast<float>(std::min(photo.width, photo.height));
-  const float extent = shorterSide * config.bilateralSpatialFraction;
-  return extent > 1.0f ? extent : 1.0f;
 }
 
 template <typename T>
@@ -42,12 +38,13 @@ template <typename TB, typename TL>
 void computeMasksExactly(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                          const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm) {
   Image<float> lightness(photo.width, photo.height);
-  LightnessRows rows(photo);
+  LightnessRow row(photo.width);
   for (std::uint32_t y = 0; y < photo.height; ++y) {
-    std::copy_n(rows.row(y), photo.width, lightness.row(y));
+    std::copy_n(row.of(photo.row(y)), photo.width, lightness.row(y));
   }
   bilateralFilter(lightness, config.bilateralRange,
-                  truncateTo<std::int32_t>(spatialExtent(photo, config)), bilateral);
+                  truncateTo<std::int32_t>(spatialExtent(photo.width, photo.height, config)),
+                  bilateral);
   computeLtmMask(metadata, photo, lightness, bilateral, config.ltmMaskAmount, config.ltmMaskRadius,
                  ltm);
 }
@@ -84,25 +81,28 @@ void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& met
                         const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
                         LightnessHistogramSimd& counter) {
   if (photo.pixelCount() == 0) return;
-  LightnessRows lightness(photo);
-  const float cellSize = gridCellSize(spatialExtent(photo, config));
+  LightnessRow lightness(photo.width);
+  const float cellSize = gridCellSize(spatialExtent(photo.width, photo.height, config));
   Grid grid = makeGrid(photo.width, photo.height, cellSize);
   GridSplatter splatter(grid, photo.width, cellSize);
   for (std::uint32_t y = 0; y < photo.height; ++y) {
-    const float* const row = lightness.row(y);
+    const float* const row = lightness.of(photo.row(y));
     splatter.addRow(y, row);
     counter.add(row, photo.width);
   }
   blur(grid, config.bilateralRange);
 
-  SmoothedRows<TB> smoothed(grid, cellSize, lightness, bilateral);
-  if (config.ltmMaskAmount > 0.0f) {
-    computeFlatnessMask<TB, TL>(lightness, smoothed, config.ltmMaskRadius, ltm);
-  } else {
-    fillWithZero(ltm);
+  using Rows = MaskRows<TB, TL>;
+  Rows rows(
+      grid, cellSize, photo.width, photo.height, config, metadata,
+      [&](std::uint32_t y) { return photo.row(y); }, RowRing<TB>(bilateral));
+  typename Rows::Scratch scratch(rows);
+  std::uint32_t y = 0;
+  for (std::int64_t step = 0; step < rows.steps(); ++step) {
+    rows.prepare(step, scratch);
+    rows.sum(step, scratch);
+    for (; y < rows.maskEnd(step); ++y) rows.writeLtm(y, ltm.row(y));
   }
-  smoothed.makeUpTo(photo.height);
-  blendFacesIntoMask(metadata, photo, ltm);
 }
 
 template <typename TB, typename TL>

@@ -9,6 +9,7 @@
 #include "image_processing/filters/abstract_filter.h"
 #include "image_processing/filters/looks/apply_look.h"
 #include "image_processing/filters/looks/look_parameters.h"
+#include "image_processing/filters/looks/look_row_filter.h"
 
 namespace pelorin::image_processing {
 
@@ -42,19 +43,29 @@ class AbstractRGBCurveFilter : public AbstractFilter {
   /// `init` comes first. Throws std::bad_alloc alone.
   void applyConfig(const std::string& params, const FilterConfig&,
                    Image<RGBA8Pixel>& output) override {
+    applyLook(lookFor(params), *state->image, output);
+  }
+
+  static std::unique_ptr<RowFilter> forRows(const RowRequest& request) {
+    auto filter = std::make_unique<T>(nullptr);
+    filter->init(request.params);
+    const Look look = filter->lookFor(request.params);
+    return lookRowFilter(look, std::move(filter->radialMask_), request.width, request.height);
+  }
+
+  /// What an application with these parameters applies; it borrows the vignette from this filter.
+  Look lookFor(const std::string& params) {
     std::vector<float> red, green, blue;
     getRGBCurves(red, green, blue, params);
     parseRGBCurves(red, green, blue, params);
     Look look{{LookCurve(std::move(red)), LookCurve(std::move(green)), LookCurve(std::move(blue))},
               T::channelMix};
-    {
-      const std::lock_guard lock(maskMutex_);
-      parseMaskParameters(maskRadius_, maskAlpha_, applyMask_, params);
-      look.maskRadius = maskRadius_;
-      look.maskAlpha = maskAlpha_;
-      look.vignette = applyMask_ ? radialMask_.get() : nullptr;
-    }
-    applyLook(look, *state->image, output);
+    const std::lock_guard lock(maskMutex_);
+    parseMaskParameters(maskRadius_, maskAlpha_, applyMask_, params);
+    look.maskRadius = maskRadius_;
+    look.maskAlpha = maskAlpha_;
+    look.vignette = applyMask_ ? radialMask_.get() : nullptr;
+    return look;
   }
 
   /// Replaces the curves that the parameters name, as `replaceCurves` says.

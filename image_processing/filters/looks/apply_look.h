@@ -9,8 +9,8 @@ namespace pelorin::image_processing {
 /// Walks both images in storage order and stops at the end of the shorter; coordinates are those of
 /// `source`.
 /// @param output  written; its own pixels, or exactly those of `source`.
-/// @throws std::bad_alloc when its tables (at most 300 KB, and one float a column) do not fit;
-///         `output` is then as it was.
+/// @throws std::bad_alloc when its tables (at most 300 KB, and one float a column and a row) do
+///         not fit; `output` is then as it was.
 ///
 /// Keeps no state, so any thread may call it for outputs of its own.
 void applyLook(const Look& look, const Image<RGBA8Pixel>& source, Image<RGBA8Pixel>& output);

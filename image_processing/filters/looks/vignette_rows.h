@@ -16,8 +16,8 @@ struct VignetteRow {
   float lastSample;       ///< Index of the mask's last sample.
 };
 
-/// The coordinates of a vignette row by row: the squares of the horizontal ones are formed once for
-/// all rows.
+/// The coordinates of a vignette, formed once for all columns and all rows: neither order is free,
+/// since each comes of the one before it.
 class VignetteRows {
  public:
   /// Whether the coordinates are numbers all over the picture. Infinite ones are fine; a step that
@@ -26,31 +26,37 @@ class VignetteRows {
     return std::isfinite(coordinates.step);
   }
 
-  /// Starts at row 0. `canCover` must hold.
-  /// @throws std::bad_alloc when a float a column does not fit.
-  VignetteRows(const VignetteCoordinates& coordinates, std::uint32_t width,
-               const CubicRadialMask& mask)
-      : step_(coordinates.step),
-        v_(coordinates.firstV),
-        lastSample_(static_cast<float>(mask.samples().size() - 1)),
-        uSquares_(width) {
+  /// @param mask  null where no row is asked for.
+  /// @throws std::bad_alloc when a float a column and a row does not fit.
+  VignetteRows(const VignetteCoordinates& coordinates, std::uint32_t width, std::uint32_t height,
+               const CubicRadialMask* mask)
+      : lastSample_(mask == nullptr ? 0.0f : static_cast<float>(mask->samples().size() - 1)),
+        uSquares_(width),
+        vs_(height) {
     float u = coordinates.firstU;
     for (float& square : uSquares_) {
       square = u * u;
-      u += step_;
+      u += coordinates.step;
+    }
+    float v = coordinates.firstV;
+    for (float& vertical : vs_) {
+      vertical = v;
+      v += coordinates.step;
     }
   }
 
-  void advance() { v_ += step_; }
+  /// The vertical coordinate of row `y`.
+  float v(std::uint32_t y) const { return vs_[y]; }
 
-  /// The current row; good until this is gone.
-  VignetteRow row() const { return {uSquares_.data(), v_ * v_, lastSample_}; }
+  /// Row `y`, where `canCover` holds; good until this is gone.
+  VignetteRow row(std::uint32_t y) const {
+    return {uSquares_.data(), vs_[y] * vs_[y], lastSample_};
+  }
 
  private:
-  float step_;
-  float v_;
   float lastSample_;
   std::vector<float> uSquares_;
+  std::vector<float> vs_;
 };
 
 }  // namespace pelorin::image_processing

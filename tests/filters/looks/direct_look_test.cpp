@@ -33,9 +33,8 @@ std::vector<Look> directLooks(const CubicRadialMask& vignette) {
 std::vector<RGBA8Pixel> firstRow(const Look& look, const Image<RGBA8Pixel>& picture) {
   std::vector<RGBA8Pixel> row(picture.width + 1, RGBA8Pixel{7, 7, 7, 7});
   const VignetteCoordinates coordinates(picture.width, picture.height, look.maskRadius);
-  const CubicRadialMask any(0.0f, 1.0f, 2);
-  const VignetteRows rows(coordinates, picture.width, look.vignette ? *look.vignette : any);
-  applyDirectLook(DirectLook(look), look.vignette ? rows.row() : VignetteRow{}, picture.data.get(),
+  const VignetteRows rows(coordinates, picture.width, 1, look.vignette);
+  applyDirectLook(DirectLook(look), look.vignette ? rows.row(0) : VignetteRow{}, picture.data.get(),
                   row.data(), picture.width);
   return row;
 }

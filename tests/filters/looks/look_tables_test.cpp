@@ -58,7 +58,7 @@ TEST(ApplyLookTables, TakesTheTableOfEachMaskSampleOnEveryInstructionSetAtEveryL
       [&] {
         for (std::uint32_t count = 1; count <= 100; ++count) {
           const VignetteCoordinates coordinates(count, 40, 1.5f);
-          const VignetteRows rows(coordinates, count, mask);
+          const VignetteRows rows(coordinates, count, 40, &mask);
           const std::vector<RGBA8Pixel> pixels = randomPixels(count, count);
           std::vector<RGBA8Pixel> expected, actual(count + 1, untouched);
           const float v = coordinates.firstV;
@@ -68,7 +68,7 @@ TEST(ApplyLookTables, TakesTheTableOfEachMaskSampleOnEveryInstructionSetAtEveryL
             u += coordinates.step;
           }
           expected.push_back(untouched);
-          applyLookTables(tables.data(), rows.row(), pixels.data(), actual.data(), count);
+          applyLookTables(tables.data(), rows.row(0), pixels.data(), actual.data(), count);
           ASSERT_TRUE(actual == expected) << count;
         }
       },

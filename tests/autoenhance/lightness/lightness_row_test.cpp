@@ -1,4 +1,4 @@
-#include "image_processing/autoenhance/lightness/lightness_rows.h"
+#include "image_processing/autoenhance/lightness/lightness_row.h"
 
 #include <gtest/gtest.h>
 
@@ -9,11 +9,11 @@
 namespace pelorin::image_processing {
 namespace {
 
-TEST(LightnessRows, AreEachPixelsLightnessInAnyOrderOfRows) {
+TEST(LightnessRow, IsEachPixelsLightness) {
   const auto photo = test_support::noisePicture(37, 5, 1);
-  LightnessRows rows(photo);
-  for (const std::uint32_t y : {0u, 1u, 1u, 4u, 2u, 0u, 3u, 4u}) {
-    const float* const row = rows.row(y);
+  LightnessRow lightness(photo.width);
+  for (std::uint32_t y = 0; y < photo.height; ++y) {
+    const float* const row = lightness.of(photo.row(y));
     for (std::uint32_t x = 0; x < photo.width; ++x) {
       const RGBA8Pixel& p = photo.row(y)[x];
       ASSERT_EQ(row[x], rgbToLab(p.r, p.g, p.b).L / labWhite) << x << ", " << y;
@@ -21,13 +21,14 @@ TEST(LightnessRows, AreEachPixelsLightnessInAnyOrderOfRows) {
   }
 }
 
-TEST(LightnessRows, GoFromBlackToWhite) {
+TEST(LightnessRow, GoesFromBlackToWhite) {
   Image<RGBA8Pixel> photo(2, 1);
   photo.row(0)[0] = {0, 0, 0, 255};
   photo.row(0)[1] = {255, 255, 255, 0};  // alpha is ignored
-  LightnessRows rows(photo);
-  EXPECT_EQ(rows.row(0)[0], 0.0f);
-  EXPECT_EQ(rows.row(0)[1], 1.0f);
+  LightnessRow lightness(photo.width);
+  const float* const row = lightness.of(photo.row(0));
+  EXPECT_EQ(row[0], 0.0f);
+  EXPECT_EQ(row[1], 1.0f);
 }
 
 }  // namespace
