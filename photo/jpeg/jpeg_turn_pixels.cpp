@@ -23,11 +23,14 @@ Samples samplesOf(std::uint32_t width, std::uint32_t height, std::size_t channel
 }
 
 // In the colours of the file.
-Samples decode(LibjpegReader& reader) {
+Samples decode(LibjpegReader& reader, unsigned divisor) {
   jpeg_decompress_struct& codec = reader.codec();
-  Samples samples = samplesOf(codec.image_width, codec.image_height,
-                              static_cast<std::size_t>(codec.num_components));
   codec.out_color_space = codec.jpeg_color_space;
+  codec.scale_num = 1;
+  codec.scale_denom = divisor;
+  reader.run([&] { jpeg_calc_output_dimensions(&codec); });
+  Samples samples = samplesOf(codec.output_width, codec.output_height,
+                              static_cast<std::size_t>(codec.num_components));
   reader.run([&] {
     jpeg_start_decompress(&codec);
     while (codec.output_scanline < codec.output_height) {
@@ -53,11 +56,12 @@ Samples turned(Samples samples, const Turn& turn) {
 
 }  // namespace
 
-std::vector<std::uint8_t> turnPixels(std::span<const std::uint8_t> file, const Turn& turn) {
+std::vector<std::uint8_t> turnPixels(std::span<const std::uint8_t> file, const Turn& turn,
+                                     unsigned divisor) {
   LibjpegReader reader(file);
   reader.keepAllSegments();
   reader.readHeader();
-  Samples samples = turned(decode(reader), turn);
+  Samples samples = turned(decode(reader, divisor), turn);
   const jpeg_decompress_struct& source = reader.codec();
   LibjpegWriter writer(file.size());
   jpeg_compress_struct& target = writer.codec();

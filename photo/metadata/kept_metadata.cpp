@@ -77,9 +77,24 @@ void removeSignatures(std::vector<MetadataSegment>& segments, std::vector<Loss>&
                          : Loss{"JUMBF boxes", "may describe the picture as it was"});
 }
 
-// Whether blocks can be moved without cutting partial ones off.
-std::vector<std::uint8_t> turnedGainMap(const std::vector<std::uint8_t>& file, Turn turn) {
+// What the sides of the picture were divided by; 1 where it was not by one number of these.
+unsigned divisorOf(const PictureChange& change) {
+  PictureSize before = change.before;
+  if (change.turn.swapsAxes()) std::swap(before.width, before.height);
+  for (const unsigned divisor : {1u, 2u, 4u, 8u}) {
+    const auto smaller = [&](std::uint32_t side) { return side / divisor + (side % divisor != 0); };
+    if (PictureSize{smaller(before.width), smaller(before.height)} == change.after) return divisor;
+  }
+  return 1;
+}
+
+std::vector<std::uint8_t> changedGainMap(const std::vector<std::uint8_t>& file,
+                                         const PictureChange& change) {
+  const Turn turn = change.turn;
+  const unsigned divisor = divisorOf(change);
+  if (divisor > 1) return turnPixels(file, turn, divisor);
   if (turn == Turn{}) return file;
+  // Whether blocks can be moved without cutting partial ones off.
   constexpr std::uint32_t largestUnit = 32;
   const JpegHeader header = readJpegHeader(file);
   const bool movable = header.width % largestUnit == 0 && header.height % largestUnit == 0;
@@ -104,7 +119,7 @@ std::vector<TailPart> keptTail(const Metadata& metadata, const PictureChange& ch
           continue;
         }
         try {
-          part.bytes = turnedGainMap(part.bytes, change.turn);
+          part.bytes = changedGainMap(part.bytes, change);
         } catch (const PhotoError& error) {
           lose(error.what());
           continue;

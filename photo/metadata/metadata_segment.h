@@ -10,6 +10,8 @@ namespace pelorin::photo {
 struct MetadataSegment {
   std::uint8_t marker;
   std::vector<std::uint8_t> payload;
+
+  friend bool operator==(const MetadataSegment&, const MetadataSegment&) = default;
 };
 
 }  // namespace pelorin::photo

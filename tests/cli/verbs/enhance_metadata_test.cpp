@@ -31,10 +31,6 @@ std::vector<MetadataSegment> cameraSegments(int orientation, bool littleEndian) 
           {0xFE, bytesOf("a comment")}};
 }
 
-bool operator==(const MetadataSegment& a, const MetadataSegment& b) {
-  return a.marker == b.marker && a.payload == b.payload;
-}
-
 void expectSegments(const Bytes& file, const std::vector<MetadataSegment>& expected) {
   const std::vector<MetadataSegment> found = photo::readJpegHeader(file).metadata;
   ASSERT_EQ(found.size(), expected.size());

@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <string>
 
+#include "photo/area_average.h"
 #include "photo/jpeg/jpeg_codec.h"
 #include "photo/jpeg/jpeg_end.h"
 #include "photo/metadata/exif_orientation.h"
@@ -80,24 +81,32 @@ TEST(KeptMetadata, HasAGainMapWhereIndexAndContainerSay) {
   }
 }
 
-TEST(KeptMetadata, TurnsTheGainMapWithThePicture) {
-  for (int orientation = 1; orientation <= 8; ++orientation) {
-    const Written written = rewritten(phonePhoto(orientation, gainMap()));
-    const Bytes map = written.tail();
-    EXPECT_TRUE(isGainMap(map));
-    const DecodedPicture turned = decodeJpeg(map);
-    const Image<RGBA8Pixel> before = photoLikePicture(32, 64, 5);
-    const Turn turn = uprightTurn(orientation);
-    ASSERT_EQ(turned.width, turn.swapsAxes() ? 64u : 32u);
-    double difference = 0;
-    for (std::uint32_t y = 0; y < turned.height; ++y) {
-      for (std::uint32_t x = 0; x < turned.width; ++x) {
-        const Turn::Place from = turn.sourceOf({y, x}, before.height, before.width);
-        const int was = before.row(from.row)[from.column].g;
-        difference += std::abs(was - turned.pixels.get()[4 * (y * turned.width + x) + 1]);
-      }
+void expectTurned(const DecodedPicture& turned, const Image<RGBA8Pixel>& before, int orientation) {
+  const Turn turn = uprightTurn(orientation);
+  ASSERT_EQ(turned.width, turn.swapsAxes() ? before.height : before.width);
+  double difference = 0;
+  for (std::uint32_t y = 0; y < turned.height; ++y) {
+    for (std::uint32_t x = 0; x < turned.width; ++x) {
+      const Turn::Place from = turn.sourceOf({y, x}, before.height, before.width);
+      const int was = before.row(from.row)[from.column].g;
+      difference += std::abs(was - turned.pixels.get()[4 * (y * turned.width + x) + 1]);
     }
-    EXPECT_LT(difference / (turned.width * turned.height), 6) << orientation;
+  }
+  EXPECT_LT(difference / (turned.width * turned.height), 6) << orientation;
+}
+
+TEST(KeptMetadata, TurnsAndScalesTheGainMapWithThePicture) {
+  for (int orientation = 1; orientation <= 8; ++orientation) {
+    for (const unsigned scale : {1u, 2u, 8u}) {
+      const Written written =
+          rewritten(phonePhoto(orientation, gainMap()), {.scale = static_cast<int>(scale)});
+      const Bytes map = written.tail();
+      EXPECT_TRUE(isGainMap(map));
+      expectTurned(decodeJpeg(map),
+                   areaAverage(photoLikePicture(32, 64, 5), {32 / scale, 64 / scale}), orientation);
+      EXPECT_EQ(readJpegHeader(map).metadata, readJpegHeader(gainMap()).metadata);
+      EXPECT_EQ(readMpf(mpfOf(written.header()).payload).at(1).size, map.size());
+    }
   }
 }
 
