@@ -10,15 +10,15 @@ namespace pelorin::cli {
 
 /// The options that say what a written file keeps of its photo's metadata.
 struct KeepChoice {
-  std::vector<std::string> strip;
+  std::vector<std::string> strip, keep;
   std::string gainMap = "keep";
   bool strict = false;
 };
 
-/// Adds `--strip`, `--gain-map` and `--strict-metadata`.
+/// Adds `--strip`, `--keep`, `--gain-map` and `--strict-metadata`.
 void addKeepOptions(Verb verb, KeepChoice& choice);
 
-/// @throws UsageError for something that cannot be stripped.
+/// @throws UsageError for something that cannot be stripped or kept.
 photo::KeepOptions keepOptions(const KeepChoice& choice);
 
 /// One line for a person: "C2PA manifest lost: an edit breaks its signature".

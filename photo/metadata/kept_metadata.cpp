@@ -13,6 +13,7 @@
 #include "photo/metadata/mpf.h"
 #include "photo/metadata/photoshop_resources.h"
 #include "photo/metadata/picture_change.h"
+#include "photo/metadata/segments.h"
 #include "photo/metadata/thumbnail.h"
 #include "photo/metadata/xmp_container.h"
 #include "photo/metadata/xmp_facts.h"
@@ -40,14 +41,8 @@ bool holds(const MetadataSegment& segment, std::string_view text) {
   return std::search(bytes.begin(), bytes.end(), text.begin(), text.end()) != bytes.end();
 }
 
-bool isColourProfile(const MetadataSegment& segment) {
-  return startsWith(segment, app2, "ICC_PROFILE\0"sv);
-}
 bool isMpfIndex(const MetadataSegment& segment) {
   return segment.marker == app2 && isMpf(segment.payload);
-}
-bool isIsoGainMap(const MetadataSegment& segment) {
-  return startsWith(segment, app2, "urn:iso:std:iso:ts:21496:-1\0"sv);
 }
 bool isJumbf(const MetadataSegment& segment) {
   return startsWith(segment, app11, "JP"sv);
@@ -203,12 +198,13 @@ void removeLocation(XmpPacket& packet) {
 
 KeptMetadata keptMetadata(const Image<RGBA8Pixel>& picture, const Metadata& metadata,
                           const KeepOptions& options) {
+  if (options.only) {
+    KeepOptions all = options;
+    all.only.reset();
+    return keptMetadata(picture, chosenMetadata(metadata, *options.only), all);
+  }
   KeptMetadata kept;
   kept.segments = metadata.segments;
-  if (!options.everything) {
-    std::erase_if(kept.segments, [](const MetadataSegment& s) { return !isColourProfile(s); });
-    return kept;
-  }
   kept.chunks = metadata.chunks;
   const PictureChange change = {
       metadata.storedSize, {picture.width, picture.height}, metadata.turn, metadata.orientation};

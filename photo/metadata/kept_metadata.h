@@ -1,8 +1,11 @@
 #pragma once
 
+#include <optional>
+#include <set>
 #include <vector>
 
 #include "image_processing/core/image.h"
+#include "photo/metadata/chosen_metadata.h"
 #include "photo/metadata/jpeg_tail.h"
 #include "photo/metadata/loss.h"
 #include "photo/metadata/metadata.h"
@@ -12,7 +15,7 @@ namespace pelorin::photo {
 /// What a file is to keep of the metadata of the photo that it is made of. What goes by choice is
 /// not lost.
 struct KeepOptions {
-  bool everything = true;  ///< Else the colour profile alone.
+  std::optional<std::set<MetadataKind>> only = {};  ///< Beside the colours; else everything.
   bool location = true;
   bool thumbnail = true;
   bool gainMap = true;

@@ -21,6 +21,10 @@ bool isColourProfile(const MetadataSegment& segment) {
   return begins(segment, app2, profileMark);
 }
 
+bool isIsoGainMap(const MetadataSegment& segment) {
+  return begins(segment, app2, std::string_view("urn:iso:std:iso:ts:21496:-1\0", 28));
+}
+
 MetadataSegment segmentOf(std::uint8_t marker, std::string_view mark,
                           std::span<const std::uint8_t> content) {
   MetadataSegment segment{marker, {mark.begin(), mark.end()}};

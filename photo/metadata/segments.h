@@ -24,6 +24,9 @@ std::span<const std::uint8_t> contentOf(std::span<const MetadataSegment> segment
 /// Whether a segment is a part of a colour profile.
 bool isColourProfile(const MetadataSegment& segment);
 
+/// Whether a segment tells of a gain map in the words of ISO 21496-1.
+bool isIsoGainMap(const MetadataSegment& segment);
+
 /// Appends a colour profile, cut into segments; one above 16 MB is left out.
 void addColourProfile(std::span<const std::uint8_t> profile,
                       std::vector<MetadataSegment>& segments);

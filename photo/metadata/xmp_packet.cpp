@@ -232,6 +232,16 @@ XmpProperty XmpPacket::property(XmpName name) const {
   return found.empty() ? XmpProperty() : found.front();
 }
 
+void XmpPacket::keepOnly(const std::function<bool(XmpName)>& isKept) {
+  for (XmpProperty& property : properties()) {
+    const std::string_view written =
+        property.attribute_ ? property.attribute_.name() : property.element_.name();
+    const std::size_t colon = std::min(written.find(':'), written.size());
+    const std::string_view space = spaceOf(property.element_, written.substr(0, colon));
+    if (!isKept({space, written.substr(std::min(colon + 1, written.size()))})) property.remove();
+  }
+}
+
 void XmpPacket::add(XmpName name, const std::string& prefix, const std::string& text) {
   addElement(addDescription(), name, prefix).text().set(text.c_str());
   state_->changed = true;

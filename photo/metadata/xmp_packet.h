@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <pugixml.hpp>
 #include <stdexcept>
@@ -83,6 +84,8 @@ class XmpPacket {
   /// All of them.
   std::vector<XmpProperty> properties() const;
 
+  /// Removes the properties for which `isKept` is false.
+  void keepOnly(const std::function<bool(XmpName)>& isKept);
   /// Adds a property that the packet does not have.
   /// @param prefix  for its namespace, where the packet has none for it.
   void add(XmpName name, const std::string& prefix, const std::string& text);

@@ -2,6 +2,7 @@
 
 #include <filesystem>
 
+#include "photo/metadata/capture_time.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/support/exif_payload.h"
 #include "tests/support/jpeg_files.h"
@@ -27,7 +28,7 @@ std::vector<MetadataSegment> cameraSegments(int orientation, bool littleEndian) 
           {0xE1, bytesOf(std::string("http://ns.adobe.com/xap/1.0/\0", 29) +
                          "<rdf:RDF xmlns:rdf='http://www.w3.org/1999/02/22-rdf-syntax-ns#'/>")},
           {0xE2, colourProfile()},
-          {0xED, bytesOf("Photoshop 3.0")},
+          {0xED, bytesOf(std::string("Photoshop 3.0\0", 14))},
           {0xFE, bytesOf("a comment")}};
 }
 
@@ -97,6 +98,15 @@ TEST(KeptMetadata, GoesWhereItIsStripped) {
   ASSERT_EQ(left.size(), 2u);  // JFIF and the colour profile
   EXPECT_EQ(left[1].payload, colourProfile());
   EXPECT_EQ(quenby({"enhance", in, "-o", folder / "c.jpg", "--strip", "everything"}).exitCode, 2);
+  EXPECT_EQ(quenby({"enhance", in, "-o", folder / "c.jpg", "--keep", "time,iptc"}).exitCode, 0);
+  const auto kept = photo::readJpegHeader(folder.read("c.jpg")).metadata;
+  ASSERT_EQ(kept.size(), 3u);
+  EXPECT_EQ(photo::exifCaptureTime(kept[0].payload)->text,
+            photo::exifCaptureTime(cameraSegments(6, true)[0].payload)->text);
+  EXPECT_EQ(kept[2].payload, cameraSegments(6, true)[3].payload);
+  const Finished wrong = quenby({"enhance", in, "-o", folder / "d.jpg", "--keep", "time,artist"});
+  EXPECT_EQ(wrong.exitCode, 2);
+  EXPECT_THAT(wrong.errors, testing::HasSubstr("--keep: 'artist' is none of copyright, time"));
 }
 
 TEST(Upright, IsEveryOneOfTheEightOrientations) {

@@ -215,7 +215,7 @@ TEST(KeptMetadata, CanBeTheColourProfileAlone) {
   const Bytes file = joined({jpegWith(photoLikePicture(32, 32, 1),
                                       {{0xE1, cameraExif({})}, profile, {0xFE, bytesOf("note")}}),
                              gainMap()});
-  const Written written = rewritten(file, {}, {.everything = false});
+  const Written written = rewritten(file, {}, {.only = std::set<MetadataKind>()});
   EXPECT_TRUE(written.tail().empty());
   const std::vector<MetadataSegment> segments = written.header().metadata;
   ASSERT_EQ(segments.size(), 2u);  // JFIF and the profile
