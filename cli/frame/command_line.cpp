@@ -1,9 +1,13 @@
 #include "cli/frame/command_line.h"
 
+#include <fcntl.h>
+#include <unistd.h>
+
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <csignal>
 #include <cstdio>
+#include <cstdlib>
 
 #include "cli/frame/errors.h"
 #include "cli/frame/interrupt.h"
@@ -19,6 +23,17 @@ std::vector<std::string> optionNames(const CLI::App& app) {
     for (const std::string& name : option->get_snames()) names.push_back("-" + name);
   }
   return names;
+}
+
+// A file that is opened while a standard stream is closed gets its number, and what is said to a
+// person ends in a photo. Opened the wrong way round, uses of the stream stay errors.
+void keepStandardDescriptors() {
+  for (const int descriptor : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
+    if (::fcntl(descriptor, F_GETFD) != -1) continue;
+    if (::open("/dev/null", descriptor == STDIN_FILENO ? O_WRONLY : O_RDONLY) != descriptor) {
+      std::_Exit(static_cast<int>(ExitCode::someFailed));
+    }
+  }
 }
 
 }  // namespace
@@ -73,6 +88,7 @@ ExitCode CommandLine::refuse(const std::string& message, const CLI::App* verb) c
 }
 
 ExitCode CommandLine::run(int argc, char** argv) {
+  keepStandardDescriptors();
   // Writes beyond a limit or into a closed pipe are then errors like any other.
   std::signal(SIGPIPE, SIG_IGN);
   std::signal(SIGXFSZ, SIG_IGN);

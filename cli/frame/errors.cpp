@@ -22,6 +22,8 @@ std::string advice(int code) {
     case ENOENT:
     case ENOTDIR:
       return "; check the path";
+    case EEXIST:
+      return "; add --overwrite to replace it";
     case EISDIR:
       return "; name a file, or add -r to take the photos of a folder";
     default:

@@ -12,7 +12,6 @@
 
 #include "cli/frame/errors.h"
 #include "cli/frame/interrupt.h"
-#include "photo/file_io.h"
 
 namespace fs = std::filesystem;
 
@@ -58,7 +57,8 @@ std::vector<std::uint8_t> readInput(const Input& input) {
   return input.isStandardInput() ? readStandardInput() : photo::readFile(input.path);
 }
 
-void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes) {
+void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes,
+                 const photo::ReplaceOptions& options) {
   try {
     std::error_code ignored;
     if (path == "-") {
@@ -66,7 +66,7 @@ void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes) {
     } else if (fs::is_other(fs::status(path, ignored))) {
       writeSpecialFile(path, bytes);
     } else {
-      photo::writeFileAtomically(path, bytes);
+      photo::writeFileAtomically(path, bytes, options);
     }
   } catch (const std::system_error& error) {
     throw FileError((path == "-" ? "standard output" : path) +

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "cli/frame/inputs.h"
+#include "photo/file_io.h"
 
 namespace pelorin::cli {
 
@@ -15,7 +16,9 @@ std::vector<std::uint8_t> readInput(const Input& input);
 
 /// Writes a file in one step, old or new and never half; "-" and special files (/dev/null, a named
 /// pipe) are written as they come.
-/// @throws FileError, naming the file, when it cannot be written; an old file is then as it was.
-void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes);
+/// @throws FileError, naming the file, when it cannot be written, or is there and may not be
+///         replaced; an old file is then as it was.
+void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes,
+                 const photo::ReplaceOptions& options);
 
 }  // namespace pelorin::cli

@@ -25,7 +25,6 @@ struct Work {
   FaceChoice faces;
   photo::OpenOptions photo;
   SaveChoice save;
-  bool overwrite;
 };
 
 struct Done {
@@ -35,11 +34,12 @@ struct Done {
 };
 
 Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter) {
-  Work work = {filter, FaceChoice(options.faces), {}, {}, options.outputs.overwrite};
+  Work work = {filter, FaceChoice(options.faces), {}, {}};
   work.save = {.raw = !options.raw.empty(),
                .quality = options.quality,
                .keep = keepOptions(options.keep),
-               .strict = options.keep.strict};
+               .strict = options.keep.strict,
+               .replace = {.mayReplace = options.outputs.overwrite}};
   if (work.faces.areNamed() && !filter.filter.parameters().readsFaces) {
     throw UsageError("--face: has no effect on " + filter.filter.name);
   }

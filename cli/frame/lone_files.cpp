@@ -5,13 +5,14 @@
 #include <filesystem>
 
 #include "cli/frame/errors.h"
+#include "cli/frame/used_files.h"
 
 namespace fs = std::filesystem;
 
 namespace pelorin::cli {
 namespace {
 
-void requirePlaceFor(const std::string& path, const std::vector<Input>& inputs) {
+void requirePlaceFor(const std::string& path) {
   if (path == "-") return;
   std::error_code ignored;
   if (path.empty() || path.back() == '/' || fs::is_directory(path, ignored)) {
@@ -20,11 +21,6 @@ void requirePlaceFor(const std::string& path, const std::vector<Input>& inputs) 
   const fs::path folder = fs::path(path).parent_path();
   if (!folder.empty() && !fs::is_directory(folder, ignored)) {
     throw UsageError(folder.string() + ": there is no such folder; make it first (mkdir -p)");
-  }
-  for (const Input& input : inputs) {
-    if (!input.isStandardInput() && fs::equivalent(input.path, path, ignored)) {
-      throw UsageError(path + ": is itself an input; choose another output");
-    }
   }
 }
 
@@ -62,13 +58,17 @@ std::optional<ExitCode> stopBeforeWork(const std::vector<Input>& inputs,
                                        const LoneOutputOptions& options, Talk& talk,
                                        JsonOutput& json) {
   bool kept = false;
+  refuseSharedFiles(outputs, usedFiles(inputs));
   for (const std::string& output : outputs) {
-    requirePlaceFor(output, inputs);
+    requirePlaceFor(output);
     if (options.overwrite || !holdsAFile(output)) continue;
     talk.error(output, "exists already; add --overwrite to replace it");
     kept = true;
   }
-  if (!kept && !options.planOnly) return std::nullopt;
+  if (!kept && !options.planOnly) {
+    sweepFolders(outputs);
+    return std::nullopt;
+  }
   Json plan = {{"inputs", Json::array()}, {"outputs", outputs}};
   plan["status"] = kept ? "exists" : "planned";
   for (const Input& input : inputs) {

@@ -4,6 +4,7 @@
 
 #include "cli/frame/errors.h"
 #include "cli/frame/nearest_name.h"
+#include "cli/frame/used_files.h"
 #include "photo/format.h"
 
 namespace fs = std::filesystem;
@@ -56,28 +57,29 @@ std::string nameInFolder(const Input& input, const OutputOptions& options,
   return (fs::path(options.output) / input.subfolder / name).string();
 }
 
-std::string identity(const std::string& path) {
-  std::error_code failed;
-  const fs::path canonical = fs::weakly_canonical(path, failed);
-  return failed ? fs::path(path).lexically_normal().string() : canonical.string();
-}
-
-void refuseClashes(const std::vector<PlannedFile>& plan, bool overwrite) {
-  std::map<std::string, const PlannedFile*> byInput, byOutput;
-  for (const PlannedFile& file : plan) {
-    if (!file.input.isStandardInput()) byInput.emplace(identity(file.input.path), &file);
+void refuseClashes(const std::vector<PlannedFile>& plan, const InputOptions& named,
+                   bool overwrite) {
+  UsedFiles inputs, outputs;
+  for (const PlannedFile& file : plan) inputs.add(file.input.path, file.input.path);
+  UsedFiles lists;
+  for (const std::string& name : named.names) {
+    if (name.starts_with('@')) lists.add(name.substr(1), name);
   }
   for (const PlannedFile& file : plan) {
-    if (file.output == "-") continue;
-    const std::string id = identity(file.output);
-    const auto [first, isNew] = byOutput.emplace(id, &file);
-    if (!isNew) {
-      throw UsageError(file.output + ": both " + first->second->input.shownName() + " and " +
-                       file.input.shownName() + " would become this file; change --name");
+    const std::string* const other = outputs.find(file.output);
+    if (other != nullptr) {
+      throw UsageError(file.output + ": both " + *other + " and " + file.input.shownName() +
+                       " would become this file; change --name");
     }
-    const auto replaced = byInput.find(id);
-    if (replaced == byInput.end()) continue;
-    if (identity(file.input.path) != id) {
+    outputs.add(file.output, file.input.shownName());
+    if (lists.find(file.output) != nullptr) {
+      throw UsageError(file.output + ": is the list of inputs; change --name or -o");
+    }
+    const std::string* const replaced = inputs.find(file.output);
+    if (replaced == nullptr) continue;
+    UsedFiles own;
+    own.add(file.input.path, file.input.path);
+    if (own.find(file.output) == nullptr) {
       throw UsageError(file.output +
                        ": is itself an input and would be replaced by the result of " +
                        file.input.shownName() + "; change --name or -o");
@@ -134,14 +136,18 @@ std::vector<PlannedFile> planOutputs(const std::vector<Input>& inputs, const Inp
     file.skipped = exists && !options.overwrite;
     plan.push_back(std::move(file));
   }
-  refuseClashes(plan, options.overwrite);
+  refuseClashes(plan, named, options.overwrite);
   return plan;
 }
 
 OutputFolders::OutputFolders(const std::vector<PlannedFile>& plan) {
+  std::vector<std::string> outputs;
   for (const PlannedFile& file : plan) {
-    if (!file.skipped && file.output != "-") make(fs::path(file.output).parent_path());
+    if (file.skipped || file.output == "-") continue;
+    make(fs::path(file.output).parent_path());
+    outputs.push_back(file.output);
   }
+  sweepFolders(outputs);
 }
 
 OutputFolders::~OutputFolders() {

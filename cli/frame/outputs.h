@@ -43,8 +43,8 @@ std::vector<PlannedFile> planOutputs(const std::vector<Input>& inputs, const Inp
                                      const OutputOptions& options,
                                      const std::map<std::string, std::string>& values);
 
-/// The sub-folders that a plan needs: made at once, and the ones that stayed empty removed at the
-/// end.
+/// The folders that a plan needs: made at once, freed from what killed runs left in them, and those
+/// of them that were made and stayed empty removed at the end.
 class OutputFolders {
  public:
   /// @throws std::filesystem::filesystem_error when one cannot be made.

@@ -27,8 +27,11 @@ void addQualityOption(Verb verb, int& quality) {
       .group("Output");
 }
 
-SaveChoice drawing() {
-  return {.unnamed = photo::formatNamed("PNG"), .quality = 95, .colour = photo::ColourDetail::full};
+SaveChoice drawing(bool overwrite) {
+  return {.unnamed = photo::formatNamed("PNG"),
+          .quality = 95,
+          .colour = photo::ColourDetail::full,
+          .replace = {.mayReplace = overwrite}};
 }
 
 const photo::Format& outputFormat(const std::string& path, const SaveChoice& choice) {
@@ -67,7 +70,7 @@ std::vector<photo::Loss> savePicture(
                                                       .colour = choice.colour},
                                                      &lost);
   refuseLosses(lost, choice.strict);
-  writeOutput(path, file);
+  writeOutput(path, file, choice.replace);
   return lost;
 }
 

@@ -6,6 +6,7 @@
 #include "cli/frame/inputs.h"
 #include "cli/frame/talk.h"
 #include "cli/frame/verb.h"
+#include "photo/file_io.h"
 #include "photo/photo.h"
 
 namespace pelorin::cli {
@@ -27,10 +28,12 @@ struct SaveChoice {
   photo::ColourDetail colour = photo::ColourDetail::usual;
   photo::KeepOptions keep = {};
   bool strict = false;  ///< Fail where metadata would be lost.
+  photo::ReplaceOptions replace = {};
 };
 
 /// For plots and drawings: without loss where the name says no format, thin lines in full colour.
-SaveChoice drawing();
+/// @param overwrite  whether they may replace a file.
+SaveChoice drawing(bool overwrite);
 
 /// The format of a file called `path`, which says it by its extension.
 const photo::Format& outputFormat(const std::string& path, const SaveChoice& choice);

@@ -104,7 +104,8 @@ ExitCode runCurve(const CurveOptions& options) {
              const photo::Photo photo = loadPhoto(input, photoOptions, talk);
              const Curve curve = curveOf(photo, slider, allFaces(faces.of(input), photo));
              if (plotted) {
-               savePicture(output, drawPlot(plotOf(curve, input, slider)), {}, drawing());
+               savePicture(output, drawPlot(plotOf(curve, input, slider)), {},
+                           drawing(options.outputs.overwrite));
              }
              return curve;
            },

@@ -14,6 +14,7 @@
 #include "cli/frame/jobs.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/talk.h"
+#include "cli/frame/used_files.h"
 #include "cli/verbs/dupes/html_report.h"
 #include "cli/verbs/dupes/report.h"
 #include "cli/verbs/dupes/scan_photos.h"
@@ -21,6 +22,9 @@
 #include "cli/verbs/verbs.h"
 #include "photo/collection/pair_search.h"
 #include "photo/collection/photo_score.h"
+#include "photo/format.h"
+
+namespace fs = std::filesystem;
 
 namespace pelorin::cli {
 namespace {
@@ -136,7 +140,8 @@ bool writeHtml(const DupesOptions& options, DupeReport& report) {
     if (tally.interrupted) return false;
   }
   const std::string html = htmlReport(report, thumbnails);
-  writeOutput(options.html, {reinterpret_cast<const std::uint8_t*>(html.data()), html.size()});
+  writeOutput(options.html, {reinterpret_cast<const std::uint8_t*>(html.data()), html.size()},
+              {.mayReplace = options.overwrite});
   return true;
 }
 
@@ -165,14 +170,32 @@ void printReport(const DupesOptions& options, const DupeReport& report) {
   }
 }
 
-void checkHtml(const DupesOptions& options) {
-  if (options.html == "-" && (options.report.json || options.report.jsonLines)) {
+void checkOutputs(const DupesOptions& options, const std::vector<Input>& inputs) {
+  const std::string& html = options.html;
+  const std::string& cache = options.cache;
+  if (html == "-" && (options.report.json || options.report.jsonLines)) {
     throw UsageError("--html -: standard output takes the page or --json, not both");
   }
-  std::error_code ignored;
-  if (!options.overwrite && std::filesystem::is_regular_file(options.html, ignored)) {
-    throw UsageError("--html: " + options.html + " exists; add --overwrite to replace it");
+  const std::string extension = fs::path(html).extension().string();
+  if (!extension.empty() && extension != ".html" && extension != ".htm") {
+    throw UsageError("--html: " + html + ": the page is no " + extension + " file; name it .html");
   }
+  if (photo::isPictureExtension(fs::path(cache).extension().string())) {
+    throw UsageError("--cache: " + cache + " is called like a photo; choose another name");
+  }
+  UsedFiles used = usedFiles(inputs);
+  if (!cache.empty()) {
+    refuseSharedFiles({cache}, used);
+    // SQLite keeps its journals beside the file.
+    for (const char* end : {"", "-journal", "-wal", "-shm"}) used.add(cache + end, "the cache");
+  }
+  if (html.empty() || html == "-") return;
+  refuseSharedFiles({html}, used);
+  std::error_code ignored;
+  if (!options.overwrite && fs::is_regular_file(html, ignored)) {
+    throw UsageError("--html: " + html + " exists; add --overwrite to replace it");
+  }
+  sweepFolders({html});
 }
 
 // Time tells more than light: without it, photos that are only a little alike reach threshold 0.
@@ -189,12 +212,12 @@ void noteUntimed(const DupeReport& report, Talk& talk) {
 
 ExitCode runDupes(const DupesOptions& options) {
   const float threshold = readFiniteNumber("--threshold", options.threshold);
-  checkHtml(options);
   const std::vector<Input> inputs = withoutRepetitions(expandInputs(options.inputs));
   if (inputs.empty()) {
     Talk(verbName, options.report.quiet, 0).note("no photos found");
     return ExitCode::nothingToDo;
   }
+  checkOutputs(options, inputs);
   std::unique_ptr<photo::PhotoCache> cache;
   if (!options.cache.empty()) cache = std::make_unique<photo::PhotoCache>(options.cache);
 

@@ -124,7 +124,7 @@ ExitCode runKeypoints(const KeypointsOptions& options) {
                  findCorners(image_processing::imageMakeGrayscale(*photo.image), search)};
              if (!path.empty()) {
                const auto picture = drawingOf(photo, input, keypoints.corners, search);
-               savePicture(path, picture, {}, drawing());
+               savePicture(path, picture, {}, drawing(options.drawing.overwrite));
              }
              return keypoints;
            },

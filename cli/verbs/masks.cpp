@@ -48,20 +48,23 @@ Masks masksOf(photo::Photo photo, const std::string& filter, const std::vector<F
   return {withMasks.getBilateralMask(), withMasks.getLtmMask()};
 }
 
-void writeMask(const std::string& path, const Image<float>& mask, bool raw) {
+void writeMask(const std::string& path, const Image<float>& mask, bool raw,
+               const photo::ReplaceOptions& replace) {
   if (raw) {
-    writeOutput(path, {reinterpret_cast<const std::uint8_t*>(mask.data.get()), mask.byteSize()});
+    writeOutput(path, {reinterpret_cast<const std::uint8_t*>(mask.data.get()), mask.byteSize()},
+                replace);
   } else {
-    savePicture(path, greyPicture(mask), {}, {.colour = photo::ColourDetail::none});
+    savePicture(path, greyPicture(mask), {},
+                {.colour = photo::ColourDetail::none, .replace = replace});
   }
 }
 
 void writeMasks(const Masks& masks, const std::string& bilateralPath, const std::string& ltmPath,
-                bool raw) {
+                bool raw, const photo::ReplaceOptions& replace) {
   const bool isNew = !std::filesystem::exists(bilateralPath);
-  writeMask(bilateralPath, *masks.bilateral, raw);
+  writeMask(bilateralPath, *masks.bilateral, raw, replace);
   try {
-    writeMask(ltmPath, *masks.ltm, raw);
+    writeMask(ltmPath, *masks.ltm, raw, replace);
   } catch (...) {
     // One mask without the other is half a result.
     if (isNew) std::filesystem::remove(bilateralPath);
@@ -96,7 +99,8 @@ ExitCode runMasks(const MasksOptions& options) {
              photo::Photo photo = loadPhoto(input, photoOptions, talk);
              const std::vector<Face> known = allFaces(faces.of(input), photo);
              const Masks masks = masksOf(std::move(photo), options.filter, known, options.exact);
-             writeMasks(masks, bilateralPath, ltmPath, raw);
+             writeMasks(masks, bilateralPath, ltmPath, raw,
+                        {.mayReplace = options.outputs.overwrite});
              return masks;
            },
        .done =

@@ -50,16 +50,17 @@ Image<RGBA8Pixel> heatMapOf(const photo::Photo& photo, const Input& input,
       "Quality of " + name, about, "Distance of each block from natural photos; lower is better");
 }
 
-/// @param map  where the heat map goes; null for none.
+/// @param map        where the heat map goes; null for none.
+/// @param overwrite  whether it may replace a file.
 ScoredPhoto score(const Input& input, const photo::OpenOptions& options, const PlannedFile* map,
-                  Talk& talk) {
+                  bool overwrite, Talk& talk) {
   const photo::Photo photo = loadPhoto(input, options, talk);
   stopIfInterrupted();
   ScoredPhoto scored = {photo.image->width, photo.image->height,
                         image_processing::analyzeNiqe(*photo.image)};
   stopIfInterrupted();
   if (map != nullptr && !map->skipped && !scored.isTooSmall()) {
-    savePicture(map->output, heatMapOf(photo, input, scored), {}, drawing());
+    savePicture(map->output, heatMapOf(photo, input, scored), {}, drawing(overwrite));
   }
   return scored;
 }
@@ -111,7 +112,8 @@ ExitCode runScore(const ScoreOptions& options) {
       inputs, options.jobs, talk,
       {.work =
            [&](std::size_t index) {
-             return score(inputs[index], photoOptions, maps.empty() ? nullptr : &maps[index], talk);
+             return score(inputs[index], photoOptions, maps.empty() ? nullptr : &maps[index],
+                          options.maps.overwrite, talk);
            },
        .done = report,
        .failed = [&](std::size_t index,

@@ -177,7 +177,7 @@ ExitCode runSheet(const SheetOptions& options) {
     return ExitCode::interrupted;
   }
   const bool something = tally.done > 0;
-  if (something) writeOutput(output, writer->finish());
+  if (something) writeOutput(output, writer->finish(), {.mayReplace = options.outputs.overwrite});
   json.add({{"output", output},
             {"status", something ? "done" : "failed"},
             {"width", painter.width()},

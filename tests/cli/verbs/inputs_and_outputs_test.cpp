@@ -203,6 +203,73 @@ TEST(Outputs, NeverReplaceAnotherInput) {
   EXPECT_EQ(folder.read("a_x.jpg"), file);
 }
 
+TEST(Outputs, NeverReplaceAnInputUnderAnotherNameOfIt) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("real/a.png", smallJpeg());
+  const std::string b = folder.write("b.jpg", smallJpeg());
+  std::filesystem::create_directory_symlink("real", folder / "link");
+  std::filesystem::create_symlink("real/a.png", folder / "c.png");
+  for (const std::string& out :
+       {folder / "link/a.png", folder / "c.png", folder / "link/../link/a.png"}) {
+    const Finished run = quenby({"sheet", b, a, "-o", out, "--overwrite"});
+    EXPECT_EQ(run.exitCode, 2) << out;
+  }
+  for (const std::vector<std::string>& verb :
+       {std::vector<std::string>{"curve", a, "-o", folder / "c.png", "--overwrite"},
+        {"keypoints", a, "--draw", folder / "link/a.png", "--overwrite"},
+        {"score", a, b, "--map", folder.path(), "--name", "b.jpg", "--overwrite"}}) {
+    EXPECT_EQ(quenby(verb).exitCode, 2) << verb[0];
+  }
+  EXPECT_EQ(folder.read("real/a.png"), smallJpeg());
+}
+
+TEST(Outputs, NeverReplaceTheListOfInputs) {
+  const TemporaryFolder folder;
+  const std::string list = folder.write("list", folder.write("a.jpg", smallJpeg()) + "\n");
+  const Finished run = enhance({"@" + list, "-o", folder.path(), "--name", "list", "--overwrite"});
+  EXPECT_EQ(run.exitCode, 2);
+  EXPECT_THAT(run.errors, HasSubstr("is the list of inputs"));
+}
+
+TEST(Outputs, MayReplaceOneOfTwoNamesOfAFile) {
+  const TemporaryFolder folder;
+  const Bytes file = smallJpeg();
+  const std::string a = folder.write("a.jpg", file);
+  std::filesystem::create_hard_link(a, folder / "b.jpg");
+  EXPECT_EQ(enhance({a, "-o", folder / "b.jpg", "--overwrite"}).exitCode, 0);
+  EXPECT_EQ(folder.read("a.jpg"), file);
+  EXPECT_EQ(folder.read("b.jpg"), jpegOf(decoded(file)));
+}
+
+TEST(Outputs, OfKilledRunsAreSwept) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("a.jpg", smallJpeg());
+  folder.write("out/.quenby-1-0.tmp", std::string("half"));
+  folder.write("out/.quenby-mine.tmp", std::string("mine"));
+  folder.write(".quenby-1-0.tmp", std::string("half"));
+  EXPECT_EQ(enhance({a, "-o", folder / "out"}).exitCode, 0);
+  EXPECT_EQ(quenby({"curve", a, "-o", folder / "c.png"}).exitCode, 0);
+  EXPECT_THAT(folder.content(), ElementsAre("a.jpg", "c.png", "out/", "out/.quenby-mine.tmp",
+                                            "out/a_PassThrough.jpg"));
+}
+
+// What opens a file while a standard stream is closed gets its number.
+TEST(Outputs, NeverTakeThePlaceOfAStandardStream) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("a.jpg", smallJpeg());
+  const std::string trace = folder / "trace";
+  const Finished run = shell("ASAN_OPTIONS=detect_leaks=0 strace -f -o " + trace +
+                             " -e trace=openat $QUENBY enhance " + a + " -o " + folder / "b.jpg" +
+                             " --filter PassThrough <&- >&- 2>&-");
+  if (!folder.has("trace")) GTEST_SKIP() << "strace cannot trace here";
+  EXPECT_EQ(run.exitCode, 0);
+  const std::string calls = text(folder.read("trace"));
+  const std::size_t at = calls.find(".tmp\"");
+  ASSERT_NE(at, std::string::npos) << calls;
+  const std::string line = calls.substr(at, calls.find('\n', at) - at);
+  EXPECT_GT(std::stoi(line.substr(line.rfind('=') + 1)), 2) << line;
+}
+
 TEST(Outputs, ThatAreSpecialFilesStaySpecial) {
   const TemporaryFolder folder;
   const std::string in = folder.write("a.jpg", smallJpeg());

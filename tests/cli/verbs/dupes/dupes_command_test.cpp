@@ -460,6 +460,26 @@ TEST(DupesCommand, WritesAPageThatNeedsNothingElse) {
   EXPECT_THAT(holiday.dupes({"--html", "-"}).output, testing::StartsWith("<!DOCTYPE html>"));
 }
 
+// The shell puts the first photo where a name for the page is missing: --html *.jpg.
+TEST(DupesCommand, NeverReplacesAPhotoOrItsCacheWithThePage) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("a.jpg", smallJpeg()), b = folder.write("b.jpg", smallJpeg());
+  const std::string cache = folder / "c.html";
+  std::filesystem::create_symlink("a.jpg", folder / "a.html");
+  for (const std::vector<std::string>& page : {std::vector<std::string>{a},
+                                               {folder / "a.html"},
+                                               {cache, "--cache", cache},
+                                               {cache + "-wal", "--cache", cache},
+                                               {folder / "p.html", "--cache", folder / "c.jpg"}}) {
+    std::vector<std::string> arguments = {"dupes", b, a, "--overwrite", "--html"};
+    arguments.insert(arguments.end(), page.begin(), page.end());
+    const Finished run = quenby(arguments);
+    EXPECT_EQ(run.exitCode, 2) << page[0];
+    EXPECT_EQ(folder.read("a.jpg"), smallJpeg());
+  }
+  EXPECT_THAT(folder.content(), testing::ElementsAre("a.html", "a.jpg", "b.jpg"));
+}
+
 TEST(DupesCommand, GivesTheSameAnswerWithSeveralThreads) {
   const Holiday holiday;
   EXPECT_EQ(holiday.dupes({"-j", "4", "--json"}).output, holiday.dupes({"--json"}).output);
