@@ -12,6 +12,7 @@
 #include "cli/frame/errors.h"
 #include "cli/frame/interrupt.h"
 #include "cli/frame/nearest_name.h"
+#include "cli/frame/shown_text.h"
 
 namespace pelorin::cli {
 namespace {
@@ -82,8 +83,8 @@ std::vector<std::string> CommandLine::verbNames() const {
 
 ExitCode CommandLine::refuse(const std::string& message, const CLI::App* verb) const {
   const std::string of = verb == nullptr ? "" : " " + verb->get_name();
-  std::fprintf(stderr, "quenby%s: %s (see quenby%s --help)\n", of.c_str(), message.c_str(),
-               of.c_str());
+  std::fprintf(stderr, "quenby%s: %s (see quenby%s --help)\n", of.c_str(),
+               shownText(message).c_str(), of.c_str());
   return ExitCode::usage;
 }
 
@@ -147,7 +148,7 @@ ExitCode CommandLine::run(int argc, char** argv) {
   } catch (const Interrupted&) {
     return ExitCode::interrupted;
   } catch (const std::exception& error) {
-    std::fprintf(stderr, "quenby %s: %s\n", name.c_str(), explain(error).c_str());
+    std::fprintf(stderr, "quenby %s: %s\n", name.c_str(), shownText(explain(error)).c_str());
     return ExitCode::someFailed;
   }
   const bool printed = std::fflush(stdout) == 0 && std::ferror(stdout) == 0;

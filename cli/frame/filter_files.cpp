@@ -82,7 +82,7 @@ ExitCode printPlan(const std::vector<PlannedFile>& plan, JsonOutput& json) {
     something = something || !file.skipped;
     json.add(describe(file, file.skipped ? "exists" : "planned"));
     if (json.wanted()) continue;
-    fmt::print("{} -> {}{}\n", file.input.path, file.output,
+    fmt::print("{} -> {}{}\n", shownText(file.input.path), shownText(file.output),
                file.skipped ? " (exists: skipped without --overwrite)" : "");
   }
   return something ? ExitCode::allDone : ExitCode::nothingToDo;

@@ -4,6 +4,7 @@
 #include <string>
 #include <vector>
 
+#include "cli/frame/shown_text.h"
 #include "cli/frame/verb.h"
 
 namespace pelorin::cli {
@@ -19,11 +20,6 @@ void addInputOptions(Verb verb, InputOptions& options);
 
 /// "a JPEG or PNG file, or - (standard input)", for the help.
 std::string aPhotoFile();
-
-/// What messages call an input.
-inline std::string shownName(const std::string& path) {
-  return path == "-" ? "standard input" : path;
-}
 
 /// One file to work on.
 struct Input {

@@ -10,6 +10,9 @@ using Json = nlohmann::ordered_json;
 
 /// Data on stdout: nothing without `--json` or `--jsonl`; one object a line with `--jsonl`; with
 /// `--json` one object, or an array of them unless the user named a single file.
+///
+/// JSON is UTF-8 and file names may be any bytes: where a member's text is no UTF-8, a member of the
+/// same name with "Base64" behind it holds its bytes, and the text has U+FFFD in their place.
 class JsonOutput {
  public:
   JsonOutput(const ReportOptions& options, bool singleFile)

@@ -74,7 +74,9 @@ std::optional<ExitCode> stopBeforeWork(const std::vector<Input>& inputs,
   for (const Input& input : inputs) {
     plan["inputs"].push_back(input.path);
     if (kept || json.wanted()) continue;
-    for (const std::string& output : outputs) fmt::print("{} -> {}\n", input.path, output);
+    for (const std::string& output : outputs) {
+      fmt::print("{} -> {}\n", shownText(input.path), shownText(output));
+    }
   }
   json.add(plan);
   return kept ? ExitCode::nothingToDo : ExitCode::allDone;

@@ -6,6 +6,8 @@
 #include <cstdio>
 #include <utility>
 
+#include "cli/frame/shown_text.h"
+
 namespace pelorin::cli {
 
 void addReportOptions(Verb verb, ReportOptions& options) {
@@ -55,7 +57,7 @@ void Talk::fileDone() {
 
 void Talk::say(const std::string& line) {
   hideBar();
-  fmt::print(stderr, "{}\n", line);
+  fmt::print(stderr, "{}\n", shownText(line));
   showBar();
 }
 

@@ -4,6 +4,8 @@
 #include <cstdint>
 #include <vector>
 
+#include "cli/frame/shown_text.h"
+
 #if defined(__SANITIZE_ADDRESS__)
 #define PELORIN_LOOKS_FOR_LEAKS
 #elif defined(__has_feature)
@@ -28,23 +30,6 @@ namespace {
 
 constexpr std::string_view replacement = "\xEF\xBF\xBD";
 constexpr std::string_view ellipsis = "\xE2\x80\xA6";
-
-/// Length in bytes of the character at the start of `text` (not empty), 0 when it is not UTF-8.
-std::size_t characterLength(std::string_view text) {
-  const auto byte = [&](std::size_t i) { return static_cast<std::uint8_t>(text[i]); };
-  const std::uint8_t first = byte(0);
-  if (first < 0x80) return 1;
-  const std::size_t length = first >= 0xF0 ? 4 : first >= 0xE0 ? 3 : 2;
-  if (first < 0xC2 || first > 0xF4 || text.size() < length) return 0;
-  std::uint32_t codePoint = first & (0xFF >> (length + 1));
-  for (std::size_t i = 1; i < length; ++i) {
-    if ((byte(i) & 0xC0) != 0x80) return 0;
-    codePoint = codePoint << 6 | (byte(i) & 0x3F);
-  }
-  const std::uint32_t least = length == 2 ? 0x80 : length == 3 ? 0x800 : 0x10000;
-  const bool surrogate = codePoint >= 0xD800 && codePoint <= 0xDFFF;
-  return codePoint < least || codePoint > 0x10FFFF || surrogate ? 0 : length;
-}
 
 void select(cairo_t* context, const TextStyle& style) {
   cairo_select_font_face(context, "DejaVu Sans", CAIRO_FONT_SLANT_NORMAL,

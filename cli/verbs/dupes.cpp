@@ -246,7 +246,7 @@ ExitCode runDupes(const DupesOptions& options) {
   noteUntimed(report, talk);
   talk.note(summaryOf(report));
   if (!scan.cacheTrouble.empty()) {
-    fmt::print(stderr, "quenby {}: {}\n", verbName, scan.cacheTrouble);
+    fmt::print(stderr, "quenby {}: {}\n", verbName, shownText(scan.cacheTrouble));
   }
   const bool trouble = !report.failed.empty() || !scan.cacheTrouble.empty();
   return trouble ? ExitCode::someFailed : ExitCode::allDone;

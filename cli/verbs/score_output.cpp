@@ -26,6 +26,12 @@ Json jsonOf(const Input& input, const ScoredPhoto& photo, bool withFeatures) {
   return object;
 }
 
+// A relative path may begin like a formula of a spreadsheet; behind "./" it is the same path.
+std::string pathForCsv(const std::string& path) {
+  const bool likeAFormula = path.find_first_of("=+-@\t\r") == 0;
+  return likeAFormula && path != "-" ? "./" + path : path;
+}
+
 std::string quotedForCsv(const std::string& text) {
   if (text.find_first_of(",\"\r\n") == std::string::npos) return text;
   std::string quoted = "\"";
@@ -41,8 +47,8 @@ void printCsvHead(bool withFeatures) {
 
 void printCsvRow(const Input& input, const ScoredPhoto& photo, bool withFeatures) {
   const std::string score = photo.isTooSmall() ? "" : fmt::format("{:.9g}", photo.niqe.score);
-  fmt::print("{},{},{},{},{},{}", quotedForCsv(input.path), photo.width, photo.height, score,
-             photo.blocks(), niqeModelId);
+  fmt::print("{},{},{},{},{},{}", quotedForCsv(pathForCsv(input.path)), photo.width, photo.height,
+             score, photo.blocks(), niqeModelId);
   if (withFeatures && photo.isTooSmall()) fmt::print("{:,<{}}", "", featureCount);
   for (const float mean : photo.niqe.meanFeatures) {
     if (withFeatures) fmt::print(",{:.9g}", mean);

@@ -5,6 +5,9 @@
 #include <map>
 #include <string_view>
 
+#include "cli/frame/base64.h"
+#include "cli/frame/shown_text.h"
+
 namespace pelorin::cli {
 namespace {
 
@@ -57,23 +60,6 @@ std::string escaped(std::string_view text) {
   return html;
 }
 
-std::string base64(const std::vector<std::uint8_t>& bytes) {
-  constexpr std::string_view digits =
-      "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789+/";
-  std::string text;
-  for (std::size_t i = 0; i < bytes.size(); i += 3) {
-    const auto byte = [&](std::size_t at) -> std::uint32_t {
-      return at < bytes.size() ? bytes[at] : 0;
-    };
-    const std::uint32_t bits = byte(i) << 16 | byte(i + 1) << 8 | byte(i + 2);
-    text += digits[bits >> 18];
-    text += digits[bits >> 12 & 63];
-    text += i + 1 < bytes.size() ? digits[bits >> 6 & 63] : '=';
-    text += i + 2 < bytes.size() ? digits[bits & 63] : '=';
-  }
-  return text;
-}
-
 std::string figure(const photo::ScannedPhoto& photo, const std::vector<std::uint8_t>& thumbnail,
                    const photo::Ranked* ranked, bool keep) {
   const std::string name = escaped(shownName(photo.path));
@@ -82,7 +68,7 @@ std::string figure(const photo::ScannedPhoto& photo, const std::vector<std::uint
                             : fmt::format("<img alt=\"{}\" src=\"data:image/jpeg;base64,{}\">\n",
                                           name, base64(thumbnail));
   html += fmt::format("<figcaption>{}\n<small>{} × {}, {}</small>\n", name, photo.width,
-                      photo.height, escaped(timeText(photo)));
+                      photo.height, escaped(shownText(timeText(photo))));
   if (ranked != nullptr) {
     html += fmt::format("<small>{}{}</small>\n", keep ? "keep: " : "", escaped(ranked->reason));
   }
@@ -127,8 +113,8 @@ std::string htmlReport(const DupeReport& report,
   }
   if (!report.failed.empty()) html += "<section>\n<h2>Not read</h2>\n<ul>\n";
   for (const photo::FailedPhoto& failed : report.failed) {
-    html +=
-        fmt::format("<li>{}: {}</li>\n", escaped(shownName(failed.path)), escaped(failed.reason));
+    html += fmt::format("<li>{}: {}</li>\n", escaped(shownName(failed.path)),
+                        escaped(shownText(failed.reason)));
   }
   if (!report.failed.empty()) html += "</ul>\n</section>\n";
   return html + "</body>\n</html>\n";
