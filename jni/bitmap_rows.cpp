@@ -27,6 +27,15 @@ bool queryBitmap(JNIEnv* env, jobject bitmap, AndroidBitmapInfo& info) {
   return true;
 }
 
+bool queryLockedBitmap(JNIEnv* env, jobject bitmap, const BitmapPixelsLock& lock,
+                       AndroidBitmapInfo& info) {
+  if (lock.pixels() == nullptr) {
+    pn_printLog(logError, logTag, "AndroidBitmap_lockPixels failed");
+    return false;
+  }
+  return queryBitmap(env, bitmap, info);
+}
+
 void copyRows(const void* from, std::size_t fromStride, void* to, std::size_t toStride,
               std::size_t rowBytes, std::size_t rows) {
   if (fromStride == rowBytes && toStride == rowBytes) {

@@ -5,12 +5,18 @@
 #include <cstddef>
 
 #include "image_processing/core/image.h"
+#include "jni/bitmap_pixels_lock.h"
 
 namespace pelorin::quenby {
 
 /// Asks what `bitmap` is. Returns false, with a line in the log, when that fails or when it is
 /// nothing the natives work on: RGBA_8888 with rows of at least width x 4 bytes.
 bool queryBitmap(JNIEnv* env, jobject bitmap, AndroidBitmapInfo& info);
+
+/// The same for pixels that are locked: until then other threads may make another bitmap of it. Also
+/// false, with a line in the log, when `lock` failed.
+bool queryLockedBitmap(JNIEnv* env, jobject bitmap, const BitmapPixelsLock& lock,
+                       AndroidBitmapInfo& info);
 
 /// Copies rows of `rowBytes` bytes; rows may be farther apart than that on either side.
 void copyRows(const void* from, std::size_t fromStride, void* to, std::size_t toStride,

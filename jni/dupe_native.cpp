@@ -2,10 +2,8 @@
 #include <memory>
 
 #include "image_processing/dupe/dupe_score.h"
-#include "jni/bitmap_pixels_lock.h"
 #include "jni/bitmap_rows.h"
 #include "jni/load_time_cache.h"
-#include "jni/log.h"
 #include "jni/natives.h"
 
 namespace pelorin::quenby {
@@ -30,16 +28,10 @@ jfloat similarityScore(JNIEnv* env, jobject, jobject bitmap1, jdouble time1, jin
   AndroidBitmapInfo info1, info2;
   if (!queryBitmap(env, bitmap1, info1)) return loadTimeCache.similarityError;
   const BitmapPixelsLock lock1(env, bitmap1);
-  if (lock1.pixels() == nullptr) {
-    pn_printLog(logError, logTag, "AndroidBitmap_lockPixels failed");
-    return loadTimeCache.similarityError;
-  }
+  if (!queryLockedBitmap(env, bitmap1, lock1, info1)) return loadTimeCache.similarityError;
   if (!queryBitmap(env, bitmap2, info2)) return loadTimeCache.similarityError;
   const BitmapPixelsLock lock2(env, bitmap2);
-  if (lock2.pixels() == nullptr) {
-    pn_printLog(logError, logTag, "AndroidBitmap_lockPixels failed");
-    return loadTimeCache.similarityError;
-  }
+  if (!queryLockedBitmap(env, bitmap2, lock2, info2)) return loadTimeCache.similarityError;
   const Image<RGBA8Pixel> image1 = imageOver(info1, lock1.pixels());
   const Image<RGBA8Pixel> image2 = imageOver(info2, lock2.pixels());
   const auto dt = static_cast<float>(std::fabs(time1 - time2));

@@ -26,12 +26,8 @@ namespace {
 
 void copyToBitmap(JNIEnv* env, const Image<RGBA8Pixel>& image, jobject bitmap) {
   const BitmapPixelsLock lock(env, bitmap);
-  if (lock.pixels() == nullptr) {
-    pn_printLog(logError, logTag, "AndroidBitmap_lockPixels failed");
-    return;
-  }
   AndroidBitmapInfo info;
-  if (!queryBitmap(env, bitmap, info)) return;
+  if (!queryLockedBitmap(env, bitmap, lock, info)) return;
   if (info.width < image.width || info.height < image.height) {
     pn_printLog(logError, logTag, "the output bitmap [%u, %u] is smaller than the photo [%u, %u]",
                 info.width, info.height, image.width, image.height);
@@ -47,10 +43,7 @@ jlong init(JNIEnv* env, jobject, jobject bitmap) {
   AndroidBitmapInfo info;
   if (!queryBitmap(env, bitmap, info)) return 0;
   const BitmapPixelsLock lock(env, bitmap);
-  if (lock.pixels() == nullptr) {
-    pn_printLog(logError, logTag, "AndroidBitmap_lockPixels failed");
-    return 0;
-  }
+  if (!queryLockedBitmap(env, bitmap, lock, info)) return 0;
   pn_printLog(logDebug, logTag, "== QBE: init [%d, %d]", static_cast<int>(info.width),
               static_cast<int>(info.height));
   try {

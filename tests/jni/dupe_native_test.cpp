@@ -52,6 +52,17 @@ TEST_F(DupeNative, ReadsPaddedRows) {
   EXPECT_EQ(padded1.locks + padded2.locks, 0);
 }
 
+TEST_F(DupeNative, ScoresTheBitmapsAsTheyAreOnceLocked) {
+  FakeBitmap first(picture1), second(picture2);
+  first.info.height = second.info.height = 5;
+  const float expected = natives.similarity(first.reference(), 0, 1, second.reference(), 1, 1);
+  bitmap1.heightOnceLocked = bitmap2.heightOnceLocked = 5;
+  EXPECT_NE(natives.similarity(FakeBitmap(picture1).reference(), 0, 1,
+                               FakeBitmap(picture2).reference(), 1, 1),
+            expected);
+  EXPECT_EQ(natives.similarity(bitmap1.reference(), 0, 1, bitmap2.reference(), 1, 1), expected);
+}
+
 TEST_F(DupeNative, GivesTheErrorValueForABitmapThatCannotBeRead) {
   for (FakeBitmap* const broken : {&bitmap1, &bitmap2}) {
     const auto score = [&] {

@@ -54,6 +54,13 @@ TEST_F(EnhancementNatives, OpenNoSessionOnABitmapThatCannotBeLocked) {
   EXPECT_THAT(takeLogLines(), ElementsAre("6 QuenbyLib: AndroidBitmap_lockPixels failed"));
 }
 
+TEST_F(EnhancementNatives, OpenASessionOnTheBitmapAsItIsOnceLocked) {
+  photo.heightOnceLocked = 20;
+  const jlong handle = natives.init(photo.reference());
+  EXPECT_THAT(takeLogLines(), ElementsAre("3 QuenbyLib: == QBE: init [64, 20]"));
+  natives.release(handle);
+}
+
 TEST_F(EnhancementNatives, OpenNoSessionOnAnotherFormat) {
   for (const int format :
        std::initializer_list<int>{ANDROID_BITMAP_FORMAT_NONE, ANDROID_BITMAP_FORMAT_RGB_565,

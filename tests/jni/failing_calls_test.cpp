@@ -62,7 +62,7 @@ TEST_F(FailingCalls, OfInit) {
         EXPECT_EQ(opened == 0, env.failed());
         if (opened != 0) natives.release(opened);
       },
-      2);
+      3);
 }
 
 TEST_F(FailingCalls, OfPreprocess) {
@@ -96,7 +96,7 @@ TEST_F(FailingCalls, OfSimilarityScore) {
             natives.similarity(run.photo.reference(), 1, 1, run.padded.reference(), 2, 2);
         EXPECT_EQ(score == -2222.0f, env.failed());
       },
-      4);
+      6);
 }
 
 TEST_F(FailingCalls, OfTheExceptionItself) {

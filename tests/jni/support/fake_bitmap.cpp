@@ -57,6 +57,8 @@ int AndroidBitmap_lockPixels(JNIEnv* env, jobject bitmap, void** pixels) {
   if (environmentOf(env).shouldFail("AndroidBitmap_lockPixels"))
     return ANDROID_BITMAP_RESULT_JNI_EXCEPTION;
   if (bitmapOf(bitmap)->lockResult != 0) return bitmapOf(bitmap)->lockResult;
+  if (bitmapOf(bitmap)->heightOnceLocked != 0)
+    bitmapOf(bitmap)->info.height = bitmapOf(bitmap)->heightOnceLocked;
   ++bitmapOf(bitmap)->locks;
   ++bitmapOf(bitmap)->timesLocked;
   *pixels = bitmapOf(bitmap)->bytes.data();

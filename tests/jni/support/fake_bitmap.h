@@ -26,6 +26,7 @@ struct FakeBitmap : FakeObject {
   std::vector<std::uint8_t> bytes;
   std::atomic<int> locks = 0, timesLocked = 0;
   int infoResult = 0, lockResult = 0;  ///< What the library answers.
+  std::uint32_t heightOnceLocked = 0;  ///< Another, if not 0: as if a thread had come in between.
 };
 
 }  // namespace pelorin::test_support

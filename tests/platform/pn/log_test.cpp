@@ -59,6 +59,23 @@ TEST_F(Log, CutsALongLineAndKeepsItsEnd) {
   EXPECT_THAT(line, testing::EndsWith("xxx\n"));
 }
 
+TEST_F(Log, EscapesControlCharacters) {
+  CaptureStderr();
+  pn_printLog(6, "tag", "%s", "a\nb\r\t\x1b[2J\x7f \xC2\x9B\xC2\xA0\xC3\xA4\\.jpg\xC2");
+  EXPECT_THAT(GetCapturedStderr(),
+              testing::EndsWith(
+                  "E tag: a\\x0ab\\x0d\\x09\\x1b[2J\\x7f \\u009b\xC2\xA0\xC3\xA4\\.jpg\xC2\n"));
+}
+
+TEST_F(Log, CutsALineOfEscapesBetweenThem) {
+  CaptureStderr();
+  pn_printLog(6, "tag", "%s", std::string(5000, '\n').c_str());
+  const std::string line = GetCapturedStderr();
+  EXPECT_LE(line.size(), 1200u);
+  EXPECT_GE(line.size(), 1000u);
+  EXPECT_THAT(line, testing::EndsWith("\\x0a\\x0a\n"));
+}
+
 TEST_F(Log, CutsALongTag) {
   CaptureStderr();
   pn_printLog(6, std::string(3000, 't').c_str(), "text");
