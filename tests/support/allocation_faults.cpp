@@ -68,6 +68,12 @@ void* operator new(std::size_t size) {
 void* operator new[](std::size_t size) {
   return operator new(size);
 }
+void* operator new(std::size_t size, const std::nothrow_t&) noexcept {
+  return mayAllocate() ? counted(std::malloc(size)) : nullptr;
+}
+void* operator new[](std::size_t size, const std::nothrow_t& never) noexcept {
+  return operator new(size, never);
+}
 void operator delete(void* block) noexcept {
   uncount(block);
   std::free(block);
