@@ -20,7 +20,7 @@ class FileError : public std::runtime_error {
 };
 
 /// One clause for a user from whatever a verb's work has thrown: full memory, a missing file, a
-/// damaged JPEG, a full disk.
+/// damaged photo, a full disk.
 std::string explain(const std::exception& error);
 
 }  // namespace pelorin::cli

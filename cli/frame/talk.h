@@ -28,7 +28,7 @@ class Talk {
   Talk(const Talk&) = delete;
   Talk& operator=(const Talk&) = delete;
 
-  /// "quenby enhance: a.jpg: is empty, not a JPEG file". Said even when quiet.
+  /// "quenby enhance: a.jpg: is empty, not a photo". Said even when quiet.
   void error(const std::string& file, const std::string& clause);
   void note(const std::string& line);
   /// A note that is not said again when one with the same topic was said.

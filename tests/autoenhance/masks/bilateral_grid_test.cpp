@@ -7,6 +7,7 @@
 #include <limits>
 #include <utility>
 
+#include "tests/autoenhance/masks/noisy_edge.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/float_images.h"
 #include "tests/support/instruction_sets.h"
@@ -40,16 +41,7 @@ TEST(BilateralGrid, KeepsAConstantImage) {
 }
 
 TEST(BilateralGrid, KeepsAnEdgeAndSmoothsWhatLiesBesideIt) {
-  Image<float> image = randomImage(60, 60, 8);
-  for (std::uint32_t y = 0; y < 60; ++y) {
-    for (std::uint32_t x = 0; x < 60; ++x) {
-      image.row(y)[x] = (x < 30 ? 0.1f : 0.9f) + 0.04f * image.row(y)[x];
-    }
-  }
-  const Image<float> smoothed = gridSmoothed(image, 0.3f, 6.0f);
-  EXPECT_NEAR(smoothed.row(30)[29], 0.12f, 0.02f);
-  EXPECT_NEAR(smoothed.row(30)[30], 0.92f, 0.02f);
-  for (std::uint32_t x = 5; x < 25; ++x) EXPECT_NEAR(smoothed.row(30)[x], 0.12f, 0.015f);
+  test_support::expectSmoothedBesideTheEdge(gridSmoothed(test_support::noisyEdge(), 0.3f, 6.0f));
 }
 
 TEST(BilateralGrid, IsAllZeroBelowAThirtySecondOfRange) {
