@@ -1,11 +1,12 @@
 #include "photo/filter_photo.h"
 
+#include <algorithm>
 #include <cmath>
 #include <memory>
 #include <stdexcept>
 
+#include "image_processing/core/picture_rows.h"
 #include "image_processing/filters/default_filter_factory.h"
-#include "image_processing/filters/filtered_image.h"
 #include "image_processing/filters/parameter_check.h"
 
 namespace pelorin::photo {
@@ -29,6 +30,25 @@ void checkRequest(const FilterRequest& request) {
   requireFinite(request.faces);
 }
 
+/// The rows of a picture that are replaced by filtered ones. What is read is copied, since a filter
+/// may ask for a row again that stands there filtered already.
+class RowsInPlace : public RowSource, public RowSink {
+ public:
+  explicit RowsInPlace(const Image<RGBA8Pixel>& picture)
+      : width_(picture.width), picture_(picture), filtered_(picture) {}
+
+  const RGBA8Pixel* next(std::uint32_t count, RGBA8Pixel* room) override {
+    std::copy_n(picture_.next(count, nullptr), std::size_t{width_} * count, room);
+    return room;
+  }
+  void write(const RGBA8Pixel* rows, std::uint32_t count) override { filtered_.write(rows, count); }
+
+ private:
+  std::uint32_t width_;
+  PictureSource picture_;
+  PictureSink filtered_;
+};
+
 }  // namespace
 
 const FilterDescription& filterFor(const std::string& name, const std::string& params) {
@@ -51,14 +71,20 @@ void requireFinite(const std::vector<Face>& faces) {
 }
 
 void filterInPlace(Photo& photo, const std::string& filter, const std::string& params,
-                   const std::vector<Face>& faces, int scale) {
-  // The session ends here, before an encoder begins: its masks are several times the picture.
-  FilteredImage session(
-      photo.image,
-      metadataWithFaces(allFaces(faces, photo), photo.image->width, photo.image->height, scale), "",
-      defaultFilterConfigValue, DefaultFilterFactory::filterFactory());
-  session.applyFilterWithParams(filter, params, defaultFilterConfigValue,
-                                /*output=*/*photo.image);
+                   const std::vector<Face>& faces, int scale, const std::stop_token& stop) {
+  const Image<RGBA8Pixel>& picture = *photo.image;
+  const std::unique_ptr<RowFilter> rows =
+      DefaultFilterFactory::filterFactory()->find(filter)->makeRowFilter(
+          {.width = picture.width,
+           .height = picture.height,
+           .metadata =
+               metadataWithFaces(allFaces(faces, photo), picture.width, picture.height, scale),
+           .params = params});
+  const RowWork work{.stop = [&] { return stop.stop_requested(); }};
+  PictureSource whole(picture);
+  if (rows->looksFirst() && !rows->look(whole, work)) throw Stopped();
+  RowsInPlace inPlace(picture);
+  if (!rows->filter(inPlace, inPlace, work)) throw Stopped();
 }
 
 std::vector<std::uint8_t> filterPhoto(std::span<const std::uint8_t> file,
@@ -67,7 +93,8 @@ std::vector<std::uint8_t> filterPhoto(std::span<const std::uint8_t> file,
   checkRequest(request);
   Photo photo = open(file, request.open);
   stopIfAsked(request.open.stop);
-  filterInPlace(photo, request.filter, request.params, request.faces, request.open.scale);
+  filterInPlace(photo, request.filter, request.params, request.faces, request.open.scale,
+                request.open.stop);
   if (format == nullptr) format = formatNamed(photo.facts.format);
   return save(*photo.image, *format, photo.metadata, request.save, lost);
 }

@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <span>
+#include <stop_token>
 #include <string>
 #include <vector>
 
@@ -29,12 +30,15 @@ const image_processing::FilterDescription& filterFor(const std::string& name,
 /// @throws std::invalid_argument when a side is not finite.
 void requireFinite(const std::vector<Face>& faces);
 
-/// Filters a photo in its own pixels.
+/// Filters a photo in its own pixels, by rows: with hardly any memory beside them. The bytes are
+/// those of a session on it.
+/// @param filter  a name in the registry.
 /// @param faces   beside those that its file knows of.
 /// @param scale   how often smaller it was decoded than it is.
-/// @throws PhotoError for a face in pixels that lies outside the picture; what the filter throws.
+/// @throws PhotoError for a face in pixels that lies outside the picture; Stopped; what the filter
+///         throws.
 void filterInPlace(Photo& photo, const std::string& filter, const std::string& params,
-                   const std::vector<Face>& faces, int scale);
+                   const std::vector<Face>& faces, int scale, const std::stop_token& stop = {});
 
 /// The bytes of the file that the command writes for the same options: upright, filtered, with the
 /// metadata kept.

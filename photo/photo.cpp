@@ -32,6 +32,24 @@ std::unique_ptr<RowReader> readerOf(std::span<const std::uint8_t> file,
   return reducedRows(std::move(reader), divisor);
 }
 
+// Turned while it comes, so that there is one picture and not two.
+std::shared_ptr<Image<RGBA8Pixel>> readTurned(RowReader& reader, Turn turn, SparePixels& spare) {
+  const PictureSize size = reader.size(), upright = turnedSize(size, turn);
+  const std::shared_ptr<Image<RGBA8Pixel>> picture = spare.picture(upright.width, upright.height);
+  if (turn == Turn{}) {
+    reader.read(picture->data.get(), size.height);
+    return picture;
+  }
+  const Image<RGBA8Pixel> room(size.width, std::min(size.height, rowsAtOnce));
+  for (std::uint32_t y = 0; y < size.height;) {
+    const std::uint32_t count = std::min(size.height - y, room.height);
+    reader.read(room.data.get(), count);
+    turnRows(room.data.get(), y, count, size, turn, *picture);
+    y += count;
+  }
+  return picture;
+}
+
 bool isOpaque(const RGBA8Pixel* pixels, std::size_t count) {
   std::uint32_t all = ~0u;  // of every channel: a loop without a branch, of which vectors are made
 #pragma GCC unroll 8
@@ -62,15 +80,11 @@ PhotoFacts readFacts(std::span<const std::uint8_t> file) {
 Photo open(std::span<const std::uint8_t> file, const OpenOptions& options, SparePixels* spare) {
   const std::unique_ptr<RowReader> rows = openRows(file, options);
   Photo photo{nullptr, rows->facts(), rows->metadata(), {}};
-  SparePixels none;
-  const PictureSize size = rows->size();
-  photo.image = (spare != nullptr ? spare : &none)->picture(size.width, size.height);
-  rows->read(photo.image->data.get(), size.height);
-  stopIfAsked(options.stop);
-  if (options.upright) {
+  if (options.upright)
     photo.metadata.turn = turnedFurther(uprightTurn(photo.facts.orientation), options.rotate);
-    photo.image = turned(photo.image, photo.metadata.turn);
-  }
+  SparePixels none;
+  photo.image = readTurned(*rows, photo.metadata.turn, spare != nullptr ? *spare : none);
+  stopIfAsked(options.stop);
   if (options.faces && !options.raw)
     photo.faces = knownFaces(photo.metadata, {photo.image->width, photo.image->height});
   return photo;

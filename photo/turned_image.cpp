@@ -6,21 +6,16 @@
 namespace pelorin::photo {
 
 using image_processing::Image;
-using image_processing::makeSharedImage;
 using image_processing::RGBA8Pixel;
 
-std::shared_ptr<Image<RGBA8Pixel>> turned(const std::shared_ptr<Image<RGBA8Pixel>>& picture,
-                                          Turn turn) {
-  if (turn == Turn{}) return picture;
-  const std::ptrdiff_t width = picture->width, height = picture->height;
-  const bool sideways = turn.quarters % 2 == 1;
-  auto result = sideways ? makeSharedImage<RGBA8Pixel>(picture->height, picture->width)
-                         : makeSharedImage<RGBA8Pixel>(picture->width, picture->height);
+void turnRows(const RGBA8Pixel* rows, std::uint32_t first, std::uint32_t count, PictureSize size,
+              Turn turn, const Image<RGBA8Pixel>& result) {
+  const std::ptrdiff_t width = size.width, bottomRow = std::ptrdiff_t{first} + count;
 
   // Where the source's first pixel goes, and how far apart its neighbours to the right and below
   // come to stand.
-  const std::ptrdiff_t rowLength = result->width;
-  const std::ptrdiff_t lastX = rowLength - 1, lastRow = (result->height - 1) * rowLength;
+  const std::ptrdiff_t rowLength = result.width;
+  const std::ptrdiff_t lastX = rowLength - 1, lastRow = (result.height - 1) * rowLength;
   std::ptrdiff_t origin = 0, right = 1, down = rowLength;
   if (turn.quarters == 1) origin = lastX, right = rowLength, down = -1;
   if (turn.quarters == 2) origin = lastRow + lastX, right = -1, down = -rowLength;
@@ -32,20 +27,18 @@ std::shared_ptr<Image<RGBA8Pixel>> turned(const std::shared_ptr<Image<RGBA8Pixel
 
   // In tiles, because one of the two pictures is walked along its columns.
   constexpr std::ptrdiff_t tile = 32;
-  const RGBA8Pixel* source = picture->data.get();
-  RGBA8Pixel* target = result->data.get();
-  for (std::ptrdiff_t top = 0; top < height; top += tile) {
+  RGBA8Pixel* const target = result.data.get();
+  for (std::ptrdiff_t top = first; top < bottomRow; top += tile) {
     for (std::ptrdiff_t left = 0; left < width; left += tile) {
-      const std::ptrdiff_t bottom = std::min(top + tile, height);
+      const std::ptrdiff_t bottom = std::min(top + tile, bottomRow);
       const std::ptrdiff_t end = std::min(left + tile, width);
       for (std::ptrdiff_t y = top; y < bottom; ++y) {
         for (std::ptrdiff_t x = left; x < end; ++x) {
-          target[origin + x * right + y * down] = source[y * width + x];
+          target[origin + x * right + y * down] = rows[(y - first) * width + x];
         }
       }
     }
   }
-  return result;
 }
 
 }  // namespace pelorin::photo

@@ -1,16 +1,25 @@
 #pragma once
 
-#include <memory>
+#include <cstdint>
 
 #include "image_processing/core/image.h"
+#include "photo/picture_size.h"
 #include "photo/turn.h"
 
 namespace pelorin::photo {
 
-/// The turned picture in pixels of its own; `picture` itself when there is nothing to turn.
-/// @throws std::bad_alloc when the second picture does not fit.
-std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> turned(
-    const std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>>& picture,
-    Turn turn);
+/// The size of a picture once it is turned.
+inline PictureSize turnedSize(PictureSize size, Turn turn) {
+  return turn.swapsAxes() ? PictureSize{size.height, size.width} : size;
+}
+
+/// Turns some rows of a picture into their place in the turned one, so that the two need not exist
+/// at once. Never throws.
+/// @param rows    `count` of them from row `first` on, back to back.
+/// @param size    of the picture before it is turned.
+/// @param result  of `turnedSize`; only the pixels that the rows become are written.
+void turnRows(const image_processing::RGBA8Pixel* rows, std::uint32_t first, std::uint32_t count,
+              PictureSize size, Turn turn,
+              const image_processing::Image<image_processing::RGBA8Pixel>& result);
 
 }  // namespace pelorin::photo

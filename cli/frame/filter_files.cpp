@@ -59,7 +59,7 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   Image<RGBA8Pixel>& picture = *photo.image;
   Done done = {picture.width, picture.height, {}, photo.facts.notices};
   photo::filterInPlace(photo, work.filter.filter.name, work.filter.params,
-                       work.faces.of(file.input), work.photo.scale);
+                       work.faces.of(file.input), work.photo.scale, interruptToken());
   stopIfInterrupted();
   done.lost = savePicture(file.output, picture, photo.metadata, work.save);
   if (!work.save.raw) spare.keep(picture);
