@@ -48,10 +48,10 @@ photo::SaveOptions saveOptions(const quenby_save_options* given, const quenby_ca
     refuse("options", "unknown flags");
   }
   photo::SaveOptions save{.stop = tokenOf(cancel),
-                          .keep = {.everything = keeps(QUENBY_DROP_METADATA),
-                                   .location = keeps(QUENBY_DROP_LOCATION),
+                          .keep = {.location = keeps(QUENBY_DROP_LOCATION),
                                    .thumbnail = keeps(QUENBY_DROP_THUMBNAIL),
                                    .gainMap = keeps(QUENBY_DROP_GAIN_MAP)}};
+  if (!keeps(QUENBY_DROP_METADATA)) save.keep.only.emplace();
   if (options.quality != 0) save.quality = options.quality;
   if (save.quality < 1 || save.quality > 100) refuse("quality", "is not from 1 to 100");
   return save;
