@@ -3,12 +3,12 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <locale>
 #include <string>
 #include <vector>
 
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/pass_through.h"
+#include "tests/support/comma_locale.h"
 
 namespace pelorin::image_processing {
 namespace {
@@ -118,13 +118,8 @@ TEST(ParameterCheck, FindsWhatAFilterDoesNotSee) {
 }
 
 TEST(ParameterCheck, WritesNumbersWithAPointInEveryLocale) {
-  struct Comma : std::numpunct<char> {
-    char do_decimal_point() const override { return ','; }
-  };
-  const std::locale before = std::locale::global(std::locale(std::locale::classic(), new Comma));
-  const std::string params = requiredParameters(builtIn("AE0").parameters());
-  std::locale::global(before);
-  EXPECT_EQ(params, "slider=0.4;");
+  const test_support::CommaLocale comma;
+  EXPECT_EQ(requiredParameters(builtIn("AE0").parameters()), "slider=0.4;");
 }
 
 /// A filter of somebody else's, with one key of each kind that no built-in one has.
