@@ -39,4 +39,16 @@ std::size_t jpegEnd(std::span<const std::uint8_t> bytes) {
   return bytes.size();
 }
 
+bool hasMoreSegments(std::span<const std::uint8_t> bytes, std::size_t most) {
+  constexpr std::uint8_t startOfScan = 0xDA;
+  std::size_t at = 2;
+  for (std::size_t count = 0; (at = nextMarker(bytes, at)) < bytes.size(); ++count) {
+    const std::uint8_t marker = bytes[at + 1];
+    if (marker == startOfScan || marker == endOfImage || bytes.size() - at < 4) break;
+    if (count == most) return true;
+    at += 2 + (std::size_t{bytes[at + 2]} << 8 | bytes[at + 3]);
+  }
+  return false;
+}
+
 }  // namespace pelorin::photo

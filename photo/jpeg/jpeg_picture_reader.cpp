@@ -54,6 +54,7 @@ JpegPictureReader::JpegPictureReader(std::span<const std::uint8_t> file, int sca
     reader_.keepSegments(profileMarker);
   }
   reader_.readHeader();
+  reader_.keepNoMoreSegments();
   checkLimits(reader_, limits);
   chooseOutput(reader_.codec(), scale);
   reader_.run([this] { jpeg_calc_output_dimensions(&reader_.codec()); });

@@ -1,6 +1,9 @@
 #include "photo/jpeg/libjpeg_reader.h"
 
+#include <string>
+
 #include "photo/jpeg/jpeg_codec.h"
+#include "photo/jpeg/jpeg_end.h"
 
 namespace pelorin::photo {
 
@@ -19,12 +22,26 @@ void LibjpegReader::keepSegments(int marker) {
   run([this, marker] { jpeg_save_markers(&codec_, marker, wholeSegment); });
 }
 
+void LibjpegReader::keepNoMoreSegments() {
+  run([this] {
+    jpeg_save_markers(&codec_, JPEG_COM, 0);
+    for (int n = 0; n < 16; ++n) jpeg_save_markers(&codec_, JPEG_APP0 + n, 0);
+  });
+}
+
 void LibjpegReader::keepAllSegments() {
   keepSegments(JPEG_COM);
   for (int n = 0; n < 16; ++n) keepSegments(JPEG_APP0 + n);
 }
 
 void LibjpegReader::readHeader() {
+  // libjpeg goes through those it has for each that it keeps. Profiles of 16 MB and extended XMP of
+  // 64 MB take 1300 together.
+  constexpr std::size_t mostSegments = 4096;
+  if (hasMoreSegments(file_, mostSegments)) {
+    throw PhotoError(PhotoError::Kind::tooLarge,
+                     "too many segments: at most " + std::to_string(mostSegments) + " can be read");
+  }
   run([this] {
     jpeg_mem_src(&codec_, file_.data(), file_.size());
     jpeg_read_header(&codec_, TRUE);

@@ -31,7 +31,12 @@ class LibjpegReader {
   /// Keeps every APPn and COM segment; before readHeader.
   void keepAllSegments();
 
+  /// Keeps none of those that stand between and behind the picture data; after readHeader.
+  void keepNoMoreSegments();
+
   /// Reads up to the picture data.
+  /// @throws PhotoError also for more segments than any camera writes, which cost libjpeg the square
+  ///         of their number.
   void readHeader();
 
   /// After the picture data. A file of several scans may end, without a warning, before each

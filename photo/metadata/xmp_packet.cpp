@@ -14,6 +14,8 @@ constexpr std::string_view empty =
 constexpr std::size_t mostParts = 1'000'000;
 constexpr int deepest = 100;
 
+constexpr std::size_t largestPacket = std::size_t{64} << 20;
+
 // What a parser keeps costs 40 to 60 bytes a part, however few bytes spell it.
 void checkParts(std::string_view bytes) {
   const auto parts = std::count_if(bytes.begin(), bytes.end(),
@@ -150,6 +152,7 @@ std::size_t XmpProperty::size() const {
 }
 
 XmpPacket::XmpPacket(std::string_view bytes) : state_(std::make_unique<State>()) {
+  if (bytes.size() > largestPacket) throw XmpError("over 64 MiB");
   checkParts(bytes);
   state_->original = bytes;
   const std::string_view all = state_->original;
@@ -282,16 +285,17 @@ void XmpPacket::take(XmpProperty property) {
   property.remove();
 }
 
-std::string XmpPacket::bytes() const {
+std::string XmpPacket::bytes(std::size_t longest) const {
   const auto& [document, rdf, changed, original, before, after] = *state_;
-  if (!changed) return original;
+  if (!changed && original.size() <= longest) return original;
   std::ostringstream text;
   document.save(text, "", pugi::format_raw | pugi::format_no_declaration, pugi::encoding_utf8);
   const std::string written = text.str();
   // Padding is the space before the closing instruction; programs write into it.
   const std::size_t padding = std::min(after.find_first_not_of(whitespace), after.size());
   const std::size_t others = before.size() + after.size() - padding;
-  const std::size_t room = std::max(original.size(), others + written.size()) - others;
+  const std::size_t room =
+      std::max(std::min(original.size(), longest), others + written.size()) - others;
   std::string_view fill = after.substr(0, padding);
   std::string result(before);
   result += written;

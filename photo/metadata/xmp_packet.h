@@ -69,8 +69,8 @@ class XmpPacket {
  public:
   /// @param bytes  UTF-8, with or without the processing instructions around it.
   /// @throws XmpError for what is not well-formed, has no RDF, declares a document type (which XMP
-  ///         never does, and bombs do), is nested deeper than 100 or is made of more than a million
-  ///         elements and attributes, and std::bad_alloc.
+  ///         never does, and bombs do), is nested deeper than 100, is over 64 MiB or made of more
+  ///         than a million elements and attributes, and std::bad_alloc.
   explicit XmpPacket(std::string_view bytes);
   /// A packet without properties, and without processing instructions as an extension has none.
   XmpPacket();
@@ -96,7 +96,8 @@ class XmpPacket {
 
   bool changed() const { return state_->changed; }
   /// The packet written out, as long as it was where the padding within allows it.
-  std::string bytes() const;
+  /// @param longest  beyond which no padding is put.
+  std::string bytes(std::size_t longest = std::string::npos) const;
 
  private:
   struct State {

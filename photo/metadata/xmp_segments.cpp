@@ -102,7 +102,9 @@ class PacketOfSegments {
 
   // @throws XmpError when there is no way to make it fit.
   std::vector<MetadataSegment> written() {
-    while (packet_.bytes().size() > longestPayload - packetMark.size()) moveLargestProperty();
+    constexpr std::size_t room = longestPayload - packetMark.size();
+    for (std::size_t size; (size = packet_.bytes(room).size()) > room;)
+      moveLargestProperties(size - room);
     std::vector<MetadataSegment> segments(1);
     if (extension_) {
       const std::string bytes = extension_->bytes();
@@ -113,8 +115,17 @@ class PacketOfSegments {
                        std::string_view(bytes).substr(done, longestPart)}));
       }
     }
-    segments[0] = segmentOf({packetMark, packet_.bytes()});
+    segments[0] = segmentOf({packetMark, packet_.bytes(room)});
     return segments;
+  }
+
+  // As one segment of any length.
+  std::vector<MetadataSegment> merged() {
+    forgetExtension();
+    if (extension_) {
+      for (const XmpProperty& property : extension_->properties()) packet_.take(property);
+    }
+    return {segmentOf({packetMark, packet_.bytes()})};
   }
 
  private:
@@ -127,65 +138,68 @@ class PacketOfSegments {
     }
   }
 
-  void moveLargestProperty() {
+  // So many bytes of them.
+  void moveLargestProperties(std::size_t excess) {
     if (!extension_) {
       extension_.emplace();
       nameExtension(std::string(nameSize, '0'));  // takes its place from the start
     }
-    XmpProperty largest;
-    std::size_t size = 100;  // more than the name of the extension takes, which must stay
+    std::vector<std::pair<std::size_t, XmpProperty>> largest;
     for (const XmpProperty& property : packet_.properties()) {
-      if (property.size() <= size) continue;
-      size = property.size();
-      largest = property;
+      const std::size_t size = property.size();
+      // The name of the extension takes less, and must stay.
+      if (size > 100) largest.emplace_back(size, property);
     }
-    if (!largest) throw XmpError("too large for its segment");
-    extension_->take(largest);
+    std::stable_sort(largest.begin(), largest.end(),
+                     [](const auto& a, const auto& b) { return a.first > b.first; });
+    std::size_t moved = 0;
+    for (const auto& [size, property] : largest) {
+      if (moved >= excess || mayMove_ == 0) break;
+      moved += size;
+      --mayMove_;
+      extension_->take(property);
+    }
+    if (moved == 0) throw XmpError("too large for its segment");
   }
 
   XmpPacket packet_;
+  std::size_t mayMove_ = 1000;  // each brings its namespaces along
   std::string extensionName_;
   std::optional<XmpPacket> extension_;
 };
 
-std::vector<MetadataSegment> edited(const MetadataSegment& segment, Extensions& extensions,
-                                    const std::function<void(XmpPacket&)>& edit,
-                                    std::vector<Loss>& lost) {
+PacketOfSegments packetWithExtension(const MetadataSegment& segment, Extensions& extensions,
+                                     std::vector<Loss>& lost) {
   PacketOfSegments packet(segment);
-  if (!packet.extensionName().empty()) {
-    try {
-      const auto found = extensions.find(packet.extensionName());
-      if (found == extensions.end()) throw XmpError("missing from the file");
-      const Extension extension = std::move(found->second);
-      extensions.erase(found);
-      packet.setExtension(assembled(extension));
-    } catch (const XmpError& error) {
-      lost.push_back({"Extended XMP", error.what()});
-      packet.forgetExtension();
-    }
+  if (packet.extensionName().empty()) return packet;
+  try {
+    const auto found = extensions.find(packet.extensionName());
+    if (found == extensions.end()) throw XmpError("missing from the file");
+    const Extension extension = std::move(found->second);
+    extensions.erase(found);
+    packet.setExtension(assembled(extension));
+  } catch (const XmpError& error) {
+    lost.push_back({"Extended XMP", error.what()});
+    packet.forgetExtension();
   }
-  packet.edit(edit);
-  return packet.written();
+  return packet;
 }
 
-}  // namespace
-
-bool isXmpExtension(const MetadataSegment& segment) {
-  return startsWith(segment, extensionMark);
-}
-
-void editXmp(std::vector<MetadataSegment>& segments, const std::function<void(XmpPacket&)>& edit,
-             std::vector<Loss>& lost) {
+// Each packet's segments are replaced by what `rewritten` makes of it.
+void rewriteXmp(std::vector<MetadataSegment>& segments,
+                const std::function<std::vector<MetadataSegment>(PacketOfSegments)>& rewritten,
+                std::vector<Loss>& lost) {
   Extensions extensions = extensionsIn(segments);
   std::vector<MetadataSegment> result;
   for (const MetadataSegment& segment : segments) {
     if (isXmpExtension(segment)) continue;  // comes with its packet
-    if (!startsWith(segment, packetMark)) {
+    if (!isXmpPacket(segment)) {
       result.push_back(segment);
       continue;
     }
     try {
-      std::vector<MetadataSegment> written = edited(segment, extensions, edit, lost);
+      std::vector<MetadataSegment> written =
+          rewritten(packetWithExtension(segment, extensions, lost));
       std::move(written.begin(), written.end(), std::back_inserter(result));
     } catch (const XmpError& error) {
       lost.push_back({"XMP", error.what()});
@@ -194,6 +208,33 @@ void editXmp(std::vector<MetadataSegment>& segments, const std::function<void(Xm
   for (std::size_t i = 0; i < extensions.size(); ++i)
     lost.push_back({"Extended XMP", "belongs to no packet of the file"});
   segments = std::move(result);
+}
+
+}  // namespace
+
+bool isXmpExtension(const MetadataSegment& segment) {
+  return startsWith(segment, extensionMark);
+}
+
+bool isXmpPacket(const MetadataSegment& segment) {
+  return startsWith(segment, packetMark);
+}
+
+void editXmp(std::vector<MetadataSegment>& segments, const std::function<void(XmpPacket&)>& edit,
+             std::vector<Loss>& lost) {
+  rewriteXmp(
+      segments,
+      [&](PacketOfSegments packet) {
+        packet.edit(edit);
+        return packet.written();
+      },
+      lost);
+}
+
+void mergeXmpExtensions(std::vector<MetadataSegment>& segments, std::vector<Loss>& lost) {
+  if (std::none_of(segments.begin(), segments.end(), isXmpExtension)) return;
+  rewriteXmp(
+      segments, [](PacketOfSegments packet) { return packet.merged(); }, lost);
 }
 
 }  // namespace pelorin::photo

@@ -11,6 +11,8 @@
 
 namespace pelorin::photo {
 
+/// Whether a segment is a packet.
+bool isXmpPacket(const MetadataSegment& segment);
 /// Whether a segment is a part of an extension.
 bool isXmpExtension(const MetadataSegment& segment);
 
@@ -21,5 +23,9 @@ bool isXmpExtension(const MetadataSegment& segment);
 /// 64 MiB or of no packet.
 void editXmp(std::vector<MetadataSegment>& segments, const std::function<void(XmpPacket&)>& edit,
              std::vector<Loss>& lost);
+
+/// Brings every extension into its packet, which may grow beyond what a JPEG file can hold. Losses
+/// are those of `editXmp`.
+void mergeXmpExtensions(std::vector<MetadataSegment>& segments, std::vector<Loss>& lost);
 
 }  // namespace pelorin::photo

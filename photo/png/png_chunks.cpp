@@ -36,8 +36,8 @@ std::string_view textOf(Bytes bytes) {
   throw PhotoError(PhotoError::Kind::truncated, "truncated: the file ends early");
 }
 
-// Unpacked bytes; a profile beyond any that exists counts as damage.
-std::vector<std::uint8_t> inflated(Bytes packed) {
+// Unpacked bytes; a size beyond any that exists counts as damage.
+std::vector<std::uint8_t> inflated(Bytes packed, std::string_view what) {
   constexpr std::size_t largest = std::size_t{16} << 20;
   std::vector<std::uint8_t> bytes(std::max<std::size_t>(packed.size() * 4, 4096));
   for (;;) {
@@ -49,7 +49,8 @@ std::vector<std::uint8_t> inflated(Bytes packed) {
     }
     if (code == Z_MEM_ERROR) throw std::bad_alloc();
     if (code != Z_BUF_ERROR || bytes.size() >= largest) {
-      throw PhotoError(PhotoError::Kind::damaged, "damaged: its colour profile cannot be unpacked");
+      throw PhotoError(PhotoError::Kind::damaged,
+                       "damaged: its " + std::string(what) + " cannot be unpacked");
     }
     bytes.resize(bytes.size() * 2);
   }
@@ -69,14 +70,22 @@ void addProfile(Bytes data, Metadata& metadata) {
   if (name + 2 >= data.size() || data[name + 1] != 0) {
     throw PhotoError(PhotoError::Kind::damaged, "damaged: its colour profile cannot be read");
   }
-  addColourProfile(inflated(data.subspan(name + 2)), metadata.segments);
+  addColourProfile(inflated(data.subspan(name + 2), "colour profile"), metadata.segments);
 }
 
-// An XMP packet that is neither packed nor in a language; others stay chunks.
-Bytes xmpOf(Bytes data) {
-  constexpr std::string_view plain("\0\0\0\0", 4);
-  const std::string head = std::string(xmpKeyword) + std::string(plain);
-  return textOf(data).starts_with(head) ? data.subspan(head.size()) : Bytes{};
+// The XMP packet in an iTXt chunk; empty when it is another text or cut off.
+std::vector<std::uint8_t> xmpOf(Bytes data) {
+  const std::string_view text = textOf(data);
+  const std::size_t flags = xmpKeyword.size();
+  if (!text.starts_with(xmpKeyword) || text.size() < flags + 2) return {};
+  // Packed or not, how, then the language and the keyword in it.
+  const std::size_t language = text.find('\0', flags + 2);
+  const std::size_t keyword =
+      language == std::string_view::npos ? language : text.find('\0', language + 1);
+  if (keyword == std::string_view::npos) return {};
+  const Bytes packet = data.subspan(keyword + 1);
+  if (data[flags] != 0) return inflated(packet, "XMP");
+  return {packet.begin(), packet.end()};
 }
 
 void addChunk(std::string_view type, Bytes data, bool isColour, Metadata& metadata) {
@@ -86,7 +95,8 @@ void addChunk(std::string_view type, Bytes data, bool isColour, Metadata& metada
     metadata.segments.push_back(segmentOf(app1, marked ? std::string_view{} : exifMark, data));
   } else if (type == "iCCP") {
     if (isColour) addProfile(data, metadata);
-  } else if (const Bytes xmp = type == "iTXt" ? xmpOf(data) : Bytes{}; !xmp.empty()) {
+  } else if (const auto xmp = type == "iTXt" ? xmpOf(data) : std::vector<std::uint8_t>();
+             !xmp.empty()) {
     metadata.segments.push_back(segmentOf(app1, xmpMark, xmp));
   } else if (std::find(keptTypes.begin(), keptTypes.end(), type) != keptTypes.end()) {
     metadata.chunks.push_back({std::string(type), {data.begin(), data.end()}});

@@ -11,10 +11,10 @@
 
 #include "image_processing/core/checked_size.h"
 #include "photo/metadata/kept_metadata.h"
-#include "photo/metadata/segments.h"
 #include "photo/metadata/stated_facts.h"
 #include "photo/photo_error.h"
 #include "photo/png/png_chunks.h"
+#include "photo/png/png_losses.h"
 
 namespace pelorin::photo {
 namespace {
@@ -314,22 +314,6 @@ class PngRowWriter : public RowWriter {
   png_infop info_ = nullptr;
 };
 
-// IPTC, makers' own segments and what stands behind a JPEG file have no place in a PNG file.
-void removeForeign(KeptMetadata& kept) {
-  constexpr std::uint8_t app2 = 0xE2, app3 = 0xE3, app15 = 0xEF;
-  const std::size_t before = kept.segments.size();
-  const bool profileIsWhole = !colourProfileOf(kept.segments).empty();
-  std::erase_if(kept.segments, [&](const MetadataSegment& segment) {
-    if (segment.marker >= app3 && segment.marker <= app15) return true;
-    return segment.marker == app2 && !(profileIsWhole && isColourProfile(segment));
-  });
-  if (kept.segments.size() < before)
-    kept.lost.push_back({"IPTC or a maker's own data", "a PNG file has no place for it"});
-  for (const TailPart& part : kept.tail)
-    kept.lost.push_back({std::string(nameOf(part.kind)), "a PNG file has no place for it"});
-  kept.tail.clear();
-}
-
 constexpr std::string_view extensions[] = {".png"};
 
 }  // namespace
@@ -347,7 +331,7 @@ constinit const Format pngFormat = {
         },
     .reader = [](std::span<const std::uint8_t> file, const OpenOptions& options)
         -> std::unique_ptr<RowReader> { return std::make_unique<PngRowReader>(file, options); },
-    .removeForeign = removeForeign,
+    .removeForeign = removeWhatPngLacks,
     .writer = [](PictureSize size, bool hasAlpha, KeptMetadata kept,
                  const SaveOptions& options) -> std::unique_ptr<RowWriter> {
       return std::make_unique<PngRowWriter>(size, hasAlpha, kept, options);
