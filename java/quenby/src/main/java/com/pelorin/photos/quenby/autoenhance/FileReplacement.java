@@ -43,7 +43,8 @@ final class FileReplacement {
             throw new AccessDeniedException(file.toString());
         }
         Path target = linkTarget(file);
-        Path beside = target.resolveSibling(".quenby-" + UUID.randomUUID() + ".tmp");
+        // The command sweeps temporaries of its own away, whose names are numbers.
+        Path beside = target.resolveSibling(".quenby-java-" + UUID.randomUUID() + ".tmp");
         PosixFileAttributeView old = exists
                 ? Files.getFileAttributeView(target, PosixFileAttributeView.class) : null;
         try {
@@ -60,6 +61,16 @@ final class FileReplacement {
             Files.move(beside, target, StandardCopyOption.ATOMIC_MOVE);
         } finally {
             Files.deleteIfExists(beside);
+        }
+        sync(target.toAbsolutePath().getParent());
+    }
+
+    /** A name that is not on the disk yet means the old file after a power cut, which is whole. */
+    private static void sync(Path folder) {
+        try (FileChannel channel = FileChannel.open(folder, StandardOpenOption.READ)) {
+            channel.force(true);
+        } catch (IOException cannotBeSynced) {
+            // The file is there all the same.
         }
     }
 
