@@ -59,10 +59,12 @@ function(pelorin_place_beside_each_other target)
   if(PELORIN_SELF_CONTAINED)
     # What is linked in is nobody else's: two copies in one process must not mix. The C++ library is
     # not among it, since exceptions cross from one of the libraries into another.
-    target_sources(${target} PRIVATE $<TARGET_OBJECTS:pelorin_older_glibc>)
+    if(NOT ANDROID)
+      target_sources(${target} PRIVATE $<TARGET_OBJECTS:pelorin_older_glibc>)
+    endif()
     target_link_options(
       ${target} PRIVATE -Wl,--gc-sections -Wl,--strip-all
-                        -Wl,--exclude-libs,libhwy.a:libjpeg.a:liblcms2.a)
+                        -Wl,--exclude-libs,libfmt.a:libhwy.a:libjpeg.a:liblcms2.a:libpng16.a:libpugixml.a:libz.a)
   endif()
 endfunction()
 

@@ -7,7 +7,7 @@ target_include_directories(pelorin_jni_headers INTERFACE ${PROJECT_SOURCE_DIR})
 # A device build takes the platform's own header.
 add_library(pelorin_bitmap_header INTERFACE)
 target_link_libraries(pelorin_bitmap_header INTERFACE pelorin_jni_headers)
-if(NOT PELORIN_DEVICE_LIBRARIES)
+if(NOT PELORIN_DEVICE_LIBRARIES AND NOT ANDROID)
   target_include_directories(pelorin_bitmap_header
                              INTERFACE ${PROJECT_SOURCE_DIR}/platform/jnigraphics/include)
 endif()
@@ -47,8 +47,13 @@ platform_library(
   pnjni SOURCES pnjni/environment.cpp pnjni/exceptions.cpp pnjni/java_message.cpp
                 pnjni/local_reference.cpp
   DEPENDS pn)
-platform_library(jnigraphics SOURCES jnigraphics/bitmap.cpp jnigraphics/desktop_bitmap.cpp
-                 DEPENDS pelorin_bitmap_header)
+if(ANDROID) # which has it, everywhere
+  add_library(jnigraphics INTERFACE)
+  target_link_libraries(jnigraphics INTERFACE -ljnigraphics pelorin_bitmap_header)
+else()
+  platform_library(jnigraphics SOURCES jnigraphics/bitmap.cpp jnigraphics/desktop_bitmap.cpp
+                   DEPENDS pelorin_bitmap_header)
+endif()
 
 # Which bytes a Java path stands for, for whoever opens files; no library of a device's.
 pelorin_library(utf8_path SOURCES pn_imgproc/utf8_path.cpp)

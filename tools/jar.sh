@@ -13,7 +13,7 @@ rm -rf "$contents"
 add_natives() { # FOLDER PRESET
   mkdir -p "$contents/native/$1"
   local name
-  for name in libpn libpnjni libpn_imgproc libjnigraphics libpn_quenby; do
+  for name in libpn libpnjni libpn_imgproc libjnigraphics libpn_quenby libquenby_photo; do
     cp "$root/build/$2/lib/$name.so" "$contents/native/$1/"
   done
 }

@@ -9,8 +9,9 @@ here=$root/tests/jar
 scratch=$root/build/jar_test
 natives=${1-$root/build/release/lib}
 photo=/usr/share/matplotlib/mpl-data/sample_data/grace_hopper.jpg
-jar=$root/build/jar/quenby/quenby-0.1.0.jar
-desktop=$root/build/jar/quenby-desktop/quenby-desktop-0.1.0.jar
+version=$(sed -n 's/^project(Quenby VERSION \([0-9.]*\).*/\1/p' "$root/CMakeLists.txt")
+jar=$root/build/jar/quenby/quenby-$version.jar
+desktop=$root/build/jar/quenby-desktop/quenby-desktop-$version.jar
 maven=(mvn --batch-mode --no-transfer-progress --quiet -Dstyle.color=never)
 
 step() { printf '%s\n' "jar: $*"; }
@@ -30,12 +31,14 @@ for machine in linux-amd64 linux-aarch64 linux-arm; do
 done
 declare -A machines=([amd64]=X86-64 [aarch64]=AArch64 [arm]=ARM)
 for machine in "${!machines[@]}"; do
-  readelf -h "$scratch/unpacked/native/linux-$machine/libpn_quenby.so" |
-    grep -q "Machine:.*${machines[$machine]}" || fail "linux-$machine holds another machine's library"
+  for library in "$scratch/unpacked/native/linux-$machine"/*.so; do
+    readelf -h "$library" | grep -q "Machine:.*${machines[$machine]}" ||
+      fail "$library is another machine's"
+  done
 done
 
 step "licences, module names, sources, documentation"
-for licence in highway libjpeg-turbo libjpeg-turbo-ijg lcms2; do
+for licence in fmt highway lcms2 libjpeg-turbo libjpeg-turbo-ijg libpng pugixml zlib; do
   [ -s "$scratch/unpacked/META-INF/licences/$licence.txt" ] || fail "no licence of $licence"
 done
 for file in "$jar" "$desktop"; do
@@ -68,25 +71,30 @@ mkdir -p "$repository"
 cp -rs "$HOME/.m2/repository/." "$repository"
 rm -rf "$repository/com/pelorin"
 "$root/tools/jar.sh" -Dmaven.repo.local="$repository" install
+mkdir "$scratch/sources"
+cp "$root/java/example/src/main/java/SlideAndSave.java" "$here/project/PhotosAndBytes.java" \
+  "$scratch/sources"
 "${maven[@]}" --offline --file "$here/project/pom.xml" -Dmaven.repo.local="$repository" \
-  -Dbuild="$scratch/project" -Dsources="$root/java/example/src/main/java" compile
+  -Dquenby.version="$version" -Dbuild="$scratch/project" -Dsources="$scratch/sources" compile
 
-# slide NAME CLASSPATH [JAVA OPTION...]
-slide() {
-  local name=$1 classpath=$2
+# make NAME CLASSPATH [JAVA OPTION...]: pictures by both programs, in a folder of that name.
+make() {
+  local made=$scratch/made/$1 classpath=$2
   shift 2
-  java -Djava.io.tmpdir="$scratch/tmp" -Djava.awt.headless=true "$@" -cp "$classpath" SlideAndSave \
-    "$photo" "$scratch/$name-enhanced.jpg" "$scratch/$name-look.jpg"
+  mkdir -p "$made"
+  local java=(java -Djava.io.tmpdir="$scratch/tmp" -Djava.awt.headless=true "$@" -cp "$classpath")
+  "${java[@]}" SlideAndSave "$photo" "$made/enhanced.jpg" "$made/look.jpg" &&
+    "${java[@]}" PhotosAndBytes "$photo" "$made"
 }
 same() {
-  cmp "$scratch/$1-enhanced.jpg" "$scratch/$2-enhanced.jpg"
-  cmp "$scratch/$1-look.jpg" "$scratch/$2-look.jpg"
+  [ "$(find "$scratch/made/$1" -size +0 | wc -l)" -eq 7 ] || fail "files are missing of $1"
+  diff -r "$scratch/made/$1" "$scratch/made/$2"
 }
 installed=$repository/com/pelorin/photos
-classpath=$scratch/project/classes:$installed/quenby/0.1.0/quenby-0.1.0.jar
-classpath=$classpath:$installed/quenby-desktop/0.1.0/quenby-desktop-0.1.0.jar
-slide jar "$classpath"
-slide folder "$classpath" -Dquenby.library="$natives"
+classpath=$scratch/project/classes:$installed/quenby/$version/quenby-$version.jar
+classpath=$classpath:$installed/quenby-desktop/$version/quenby-desktop-$version.jar
+make jar "$classpath"
+make folder "$classpath" -Dquenby.library="$natives"
 same jar folder
 
 step "shrunk by ProGuard with the rules inside the jars"
@@ -103,17 +111,23 @@ shrink() { # NAME RULES...
     -injars "$scratch/project/classes" -injars "$jar(!META-INF/MANIFEST.MF)" \
     -injars "$desktop(!META-INF/MANIFEST.MF,!META-INF/maven/**)" \
     -outjars "$scratch/$name.jar" "${platform[@]}" \
-    -keep 'public class SlideAndSave { public static void main(java.lang.String[]); }' \
+    -keep 'public class * { public static void main(java.lang.String[]); }' \
     "$@" >"$scratch/$name.log" 2>&1 || fail "$(cat "$scratch/$name.log")"
 }
 rules=()
 for file in "$scratch"/unpacked/META-INF/proguard/*.pro; do rules+=(-include "$file"); done
 [ ${#rules[@]} -eq 4 ] || fail "each jar brings its rules"
 shrink shrunk "${rules[@]}"
-slide shrunk "$scratch/shrunk.jar"
+make shrunk "$scratch/shrunk.jar"
 same shrunk folder
-shrink without_rules
-if slide without_rules "$scratch/without_rules.jar" >/dev/null 2>&1; then
-  fail "the rules are not needed: this test shows nothing"
-fi
+cat "$scratch"/unpacked/META-INF/proguard/*.pro |
+  grep -v 'PhotoBytes\|PhotoException' >"$scratch/no_photos.pro"
+for name in none no_photos; do
+  rules=()
+  [ $name = none ] || rules=(-include "$scratch/$name.pro")
+  shrink $name "${rules[@]}"
+  if make $name "$scratch/$name.jar" >/dev/null 2>&1; then
+    fail "with $name of the rules it works as well: this test shows nothing"
+  fi
+done
 step "passed"

@@ -1,4 +1,4 @@
-# What the five libraries in a folder ask of a Linux machine: the C library from glibc 2.28 on, the C++
+# What the libraries in a folder ask of a Linux machine: the C library from glibc 2.28 on, the C++
 # library from GCC 11 on with the compiler's runtime that comes with it, and pages of up to 16 KiB.
 #   cmake -DFOLDER=<folder> -DREADELF=<readelf> -P check_self_contained.cmake
 cmake_minimum_required(VERSION 3.25)
@@ -11,9 +11,12 @@ macro(complain)
   math(EXPR failures "${failures} + 1")
 endmacro()
 
+file(GLOB libraries ${FOLDER}/*.so)
+if(NOT libraries)
+  complain("no libraries in ${FOLDER}")
+endif()
 set(found "")
-foreach(name libpn libpnjni libpn_imgproc libjnigraphics libpn_quenby)
-  set(library ${FOLDER}/${name}.so)
+foreach(library IN LISTS libraries)
   execute_process(COMMAND ${READELF} --wide --dynamic --version-info --program-headers ${library}
                   OUTPUT_VARIABLE facts COMMAND_ERROR_IS_FATAL ANY)
 

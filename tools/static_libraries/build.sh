@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Static Highway, libjpeg-turbo and Little CMS for one toolchain, from Debian's sources:
+# Static libraries of what the natives use for one toolchain, from Debian's sources:
 #
 #   tools/static_libraries/build.sh NAME [CMAKE OPTION...]
 #
@@ -13,17 +13,18 @@ name=$1
 shift
 prefix=$root/build/static/$name
 sources=$root/build/static/sources
+packages=(fmtlib highway lcms2 libjpeg-turbo libpng1.6 pugixml zlib)
 
-# The checksums are those of the authors' archives; Debian's patches, which change with its security
-# updates, are covered by Debian's signatures.
+# The checksums are those of the authors' archives as Debian has them; its patches, which change with
+# its security updates, are covered by its signatures.
 archives=$here/archives.sha256
 
 fetch() {
   (cd "$sources" 2>/dev/null && sha256sum --check --quiet "$archives" 2>/dev/null) &&
-    [ "$(find "$sources" -name '*.dsc' | wc -l)" -eq 3 ] && return
+    [ "$(find "$sources" -name '*.dsc' | wc -l)" -eq ${#packages[@]} ] && return
   rm -rf "$sources"
-  mkdir -p "$sources/apt/parts" "$sources/apt/lists/partial"
-  local file name
+  mkdir -p "$sources/apt/parts" "$sources/apt/lists/partial" "$sources/apt/cache"
+  local file name package version
   for file in /etc/apt/sources.list /etc/apt/sources.list.d/*; do
     name=$sources/apt/parts/${file##*/}
     case $file in
@@ -31,19 +32,27 @@ fetch() {
       *.sources) sed 's/^Types:.*/Types: deb-src/' "$file" >"$name" ;;
     esac
   done
-  local apt=(apt-get -qq -o APT::Sandbox::User=root -o Dir::Etc::sourcelist=/dev/null
-    -o Dir::Etc::sourceparts="$sources/apt/parts" -o Dir::State::lists="$sources/apt/lists")
+  local apt=(-qq -o APT::Sandbox::User=root -o Dir::Etc::sourcelist=/dev/null
+    -o Dir::Etc::sourceparts="$sources/apt/parts" -o Dir::State::lists="$sources/apt/lists"
+    -o Dir::Cache="$sources/apt/cache")
   # Other repositories of the machine may have no sources; a missing package is noticed below.
-  "${apt[@]}" update || true
-  (cd "$sources" && "${apt[@]}" source --download-only highway libjpeg-turbo lcms2 &&
-    sha256sum --check --quiet "$archives")
+  apt-get "${apt[@]}" update || true
+  for package in "${packages[@]}"; do
+    # A mirror may list a version before it has it.
+    for version in $(apt-cache "${apt[@]}" showsrc --only-source "$package" |
+      sed -n 's/^Version: //p' | sort -rV); do
+      (cd "$sources" && apt-get "${apt[@]}" source --download-only "$package=$version") && break
+      echo "warning: no sources of $package $version; an older version is taken, if there is one"
+    done
+  done
+  (cd "$sources" && sha256sum --check --quiet "$archives")
   rm -rf "${sources:?}/apt"
 }
 
-# library FOLDER [CMAKE OPTION...]: configures, builds and installs.
+# library NAME FOLDER [CMAKE OPTION...]: configures, builds and installs.
 library() {
-  local folder=$1 build=$prefix/build/${1##*/}
-  shift
+  local folder=$2 build=$prefix/build/$1
+  shift 2
   mkdir -p "$build"
   cd "$build" # checks of libjpeg-turbo's leave files where they run
   cmake -S "$folder" -B "$build" -G Ninja -DCMAKE_BUILD_TYPE=Release \
@@ -51,6 +60,16 @@ library() {
     -DCMAKE_POSITION_INDEPENDENT_CODE=ON -DCMAKE_PREFIX_PATH="$prefix" "${options[@]}" "$@"
   cmake --build "$build"
   cmake --install "$build"
+}
+
+# c_sources PACKAGE LIBRARY FOLDER HEADER...: the same for a folder of sources.
+c_sources() {
+  local package=$1 library=$2 source=$prefix/source/$1/$3
+  shift 3
+  local headers=("${@/#/$prefix/source/$package/}")
+  library "$package" "$here/c_sources" -DPACKAGE="$package" -DLIBRARY="$library" -DSOURCES="$source" \
+    -DHEADERS="$(IFS=';' && echo "${headers[*]}")" \
+    -DVERSION="$(sed -n 's/^Version: //p' "$sources/$package"_*.dsc)"
 }
 
 # What nobody calls is left out of whatever links them.
@@ -70,16 +89,27 @@ stamp=$(made_from | sha256sum)
 
 rm -rf "$prefix"
 mkdir -p "$prefix/source" "$prefix/share/licences"
-for package in highway libjpeg-turbo lcms2; do
+for package in "${packages[@]}"; do
   dpkg-source --no-check -x "$sources/$package"_*.dsc "$prefix/source/$package"
 done
-library "$prefix/source/highway" -DBUILD_SHARED_LIBS=OFF -DHWY_ENABLE_CONTRIB=OFF \
-  -DHWY_ENABLE_EXAMPLES=OFF -DHWY_ENABLE_TESTS=OFF -DBUILD_TESTING=OFF
-library "$prefix/source/libjpeg-turbo" -DENABLE_SHARED=OFF -DWITH_TURBOJPEG=OFF
-library "$here/lcms2" -DLCMS2_SOURCE="$prefix/source/lcms2"
+library fmtlib "$prefix/source/fmtlib" -DFMT_TEST=OFF -DFMT_DOC=OFF
+# Highway's library chooses among instruction sets; other machines than this take its headers and one.
+[[ $* == *-DCMAKE_TOOLCHAIN_FILE=* ]] ||
+  library highway "$prefix/source/highway" -DBUILD_SHARED_LIBS=OFF -DHWY_ENABLE_CONTRIB=OFF \
+    -DHWY_ENABLE_EXAMPLES=OFF -DHWY_ENABLE_TESTS=OFF -DBUILD_TESTING=OFF
+library libjpeg-turbo "$prefix/source/libjpeg-turbo" -DENABLE_SHARED=OFF -DWITH_TURBOJPEG=OFF
+c_sources lcms2 lcms2 src include/lcms2.h include/lcms2_plugin.h
+c_sources zlib z . zlib.h zconf.h
+library libpng1.6 "$prefix/source/libpng1.6" -DPNG_SHARED=OFF -DPNG_TESTS=OFF -DPNG_EXECUTABLES=OFF \
+  -DZLIB_LIBRARY="$prefix/lib/libz.a" -DZLIB_INCLUDE_DIR="$prefix/include"
+library pugixml "$prefix/source/pugixml" -DBUILD_SHARED_LIBS=OFF -DBUILD_TESTING=OFF
+cp "$prefix/source/fmtlib/LICENSE.rst" "$prefix/share/licences/fmt.txt"
 cp "$prefix/source/highway/LICENSE" "$prefix/share/licences/highway.txt"
 cp "$prefix/source/libjpeg-turbo/LICENSE.md" "$prefix/share/licences/libjpeg-turbo.txt"
 cp "$prefix/source/libjpeg-turbo/README.ijg" "$prefix/share/licences/libjpeg-turbo-ijg.txt"
 cp "$prefix/source/lcms2/COPYING" "$prefix/share/licences/lcms2.txt"
+cp "$prefix/source/libpng1.6/LICENSE" "$prefix/share/licences/libpng.txt"
+cp "$prefix/source/pugixml/LICENSE.md" "$prefix/share/licences/pugixml.txt"
+cp "$prefix/source/zlib/LICENSE" "$prefix/share/licences/zlib.txt"
 rm -rf "$prefix/source" "$prefix/build" "$prefix/bin" "$prefix/share/man" "$prefix/share/doc"
 echo "$stamp" >"$prefix/stamp"

@@ -18,11 +18,18 @@ import java.util.Arrays;
 import java.util.List;
 import java.util.stream.Collectors;
 import java.util.stream.Stream;
+import org.junit.jupiter.api.BeforeEach;
 import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.io.TempDir;
 
 class LoadingTest {
     @TempDir Path folder;
+
+    /** By the name under which the system tells of what it loaded. */
+    @BeforeEach
+    void nameTheFolderPlainly() throws Exception {
+        folder = folder.toRealPath();
+    }
 
     /** Loads and says where from. */
     static final class Load {
@@ -134,7 +141,8 @@ class LoadingTest {
     void aFolderThatMayHoldNoProgramsGivesWayToTheHomeFolder(@TempDir Path home)
             throws Exception {
         ChildJvm child = loadWithoutPrograms(home.toString());
-        assertTrue(child.output.contains("works from " + home + "/.cache/quenby-"), child.output);
+        assertTrue(child.output.contains("works from " + home.toRealPath() + "/.cache/quenby-"),
+                child.output);
     }
 
     @Test
