@@ -17,7 +17,10 @@ const char* quenby_niqe_model(void) {
 
 int32_t quenby_cancel_new(quenby_cancel** cancel, quenby_error* error) {
   if (cancel != nullptr) *cancel = nullptr;
-  return guarded(error, [&] { required(cancel, "cancel") = new quenby_cancel; });
+  return guarded(error, [&] {
+    required(cancel, "cancel");
+    *cancel = new quenby_cancel;
+  });
 }
 
 void quenby_cancel_request(quenby_cancel* cancel) {

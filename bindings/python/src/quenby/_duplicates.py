@@ -1,0 +1,158 @@
+"""Near-duplicates: the same scene, a moment apart."""
+
+from __future__ import annotations
+
+import os
+from collections.abc import Iterable
+from concurrent.futures import ThreadPoolExecutor
+from ctypes import byref, c_double, c_float, c_uint64
+from dataclasses import dataclass
+from typing import Any, Optional
+
+import numpy as np
+import numpy.typing as npt
+
+from ._library import Cancel, Cancelled, CPairs, CShot, call, plain, pointer_of
+from ._photos import Photo, open_options, opened
+from ._pixels import AnyPhoto, Path, file_bytes, floats, pixels_of, rgba_of
+
+Cdf = npt.NDArray[np.float32]
+
+
+def _shot_of(file: bytes, cancel: Optional[Cancel] = None) -> CShot:
+    shot, options = CShot(), open_options()
+    call("read_shot", file, len(file), byref(options), pointer_of(cancel), byref(shot))
+    return shot
+
+
+def green_cdf(photo: AnyPhoto) -> Cdf:
+    """The share of pixels whose green byte is at most i: 256 floats up to 1. Files are decoded at the size
+    that find_duplicates reads."""
+    file = file_bytes(photo)
+    if file is not None:
+        return np.array(_shot_of(file).green_cdf, np.float32)
+    pixels = opened(photo)
+    rgba = pixels.rgba if isinstance(pixels, Photo) else rgba_of(pixels)
+    given, cdf = pixels_of(rgba), np.empty(256, np.float32)
+    call("green_cdf", byref(given), floats(cdf))
+    return cdf
+
+
+def _cdf_of(photo_or_cdf: Any) -> Cdf:
+    if isinstance(photo_or_cdf, np.ndarray) and photo_or_cdf.ndim == 1:
+        if photo_or_cdf.shape != (256,):
+            raise ValueError("a green CDF has 256 values")
+        return np.ascontiguousarray(photo_or_cdf, np.float32)
+    return green_cdf(photo_or_cdf)
+
+
+def distance(a: Any, b: Any) -> float:
+    """How far apart the light of two photos is, once a difference in exposure is taken out: 0 to 1; of a
+    photo to itself about 0.001.
+
+    a, b:  photos, or what green_cdf() gave of them.
+    """
+    result = c_float()
+    one, other = _cdf_of(a), _cdf_of(b)
+    call("distance", floats(one), floats(other), byref(result))
+    return result.value
+
+
+def dupe_score(distance: float, seconds: float, same_orientation: bool = True) -> float:
+    """The duplicate score of two photos so far apart: larger is more likely, 0 the even chance, the same
+    photo twice about 3.65. seconds lie between the two, of either sign."""
+    result = c_float()
+    call("dupe_score", distance, seconds, int(same_orientation), byref(result))
+    return result.value
+
+
+def dupe_window(threshold: float = 0.0, same_orientation: bool = True) -> float:
+    """The longest time between two photos, in seconds, that may reach a score: negative when none does,
+    infinite when any does."""
+    result = c_double()
+    call("dupe_window", threshold, int(same_orientation), byref(result))
+    return result.value
+
+
+@dataclass(frozen=True)
+class Pair:
+    """Two photos that reach the threshold."""
+
+    first: str
+    second: str
+    score: float
+    distance: float
+    seconds: Optional[float]  #: Between them; None where not both times are known.
+    same_orientation: bool
+
+
+@dataclass(frozen=True)
+class Group:
+    """Photos that pairs tie together, directly or through others."""
+
+    paths: tuple[str, ...]
+    pairs: tuple[Pair, ...]
+
+
+@dataclass(frozen=True)
+class Duplicates:
+    """What find_duplicates found."""
+
+    groups: tuple[Group, ...]
+    failed: dict[str, Exception]  #: Photos that could not be read, and why.
+
+
+def find_duplicates(
+    paths: Iterable[Path],
+    threshold: float = 0.0,
+    *,
+    workers: Optional[int] = None,
+    cancel: Optional[Cancel] = None,
+) -> Duplicates:
+    """The near-duplicates among files, as `quenby dupes` finds them: shots of one scene a moment apart.
+    Photos without a capture time are compared with all others, the time between taken as 0.
+
+    threshold:  the smallest score of a pair.
+    workers:    how many files are read at once; as many as there are processors unless given.
+    """
+    names = list(dict.fromkeys(os.fspath(path) for path in paths))
+    failed: dict[str, Exception] = {}
+
+    def shot(name: str) -> Optional[CShot]:
+        try:
+            with open(name, "rb") as file:
+                return _shot_of(file.read(), cancel)
+        except Cancelled:
+            raise
+        except (ValueError, OSError, MemoryError) as error:
+            failed[name] = error
+            return None
+
+    with ThreadPoolExecutor(workers or os.cpu_count() or 1) as pool:
+        shots = dict(zip(names, pool.map(shot, names)))
+    found = {name: shot for name, shot in shots.items() if shot is not None}
+    names = list(found)
+    given, pairs = (CShot * len(names))(*found.values()), CPairs()
+    first_of = (c_uint64 * len(names))()
+    call("find_pairs", given, len(names), threshold, pointer_of(cancel), byref(pairs))
+    try:
+        call("group_pairs", pairs.data, pairs.count, len(names), first_of)
+        tied: dict[int, list[Pair]] = {}
+        for pair in pairs.data[: pairs.count]:
+            tied.setdefault(first_of[pair.first], []).append(
+                Pair(
+                    names[pair.first],
+                    names[pair.second],
+                    pair.score,
+                    pair.distance,
+                    pair.seconds if pair.times_known else None,
+                    bool(pair.same_orientation),
+                )
+            )
+    finally:
+        plain("pairs_free", byref(pairs))
+    groups = []
+    for first in sorted(tied):
+        members = tuple(name for name, of in zip(names, first_of) if of == first)
+        groups.append(Group(members, tuple(tied[first])))
+    return Duplicates(tuple(groups), failed)
