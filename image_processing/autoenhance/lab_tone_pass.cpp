@@ -18,11 +18,13 @@ void imageVibranceLabAndToneCurve(const Image<RGBA8Pixel>& source, Image<RGBA8Pi
                                   const FilterConfig& config, const std::vector<float>& curve,
                                   float scale, const ImageMasks<TB, TL>& masks) {
   const TonePass pass(curve, scale, config.vibrance, config.ltmBlend, config.detailGain);
-  const bool useMasks = config.detailGainHigh != 0.0f && masks.present();
+  const std::size_t count = std::min(source.pixelCount(), output.pixelCount());
+  const bool useMasks = config.detailGainHigh != 0.0f && masks.present() &&
+                        masks.bilateralMask->pixelCount() >= count &&
+                        masks.ltmMask->pixelCount() >= count;
   const TB* const bilateral = useMasks ? masks.bilateralMask->data.get() : nullptr;
   const TL* const ltm = useMasks ? masks.ltmMask->data.get() : nullptr;
-  enhanceRow(pass, source.data.get(), bilateral, ltm, output.data.get(),
-             std::min(source.pixelCount(), output.pixelCount()));
+  enhanceRow(pass, source.data.get(), bilateral, ltm, output.data.get(), count);
 }
 
 template <typename TB, typename TL>

@@ -23,8 +23,8 @@ void apply(const Image<RGBA8Pixel>& source, const ImageStatistics& statistics,
 ///                off.
 /// @param curve   at least 2 samples over [0, 1], in [0, 1].
 /// @param scale   L of white, 100.
-/// @param masks   of the size of `source`, computed or filled by hand; those that were only
-///                allocated, or are not there at all, are off.
+/// @param masks   of the size of `source`, computed or filled by hand; those that are smaller, were
+///                only allocated, or are not there at all, are off.
 ///
 /// Keeps no state; calls with different outputs may run at once. For (float, float) and
 /// (QuantizedFloat<unsigned char>, the same).

@@ -2,6 +2,7 @@
 
 #include <limits>
 
+#include "image_processing/core/require.h"
 #include "image_processing/quality/ggd.h"
 #include "image_processing/quality/write_features.h"
 
@@ -34,10 +35,19 @@ void buildBlock(const Image<float>& structure, std::uint32_t x0, std::uint32_t y
   }
 }
 
+void requireRoomForFeatures(const Image<float>& features, std::uint32_t featuresPerScale,
+                            std::uint32_t blockColumns, std::uint32_t blockRows,
+                            std::uint32_t scale) {
+  require(holds(features, std::uint64_t{blockColumns} * blockRows,
+                std::uint64_t{featuresPerScale} * scale + niqeFeaturesPerScale),
+          "block features: the feature image is too small");
+}
+
 void computeBlockFeaturesScalar(const Image<float>& structure, std::uint32_t featuresPerScale,
                                 std::uint32_t blockSize, std::uint32_t blockColumns,
                                 std::uint32_t blockRows, std::uint32_t scale,
                                 Image<float>& features) {
+  requireRoomForFeatures(features, featuresPerScale, blockColumns, blockRows, scale);
   const std::uint32_t side = blockSize / (scale + 1);
   Image<float> block(side, side);
   for (std::uint32_t row = 0; row < blockRows; ++row) {

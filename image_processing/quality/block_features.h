@@ -42,11 +42,17 @@ PELORIN_EXPORT void buildBlock(const Image<float>& structure, std::uint32_t x0, 
 /// @param features          `blockColumns` * `blockRows` wide, 18 rows from the first one on.
 /// A feature that cannot be had is NaN, as are all of a block that reaches past the structure.
 /// Squares below 1.2e-38, which coefficients of pictures never have, may count as 0 on 32-bit ARM.
-/// @throws std::bad_alloc. Pure.
+/// @throws std::bad_alloc; std::invalid_argument when the feature image is smaller. Pure.
 PELORIN_EXPORT void computeBlockFeatures(const Image<float>& structure,
                                          std::uint32_t featuresPerScale, std::uint32_t blockSize,
                                          std::uint32_t blockColumns, std::uint32_t blockRows,
                                          std::uint32_t scale, Image<float>& features);
+
+/// Refuses a feature image that has no room for these rows and columns. @throws
+/// std::invalid_argument.
+void requireRoomForFeatures(const Image<float>& features, std::uint32_t featuresPerScale,
+                            std::uint32_t blockColumns, std::uint32_t blockRows,
+                            std::uint32_t scale);
 
 /// The definition of `computeBlockFeatures`.
 void computeBlockFeaturesScalar(const Image<float>& structure, std::uint32_t featuresPerScale,

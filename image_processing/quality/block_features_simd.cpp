@@ -162,6 +162,7 @@ HWY_EXPORT(computeBlockFeatures);
 void computeBlockFeatures(const Image<float>& structure, std::uint32_t featuresPerScale,
                           std::uint32_t blockSize, std::uint32_t blockColumns,
                           std::uint32_t blockRows, std::uint32_t scale, Image<float>& features) {
+  requireRoomForFeatures(features, featuresPerScale, blockColumns, blockRows, scale);
   HWY_DYNAMIC_DISPATCH(computeBlockFeatures)
   (structure, featuresPerScale, blockSize, blockColumns, blockRows, scale, features);
 }

@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <cmath>
 
+#include "image_processing/core/require.h"
+
 namespace pelorin::image_processing {
 namespace {
 
@@ -14,6 +16,8 @@ std::uint32_t clampedIndex(std::int64_t index, std::uint32_t size) {
 
 void computeImageStructure(const Image<float>& grey, std::uint32_t width, std::uint32_t height,
                            Image<float>& structure) {
+  require(holds(grey, width, height) && holds(structure, width, height),
+          "image structure: an image is smaller than asked for");
   Image<float> columnMeans(width, height), columnSquares(width, height);
   for (std::uint32_t y = 0; y < height; ++y) {
     for (std::uint32_t x = 0; x < width; ++x) {

@@ -22,7 +22,8 @@ constexpr std::array<float, 7> niqeWindow = {0.012560201f, 0.07882796f, 0.237296
 ///                   between that are denormal may count as 0 on 32-bit ARM.
 /// @param structure  its top left `width` x `height` pixels are written; not `grey`. The images may
 ///                   differ in size, both at least `width` x `height`.
-/// @throws std::bad_alloc for the rows it needs in between.
+/// @throws std::bad_alloc for the rows it needs in between; std::invalid_argument when an image is
+///         smaller.
 /// Keeps no state; distinct structures may be computed at once.
 PELORIN_EXPORT void computeImageStructure_fast(const Image<float>& grey, std::uint32_t width,
                                                std::uint32_t height, Image<float>& structure);

@@ -1,5 +1,6 @@
 #include <algorithm>
 
+#include "image_processing/core/require.h"
 #include "image_processing/quality/aligned_floats.h"
 #include "image_processing/quality/image_structure.h"
 
@@ -93,6 +94,8 @@ namespace pelorin::image_processing {
 HWY_EXPORT(computeImageStructure_fast);
 void computeImageStructure_fast(const Image<float>& grey, std::uint32_t width, std::uint32_t height,
                                 Image<float>& structure) {
+  require(holds(grey, width, height) && holds(structure, width, height),
+          "image structure: an image is smaller than asked for");
   HWY_DYNAMIC_DISPATCH(computeImageStructure_fast)(grey, width, height, structure);
 }
 }  // namespace pelorin::image_processing

@@ -8,6 +8,7 @@
 #include <chrono>
 #include <cstring>
 #include <future>
+#include <memory>
 #include <mutex>
 #include <stdexcept>
 #include <thread>
@@ -119,6 +120,23 @@ TEST_F(FilteredImageTest, LetsPassThroughCopyWhatFitsAnOutputOfAnotherSize) {
   EXPECT_TRUE(session.applyFilterWithParams("PassThrough", "", {}, larger));
   EXPECT_EQ(std::memcmp(larger.data.get(), image->data.get(), image->byteSize()), 0);
   EXPECT_EQ(larger.data.get()[48], (RGBA8Pixel{1, 2, 3, 4}));
+}
+
+TEST_F(FilteredImageTest, LetsPassThroughCopyIntoAnOverlappingOutput) {
+  const std::vector<RGBA8Pixel> pixels = test_support::randomPixels(60, 3);
+  const std::shared_ptr<RGBA8Pixel> memory(new RGBA8Pixel[60], std::default_delete<RGBA8Pixel[]>());
+  for (const int shift : {-5, 5}) {
+    std::copy(pixels.begin(), pixels.end(), memory.get());
+    const auto at = [&](int first) {
+      return std::shared_ptr<RGBA8Pixel>(memory, memory.get() + first);
+    };
+    auto source = std::make_shared<Image<RGBA8Pixel>>(8, 6, at(6));
+    Image<RGBA8Pixel> output(8, 6, at(6 + shift));
+    FilteredImage session(source, {}, "", defaultFilterConfigValue,
+                          DefaultFilterFactory::filterFactory());
+    EXPECT_TRUE(session.applyFilterWithParams("PassThrough", "", {}, output));
+    EXPECT_EQ(std::memcmp(output.data.get(), pixels.data() + 6, output.byteSize()), 0);
+  }
 }
 
 TEST_F(FilteredImageTest, TriesAgainAfterAnInitThatThrew) {

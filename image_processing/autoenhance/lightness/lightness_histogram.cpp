@@ -6,6 +6,7 @@
 #include "image_processing/autoenhance/colour/companding_steps.h"
 #include "image_processing/core/float_counter.h"
 #include "image_processing/core/float_to_integer.h"
+#include "image_processing/core/require.h"
 
 namespace pelorin::image_processing {
 namespace {
@@ -16,8 +17,9 @@ std::uint64_t sum(const std::vector<std::uint64_t>& counts) {
 
 }  // namespace
 
-LightnessHistogram::LightnessHistogram(int bins, float scale)
-    : binOfStep_(compandingStepCount), counts_(bins) {
+LightnessHistogram::LightnessHistogram(int bins, float scale) : binOfStep_(compandingStepCount) {
+  require(bins > 0, "statistics: there must be at least one bin");
+  counts_.resize(static_cast<std::size_t>(bins));
   const float lastBin = static_cast<float>(bins - 1);
   for (std::size_t step = 0; step < compandingStepCount; ++step) {
     const float bin = lastBin * lightnessOfSteps()[step] / scale;

@@ -18,7 +18,7 @@ inline constexpr float lightnessScale = labWhite;
 /// Counts pixels by lightness, in bins over L in [0, scale].
 class LightnessHistogram {
  public:
-  /// `bins` at least 1. @throws std::bad_alloc.
+  /// @throws std::bad_alloc; std::invalid_argument for less than one bin.
   LightnessHistogram(int bins, float scale);
 
   /// Counts `count` pixels, of which `steps` are the companding steps, `times` each. Never throws.

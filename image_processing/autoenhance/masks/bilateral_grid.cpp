@@ -6,6 +6,7 @@
 #include "image_processing/autoenhance/masks/grid_blur.h"
 #include "image_processing/autoenhance/masks/grid_slice.h"
 #include "image_processing/autoenhance/masks/grid_splat.h"
+#include "image_processing/core/require.h"
 
 namespace pelorin::image_processing {
 namespace {
@@ -18,6 +19,12 @@ bool isOrdinary(const Grid& grid) {
       return node.value >= 0.0f && node.value <= 0x1p100f;  // false for NaN
     });
   });
+}
+
+template <typename T>
+void requireRoom(const Image<float>& lightness, const Image<T>& smoothed) {
+  require(smoothed.width == lightness.width && smoothed.height >= lightness.height,
+          "grid filter: the output is not of the picture's size");
 }
 
 }  // namespace
@@ -34,6 +41,7 @@ Grid makeGrid(std::uint32_t width, std::uint32_t height, float cellSize) {
 template <typename T>
 void bilateralFilterGridApproximation(Image<float> lightness, float sigmaRange, float spatial,
                                       Image<T> smoothed) {
+  requireRoom(lightness, smoothed);
   if (lightness.pixelCount() == 0) return;
   const float cellSize = gridCellSize(spatial);
   Grid grid = makeGrid(lightness.width, lightness.height, cellSize);
@@ -48,6 +56,7 @@ void bilateralFilterGridApproximation(Image<float> lightness, float sigmaRange, 
 template <typename T>
 void bilateralFilterGridApproximationScalar(const Image<float>& lightness, float sigmaRange,
                                             float spatial, Image<T>& smoothed) {
+  requireRoom(lightness, smoothed);
   if (lightness.pixelCount() == 0) return;
   const float cellSize = gridCellSize(spatial);
   Grid grid = makeGrid(lightness.width, lightness.height, cellSize);

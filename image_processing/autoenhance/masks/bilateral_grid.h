@@ -15,7 +15,8 @@ namespace pelorin::image_processing {
 ///                    that, the cell is one pixel or the grid one node along the side.
 /// @param smoothed    written; of the size of `lightness`, its own buffer. Images are shared, so
 ///                    writing into the copy fills the caller's.
-/// @throws std::bad_alloc when the grid of columns x rows x 32 nodes does not fit.
+/// @throws std::bad_alloc when the grid of columns x rows x 32 nodes does not fit,
+///         std::invalid_argument when `smoothed` has another width or fewer rows.
 ///
 /// Keeps no state; calls with different outputs may run at once. After Chen, Paris and Durand,
 /// "Real-time Edge-Aware Image Processing with the Bilateral Grid" (2007), with a piecewise cubic
