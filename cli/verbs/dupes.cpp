@@ -38,16 +38,21 @@ struct DupesOptions {
   std::string keep;
   std::string html;
   bool assumeFileTime = false;
+  bool unknownTimes = false;
   bool overwrite = false;
   int jobs = 1;
 };
 
 constexpr const char* verbName = "dupes";
 
+// Time tells more than light: pictures that merely have as many dark and bright parts reach 0 when
+// nothing is known of the time between. Copies and exposures of one scene are above 3.
+constexpr float leastUntimedScore = 3.0f;
+
 // A few hundred pieces: enough to share among cores and to show how far the search is.
 bool searchPairs(const std::vector<photo::Shot>& shots, float threshold,
                  const DupesOptions& options, std::vector<photo::ShotPair>& pairs) {
-  const photo::PairSearch search(shots, threshold);
+  const photo::PairSearch search(shots, threshold, options.unknownTimes);
   const std::size_t pieces = std::min<std::size_t>(search.stepCount(), 400);
   Talk talk(verbName, options.report.quiet, pieces);
   std::vector<std::vector<photo::ShotPair>> found(pieces);
@@ -116,11 +121,13 @@ bool scorePhotos(const DupesOptions& options, photo::PhotoCache* cache, std::str
 bool writeHtml(const DupesOptions& options, DupeReport& report) {
   std::vector<std::size_t> shown;
   std::vector<Input> inputs;
-  for (const photo::DupeGroup& group : report.groups) {
-    for (const std::size_t photo : group.photos) {
-      if (report.photos[photo].path == "-") continue;  // cannot be read twice
-      shown.push_back(photo);
-      inputs.push_back({report.photos[photo].path, {}});
+  for (const auto* groups : {&report.groups, &report.lookAlikes}) {
+    for (const photo::DupeGroup& group : *groups) {
+      for (const std::size_t photo : group.photos) {
+        if (report.photos[photo].path == "-") continue;  // cannot be read twice
+        shown.push_back(photo);
+        inputs.push_back({report.photos[photo].path, {}});
+      }
     }
   }
   using Thumbnail = std::vector<std::uint8_t>;
@@ -150,9 +157,13 @@ void printReport(const DupesOptions& options, const DupeReport& report) {
     Json document = {{"threshold", nineDigits(report.threshold)},
                      {"photos", report.photos.size()},
                      {"groups", Json::array()},
+                     {"lookAlikes", Json::array()},
                      {"failed", Json::array()}};
     for (const photo::DupeGroup& group : report.groups) {
       document["groups"].push_back(groupAsJson(report, group));
+    }
+    for (const photo::DupeGroup& group : report.lookAlikes) {
+      document["lookAlikes"].push_back(groupAsJson(report, group));
     }
     for (const photo::FailedPhoto& failed : report.failed) {
       document["failed"].push_back(failureAsJson(failed));
@@ -161,10 +172,14 @@ void printReport(const DupesOptions& options, const DupeReport& report) {
   } else if (options.report.jsonLines) {
     JsonOutput json(options.report, /*singleFile=*/false);
     for (const photo::DupeGroup& group : report.groups) json.add(groupAsJson(report, group));
+    for (const photo::DupeGroup& group : report.lookAlikes) json.add(groupAsJson(report, group));
     for (const photo::FailedPhoto& failed : report.failed) json.add(failureAsJson(failed));
   } else if (options.html != "-") {
     std::size_t number = 0;
     for (const photo::DupeGroup& group : report.groups) {
+      fmt::print("{}", groupAsText(report, group, ++number));
+    }
+    for (const photo::DupeGroup& group : report.lookAlikes) {
       fmt::print("{}", groupAsText(report, group, ++number));
     }
   }
@@ -198,16 +213,30 @@ void checkOutputs(const DupesOptions& options, const std::vector<Input>& inputs)
   sweepFolders({html});
 }
 
-// Time tells more than light: without it, photos that are only a little alike reach threshold 0.
-void noteUntimed(const DupeReport& report, Talk& talk) {
+void noteUntimed(const DupesOptions& options, const DupeReport& report, Talk& talk) {
+  if (options.unknownTimes) return;
   const auto untimed = std::count_if(
       report.photos.begin(), report.photos.end(),
       [](const photo::ScannedPhoto& photo) { return photo.timeSource == photo::TimeSource::none; });
   if (untimed == 0) return;
   talk.note(
-      fmt::format("{} of {} photos tell no time and were compared as if taken with every "
-                  "other; if that joins too much, try --assume-mtime or --threshold 2",
+      fmt::format("{} of {} photos tell no time and were left out; --assume-mtime takes that of "
+                  "their files, --unknown-times looks for those that look alike",
                   untimed, report.photos.size()));
+}
+
+// Where a time is not known, looks are all there is: a class of its own, never ranked.
+void groupAlike(const std::vector<photo::ShotPair>& pairs, DupeReport& report) {
+  std::vector<photo::ShotPair> timed, untimed;
+  for (const photo::ShotPair& pair : pairs) {
+    if (pair.timesKnown) {
+      timed.push_back(pair);
+    } else if (pair.score >= leastUntimedScore) {
+      untimed.push_back(pair);
+    }
+  }
+  report.groups = photo::groupWholly(report.photos.size(), timed);
+  report.lookAlikes = photo::groupWholly(report.photos.size(), untimed);
 }
 
 ExitCode runDupes(const DupesOptions& options) {
@@ -233,9 +262,9 @@ ExitCode runDupes(const DupesOptions& options) {
   std::vector<photo::ShotPair> pairs;
   if (!searchPairs(scan.library.shots, threshold, options, pairs)) return ExitCode::interrupted;
 
-  DupeReport report = {
-      threshold, std::move(scan.library.photos), {}, std::move(scan.failed), !options.keep.empty()};
-  report.groups = photo::groupPairs(report.photos.size(), pairs);
+  DupeReport report = {threshold, std::move(scan.library.photos), {},
+                       {},        std::move(scan.failed),         !options.keep.empty()};
+  groupAlike(pairs, report);
   if (report.rank && !scorePhotos(options, cache.get(), scan.cacheTrouble, report)) {
     return ExitCode::interrupted;
   }
@@ -243,7 +272,7 @@ ExitCode runDupes(const DupesOptions& options) {
   printReport(options, report);
 
   Talk talk(verbName, options.report.quiet, 0);
-  noteUntimed(report, talk);
+  noteUntimed(options, report, talk);
   talk.note(summaryOf(report));
   if (!scan.cacheTrouble.empty()) {
     fmt::print(stderr, "quenby {}: {}\n", verbName, shownText(scan.cacheTrouble));
@@ -273,8 +302,10 @@ void addDupes(CommandLine& commandLine) {
               "1/8 from 4 megapixels on and less for smaller photos")
       .oneOf({"auto", "1", "2", "4", "8"});
   verb.flag("--assume-mtime", options->assumeFileTime,
-            "Photos without a capture time take that of their file; otherwise they are "
-            "compared with every photo, the time apart taken as 0");
+            "Photos without a capture time take that of their file; otherwise they are left out");
+  verb.flag("--unknown-times", options->unknownTimes,
+            "Also tell which photos look alike where a time is not known: apart from the groups, "
+            "with scores from 3 on, and never ranked by --keep");
   verb.option("--cache", options->cache,
               "Keep what was read in this file, so that the next run reads only new and "
               "changed photos")

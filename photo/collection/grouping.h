@@ -16,4 +16,8 @@ struct DupeGroup {
 /// The groups that `pairs` make of `photoCount` photos, by their first photo.
 std::vector<DupeGroup> groupPairs(std::size_t photoCount, const std::vector<ShotPair>& pairs);
 
+/// Groups in which every two photos are a pair: each photo stays in one, the pairs with the highest
+/// scores come together first, and a pair whose groups cannot be joined whole is in none.
+std::vector<DupeGroup> groupWholly(std::size_t photoCount, const std::vector<ShotPair>& pairs);
+
 }  // namespace pelorin::photo

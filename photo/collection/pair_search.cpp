@@ -19,7 +19,7 @@ ShotPair compareShots(const Shot& a, const Shot& b) {
   return pair;
 }
 
-PairSearch::PairSearch(std::span<const Shot> shots, float threshold)
+PairSearch::PairSearch(std::span<const Shot> shots, float threshold, bool compareUntimed)
     : shots_(shots), threshold_(threshold) {
   for (const bool same : {false, true}) {
     longestBetween_[same] = image_processing::longestDupeTimeDifference(threshold, same);
@@ -27,7 +27,7 @@ PairSearch::PairSearch(std::span<const Shot> shots, float threshold)
   longest_ = std::max(longestBetween_[false], longestBetween_[true]);
   for (std::size_t i = 0; i < shots.size(); ++i) {
     const std::optional<ShotTime>& time = shots[i].time;
-    if (!time) untimed_.push_back(i);
+    if (!time && compareUntimed) untimed_.push_back(i);
     if (time) byWallClock_.push_back({time->wallClock, i});
     if (time && time->utc) byUTC_.push_back({*time->utc, i});
   }

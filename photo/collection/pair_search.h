@@ -25,15 +25,16 @@ ShotPair compareShots(const Shot& a, const Shot& b);
 
 /// Finds all pairs that reach a threshold without comparing all: the score bounds the time between
 /// near-duplicates, so that it is enough to look around each shot in the order of their times.
-/// Shots without a time are compared with every other, the time between taken as 0.
+/// Shots without a time are left out or compared with every other, the time between taken as 0.
 ///
 /// The work comes in independent steps, which any threads may share in any order: n log n in all
 /// where shots without a time are few and no more than so many are taken at once.
 class PairSearch {
  public:
-  /// @param shots      kept by reference.
-  /// @param threshold  smallest score of a pair; not NaN.
-  PairSearch(std::span<const Shot> shots, float threshold);
+  /// @param shots           kept by reference.
+  /// @param threshold       smallest score of a pair; not NaN.
+  /// @param compareUntimed  whether shots without a time take part.
+  PairSearch(std::span<const Shot> shots, float threshold, bool compareUntimed = true);
 
   std::size_t stepCount() const { return untimed_.size() + byUTC_.size() + byWallClock_.size(); }
 

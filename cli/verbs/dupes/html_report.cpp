@@ -97,15 +97,20 @@ std::string htmlReport(const DupeReport& report,
                        const std::vector<std::vector<std::uint8_t>>& thumbnails) {
   std::string html(head);
   html += fmt::format("<p>{}, threshold {}.</p>\n", summaryOf(report), report.threshold);
-  for (std::size_t g = 0; g < report.groups.size(); ++g) {
-    const photo::DupeGroup& group = report.groups[g];
+  const std::size_t all = report.groups.size() + report.lookAlikes.size();
+  for (std::size_t g = 0; g < all; ++g) {
+    const bool looksAlone = g >= report.groups.size();
+    const photo::DupeGroup& group =
+        looksAlone ? report.lookAlikes[g - report.groups.size()] : report.groups[g];
+    const bool rank = report.rank && !looksAlone;
     const std::vector<photo::Ranked> ranking =
-        report.rank ? photo::rankGroup(group, report.photos) : std::vector<photo::Ranked>{};
+        rank ? photo::rankGroup(group, report.photos) : std::vector<photo::Ranked>{};
     std::map<std::size_t, const photo::Ranked*> rankedOf;
     for (const photo::Ranked& ranked : ranking) rankedOf[ranked.photo] = &ranked;
-    html += fmt::format("<section>\n<h2>Group {}</h2>\n<div class=\"photos\">\n", g + 1);
+    html += fmt::format("<section>\n<h2>Group {}{}</h2>\n<div class=\"photos\">\n", g + 1,
+                        looksAlone ? ": look alike, time unknown" : "");
     for (const std::size_t i : group.photos) {
-      const photo::Ranked* ranked = report.rank ? rankedOf[i] : nullptr;
+      const photo::Ranked* ranked = rank ? rankedOf[i] : nullptr;
       html += figure(report.photos[i], thumbnails[i], ranked,
                      ranked != nullptr && ranked == ranking.data());
     }

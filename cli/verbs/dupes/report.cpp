@@ -53,9 +53,15 @@ Json pairAsJson(const photo::ShotPair& pair) {
           {"sameOrientation", pair.sameOrientation}};
 }
 
+bool isOfLooksAlone(const photo::DupeGroup& group) {
+  return !group.pairs.empty() && !group.pairs.front().timesKnown;
+}
+
 std::string groupAsText(const DupeReport& report, const photo::DupeGroup& group,
                         std::size_t number) {
-  std::string text = fmt::format("Group {}\n", number);
+  const bool looksAlone = isOfLooksAlone(group);
+  std::string text =
+      fmt::format("Group {}{}\n", number, looksAlone ? ": look alike, time unknown" : "");
   for (const std::size_t i : group.photos) {
     const photo::ScannedPhoto& photo = report.photos[i];
     text += fmt::format("  {}  {} x {}, {}\n", shownName(photo.path), photo.width, photo.height,
@@ -65,7 +71,7 @@ std::string groupAsText(const DupeReport& report, const photo::DupeGroup& group,
     text += fmt::format("  {} + {}: {}\n", shownName(report.photos[pair.first].path),
                         shownName(report.photos[pair.second].path), pairAsText(pair));
   }
-  if (!report.rank) return text;
+  if (!report.rank || looksAlone) return text;
   const char* verdict = "keep";
   for (const photo::Ranked& ranked : photo::rankGroup(group, report.photos)) {
     text += fmt::format("  {} {}: {}\n", verdict, shownName(report.photos[ranked.photo].path),
@@ -84,7 +90,9 @@ Json groupAsJson(const DupeReport& report, const photo::DupeGroup& group) {
     entry.update(pairAsJson(pair));
     object["pairs"].push_back(std::move(entry));
   }
-  if (report.rank) {
+  const bool looksAlone = isOfLooksAlone(group);
+  if (looksAlone) object["timeUnknown"] = true;
+  if (report.rank && !looksAlone) {
     Json& ranking = object["ranking"] = Json::array();
     for (const photo::Ranked& ranked : photo::rankGroup(group, report.photos)) {
       const photo::ScannedPhoto& photo = report.photos[ranked.photo];

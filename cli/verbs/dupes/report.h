@@ -16,6 +16,7 @@ struct DupeReport {
   float threshold;
   std::vector<photo::ScannedPhoto> photos;
   std::vector<photo::DupeGroup> groups;
+  std::vector<photo::DupeGroup> lookAlikes;  ///< Those with a time that is not known; never ranked.
   std::vector<photo::FailedPhoto> failed;
   bool rank;  ///< Whether each group is ranked by what to keep.
 };
@@ -23,6 +24,9 @@ struct DupeReport {
 /// "2024-05-01T12:30:45+02:00", followed by " (file)" where it is only the time of the file, or
 /// "time not known".
 std::string timeText(const photo::ScannedPhoto& photo);
+
+/// Whether a time is not known between photos of the group, so that only their looks speak for it.
+bool isOfLooksAlone(const photo::DupeGroup& group);
 
 /// One group in a few lines, for a terminal; `number` counts from 1.
 std::string groupAsText(const DupeReport& report, const photo::DupeGroup& group,

@@ -32,8 +32,10 @@ TEST(HostileNames, ReachNoTerminalAsTheyAre) {
   expectHarmless(quenby({"enhance", photo, "--name", "{stem}_x.jpg", "-n"}).output);
   expectHarmless(quenby({"enhance", photo, "-o", folder / "no\x1b/x.jpg"}).errors +
                  quenby({"curve", photo, "-o", folder / "c.png", "-n"}).output);
-  expectHarmless(quenby({"dupes", photo, folder.write("b.jpg", smallJpeg())}).output);
-  const std::string page = quenby({"dupes", photo, folder / "b.jpg", bad, "--html", "-"}).output;
+  expectHarmless(
+      quenby({"dupes", photo, folder.write("b.jpg", smallJpeg()), "--unknown-times"}).output);
+  const std::string page =
+      quenby({"dupes", photo, folder / "b.jpg", bad, "--unknown-times", "--html", "-"}).output;
   expectHarmless(page);
   EXPECT_THAT(page, HasSubstr("&lt;b&gt;"));
 }
