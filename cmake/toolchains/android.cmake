@@ -2,7 +2,7 @@
 if(NOT IS_DIRECTORY "$ENV{ANDROID_NDK}")
   message(FATAL_ERROR "ANDROID_NDK does not name the folder of an NDK: '$ENV{ANDROID_NDK}'")
 endif()
-set(root ${CMAKE_CURRENT_LIST_DIR}/../..)
+get_filename_component(root ${CMAKE_CURRENT_LIST_DIR}/../.. ABSOLUTE)
 file(STRINGS ${root}/java/quenby/pom.xml api REGEX "<quenby.android.api>")
 string(REGEX REPLACE "[^0-9]" "" api "${api}")
 set(ANDROID_PLATFORM android-${api})
