@@ -75,7 +75,9 @@ endfunction()
 
 # pelorin_test(<file> [THREADS] [LABEL <label>] [SOURCES ...] DEPENDS ...): the tests in <file>.cpp,
 # run by ctest one by one. THREADS marks tests that start threads: the thread sanitizer's run builds
-# and runs those; their label is "threads", whatever LABEL says.
+# and runs those; their label is "threads", whatever LABEL says. LABEL machine marks what another
+# processor or compiler would break first: whole results, kernels, natives; a short run on an emulated
+# machine builds and runs those.
 function(pelorin_test file)
   cmake_parse_arguments(PARSE_ARGV 1 arg "THREADS" "LABEL" "SOURCES;DEPENDS")
   if(NOT arg_SOURCES)
@@ -88,6 +90,9 @@ function(pelorin_test file)
   set(labels "")
   if(arg_LABEL)
     set(labels LABELS ${arg_LABEL})
+  endif()
+  if(arg_LABEL STREQUAL machine)
+    add_dependencies(machine_tests ${name})
   endif()
   if(arg_THREADS)
     set(labels LABELS threads)
