@@ -17,6 +17,7 @@
 #include "cli/frame/photo_files.h"
 #include "cli/frame/raw_option.h"
 #include "cli/pictures/canvas.h"
+#include "cli/pictures/face_frames.h"
 #include "cli/pictures/sheet_painter.h"
 #include "cli/verbs/sheet_columns.h"
 #include "cli/verbs/verbs.h"
@@ -88,15 +89,23 @@ SheetRow makeRow(const SheetWork& work, const Input& input, photo::PictureSize r
                                : std::filesystem::path(input.path).filename().string();
   SheetRow row{fmt::format("{}  \xC2\xB7  {} \xC3\x97 {}", name, size.width, size.height), {}};
   row.thumbnails.push_back(photo::areaAverage(*photo.image, small));
-  image_processing::FilteredImage session(
-      photo.image,
-      metadataWithFaces(allFaces(work.faces.of(input), photo), size.width, size.height), "",
-      defaultFilterConfigValue, image_processing::DefaultFilterFactory::filterFactory());
+  const image_processing::ImageMetadata faces =
+      metadataWithFaces(allFaces(work.faces.of(input), photo), size.width, size.height);
+  frameFaces(row.thumbnails.front(), faces, size);
+  const auto sessionWith = [&](const image_processing::ImageMetadata& metadata) {
+    return std::make_unique<image_processing::FilteredImage>(
+        photo.image, metadata, "", defaultFilterConfigValue,
+        image_processing::DefaultFilterFactory::filterFactory());
+  };
+  const auto session = sessionWith(faces);
+  std::unique_ptr<image_processing::FilteredImage> withoutFaces;  // made where it is wanted
   Image<RGBA8Pixel> filtered(size.width, size.height);
   for (const SheetColumn& column : work.columns) {
     stopIfInterrupted();
-    session.applyFilterWithParams(column.filter->name, column.params, defaultFilterConfigValue,
-                                  filtered);
+    if (!column.faces && !withoutFaces) withoutFaces = sessionWith({});
+    (column.faces ? session : withoutFaces)
+        ->applyFilterWithParams(column.filter->name, column.params, defaultFilterConfigValue,
+                                filtered);
     row.thumbnails.push_back(photo::areaAverage(filtered, small));
   }
   return row;
@@ -194,7 +203,8 @@ void addSheet(CommandLine& commandLine) {
       commandLine.addVerb("sheet", "One labelled picture of photos beside their enhanced versions",
                           "quenby sheet *.jpg -o sheet.jpg\n"
                           "quenby sheet -r holiday -o sheet.jpg --looks Auto,Winter\n"
-                          "quenby sheet photo.jpg -o sliders.jpg --sliders 0,0.3,0.6,1\n",
+                          "quenby sheet photo.jpg -o sliders.jpg --sliders 0,0.3,0.6,1\n"
+                          "quenby sheet photo.jpg -o faces.jpg --sliders 0.7 --without-faces\n",
                           [options] { return runSheet(*options); });
   addInputOptions(verb, options->inputs);
   addSheetColumnOptions(verb, options->columns);

@@ -46,15 +46,22 @@ void addSheetColumnOptions(Verb verb, SheetColumnOptions& options) {
   verb.option("--slider", options.slider,
               "Strength of the automatic enhancement among the looks; 0.4 unless given")
       .type("NUMBER");
+  verb.flag("--without-faces", options.withoutFaces,
+            "Before each column that cares for faces, another one as if the photo had none");
 }
 
 std::vector<SheetColumn> sheetColumns(const SheetColumnOptions& options) {
   const FilterDescription& automatic = filterNamed(enhancement);
   sliderParams(automatic, "--slider", options.slider);  // refused also when no look reads it
   std::vector<SheetColumn> columns;
+  const auto add = [&](const SheetColumn& column) {
+    if (options.withoutFaces && column.filter->parameters().readsFaces)
+      columns.push_back({column.label + ", no faces", column.filter, column.params, false});
+    columns.push_back(column);
+  };
   const auto addLook = [&](const FilterDescription& look) {
     if (look.name == untouched) return;
-    columns.push_back({labelOf(look), &look, sliderParams(look, "--slider", options.slider)});
+    add({labelOf(look), &look, sliderParams(look, "--slider", options.slider)});
   };
   if (options.allLooks || (options.looks.empty() && options.sliders.empty())) {
     for (const FilterDescription* look : allFilters()) addLook(*look);
@@ -63,7 +70,7 @@ std::vector<SheetColumn> sheetColumns(const SheetColumnOptions& options) {
   for (const std::string& text : options.sliders) {
     const std::string params = sliderParams(automatic, "--sliders", text);
     const float slider = image_processing::FilterParams(params).readFloat("slider");
-    columns.push_back({fmt::format("slider {:g}", slider), &automatic, params});
+    add({fmt::format("slider {:g}", slider), &automatic, params});
   }
   return columns;
 }

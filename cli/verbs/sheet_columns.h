@@ -14,9 +14,10 @@ struct SheetColumnOptions {
   std::vector<std::string> looks;
   std::vector<std::string> sliders;
   std::string slider = "0.4";
+  bool withoutFaces = false;
 };
 
-/// Adds `--all-looks`, `--looks`, `--sliders` and `--slider` to a verb.
+/// Adds `--all-looks`, `--looks`, `--sliders`, `--slider` and `--without-faces` to a verb.
 void addSheetColumnOptions(Verb verb, SheetColumnOptions& options);
 
 /// One way of treating every photo.
@@ -24,10 +25,12 @@ struct SheetColumn {
   std::string label;
   const image_processing::FilterDescription* filter;
   std::string params;
+  bool faces = true;  ///< Whether the filter is told of them.
 };
 
 /// The looks in the order they were named, or all of the registry, then the automatic enhancement
-/// at each slider; all looks when nothing was asked for. The untouched photo is not among them.
+/// at each slider; all looks when nothing was asked for. The untouched photo is not among them. With
+/// `withoutFaces`, a column whose filter reads faces has one before it that is told of none.
 /// @throws UsageError for names that are no look and sliders that are no number.
 std::vector<SheetColumn> sheetColumns(const SheetColumnOptions& options);
 

@@ -80,6 +80,30 @@ TEST_F(SheetVerb, ShowsThePhotoAndThenEverySlider) {
   EXPECT_GT(difference(shown, at(2), firstTop, low), 5);
 }
 
+TEST_F(SheetVerb, ShowsWhatFacesChange) {
+  Image<RGBA8Pixel> portrait = photoLikePicture(400, 300, 2);
+  for (std::uint32_t y = 30; y < 270; ++y) {  // a face of wrinkles, which smoothing spares
+    for (std::uint32_t x = 40; x < 160; ++x) {
+      const std::uint8_t red = (x / 6 + y / 6) % 2 == 0 ? 220 : 160;
+      portrait.row(y)[x] = {red, 150, 120, 255};
+    }
+  }
+  const Bytes file = jpegOf(portrait, {}, 95);
+  const std::string input = folder.write("a.jpg", file);
+  const Finished finished =
+      run({input}, {"--sliders", "1", "--without-faces", "--face", "0.1,0.1,0.4,0.9"});
+  ASSERT_EQ(finished.exitCode, 0) << finished.errors;
+  const auto picture = decoded(file), shown = sheet();
+  const auto at = [](std::uint32_t column) { return left + column * (cell + columnGap); };
+  EXPECT_EQ(shown.width, 2 * left + 3 * cell + 2 * columnGap);
+  const auto without = photo::areaAverage(enhanced(picture, "slider=1;"), {160, 120});
+  const double coding = difference(shown, at(1), firstTop, without);
+  EXPECT_LT(coding, 3);
+  EXPECT_GT(difference(shown, at(2), firstTop, without), 1.5 * coding);
+  const RGBA8Pixel frame = shown.row(firstTop + 60)[at(0) + 16];
+  EXPECT_GT(frame.r + frame.g + frame.b, 3 * 200);
+}
+
 TEST_F(SheetVerb, TurnsPhotosUpright) {
   const Bytes exif = exifPayload({6, "", "", ""}, true);  // to be shown turned clockwise
   const auto picture = photoLikePicture(400, 300, 6);
