@@ -11,9 +11,6 @@ using image_processing::RGBA8Pixel;
 
 namespace {
 
-/// Red, green and blue, summed with weights.
-using ColourSum = std::array<std::uint64_t, 3>;
-
 /// Calls visit(to, from, weight) for all pairs of a new and an old pixel of one line that overlap.
 /// Lengths are counted in parts so small that both grids fall on them: an old pixel is `to` parts
 /// long and a new one `from` parts, so that the weights of a new pixel sum to `from`.
@@ -47,43 +44,53 @@ PictureSize fitWithin(PictureSize picture, PictureSize box) {
   return {scaled(w, box.height, h), box.height};
 }
 
-Image<RGBA8Pixel> areaAverage(const Image<RGBA8Pixel>& picture, PictureSize size) {
-  Image<RGBA8Pixel> result(size.width, size.height);
-  const std::uint64_t area = std::uint64_t{picture.width} * picture.height;
-  std::vector<ColourSum> lineSums(size.width), sums(size.width);
-  std::uint64_t summedLine = UINT64_MAX;
-  const auto sumAlongLine = [&](std::uint64_t y) {
-    if (y == summedLine) return;  // the line lies in two new lines
-    summedLine = y;
-    std::fill(lineSums.begin(), lineSums.end(), ColourSum{});
-    const RGBA8Pixel* line = picture.row(static_cast<std::uint32_t>(y));
-    forEachOverlap(picture.width, size.width,
-                   [&](std::uint64_t to, std::uint64_t from, std::uint64_t weight) {
-                     const RGBA8Pixel& p = line[from];
-                     ColourSum& sum = lineSums[to];
-                     sum[0] += weight * p.r;
-                     sum[1] += weight * p.g;
-                     sum[2] += weight * p.b;
-                   });
-  };
-  std::uint64_t heightLeft = picture.height;  // of the new line being summed
-  forEachOverlap(picture.height, size.height,
+AreaAverage::AreaAverage(PictureSize picture, PictureSize size)
+    : picture_(picture),
+      size_(size),
+      result_(size.width, size.height),
+      lineSums_(size.width),
+      sums_(size.width) {}
+
+void AreaAverage::sumAlong(const RGBA8Pixel* row) {
+  std::fill(lineSums_.begin(), lineSums_.end(), ColourSum{});
+  forEachOverlap(picture_.width, size_.width,
                  [&](std::uint64_t to, std::uint64_t from, std::uint64_t weight) {
-                   sumAlongLine(from);
-                   for (std::uint32_t x = 0; x < size.width; ++x) {
-                     for (int c = 0; c < 3; ++c) sums[x][c] += weight * lineSums[x][c];
-                   }
-                   heightLeft -= weight;
-                   if (heightLeft > 0) return;
-                   RGBA8Pixel* line = result.row(static_cast<std::uint32_t>(to));
-                   for (std::uint32_t x = 0; x < size.width; ++x) {
-                     line[x] = {roundedShare(sums[x][0], area), roundedShare(sums[x][1], area),
-                                roundedShare(sums[x][2], area), 255};
-                   }
-                   std::fill(sums.begin(), sums.end(), ColourSum{});
-                   heightLeft = picture.height;
+                   const RGBA8Pixel& p = row[from];
+                   ColourSum& sum = lineSums_[to];
+                   sum[0] += weight * p.r;
+                   sum[1] += weight * p.g;
+                   sum[2] += weight * p.b;
                  });
-  return result;
+}
+
+void AreaAverage::addRow(const RGBA8Pixel* row) {
+  sumAlong(row);
+  rowsEnd_ += size_.height;
+  while (position_ < rowsEnd_) {  // the row may lie in two new lines
+    const std::uint64_t lineEnd = (std::uint64_t{line_} + 1) * picture_.height;
+    const std::uint64_t end = std::min(rowsEnd_, lineEnd);
+    for (std::uint32_t x = 0; x < size_.width; ++x) {
+      for (int c = 0; c < 3; ++c) sums_[x][c] += (end - position_) * lineSums_[x][c];
+    }
+    position_ = end;
+    if (end == lineEnd) finishLine();
+  }
+}
+
+void AreaAverage::finishLine() {
+  const std::uint64_t area = std::uint64_t{picture_.width} * picture_.height;
+  RGBA8Pixel* const line = result_.row(line_++);
+  for (std::uint32_t x = 0; x < size_.width; ++x) {
+    line[x] = {roundedShare(sums_[x][0], area), roundedShare(sums_[x][1], area),
+               roundedShare(sums_[x][2], area), 255};
+  }
+  std::fill(sums_.begin(), sums_.end(), ColourSum{});
+}
+
+Image<RGBA8Pixel> areaAverage(const Image<RGBA8Pixel>& picture, PictureSize size) {
+  AreaAverage average({picture.width, picture.height}, size);
+  for (std::uint32_t y = 0; y < picture.height; ++y) average.addRow(picture.row(y));
+  return average.result();
 }
 
 }  // namespace pelorin::photo

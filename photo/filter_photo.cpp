@@ -1,13 +1,15 @@
 #include "photo/filter_photo.h"
 
-#include <algorithm>
 #include <cmath>
 #include <memory>
 #include <stdexcept>
+#include <utility>
 
 #include "image_processing/core/picture_rows.h"
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/parameter_check.h"
+#include "photo/photo_writer.h"
+#include "photo/turned_image.h"
 
 namespace pelorin::photo {
 
@@ -30,23 +32,31 @@ void checkRequest(const FilterRequest& request) {
   requireFinite(request.faces);
 }
 
-/// The rows of a picture that are replaced by filtered ones. What is read is copied, since a filter
-/// may ask for a row again that stands there filtered already.
-class RowsInPlace : public RowSource, public RowSink {
+/// The rows of a reader; where there is a picture to keep them, they stand there afterwards.
+class DecodedRows : public RowSource {
  public:
-  explicit RowsInPlace(const Image<RGBA8Pixel>& picture)
-      : width_(picture.width), picture_(picture), filtered_(picture) {}
+  DecodedRows(RowReader& reader, const Image<RGBA8Pixel>* kept) : reader_(reader), kept_(kept) {}
 
   const RGBA8Pixel* next(std::uint32_t count, RGBA8Pixel* room) override {
-    std::copy_n(picture_.next(count, nullptr), std::size_t{width_} * count, room);
-    return room;
+    RGBA8Pixel* const rows = kept_ != nullptr ? kept_->row(next_) : room;
+    reader_.read(rows, count);
+    next_ += count;
+    return rows;
   }
-  void write(const RGBA8Pixel* rows, std::uint32_t count) override { filtered_.write(rows, count); }
 
  private:
-  std::uint32_t width_;
-  PictureSource picture_;
-  PictureSink filtered_;
+  RowReader& reader_;
+  const Image<RGBA8Pixel>* kept_;
+  std::uint32_t next_ = 0;
+};
+
+class WrittenRows : public RowSink {
+ public:
+  explicit WrittenRows(PhotoWriter& writer) : writer_(writer) {}
+  void write(const RGBA8Pixel* rows, std::uint32_t count) override { writer_.write(rows, count); }
+
+ private:
+  PhotoWriter& writer_;
 };
 
 }  // namespace
@@ -70,33 +80,76 @@ void requireFinite(const std::vector<Face>& faces) {
   }
 }
 
-void filterInPlace(Photo& photo, const std::string& filter, const std::string& params,
-                   const std::vector<Face>& faces, int scale, const std::stop_token& stop) {
-  const Image<RGBA8Pixel>& picture = *photo.image;
+FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const std::string& filter,
+                          const std::string& params, const std::vector<Face>& faces,
+                          const OpenOptions& open, const SaveOptions& save, const Format* format,
+                          const FilterMemory& memory) {
+  std::unique_ptr<RowReader> reader = openRows(file, open);
+  Photo photo{nullptr, reader->facts(), reader->metadata(), {}};
+  if (open.upright)
+    photo.metadata.turn = turnedFurther(uprightTurn(photo.facts.orientation), open.rotate);
+  const PictureSize stored = reader->size(), size = turnedSize(stored, photo.metadata.turn);
+  if (open.faces && !open.raw) photo.faces = knownFaces(photo.metadata, size);
+  if (format == nullptr) format = formatNamed(photo.facts.format);
+
   const std::unique_ptr<RowFilter> rows =
       DefaultFilterFactory::filterFactory()->find(filter)->makeRowFilter(
-          {.width = picture.width,
-           .height = picture.height,
+          {.width = size.width,
+           .height = size.height,
            .metadata =
-               metadataWithFaces(allFaces(faces, photo), picture.width, picture.height, scale),
+               metadataWithFaces(allFaces(faces, photo), size.width, size.height, open.scale),
            .params = params});
-  const RowWork work{.stop = [&] { return stop.stop_requested(); }};
-  PictureSource whole(picture);
-  if (rows->looksFirst() && !rows->look(whole, work)) throw Stopped();
-  RowsInPlace inPlace(picture);
-  if (!rows->filter(inPlace, inPlace, work)) throw Stopped();
+  const RowWork work{.stop = [&] { return open.stop.stop_requested(); }};
+  const auto stopUnless = [](bool done) {
+    if (!done) throw Stopped();
+  };
+
+  SparePixels none;
+  SparePixels& spare = memory.spare != nullptr ? *memory.spare : none;
+  const bool asksAlpha = format->keepsAlpha && photo.facts.hasAlpha;
+  const bool isTurned = photo.metadata.turn != Turn{};
+  const bool fits = std::uint64_t{size.width} * size.height <= memory.pixels / sizeof(RGBA8Pixel);
+  if (isTurned || asksAlpha) {
+    photo.image = readTurned(*reader, photo.metadata.turn, spare);
+  } else if (rows->looksFirst() && (fits || photo.facts.progressive)) {
+    photo.image = spare.picture(size.width, size.height);
+  }
+  if (rows->looksFirst()) {
+    if (isTurned || asksAlpha) {
+      PictureSource picture(*photo.image);
+      stopUnless(rows->look(picture, work));
+    } else {
+      DecodedRows decoded(*reader, photo.image.get());
+      stopUnless(rows->look(decoded, work));
+      reader = photo.image == nullptr ? openRows(file, open) : nullptr;
+    }
+  }
+
+  const bool hasAlpha = asksAlpha && !isOpaque(photo.image->data.get(), photo.image->pixelCount());
+  PhotoWriter writer(size, *format, hasAlpha, photo.metadata, save);
+  WrittenRows written(writer);
+  if (photo.image != nullptr) {
+    PictureSource picture(*photo.image);
+    stopUnless(rows->filter(picture, written, work));
+    spare.keep(*photo.image);
+    photo.image = nullptr;
+  } else {
+    DecodedRows decoded(*reader, nullptr);
+    stopUnless(rows->filter(decoded, written, work));
+  }
+  FilteredPhoto filtered{{}, size, std::move(photo.facts)};
+  filtered.file = writer.finish(&filtered.lost);
+  return filtered;
 }
 
 std::vector<std::uint8_t> filterPhoto(std::span<const std::uint8_t> file,
                                       const FilterRequest& request, const Format* format,
                                       std::vector<Loss>* lost) {
   checkRequest(request);
-  Photo photo = open(file, request.open);
-  stopIfAsked(request.open.stop);
-  filterInPlace(photo, request.filter, request.params, request.faces, request.open.scale,
-                request.open.stop);
-  if (format == nullptr) format = formatNamed(photo.facts.format);
-  return save(*photo.image, *format, photo.metadata, request.save, lost);
+  FilteredPhoto filtered = filterPhoto(file, request.filter, request.params, request.faces,
+                                       request.open, request.save, format);
+  if (lost != nullptr) *lost = std::move(filtered.lost);
+  return std::move(filtered.file);
 }
 
 }  // namespace pelorin::photo

@@ -2,7 +2,6 @@
 
 #include <cstdint>
 #include <span>
-#include <stop_token>
 #include <string>
 #include <vector>
 
@@ -30,15 +29,35 @@ const image_processing::FilterDescription& filterFor(const std::string& name,
 /// @throws std::invalid_argument when a side is not finite.
 void requireFinite(const std::vector<Face>& faces);
 
-/// Filters a photo in its own pixels, by rows: with hardly any memory beside them. The bytes are
-/// those of a session on it.
+/// A filtered photo as a file, and what is to say of it.
+struct FilteredPhoto {
+  std::vector<std::uint8_t> file;
+  PictureSize size;
+  PhotoFacts facts;             ///< Of the photo that it is made of.
+  std::vector<Loss> lost = {};  ///< What of the metadata is not in the file.
+};
+
+/// How a photo is filtered by rows; nothing of it changes a byte.
+struct FilterMemory {
+  /// Bytes of decoded pixels, 4 each, that are kept for a filter that goes over them twice. A photo
+  /// with more is decoded twice instead. One that is turned, whose rows come in several passes or
+  /// whose transparency must be known first is kept in any case.
+  std::uint64_t pixels = std::uint64_t{128} << 20;
+  SparePixels* spare = nullptr;  ///< Where kept pixels may come from and go; may be null.
+};
+
+/// Filters a photo into a file, by rows: with hardly any memory beside what `memory` allows for
+/// pixels, and the bytes of the two files. The result has the bytes of the filter on the whole
+/// picture.
 /// @param filter  a name in the registry.
 /// @param faces   beside those that its file knows of.
-/// @param scale   how often smaller it was decoded than it is.
-/// @throws PhotoError for a face in pixels that lies outside the picture; Stopped; what the filter
-///         throws.
-void filterInPlace(Photo& photo, const std::string& filter, const std::string& params,
-                   const std::vector<Face>& faces, int scale, const std::stop_token& stop = {});
+/// @param format  of the result; null for that of `file`.
+/// @throws PhotoError as `open` and `save`, and for a face in pixels that lies outside the picture;
+///         Stopped; what the filter throws.
+FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const std::string& filter,
+                          const std::string& params, const std::vector<Face>& faces,
+                          const OpenOptions& open, const SaveOptions& save, const Format* format,
+                          const FilterMemory& memory = {});
 
 /// The bytes of the file that the command writes for the same options: upright, filtered, with the
 /// metadata kept.

@@ -30,11 +30,9 @@ struct Format {
   /// Takes out what a file of this format cannot hold, and names it among the losses.
   void (*removeForeign)(KeptMetadata& kept);
 
-  /// @param kept      what `removeForeign` left.
   /// @param hasAlpha  whether any pixel is not opaque; without effect unless `keepsAlpha`.
   /// @throws PhotoError when the format cannot hold a picture of this size.
-  std::unique_ptr<RowWriter> (*writer)(PictureSize size, bool hasAlpha, KeptMetadata kept,
-                                       const SaveOptions& options);
+  std::unique_ptr<RowWriter> (*writer)(PictureSize size, bool hasAlpha, const SaveOptions& options);
 };
 
 /// All formats that can be read and written. A new one is a row here and a folder beside this.

@@ -2,9 +2,9 @@
 
 #include <algorithm>
 #include <bit>
-#include <cstring>
 #include <utility>
 
+#include "photo/photo_writer.h"
 #include "photo/reduced_rows.h"
 #include "photo/turned_image.h"
 
@@ -30,35 +30,6 @@ std::unique_ptr<RowReader> readerOf(std::span<const std::uint8_t> file,
   const std::uint32_t divisor = divisorOf(options.scale);
   if (divisor == 1 || format.scalesWhileDecoding) return reader;
   return reducedRows(std::move(reader), divisor);
-}
-
-// Turned while it comes, so that there is one picture and not two.
-std::shared_ptr<Image<RGBA8Pixel>> readTurned(RowReader& reader, Turn turn, SparePixels& spare) {
-  const PictureSize size = reader.size(), upright = turnedSize(size, turn);
-  const std::shared_ptr<Image<RGBA8Pixel>> picture = spare.picture(upright.width, upright.height);
-  if (turn == Turn{}) {
-    reader.read(picture->data.get(), size.height);
-    return picture;
-  }
-  const Image<RGBA8Pixel> room(size.width, std::min(size.height, rowsAtOnce));
-  for (std::uint32_t y = 0; y < size.height;) {
-    const std::uint32_t count = std::min(size.height - y, room.height);
-    reader.read(room.data.get(), count);
-    turnRows(room.data.get(), y, count, size, turn, *picture);
-    y += count;
-  }
-  return picture;
-}
-
-bool isOpaque(const RGBA8Pixel* pixels, std::size_t count) {
-  std::uint32_t all = ~0u;  // of every channel: a loop without a branch, of which vectors are made
-#pragma GCC unroll 8
-  for (std::size_t i = 0; i < count; ++i) {
-    std::uint32_t pixel;
-    std::memcpy(&pixel, pixels + i, sizeof pixel);
-    all &= pixel;
-  }
-  return std::bit_cast<RGBA8Pixel>(all).a == 255;
 }
 
 }  // namespace
@@ -94,29 +65,14 @@ std::vector<std::uint8_t> save(const Image<RGBA8Pixel>& picture, const Format& f
                                const Metadata& metadata, const SaveOptions& options,
                                std::vector<Loss>* lost) {
   stopIfAsked(options.stop);
-  KeptMetadata kept = keptMetadata(picture, metadata, options.keep);
-  if (options.mark) addEditMark(kept.segments, *options.mark, kept.lost);
-  format.removeForeign(kept);
   const bool alpha = format.keepsAlpha && !isOpaque(picture.data.get(), picture.pixelCount());
-  std::vector<Loss> losses = std::move(kept.lost);
-  const PictureSize size = {picture.width, picture.height};
-  const auto writer = format.writer(size, alpha, std::move(kept), options);
-  bool opaque = true;
-  for (std::uint32_t y = 0; y < size.height;) {
-    const std::uint32_t count = std::min(size.height - y, rowsAtOnce);
-    writer->write(picture.row(y), count);
-    // Behind the writer, while the rows are near: memory would take longer than the looking.
-    if (!format.keepsAlpha) {
-      opaque = isOpaque(picture.row(y), std::size_t{count} * size.width) && opaque;
-    }
+  PhotoWriter writer({picture.width, picture.height}, format, alpha, metadata, options);
+  for (std::uint32_t y = 0; y < picture.height;) {
+    const std::uint32_t count = std::min(picture.height - y, rowsAtOnce);
+    writer.write(picture.row(y), count);
     y += count;
   }
-  if (!opaque)
-    losses.push_back({"transparency", "a " + std::string(format.name) + " file has none"});
-  std::vector<std::uint8_t> file = writer->finish();
-  if (lost != nullptr) *lost = std::move(losses);
-  stopIfAsked(options.stop);
-  return file;
+  return writer.finish(lost);
 }
 
 std::vector<std::uint8_t> save(const Image<RGBA8Pixel>& picture, std::string_view format,

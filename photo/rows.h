@@ -4,6 +4,7 @@
 #include <vector>
 
 #include "image_processing/core/image.h"
+#include "photo/metadata/kept_metadata.h"
 #include "photo/metadata/metadata.h"
 #include "photo/photo_facts.h"
 #include "photo/picture_size.h"
@@ -43,7 +44,10 @@ class RowWriter {
   virtual void write(const image_processing::RGBA8Pixel* rows, std::uint32_t count) = 0;
 
   /// The whole file, once, after the last row.
-  virtual std::vector<std::uint8_t> finish() = 0;
+  /// @param kept  what goes with the picture, as `Format::removeForeign` left it. It comes last,
+  ///              since some of it is made of the rows.
+  /// @throws PhotoError for what no file of the format can hold.
+  virtual std::vector<std::uint8_t> finish(const KeptMetadata& kept) = 0;
 };
 
 }  // namespace pelorin::photo

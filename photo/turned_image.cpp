@@ -41,4 +41,22 @@ void turnRows(const RGBA8Pixel* rows, std::uint32_t first, std::uint32_t count, 
   }
 }
 
+std::shared_ptr<Image<RGBA8Pixel>> readTurned(RowReader& reader, Turn turn, SparePixels& spare) {
+  const PictureSize size = reader.size(), upright = turnedSize(size, turn);
+  const std::shared_ptr<Image<RGBA8Pixel>> picture = spare.picture(upright.width, upright.height);
+  if (turn == Turn{}) {
+    reader.read(picture->data.get(), size.height);
+    return picture;
+  }
+  constexpr std::uint32_t rowsRead = 64;  // what a processor has room for beside its work
+  const Image<RGBA8Pixel> room(size.width, std::min(size.height, rowsRead));
+  for (std::uint32_t y = 0; y < size.height;) {
+    const std::uint32_t count = std::min(size.height - y, room.height);
+    reader.read(room.data.get(), count);
+    turnRows(room.data.get(), y, count, size, turn, *picture);
+    y += count;
+  }
+  return picture;
+}
+
 }  // namespace pelorin::photo

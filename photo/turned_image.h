@@ -1,9 +1,12 @@
 #pragma once
 
 #include <cstdint>
+#include <memory>
 
 #include "image_processing/core/image.h"
 #include "photo/picture_size.h"
+#include "photo/rows.h"
+#include "photo/spare_pixels.h"
 #include "photo/turn.h"
 
 namespace pelorin::photo {
@@ -21,5 +24,11 @@ inline PictureSize turnedSize(PictureSize size, Turn turn) {
 void turnRows(const image_processing::RGBA8Pixel* rows, std::uint32_t first, std::uint32_t count,
               PictureSize size, Turn turn,
               const image_processing::Image<image_processing::RGBA8Pixel>& result);
+
+/// All rows of a reader, turned while they come, so that there is one picture and not two.
+/// @param spare  where its pixels may come from.
+/// @throws what the reader throws; std::bad_alloc.
+std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> readTurned(
+    RowReader& reader, Turn turn, SparePixels& spare);
 
 }  // namespace pelorin::photo

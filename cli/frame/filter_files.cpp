@@ -6,6 +6,7 @@
 
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
+#include "cli/frame/file_bytes.h"
 #include "cli/frame/interrupt.h"
 #include "cli/frame/jobs.h"
 #include "cli/frame/json_output.h"
@@ -17,14 +18,12 @@
 namespace pelorin::cli {
 namespace {
 
-using image_processing::Image;
-using image_processing::RGBA8Pixel;
-
 struct Work {
   FilterToApply filter;
   FaceChoice faces;
   photo::OpenOptions photo;
   SaveChoice save;
+  std::uint64_t pixels;  // bytes of them that a file may keep
 };
 
 struct Done {
@@ -34,7 +33,9 @@ struct Done {
 };
 
 Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter) {
-  Work work = {filter, FaceChoice(options.faces), {}, {}};
+  Work work = {filter, FaceChoice(options.faces), {}, {}, 0};
+  work.pixels = (std::uint64_t{static_cast<unsigned>(options.memory)} << 20) /
+                static_cast<unsigned>(jobsAtOnce(options.jobs));
   work.save = {.raw = !options.raw.empty(),
                .quality = options.quality,
                .keep = keepOptions(options.keep),
@@ -54,16 +55,15 @@ Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter)
 
 Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   thread_local photo::SparePixels spare;  // each worker's own
-  photo::Photo photo = loadPhoto(file.input, work.photo, talk, &spare);
-  stopIfInterrupted();
-  Image<RGBA8Pixel>& picture = *photo.image;
-  Done done = {picture.width, picture.height, {}, photo.facts.notices};
-  photo::filterInPlace(photo, work.filter.filter.name, work.filter.params,
-                       work.faces.of(file.input), work.photo.scale, interruptToken());
-  stopIfInterrupted();
-  done.lost = savePicture(file.output, picture, photo.metadata, work.save);
-  if (!work.save.raw) spare.keep(picture);
-  return done;
+  photo::OpenOptions open = work.photo;
+  open.stop = interruptToken();
+  const photo::FilteredPhoto filtered = photo::filterPhoto(
+      readInput(file.input), work.filter.filter.name, work.filter.params, work.faces.of(file.input),
+      open, saveOptions(work.save), &outputFormat(file.output, work.save),
+      {.pixels = work.pixels, .spare = &spare});
+  tellNotices(file.input, filtered.facts, talk);
+  writePhoto(file.output, filtered.file, filtered.lost, work.save);
+  return {filtered.size.width, filtered.size.height, filtered.lost, filtered.facts.notices};
 }
 
 Json describe(const PlannedFile& file, const char* status) {
@@ -105,6 +105,12 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
   addRawOption(verb, options.raw);
   verb.named("--raw").help("Read and write packed RGBA bytes of this size instead of photos");
   addJobsOption(verb, options.jobs);
+  verb.option("--memory", options.memory,
+              "MiB for decoded pixels, 128 unless given, shared by the files at once; photos that "
+              "need more are decoded twice, or kept where that cannot be")
+      .between(0, 1 << 20)
+      .type("MIB")
+      .group("Reporting");
   addReportOptions(verb, options.report);
 }
 

@@ -27,6 +27,7 @@ struct FilterFilesOptions {
   int scale = 1;
   int quality = 90;
   int jobs = 1;
+  int memory = 128;  ///< MiB of pixels kept, by all jobs together.
 };
 
 /// Adds all of them to a verb. Results in a folder are called `{stem}_{filter}` by default.

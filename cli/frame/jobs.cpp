@@ -15,9 +15,14 @@ void addJobsOption(Verb verb, int& atOnce) {
       .group("Reporting");
 }
 
+int jobsAtOnce(int atOnce) {
+  if (atOnce != 0) return atOnce;
+  return static_cast<int>(std::max(1u, std::thread::hardware_concurrency()));
+}
+
 bool runJobs(std::size_t count, int atOnce, const std::function<void(std::size_t)>& work,
              const std::function<void(std::size_t)>& report) {
-  if (atOnce == 0) atOnce = static_cast<int>(std::max(1u, std::thread::hardware_concurrency()));
+  atOnce = jobsAtOnce(atOnce);
   std::mutex mutex;
   std::condition_variable changed;
   std::size_t next = 0;

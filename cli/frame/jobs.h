@@ -11,6 +11,9 @@ namespace pelorin::cli {
 /// Adds `-j N` to a verb: 1 unless given, 0 for one a core.
 void addJobsOption(Verb verb, int& atOnce);
 
+/// How many that is: `atOnce`, or one a core for 0.
+int jobsAtOnce(int atOnce);
+
 /// Runs `work(0)` ... `work(count - 1)`, `atOnce` of them at the same time, each on one thread, and
 /// calls `report` on the calling thread in that order, as soon as the order allows. Ctrl-C starts
 /// no further work; what was done by then is reported.

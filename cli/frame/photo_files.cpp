@@ -15,10 +15,14 @@ photo::Photo loadPhoto(const Input& input, photo::OpenOptions options, Talk& tal
                        photo::SparePixels* spare) {
   options.stop = interruptToken();
   photo::Photo photo = photo::open(readInput(input), options, spare);
-  for (const std::string& notice : photo.facts.notices) {
+  tellNotices(input, photo.facts, talk);
+  return photo;
+}
+
+void tellNotices(const Input& input, const photo::PhotoFacts& facts, Talk& talk) {
+  for (const std::string& notice : facts.notices) {
     talk.noteOnce(notice, input.shownName() + ": " + notice + " (others like it are not named)");
   }
-  return photo;
 }
 
 void addQualityOption(Verb verb, int& quality) {
@@ -59,18 +63,26 @@ void requireFormatOf(const std::string& path, bool raw) {
                    photo::pictureExtensions());
 }
 
+photo::SaveOptions saveOptions(const SaveChoice& choice) {
+  return {.quality = choice.quality,
+          .stop = interruptToken(),
+          .keep = choice.keep,
+          .colour = choice.colour};
+}
+
+void writePhoto(const std::string& path, std::span<const std::uint8_t> file,
+                const std::vector<photo::Loss>& lost, const SaveChoice& choice) {
+  refuseLosses(lost, choice.strict);
+  writeOutput(path, file, choice.replace);
+}
+
 std::vector<photo::Loss> savePicture(
     const std::string& path, const image_processing::Image<image_processing::RGBA8Pixel>& picture,
     const photo::Metadata& metadata, const SaveChoice& choice) {
   std::vector<photo::Loss> lost;
-  const std::vector<std::uint8_t> file = photo::save(picture, outputFormat(path, choice), metadata,
-                                                     {.quality = choice.quality,
-                                                      .stop = interruptToken(),
-                                                      .keep = choice.keep,
-                                                      .colour = choice.colour},
-                                                     &lost);
-  refuseLosses(lost, choice.strict);
-  writeOutput(path, file, choice.replace);
+  const std::vector<std::uint8_t> file =
+      photo::save(picture, outputFormat(path, choice), metadata, saveOptions(choice), &lost);
+  writePhoto(path, file, lost, choice);
   return lost;
 }
 

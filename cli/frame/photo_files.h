@@ -1,5 +1,7 @@
 #pragma once
 
+#include <cstdint>
+#include <span>
 #include <string>
 #include <vector>
 
@@ -43,6 +45,18 @@ const photo::Format& outputFormat(const std::string& path, const SaveChoice& cho
 /// @param raw  whether raw pixels are written, else a picture.
 /// @throws UsageError.
 void requireFormatOf(const std::string& path, bool raw);
+
+/// How a picture becomes a file; stops on Ctrl-C.
+photo::SaveOptions saveOptions(const SaveChoice& choice);
+
+/// Writes a finished file, or standard output.
+/// @param lost  what of the metadata is not in it.
+/// @throws what writing throws, and where nothing may be lost; an old file is then as it was.
+void writePhoto(const std::string& path, std::span<const std::uint8_t> file,
+                const std::vector<photo::Loss>& lost, const SaveChoice& choice);
+
+/// Says what a photo's file makes a user wonder about.
+void tellNotices(const Input& input, const photo::PhotoFacts& facts, Talk& talk);
 
 /// Writes a picture to a file or standard output, in the format of `outputFormat`.
 /// @returns what is lost of the metadata.

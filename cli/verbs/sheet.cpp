@@ -156,7 +156,7 @@ ExitCode runSheet(const SheetOptions& options) {
       outputFormat(output, {})
           .writer({static_cast<std::uint32_t>(painter.width()),
                    static_cast<std::uint32_t>(painter.height())},
-                  /*hasAlpha=*/false, {},
+                  /*hasAlpha=*/false,
                   // Thin text is a large part of the picture.
                   {.quality = options.quality, .colour = photo::ColourDetail::full});
   const auto add = [&](const Image<RGBA8Pixel>& band) {
@@ -186,7 +186,7 @@ ExitCode runSheet(const SheetOptions& options) {
     return ExitCode::interrupted;
   }
   const bool something = tally.done > 0;
-  if (something) writeOutput(output, writer->finish(), {.mayReplace = options.outputs.overwrite});
+  if (something) writeOutput(output, writer->finish({}), {.mayReplace = options.outputs.overwrite});
   json.add({{"output", output},
             {"status", something ? "done" : "failed"},
             {"width", painter.width()},

@@ -31,14 +31,15 @@ void checkSegment(const MetadataSegment& segment) {
   }
 }
 
-// More than most photos need.
+// More than most photos need; of the largest, what they may need.
 std::size_t expectedSize(std::uint32_t width, std::uint32_t height) {
   if (width < 1 || height < 1 || width > JPEG_MAX_DIMENSION || height > JPEG_MAX_DIMENSION) {
     throw PhotoError(PhotoError::Kind::invalidRequest,
                      "a JPEG file cannot be " + std::to_string(width) + " x " +
                          std::to_string(height) + " pixels, only 1 to 65500 each way");
   }
-  return std::size_t{width} * height / 2;
+  constexpr std::uint64_t most = 64 << 20;
+  return static_cast<std::size_t>(std::min(std::uint64_t{width} * height / 2, most));
 }
 
 }  // namespace
@@ -86,6 +87,21 @@ void JpegPictureWriter::write(const std::uint8_t* rgba, std::uint32_t count) {
 std::vector<std::uint8_t> JpegPictureWriter::finish() {
   writer_.run([this] { jpeg_finish_compress(&writer_.codec()); });
   return writer_.takeFile();
+}
+
+void insertSegments(std::vector<std::uint8_t>& file, std::span<const MetadataSegment> segments) {
+  constexpr std::ptrdiff_t startMark = 2, jfifSegment = 18;
+  std::vector<std::uint8_t> bytes;
+  for (const MetadataSegment& segment : segments) {
+    checkSegment(segment);
+    const std::size_t length = segment.payload.size() + 2;
+    bytes.insert(bytes.end(), {0xFF, segment.marker, static_cast<std::uint8_t>(length >> 8),
+                               static_cast<std::uint8_t>(length)});
+    bytes.insert(bytes.end(), segment.payload.begin(), segment.payload.end());
+  }
+  const bool keepsJfif = std::none_of(segments.begin(), segments.end(), tellsTheFileFormat);
+  if (!keepsJfif) file.erase(file.begin() + startMark, file.begin() + startMark + jfifSegment);
+  file.insert(file.begin() + startMark + (keepsJfif ? jfifSegment : 0), bytes.begin(), bytes.end());
 }
 
 std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t width,

@@ -65,11 +65,10 @@ void removeForeign(KeptMetadata& kept) {
 
 class JpegRowWriter : public RowWriter {
  public:
-  JpegRowWriter(PictureSize size, KeptMetadata kept, const SaveOptions& options)
+  JpegRowWriter(PictureSize size, const SaveOptions& options)
       : stop_(options.stop),
         width_(size.width),
-        tail_(std::move(kept.tail)),
-        picture_(size.width, size.height, options.quality, kept.segments,
+        picture_(size.width, size.height, options.quality, {},
                  options.colour == ColourDetail::full ? Chroma::whole : Chroma::halved) {}
 
   void write(const RGBA8Pixel* rows, std::uint32_t count) override {
@@ -82,16 +81,16 @@ class JpegRowWriter : public RowWriter {
     }
   }
 
-  std::vector<std::uint8_t> finish() override {
+  std::vector<std::uint8_t> finish(const KeptMetadata& kept) override {
     std::vector<std::uint8_t> file = picture_.finish();
-    appendTail(file, tail_);
+    insertSegments(file, kept.segments);
+    appendTail(file, kept.tail);
     return file;
   }
 
  private:
   std::stop_token stop_;
   std::uint32_t width_;
-  std::vector<TailPart> tail_;
   JpegPictureWriter picture_;
 };
 
@@ -112,9 +111,8 @@ constinit const Format jpegFormat = {
     .reader = [](std::span<const std::uint8_t> file, const OpenOptions& options)
         -> std::unique_ptr<RowReader> { return std::make_unique<JpegRowReader>(file, options); },
     .removeForeign = removeForeign,
-    .writer = [](PictureSize size, bool, KeptMetadata kept,
-                 const SaveOptions& options) -> std::unique_ptr<RowWriter> {
-      return std::make_unique<JpegRowWriter>(size, std::move(kept), options);
+    .writer = [](PictureSize size, bool, const SaveOptions& options) -> std::unique_ptr<RowWriter> {
+      return std::make_unique<JpegRowWriter>(size, options);
     },
 };
 

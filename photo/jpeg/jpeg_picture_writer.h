@@ -25,4 +25,9 @@ class JpegPictureWriter {
   LibjpegWriter writer_;
 };
 
+/// Puts segments into a file of `JpegPictureWriter` that was made without any: it becomes the file
+/// that is made with them.
+/// @throws PhotoError as the writer.
+void insertSegments(std::vector<std::uint8_t>& file, std::span<const MetadataSegment> segments);
+
 }  // namespace pelorin::photo

@@ -198,22 +198,38 @@ void removeLocation(XmpPacket& packet) {
 
 KeptMetadata keptMetadata(const Image<RGBA8Pixel>& picture, const Metadata& metadata,
                           const KeepOptions& options) {
+  ThumbnailMaker thumbnails(picture);
+  return keptMetadata({picture.width, picture.height}, thumbnails, metadata, options);
+}
+
+void expectThumbnails(ThumbnailMaker& thumbnails, PictureSize picture, const Metadata& metadata,
+                      const KeepOptions& options) {
+  Metadata exif = {.segments = {},
+                   .storedSize = metadata.storedSize,
+                   .orientation = metadata.orientation,
+                   .turn = metadata.turn};
+  for (const MetadataSegment& segment : metadata.segments) {
+    if (segment.marker == app1 && isExif(segment.payload)) exif.segments.push_back(segment);
+  }
+  keptMetadata(picture, thumbnails, exif, options);
+}
+
+KeptMetadata keptMetadata(PictureSize picture, ThumbnailMaker& thumbnails, const Metadata& metadata,
+                          const KeepOptions& options) {
   if (options.only) {
     KeepOptions all = options;
     all.only.reset();
-    return keptMetadata(picture, chosenMetadata(metadata, *options.only), all);
+    return keptMetadata(picture, thumbnails, chosenMetadata(metadata, *options.only), all);
   }
   KeptMetadata kept;
   kept.segments = metadata.segments;
   kept.chunks = metadata.chunks;
-  const PictureChange change = {
-      metadata.storedSize, {picture.width, picture.height}, metadata.turn, metadata.orientation};
+  const PictureChange change = {metadata.storedSize, picture, metadata.turn, metadata.orientation};
   kept.tail = keptTail(metadata, change, options, kept.lost);
   const Appended appended = appendedBy(kept.tail);
 
   std::vector<MetadataSegment>& segments = kept.segments;
   std::vector<Loss> thumbnailsLost;
-  ThumbnailMaker thumbnails(picture);
   for (MetadataSegment& segment : segments) {
     if (segment.marker != app1 || !isExif(segment.payload)) continue;
     if (!options.location) removeExifLocation(segment.payload);

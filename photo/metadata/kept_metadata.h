@@ -9,6 +9,8 @@
 #include "photo/metadata/jpeg_tail.h"
 #include "photo/metadata/loss.h"
 #include "photo/metadata/metadata.h"
+#include "photo/metadata/thumbnail.h"
+#include "photo/picture_size.h"
 
 namespace pelorin::photo {
 
@@ -38,6 +40,15 @@ struct KeptMetadata {
 /// @throws std::bad_alloc.
 KeptMetadata keptMetadata(const image_processing::Image<image_processing::RGBA8Pixel>& picture,
                           const Metadata& metadata, const KeepOptions& options = {});
+
+/// The same for a picture of this size that is written row by row.
+/// @param thumbnails  was given every row, after `expectThumbnails`.
+KeptMetadata keptMetadata(PictureSize picture, ThumbnailMaker& thumbnails, const Metadata& metadata,
+                          const KeepOptions& options = {});
+
+/// Tells a maker, before the first row, which thumbnails `keptMetadata` will want of it.
+void expectThumbnails(ThumbnailMaker& thumbnails, PictureSize picture, const Metadata& metadata,
+                      const KeepOptions& options = {});
 
 /// Removes the colour profile from among the segments.
 void removeColourProfile(std::vector<MetadataSegment>& segments);

@@ -1,6 +1,7 @@
 #include "photo/png/png_format.h"
 
 #include <png.h>
+#include <zlib.h>
 
 #include <algorithm>
 #include <csetjmp>
@@ -221,8 +222,7 @@ class PngRowReader : public RowReader {
 
 class PngRowWriter : public RowWriter {
  public:
-  PngRowWriter(PictureSize size, bool hasAlpha, const KeptMetadata& kept,
-               const SaveOptions& options)
+  PngRowWriter(PictureSize size, bool hasAlpha, const SaveOptions& options)
       : stop_(options.stop),
         width_(size.width),
         greyRow_(options.colour == ColourDetail::none ? size.width : 0) {
@@ -232,8 +232,7 @@ class PngRowWriter : public RowWriter {
                        "a PNG file cannot be " + std::to_string(size.width) + " x " +
                            std::to_string(size.height) + " pixels");
     }
-    const std::vector<PngChunk> chunks = chunksOf(kept);
-    file_.reserve(std::size_t{size.width} * size.height);
+    file_.reserve(std::min(std::uint64_t{size.width} * size.height, mostReserved));
     png_ = png_create_write_struct(PNG_LIBPNG_VER_STRING, &errors_, PngErrors::fail,
                                    PngErrors::ignore);
     if (png_ != nullptr) info_ = png_create_info_struct(png_);
@@ -251,10 +250,6 @@ class PngRowWriter : public RowWriter {
                                 : PNG_COLOR_TYPE_RGB,
                      PNG_INTERLACE_NONE, PNG_COMPRESSION_TYPE_DEFAULT, PNG_FILTER_TYPE_DEFAULT);
         png_write_info(png_, info_);
-        for (const PngChunk& chunk : chunks) {
-          png_write_chunk(png_, reinterpret_cast<png_const_bytep>(chunk.type.c_str()),
-                          chunk.data.data(), chunk.data.size());
-        }
         if (!hasAlpha && !isGrey()) png_set_filler(png_, 0, PNG_FILLER_AFTER);
       });
     } catch (...) {
@@ -281,8 +276,11 @@ class PngRowWriter : public RowWriter {
     }
   }
 
-  std::vector<std::uint8_t> finish() override {
+  std::vector<std::uint8_t> finish(const KeptMetadata& kept) override {
     errors_.run([this] { png_write_end(png_, nullptr); });
+    std::vector<std::uint8_t> chunks;
+    for (const PngChunk& chunk : chunksOf(kept)) appendChunk(chunks, chunk);
+    file_.insert(file_.begin() + headerSize, chunks.begin(), chunks.end());
     return std::move(file_);
   }
 
@@ -292,6 +290,23 @@ class PngRowWriter : public RowWriter {
   png_const_bytep greyOf(const RGBA8Pixel* row) {
     std::transform(row, row + width_, greyRow_.begin(), [](const RGBA8Pixel& p) { return p.r; });
     return greyRow_.data();
+  }
+
+  static constexpr std::uint64_t mostReserved = 64 << 20;
+  static constexpr std::ptrdiff_t headerSize = 8 + 25;  // the signature and IHDR
+
+  static void appendNumber(std::vector<std::uint8_t>& bytes, std::uint64_t number) {
+    for (const int shift : {24, 16, 8, 0})
+      bytes.push_back(static_cast<std::uint8_t>(number >> shift));
+  }
+
+  static void appendChunk(std::vector<std::uint8_t>& bytes, const PngChunk& chunk) {
+    appendNumber(bytes, chunk.data.size());
+    const std::size_t checked = bytes.size();
+    bytes.insert(bytes.end(), chunk.type.begin(), chunk.type.end());
+    bytes.insert(bytes.end(), chunk.data.begin(), chunk.data.end());
+    appendNumber(bytes,
+                 crc32(0, bytes.data() + checked, static_cast<uInt>(bytes.size() - checked)));
   }
 
   static void append(png_structp png, png_bytep bytes, std::size_t count) {
@@ -332,9 +347,9 @@ constinit const Format pngFormat = {
     .reader = [](std::span<const std::uint8_t> file, const OpenOptions& options)
         -> std::unique_ptr<RowReader> { return std::make_unique<PngRowReader>(file, options); },
     .removeForeign = removeWhatPngLacks,
-    .writer = [](PictureSize size, bool hasAlpha, KeptMetadata kept,
+    .writer = [](PictureSize size, bool hasAlpha,
                  const SaveOptions& options) -> std::unique_ptr<RowWriter> {
-      return std::make_unique<PngRowWriter>(size, hasAlpha, kept, options);
+      return std::make_unique<PngRowWriter>(size, hasAlpha, options);
     },
 };
 

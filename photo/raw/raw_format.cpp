@@ -55,7 +55,7 @@ class RawWriter : public RowWriter {
     file_.insert(file_.end(), bytes, bytes + std::size_t{width_} * count * sizeof(RGBA8Pixel));
   }
 
-  std::vector<std::uint8_t> finish() override { return std::move(file_); }
+  std::vector<std::uint8_t> finish(const KeptMetadata&) override { return std::move(file_); }
 
  private:
   std::uint32_t width_;
@@ -76,8 +76,9 @@ constinit const Format rawFormat = {
     .reader = [](std::span<const std::uint8_t> file, const OpenOptions& options)
         -> std::unique_ptr<RowReader> { return std::make_unique<RawReader>(file, options); },
     .removeForeign = [](KeptMetadata& kept) { kept = {}; },  // nothing but pixels is what they are
-    .writer = [](PictureSize size, bool, KeptMetadata, const SaveOptions&)
-        -> std::unique_ptr<RowWriter> { return std::make_unique<RawWriter>(size); },
+    .writer = [](PictureSize size, bool, const SaveOptions&) -> std::unique_ptr<RowWriter> {
+      return std::make_unique<RawWriter>(size);
+    },
 };
 
 }  // namespace pelorin::photo
