@@ -29,8 +29,14 @@ class JpegRowReader : public RowReader {
     facts_.channels = header.components;
     facts_.progressive = header.progressive;
     addStatedFacts(header.metadata, facts_);
+    if (header.components == 4) facts_.notices.push_back("is CMYK, converted to sRGB");
     // A profile for grey or CMYK does not describe RGB.
-    if (header.components != 3) removeColourProfile(header.metadata);
+    if (header.components != 3) {
+      const std::size_t before = header.metadata.size();
+      removeColourProfile(header.metadata);
+      if (header.components == 1 && header.metadata.size() < before)
+        facts_.notices.push_back("has a colour profile for grey, which the result cannot keep");
+    }
     const auto tail = file.subspan(jpegEnd(file));
     metadata_ = {.segments = std::move(header.metadata),
                  .tail = {tail.begin(), tail.end()},

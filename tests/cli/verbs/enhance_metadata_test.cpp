@@ -57,6 +57,7 @@ TEST(KeptMetadata, OfACmykFileHasNoColourProfile) {
   const std::string in = folder.write("a.jpg", cmyk);
   const Finished run = quenby({"enhance", in, "-o", folder / "b.jpg"});
   EXPECT_EQ(run.exitCode, 0) << run.errors;
+  EXPECT_THAT(run.errors, testing::HasSubstr("is CMYK, converted to sRGB"));
   segments.erase(segments.begin() + 2);
   expectSegments(folder.read("b.jpg"), segments);
 }
