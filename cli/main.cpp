@@ -14,5 +14,6 @@ int main(int argc, char** argv) {
   addCompare(commandLine);
   addScore(commandLine);
   addKeypoints(commandLine);
+  addUndo(commandLine);
   return static_cast<int>(commandLine.run(argc, argv));
 }

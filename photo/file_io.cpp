@@ -75,14 +75,6 @@ void sync(const Descriptor& file, const std::string& path) {
   }
 }
 
-// A name that is not on the disk yet means the old file after a power cut, which is whole.
-void syncFolder(const char* folder) {
-  const int descriptor = ::open(folder, O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-  if (descriptor < 0) return;
-  ::fsync(descriptor);
-  ::close(descriptor);
-}
-
 // The file that `path` names after following symbolic links, which need not exist.
 fs::path linkTarget(fs::path path) {
   constexpr int mostLinks = 40;
@@ -230,10 +222,13 @@ Replacement::Replacement(const std::string& path, std::span<const std::uint8_t> 
   target_ = target;
   folder_ = target.has_parent_path() ? target.parent_path().string() : ".";
   mayReplace_ = options.mayReplace;
-  Descriptor file = makeTemporary(target.parent_path(), exists ? 0600 : 0666, temporary_);
-  if (exists) takeAfter(old, path, file, temporary_);
+  const std::string& model = options.like.empty() ? path : options.like;
+  if (!options.like.empty() && ::stat(model.c_str(), &old) != 0) throwError(errno, model);
+  const bool hasModel = exists || !options.like.empty();
+  Descriptor file = makeTemporary(target.parent_path(), hasModel ? 0600 : 0666, temporary_);
+  if (hasModel) takeAfter(old, model, file, temporary_);
   writeAll(file, temporary_, bytes);
-  if (exists && options.keepTimes) takeTimes(old, file, temporary_);
+  if (hasModel && options.keepTimes) takeTimes(old, file, temporary_);
   sync(file, temporary_);
   lock_ = file.release();
 }
@@ -250,12 +245,20 @@ void Replacement::replace() {
   if ((mayReplace_ ? ::rename(from, to) : renameToNew(from, to)) != 0) throwError(errno, target_);
   temporary_.clear();
   ::close(std::exchange(lock_, -1));
-  syncFolder(folder_.c_str());
+  syncFolder(folder_);
 }
 
 void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes,
                          const ReplaceOptions& options) {
   Replacement(path, bytes, options).replace();
+}
+
+// A name that is not on the disk yet means the old file after a power cut, which is whole.
+void syncFolder(const std::string& folder) {
+  const int descriptor = ::open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+  if (descriptor < 0) return;
+  ::fsync(descriptor);
+  ::close(descriptor);
 }
 
 void sweepLeftovers(const std::string& folder) {

@@ -16,6 +16,7 @@ std::vector<std::uint8_t> readFile(const std::string& path);
 struct ReplaceOptions {
   bool mayReplace = true;  ///< Else it stays, and to replace it is an error (EEXIST).
   bool keepTimes = false;  ///< The new file has its times of access and change.
+  std::string like = {};   ///< The file whose times, permissions and so on count instead.
 };
 
 /// A file that is written beside another and then takes its place. A replaced file keeps its
@@ -56,6 +57,9 @@ class Replacement {
 ///         is left behind.
 void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes,
                          const ReplaceOptions& options = {});
+
+/// Makes sure that the names in a folder are on the disk, where its file system can. Never fails.
+void syncFolder(const std::string& folder);
 
 /// Removes the temporaries that killed processes left in `folder` ("" is the current one). Those
 /// that a process still writes stay. Never fails: what cannot be removed stays.

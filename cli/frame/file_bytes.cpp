@@ -12,6 +12,7 @@
 
 #include "cli/frame/errors.h"
 #include "cli/frame/interrupt.h"
+#include "photo/backup.h"
 
 namespace fs = std::filesystem;
 
@@ -58,7 +59,7 @@ std::vector<std::uint8_t> readInput(const Input& input) {
 }
 
 void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes,
-                 const photo::ReplaceOptions& options) {
+                 const photo::ReplaceOptions& options, const std::string& backup) {
   try {
     std::error_code ignored;
     if (path == "-") {
@@ -66,7 +67,9 @@ void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes,
     } else if (fs::is_other(fs::status(path, ignored))) {
       writeSpecialFile(path, bytes);
     } else {
-      photo::writeFileAtomically(path, bytes, options);
+      photo::Replacement replacement(path, bytes, options);
+      if (!backup.empty()) photo::keepBackup(backup, path);
+      replacement.replace();
     }
   } catch (const std::system_error& error) {
     throw FileError((path == "-" ? "standard output" : path) +

@@ -16,9 +16,10 @@ std::vector<std::uint8_t> readInput(const Input& input);
 
 /// Writes a file in one step, old or new and never half; "-" and special files (/dev/null, a named
 /// pipe) are written as they come.
+/// @param backup  the folder that keeps a file that is replaced; empty for none.
 /// @throws FileError, naming the file, when it cannot be written, or is there and may not be
 ///         replaced; an old file is then as it was.
 void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes,
-                 const photo::ReplaceOptions& options);
+                 const photo::ReplaceOptions& options, const std::string& backup = {});
 
 }  // namespace pelorin::cli

@@ -40,7 +40,9 @@ Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter)
                .quality = options.quality,
                .keep = keepOptions(options.keep),
                .strict = options.keep.strict,
-               .replace = {.mayReplace = options.outputs.overwrite}};
+               .replace = {.mayReplace = options.outputs.overwrite || options.outputs.inPlace,
+                           .keepTimes = options.outputs.inPlace},
+               .backup = options.outputs.backup};
   if (work.faces.areNamed() && !filter.filter.parameters().readsFaces) {
     throw UsageError("--face: has no effect on " + filter.filter.name);
   }
@@ -76,14 +78,16 @@ Json jsonOf(const std::vector<photo::Loss>& lost) {
   return list;
 }
 
-ExitCode printPlan(const std::vector<PlannedFile>& plan, JsonOutput& json) {
+ExitCode printPlan(const std::vector<PlannedFile>& plan, bool inPlace, JsonOutput& json) {
   bool something = false;
   for (const PlannedFile& file : plan) {
     something = something || !file.skipped;
     json.add(describe(file, file.skipped ? "exists" : "planned"));
     if (json.wanted()) continue;
     fmt::print("{} -> {}{}\n", shownText(file.input.path), shownText(file.output),
-               file.skipped ? " (exists: skipped without --overwrite)" : "");
+               !file.skipped ? ""
+               : inPlace     ? " (replaced already: skipped)"
+                             : " (exists: skipped without --overwrite)");
   }
   return something ? ExitCode::allDone : ExitCode::nothingToDo;
 }
@@ -94,6 +98,7 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
                            const std::string& placeholders) {
   addInputOptions(verb, options.inputs);
   addOutputOptions(verb, options.outputs, "{stem}_{filter}.{ext}", placeholders);
+  addInPlaceOptions(verb, options.outputs);
   addFaceOptions(verb, options.faces);
   verb.option("--rotate", options.rotate,
               "Turn further by so many degrees clockwise, a multiple of 90")
@@ -118,25 +123,30 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
                      const FilterToApply& filter) {
   const Work work = readOptions(options, filter);
   const bool raw = work.photo.raw.has_value();
-  if (options.outputs.output.empty() && options.outputs.name.empty()) {
-    throw UsageError("say where results go: -o FILE, -o FOLDER, or --name to put them beside");
+  if (options.outputs.inPlace && (raw || work.photo.scale != 1)) {
+    throw UsageError("--in-place: photos are replaced at their full size (no --scale, no --raw)");
+  }
+  if (options.outputs.output.empty() && options.outputs.name.empty() && !options.outputs.inPlace) {
+    throw UsageError(
+        "say where results go: -o FILE, -o FOLDER, --name to put them beside, or --in-place");
   }
   if (options.outputs.output == "-" && (options.report.json || options.report.jsonLines)) {
     throw UsageError("-o -: standard output takes the picture or --json, not both");
   }
+  const std::vector<Input> inputs = expandInputs(options.inputs);
+  checkInPlace(options.outputs, inputs);
   if (options.outputs.name.empty()) {
     options.outputs.name = raw ? "{stem}_{filter}.rgba" : "{stem}_{filter}.{ext}";
   }
   std::map<std::string, std::string> values = filter.values;
   values["filter"] = filter.filter.name;
-  const std::vector<Input> inputs = expandInputs(options.inputs);
   const std::vector<PlannedFile> plan =
       planOutputs(inputs, options.inputs, options.outputs, values);
   for (const PlannedFile& file : plan) requireFormatOf(file.output, raw);
 
   const bool singleFile = isSingleFile(options.inputs, inputs);
   JsonOutput json(options.report, singleFile);
-  if (options.outputs.planOnly) return printPlan(plan, json);
+  if (options.outputs.planOnly) return printPlan(plan, options.outputs.inPlace, json);
 
   if (options.jobs == 1 && plan.size() > 1) recycleFreedMemory();
   const OutputFolders folders(plan);
@@ -152,7 +162,11 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
            [&](std::size_t index, const std::optional<Done>& done) {
              if (!done) {
                ++skipped;
-               talk.error(plan[index].output, "exists already; add --overwrite to replace it");
+               talk.error(
+                   plan[index].output,
+                   options.outputs.inPlace
+                       ? "was replaced already, as its backup tells; quenby undo puts it back"
+                       : "exists already; add --overwrite to replace it");
                json.add(describe(plan[index], "exists"));
                return;
              }

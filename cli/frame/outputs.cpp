@@ -5,6 +5,7 @@
 #include "cli/frame/errors.h"
 #include "cli/frame/nearest_name.h"
 #include "cli/frame/used_files.h"
+#include "photo/backup.h"
 #include "photo/format.h"
 
 namespace fs = std::filesystem;
@@ -111,6 +112,42 @@ void addOutputOptions(Verb verb, OutputOptions& options, const std::string& defa
       .group("Output");
 }
 
+void addInPlaceOptions(Verb verb, OutputOptions& options) {
+  verb.flag("--in-place", options.inPlace,
+            "Results replace their photos, whose times stay; needs --backup or --no-backup")
+      .group("Output");
+  verb.option("--backup", options.backup,
+              "Keep the replaced photos in this folder; quenby undo DIR puts them back, and photos "
+              "that it has are not done again")
+      .type("DIR")
+      .group("Output");
+  verb.flag("--no-backup", options.noBackup, "Replace photos for good").group("Output");
+}
+
+void checkInPlace(const OutputOptions& options, const std::vector<Input>& inputs) {
+  if (!options.inPlace) {
+    if (options.noBackup || !options.backup.empty()) {
+      throw UsageError("--backup and --no-backup are for --in-place");
+    }
+    return;
+  }
+  if (!options.output.empty() || !options.name.empty()) {
+    throw UsageError("--in-place: results replace their photos; leave out -o and --name");
+  }
+  if (options.noBackup == !options.backup.empty()) {
+    throw UsageError("--in-place: add --backup DIR to be able to undo it, or --no-backup");
+  }
+  std::error_code ignored;
+  const fs::path kept = options.backup.empty() ? fs::path() : fs::weakly_canonical(options.backup);
+  for (const Input& input : inputs) {
+    if (input.isStandardInput()) throw UsageError("--in-place: standard input has no place");
+    const fs::path below = fs::weakly_canonical(input.path, ignored).lexically_relative(kept);
+    if (!kept.empty() && !below.empty() && *below.begin() != "..") {
+      throw UsageError("--backup: " + input.path + " is in that folder; choose another one");
+    }
+  }
+}
+
 std::vector<PlannedFile> planOutputs(const std::vector<Input>& inputs, const InputOptions& named,
                                      const OutputOptions& options,
                                      const std::map<std::string, std::string>& values) {
@@ -129,6 +166,12 @@ std::vector<PlannedFile> planOutputs(const std::vector<Input>& inputs, const Inp
 
   std::vector<PlannedFile> plan;
   for (const Input& input : inputs) {
+    if (options.inPlace) {
+      const bool replaced = !options.backup.empty() && fs::exists(input.path, ignored) &&
+                            photo::isReplaced(options.backup, input.path);
+      plan.push_back({input, input.path, replaced});
+      continue;
+    }
     PlannedFile file = {input, intoFolder ? nameInFolder(input, options, values) : output, false};
     // Special files (/dev/null, a pipe) have nothing to lose.
     const fs::file_status status = fs::status(file.output, ignored);
@@ -136,7 +179,7 @@ std::vector<PlannedFile> planOutputs(const std::vector<Input>& inputs, const Inp
     file.skipped = exists && !options.overwrite;
     plan.push_back(std::move(file));
   }
-  refuseClashes(plan, named, options.overwrite);
+  refuseClashes(plan, named, options.overwrite || options.inPlace);
   return plan;
 }
 

@@ -16,6 +16,9 @@ struct OutputOptions {
   std::string name;    ///< `--name`: how files in a folder are called.
   bool overwrite = false;
   bool planOnly = false;
+  bool inPlace = false;  ///< Each result replaces its input, which `backup` keeps.
+  bool noBackup = false;
+  std::string backup;  ///< A folder.
 };
 
 /// Adds `-o`, `--name`, `--overwrite` and `-n` to a verb.
@@ -24,11 +27,17 @@ struct OutputOptions {
 void addOutputOptions(Verb verb, OutputOptions& options, const std::string& defaultName,
                       const std::string& placeholders);
 
+/// Adds `--in-place`, `--backup` and `--no-backup`.
+void addInPlaceOptions(Verb verb, OutputOptions& options);
+
+/// @throws UsageError where the options contradict one another.
+void checkInPlace(const OutputOptions& options, const std::vector<Input>& inputs);
+
 /// One input and the file it becomes.
 struct PlannedFile {
   Input input;
   std::string output;  ///< "-" is standard output.
-  bool skipped;        ///< There already, and `--overwrite` was not given.
+  bool skipped;        ///< There already, and not to be replaced (again).
 };
 
 /// Says for every input which file it becomes, before any work. In a folder a result is called

@@ -73,7 +73,7 @@ photo::SaveOptions saveOptions(const SaveChoice& choice) {
 void writePhoto(const std::string& path, std::span<const std::uint8_t> file,
                 const std::vector<photo::Loss>& lost, const SaveChoice& choice) {
   refuseLosses(lost, choice.strict);
-  writeOutput(path, file, choice.replace);
+  writeOutput(path, file, choice.replace, choice.backup);
 }
 
 std::vector<photo::Loss> savePicture(

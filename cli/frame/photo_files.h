@@ -31,6 +31,7 @@ struct SaveChoice {
   photo::KeepOptions keep = {};
   bool strict = false;  ///< Fail where metadata would be lost.
   photo::ReplaceOptions replace = {};
+  std::string backup = {};  ///< The folder that keeps what is replaced; empty for none.
 };
 
 /// For plots and drawings: without loss where the name says no format, thin lines in full colour.

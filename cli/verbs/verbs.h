@@ -16,5 +16,6 @@ void addKeypoints(CommandLine& commandLine);
 void addMasks(CommandLine& commandLine);
 void addScore(CommandLine& commandLine);
 void addSheet(CommandLine& commandLine);
+void addUndo(CommandLine& commandLine);
 
 }  // namespace pelorin::cli

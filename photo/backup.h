@@ -1,0 +1,33 @@
+#pragma once
+
+#include <string>
+#include <vector>
+
+namespace pelorin::photo {
+
+// A folder of backups holds files under the whole paths they had: it needs no list that could be
+// lost, and what stands in it can be put back by hand.
+
+/// Where `folder` keeps the file at `path`, links followed.
+/// @throws std::filesystem::filesystem_error when there is no such file.
+std::string backupPath(const std::string& folder, const std::string& path);
+
+/// Whether `folder` keeps another content of the file at `path` than it has now, so that it has been
+/// replaced since. @throws as above and as `readFile`.
+bool isReplaced(const std::string& folder, const std::string& path);
+
+/// Keeps the file at `path` in `folder`, on the disk before this returns: as a second name of it or,
+/// on another disk, as a copy with its times, permissions and attributes. Meant for files that are
+/// replaced next, not written into. Nothing is done where it is kept already.
+/// @throws std::system_error; nothing is then left behind but empty folders.
+void keepBackup(const std::string& folder, const std::string& path);
+
+/// The paths of the files that `folder` keeps, sorted.
+/// @throws std::filesystem::filesystem_error.
+std::vector<std::string> keptFiles(const std::string& folder);
+
+/// Puts the file that was at `path` back, in one step, and takes it out of `folder`.
+/// @throws std::system_error; the file at `path` and the backup are then as they were.
+void restoreBackup(const std::string& folder, const std::string& path);
+
+}  // namespace pelorin::photo

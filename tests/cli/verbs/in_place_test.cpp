@@ -1,0 +1,133 @@
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <sys/stat.h>
+
+#include "tests/cli/quenby_process.h"
+#include "tests/support/jpeg_files.h"
+
+namespace pelorin::test_support {
+namespace {
+
+namespace fs = std::filesystem;
+using testing::HasSubstr;
+
+struct Photos {
+  Photos() {
+    for (const char* name : {"in/a.jpg", "in/sub/b.jpg"}) {
+      const std::string path = folder.write(name, old);
+      const timespec times[] = {{1'000'000'000, 5}, {1'100'000'000, 7}};
+      EXPECT_EQ(::utimensat(AT_FDCWD, path.c_str(), times, 0), 0);
+      EXPECT_EQ(::chmod(path.c_str(), 0640), 0);
+    }
+    EXPECT_EQ(quenby({"enhance", folder / "in/a.jpg", "-o", folder / "expected.jpg"}).exitCode, 0);
+    expected = folder.read("expected.jpg");
+  }
+
+  Finished enhance(std::vector<std::string> arguments) const {
+    arguments.insert(arguments.begin(), {"enhance", "-r", folder / "in", "--in-place"});
+    return quenby(arguments);
+  }
+  struct stat statusOf(const std::string& name) const {
+    struct stat status = {};
+    EXPECT_EQ(::stat((folder / name).c_str(), &status), 0);
+    return status;
+  }
+
+  TemporaryFolder folder;
+  Bytes old = smallJpeg(), expected;
+};
+
+TEST(InPlace, ReplacesPhotosAndUndoRestoresAllOfThem) {
+  const Photos photos;
+  const struct stat before = photos.statusOf("in/a.jpg");
+  ASSERT_EQ(photos.enhance({"--backup", photos.folder / "kept"}).exitCode, 0);
+  for (const char* name : {"in/a.jpg", "in/sub/b.jpg"}) {
+    EXPECT_EQ(photos.folder.read(name), photos.expected);
+    const struct stat after = photos.statusOf(name);
+    EXPECT_EQ(after.st_mtim.tv_sec, 1'100'000'000);
+    EXPECT_EQ(after.st_mtim.tv_nsec, 7);
+    EXPECT_EQ(after.st_mode & 07777, 0640u);
+  }
+  const Finished plan = quenby({"undo", photos.folder / "kept", "-n"});
+  EXPECT_EQ(plan.output, photos.folder / "in/a.jpg" + "\n" + photos.folder / "in/sub/b.jpg" + "\n");
+  EXPECT_EQ(photos.folder.read("in/a.jpg"), photos.expected);
+  const Finished undone = quenby({"undo", photos.folder / "kept"});
+  EXPECT_EQ(undone.exitCode, 0) << undone.errors;
+  EXPECT_EQ(photos.folder.read("in/a.jpg"), photos.old);
+  EXPECT_EQ(photos.folder.read("in/sub/b.jpg"), photos.old);
+  const struct stat restored = photos.statusOf("in/a.jpg");
+  EXPECT_EQ(restored.st_ino, before.st_ino);  // the file itself, so all that is to it
+  EXPECT_EQ(restored.st_mtim.tv_nsec, 7);
+  EXPECT_TRUE(fs::is_empty(photos.folder / "kept"));
+  EXPECT_EQ(quenby({"undo", photos.folder / "kept"}).exitCode, 3);
+}
+
+TEST(InPlace, DoesNoPhotoTwiceWhoseBackupIsThere) {
+  const Photos photos;
+  const std::string kept = photos.folder / "kept";
+  ASSERT_EQ(
+      quenby({"enhance", photos.folder / "in/a.jpg", "--in-place", "--backup", kept}).exitCode, 0);
+  const Finished again = photos.enhance({"--backup", kept});
+  EXPECT_THAT(again.errors, HasSubstr("a.jpg: was replaced already, as its backup tells"));
+  EXPECT_EQ(photos.folder.read("in/a.jpg"), photos.expected);
+  EXPECT_EQ(photos.folder.read("in/sub/b.jpg"), photos.expected);
+  EXPECT_EQ(photos.enhance({"--backup", kept}).exitCode, 3);
+  EXPECT_THAT(photos.enhance({"--backup", kept, "-n"}).output, HasSubstr("(replaced already"));
+}
+
+TEST(InPlace, AsksWhatBecomesOfTheOldPhotos) {
+  const Photos photos;
+  for (const std::vector<std::string>& arguments :
+       {std::vector<std::string>{},
+        {"--backup", photos.folder / "kept", "--no-backup"},
+        {"--no-backup", "-o", photos.folder / "in"},
+        {"--no-backup", "--name", "{stem}.jpg"},
+        {"--no-backup", "--scale", "2"},
+        {"--backup", photos.folder / "in"}}) {
+    const Finished run = photos.enhance(arguments);
+    EXPECT_EQ(run.exitCode, 2) << run.errors;
+    EXPECT_EQ(photos.folder.read("in/a.jpg"), photos.old);
+  }
+  EXPECT_EQ(
+      quenby({"enhance", photos.folder / "in/a.jpg", "-o", photos.folder / "x.jpg", "--no-backup"})
+          .exitCode,
+      2);
+  EXPECT_EQ(photos.enhance({"--no-backup"}).exitCode, 0);
+  EXPECT_EQ(photos.folder.read("in/a.jpg"), photos.expected);
+}
+
+// Killed at every call that changes a file, one after the other: about twenty runs.
+TEST(InPlace, LeavesOldOrNewPhotosWhenKilledAndGoesOnAfterwards) {
+  const Photos photos;
+  fs::remove_all(photos.folder / "in/sub");
+  const std::string kept = photos.folder / "kept", trace = photos.folder / "trace";
+  const std::string command =
+      " $QUENBY enhance -q " + photos.folder / "in/a.jpg" + " --in-place --backup " + kept;
+  int kills = 0;
+  for (const std::string name :
+       {"mkdir", "fchown", "fchmod", "write", "utimensat", "fsync", "link", "rename"}) {
+    for (int time = 1;; ++time) {
+      const std::string place = name + " " + std::to_string(time);
+      const Finished run =
+          shell("ASAN_OPTIONS=detect_leaks=0 strace -f -o " + trace + " -e inject=" + name +
+                ":signal=KILL:when=" + std::to_string(time) + command);
+      if (!photos.folder.has("trace")) GTEST_SKIP() << "strace cannot trace here";
+      const Bytes now = photos.folder.read("in/a.jpg");
+      EXPECT_TRUE(now == photos.old || now == photos.expected) << place;
+      if (run.exitCode != 0) shell(command);
+      EXPECT_EQ(photos.folder.read("in/a.jpg"), photos.expected) << place;
+      for (const std::string& file : photos.folder.content()) {
+        EXPECT_FALSE(file.ends_with(".tmp")) << place;
+      }
+      EXPECT_EQ(quenby({"undo", kept}).exitCode, 0) << place;
+      EXPECT_EQ(photos.folder.read("in/a.jpg"), photos.old) << place;
+      if (run.exitCode == 0) break;
+      ++kills;
+      ASSERT_LT(time, 50);
+    }
+  }
+  EXPECT_GE(kills, 10);
+}
+
+}  // namespace
+}  // namespace pelorin::test_support
