@@ -130,13 +130,15 @@ int32_t quenby_group_pairs(const quenby_pair* pairs, size_t pair_count, size_t s
     array(first_of, shot_count, "first_of");
     std::vector<photo::ShotPair> ties(pair_count);
     for (size_t i = 0; i < pair_count; ++i) {
-      if (pairs[i].first >= shot_count || pairs[i].second >= shot_count) {
-        refuse("pairs", "a place is not below the number of shots");
+      if (pairs[i].second >= shot_count || pairs[i].first >= pairs[i].second) {
+        refuse("pairs", "places are not in order, below the number of shots");
       }
+      if (std::isnan(pairs[i].score)) refuse("pairs", "a score is no number");
       ties[i].first = static_cast<size_t>(pairs[i].first);
       ties[i].second = static_cast<size_t>(pairs[i].second);
+      ties[i].score = pairs[i].score;
     }
-    const std::vector<photo::DupeGroup> groups = photo::groupPairs(shot_count, ties);
+    const std::vector<photo::DupeGroup> groups = photo::groupWholly(shot_count, ties);
     for (size_t i = 0; i < shot_count; ++i) first_of[i] = i;
     for (const photo::DupeGroup& group : groups) {
       for (const size_t photo : group.photos) first_of[photo] = group.photos.front();

@@ -415,8 +415,9 @@ QUENBY_API int32_t quenby_find_pairs(const quenby_shot* shots, size_t count, flo
 
 QUENBY_API void quenby_pairs_free(quenby_pairs* pairs);
 
-/** The groups that pairs tie together, directly or through others.
- * @param pairs       `pair_count` pairs of places below `shot_count`; may be null when there are none.
+/** The groups of pairs: in each, every two shots are a pair.
+ * @param pairs       `pair_count` pairs of places below `shot_count`, first < second, with scores that
+ *                    are numbers; may be null when there are none.
  * @param first_of    `shot_count` numbers, written: of each shot the first of its group, its own place
  *                    when it is in none. */
 QUENBY_API int32_t quenby_group_pairs(const quenby_pair* pairs, size_t pair_count,

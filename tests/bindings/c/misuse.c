@@ -321,6 +321,11 @@ static void duplicates(void) {
   INVALID(quenby_group_pairs(&pair, 1, 2, first_of, e));
   pair.first = UINT64_MAX;
   INVALID(quenby_group_pairs(&pair, 1, 2, first_of, e));
+  pair.first = pair.second = 1;
+  INVALID(quenby_group_pairs(&pair, 1, 2, first_of, e));
+  pair.first = 0;
+  pair.score = NAN;
+  INVALID(quenby_group_pairs(&pair, 1, 2, first_of, e));
   INVALID(quenby_group_pairs(NULL, 1, 2, first_of, e));
   INVALID(quenby_group_pairs(NULL, 0, 2, NULL, e));
   INVALID(quenby_group_pairs(&pair, SIZE_MAX, 2, first_of, e));

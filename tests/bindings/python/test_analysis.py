@@ -19,18 +19,23 @@ def test_find_duplicates_finds_what_the_command_finds(quenby_command, photo, png
     Image.fromarray(255 - picture(200, 150, 9)[::-1] // 3).save(other)
     text = tmp_path / "text.jpg"
     text.write_text("no photo")
-    paths = [str(path) for path in (photo, bright, png, other)]
-    wanted = json.loads(quenby_command("dupes", *paths, "--json", "--threshold", "-1"))
+    copy = tmp_path / "copy.png"
+    copy.write_bytes(png.read_bytes())
+    paths = [str(path) for path in (photo, bright, png, other, copy)]
+    wanted = json.loads(quenby_command("dupes", *paths, "--json", "--threshold", "-1", "--unknown-times"))
     found = quenby.find_duplicates([*paths, text, photo], threshold=-1, workers=2)
-    assert [list(group.paths) for group in found.groups] == [
-        [photo["file"] for photo in group["photos"]] for group in wanted["groups"]
-    ]
     assert len(found.groups) > 0
-    for group, said in zip(found.groups, wanted["groups"]):
-        for pair, also in zip(group.pairs, said["pairs"]):
-            assert (pair.first, pair.second) == (also["a"], also["b"])
-            assert pair.score == pytest.approx(also["score"], abs=1e-8)
-            assert (pair.seconds is not None) == also["timesKnown"]
+    for groups, said in ((found.groups, wanted["groups"]), (found.look_alikes, wanted["lookAlikes"])):
+        assert [list(group.paths) for group in groups] == [
+            [photo["file"] for photo in group["photos"]] for group in said
+        ]
+        for group, also in zip(groups, said):
+            assert [(p.first, p.second) for p in group.pairs] == [
+                (p["a"], p["b"]) for p in also["pairs"]
+            ]
+            for pair, other_pair in zip(group.pairs, also["pairs"]):
+                assert pair.score == pytest.approx(other_pair["score"], abs=1e-8)
+                assert (pair.seconds is not None) == other_pair["timesKnown"]
     assert list(found.failed) == [str(text)]
     assert found.failed[str(text)].kind == "not a photo"
     again = pickle.loads(pickle.dumps(found))

@@ -12,11 +12,14 @@ from typing import Any, Optional
 import numpy as np
 import numpy.typing as npt
 
-from ._library import Cancel, Cancelled, CPairs, CShot, call, plain, pointer_of
+from ._library import Cancel, Cancelled, CPair, CPairs, CShot, call, plain, pointer_of
 from ._photos import Photo, open_options, opened
 from ._pixels import AnyPhoto, Path, file_bytes, floats, pixels_of, rgba_of
 
 Cdf = npt.NDArray[np.float32]
+
+# As the command has it: without times, pictures that merely have as many dark and bright parts reach 0.
+_least_untimed_score = 3.0
 
 
 def _shot_of(file: bytes, cancel: Optional[Cancel] = None) -> CShot:
@@ -88,7 +91,7 @@ class Pair:
 
 @dataclass(frozen=True)
 class Group:
-    """Photos that pairs tie together, directly or through others."""
+    """Photos of which every two are a pair."""
 
     paths: tuple[str, ...]
     pairs: tuple[Pair, ...]
@@ -99,7 +102,35 @@ class Duplicates:
     """What find_duplicates found."""
 
     groups: tuple[Group, ...]
+    #: What looks alike, with scores from 3 on, where a time is not known: no reason to remove any.
+    look_alikes: tuple[Group, ...]
     failed: dict[str, Exception]  #: Photos that could not be read, and why.
+
+
+def _groups(names: list[str], given: list[CPair]) -> tuple[Group, ...]:
+    pairs, first_of = (CPair * len(given))(*given), (c_uint64 * len(names))()
+    call("group_pairs", pairs, len(given), len(names), first_of)
+    inside: dict[int, list[Pair]] = {}
+    for pair in given:
+        first = first_of[pair.first]
+        if first != first_of[pair.second]:
+            continue
+        inside.setdefault(first, []).append(
+            Pair(
+                names[pair.first],
+                names[pair.second],
+                pair.score,
+                pair.distance,
+                pair.seconds if pair.times_known else None,
+                bool(pair.same_orientation),
+            )
+        )
+    return tuple(
+        Group(
+            tuple(name for name, of in zip(names, first_of) if of == first), tuple(inside[first])
+        )
+        for first in sorted(inside)
+    )
 
 
 def find_duplicates(
@@ -110,7 +141,7 @@ def find_duplicates(
     cancel: Optional[Cancel] = None,
 ) -> Duplicates:
     """The near-duplicates among files, as `quenby dupes` finds them: shots of one scene a moment apart.
-    Photos without a capture time are compared with all others, the time between taken as 0.
+    Photos without a capture time are in no group; those that look alike are told apart from them.
 
     threshold:  the smallest score of a pair.
     workers:    how many files are read at once; as many as there are processors unless given.
@@ -133,26 +164,9 @@ def find_duplicates(
     found = {name: shot for name, shot in shots.items() if shot is not None}
     names = list(found)
     given, pairs = (CShot * len(names))(*found.values()), CPairs()
-    first_of = (c_uint64 * len(names))()
     call("find_pairs", given, len(names), threshold, pointer_of(cancel), byref(pairs))
-    try:
-        call("group_pairs", pairs.data, pairs.count, len(names), first_of)
-        tied: dict[int, list[Pair]] = {}
-        for pair in pairs.data[: pairs.count]:
-            tied.setdefault(first_of[pair.first], []).append(
-                Pair(
-                    names[pair.first],
-                    names[pair.second],
-                    pair.score,
-                    pair.distance,
-                    pair.seconds if pair.times_known else None,
-                    bool(pair.same_orientation),
-                )
-            )
-    finally:
-        plain("pairs_free", byref(pairs))
-    groups = []
-    for first in sorted(tied):
-        members = tuple(name for name, of in zip(names, first_of) if of == first)
-        groups.append(Group(members, tuple(tied[first])))
-    return Duplicates(tuple(groups), failed)
+    every = [CPair.from_buffer_copy(pair) for pair in pairs.data[: pairs.count]]
+    plain("pairs_free", byref(pairs))
+    timed = [pair for pair in every if pair.times_known]
+    alike = [p for p in every if not p.times_known and p.score >= _least_untimed_score]
+    return Duplicates(_groups(names, timed), _groups(names, alike), failed)
