@@ -211,6 +211,26 @@ bool isGainMap(Bytes file) {
   return false;
 }
 
+bool samsungHoldsPictures(Bytes trailer) {
+  constexpr std::size_t entrySize = 12, blockHead = 8;  // mark and kind, the length of the name
+  if (samsungLength(trailer) != trailer.size()) return false;
+  const std::uint64_t tableSize = littleEndian32(trailer, trailer.size() - 8);
+  const auto tablePlace = static_cast<std::size_t>(trailer.size() - 8 - tableSize);
+  const Bytes table = trailer.subspan(tablePlace);
+  const std::uint64_t count = littleEndian32(table, 8);
+  for (std::size_t i = 0; i < count; ++i) {
+    const std::uint64_t back = littleEndian32(table, entrySize * (i + 1) + 4);
+    if (back < blockHead || back > tablePlace) continue;
+    const Bytes block = trailer.subspan(tablePlace - static_cast<std::size_t>(back),
+                                        static_cast<std::size_t>(back));
+    const std::uint64_t nameSize = littleEndian32(block, 4);
+    if (nameSize > block.size() - blockHead) continue;
+    const Bytes data = block.subspan(blockHead + static_cast<std::size_t>(nameSize));
+    if (textOf(data).starts_with("\xFF\xD8\xFF")) return true;
+  }
+  return false;
+}
+
 std::vector<TailPart> readTail(Bytes tail) {
   std::vector<TailPart> endings = takeEndings(tail);
   std::vector<TailPart> parts;

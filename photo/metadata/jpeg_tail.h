@@ -34,6 +34,10 @@ std::string_view nameOf(TailPart::Kind kind);
 /// by what the file says of their places. Any bytes are safe; zeros between parts belong to none.
 std::vector<TailPart> readTail(std::span<const std::uint8_t> tail);
 
+/// Whether a block of Samsung's trailer is another picture, such as the shots that one was made of.
+/// Any bytes are safe.
+bool samsungHoldsPictures(std::span<const std::uint8_t> trailer);
+
 /// Whether a JPEG file is a gain map by its own segments.
 bool isGainMap(std::span<const std::uint8_t> file);
 

@@ -121,8 +121,13 @@ std::vector<TailPart> keptTail(const Metadata& metadata, const PictureChange& ch
         }
         hasGainMap = true;
         break;
-      case Kind::video:
       case Kind::samsung:
+        if (options.location && samsungHoldsPictures(part.bytes)) {
+          lose("shows the picture as it was");
+          continue;
+        }
+        [[fallthrough]];
+      case Kind::video:
         if (!options.location) continue;  // videos tell it too
         break;
       case Kind::canonVrd:

@@ -140,14 +140,26 @@ TEST(KeptMetadata, NamesTheManifestThatAnEditBreaks) {
   EXPECT_EQ(written.text().find("c2pa"), std::string::npos);
 }
 
-TEST(KeptMetadata, KeepsSamsungsTrailerAtTheEnd) {
-  const std::string block = "\0\0\x30\x0A\x10\0\0\0MotionPhoto_Datafilm"s;
+Bytes samsungTrailer(const std::string& data) {
+  const std::string block = "\0\0\x30\x0A\x10\0\0\0MotionPhoto_Data"s + data;
   const auto little = [](std::size_t value) {
     return std::string{static_cast<char>(value), static_cast<char>(value >> 8), 0, 0};
   };
   const std::string table = "SEFH" + little(107) + little(1) + "\0\0\x30\x0A"s +
                             little(block.size()) + little(block.size());
-  const Bytes trailer = bytesOf(block + table + little(table.size()) + "SEFT");
+  return bytesOf(block + table + little(table.size()) + "SEFT");
+}
+
+TEST(KeptMetadata, HasNoSamsungTrailerThatShowsThePictureAsItWas) {
+  const Bytes shot = jpegWith(photoLikePicture(16, 16, 2));
+  const Written written = rewritten(phonePhoto(6, samsungTrailer({shot.begin(), shot.end()})));
+  EXPECT_EQ(written.lost, (std::vector<Loss>{{"Samsung trailer", "shows the picture as it was"}}));
+  EXPECT_TRUE(written.tail().empty());
+  EXPECT_EQ(written.text().find("MotionPhoto"), std::string::npos);
+}
+
+TEST(KeptMetadata, KeepsSamsungsTrailerAtTheEnd) {
+  const Bytes trailer = samsungTrailer("film");
   const Written written = rewritten(phonePhoto(6, trailer));
   EXPECT_TRUE(written.lost.empty());
   EXPECT_EQ(written.tail(), trailer);
