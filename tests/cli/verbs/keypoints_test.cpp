@@ -213,11 +213,13 @@ TEST_F(Keypoints, AreNoneInATinyPicture) {
 TEST_F(Keypoints, AreThoseOfTheUprightPicture) {
   const Bytes exif = exifPayload({6, "", "", ""}, false);
   const Bytes file = jpegOf(picture, {{0xE1, exif}});
-  const auto upright =
-      photo::turned(std::make_shared<Image<RGBA8Pixel>>(decoded(file)), photo::uprightTurn(6));
+  const Image<RGBA8Pixel> stored = decoded(file);
+  const Image<RGBA8Pixel> upright(stored.height, stored.width);
+  photo::turnRows(stored.row(0), 0, stored.height, {stored.width, stored.height},
+                  photo::uprightTurn(6), upright);
   const Finished run = quenby({"keypoints", "--text", "-"}, file);
   EXPECT_EQ(run.exitCode, 0) << run.errors;
-  EXPECT_EQ(run.output, engineText(*upright, 9, 20, true));
+  EXPECT_EQ(run.output, engineText(upright, 9, 20, true));
 }
 
 TEST_F(Keypoints, AreDrawnOverThePhoto) {
