@@ -6,6 +6,8 @@
 #include <algorithm>
 #include <cerrno>
 #include <filesystem>
+#include <iterator>
+#include <string_view>
 #include <system_error>
 
 #include "photo/file_io.h"
@@ -14,6 +16,19 @@ namespace fs = std::filesystem;
 
 namespace pelorin::photo {
 namespace {
+
+// Tells a folder of backups from others, whose files would go astray.
+constexpr const char* markName = ".quenby-backup";
+
+void markFolder(const fs::path& folder) {
+  constexpr std::string_view text =
+      "Photos that quenby replaced in place; quenby undo puts them back.\n";
+  std::error_code ignored;
+  if (fs::exists(folder / markName, ignored)) return;
+  sweepLeftovers(folder.string());
+  writeFileAtomically((folder / markName).string(),
+                      {reinterpret_cast<const std::uint8_t*>(text.data()), text.size()});
+}
 
 fs::path placeIn(const std::string& folder, const fs::path& path) {
   return fs::path(folder) / path.relative_path();
@@ -44,6 +59,7 @@ void keepBackup(const std::string& folder, const std::string& path) {
   const fs::path original = fs::canonical(path);
   const fs::path backup = placeIn(folder, original);
   fs::create_directories(backup.parent_path());
+  markFolder(folder);
   if (::link(original.c_str(), backup.c_str()) == 0) {
     syncFolder(backup.parent_path().string());
   } else if (errno == EEXIST) {
@@ -53,10 +69,17 @@ void keepBackup(const std::string& folder, const std::string& path) {
   }
 }
 
+bool isBackupFolder(const std::string& folder) {
+  return fs::is_directory(folder) &&
+         (fs::is_empty(folder) || fs::exists(fs::path(folder) / markName));
+}
+
 std::vector<std::string> keptFiles(const std::string& folder) {
   std::vector<std::string> paths;
+  sweepLeftovers(folder);
   for (const fs::directory_entry& entry : fs::recursive_directory_iterator(folder)) {
-    if (!entry.is_regular_file()) continue;
+    if (entry.is_directory()) sweepLeftovers(entry.path().string());
+    if (!entry.is_regular_file() || entry.path().filename() == markName) continue;
     paths.push_back((fs::path("/") / entry.path().lexically_relative(folder)).string());
   }
   std::sort(paths.begin(), paths.end());
@@ -80,6 +103,8 @@ void restoreBackup(const std::string& folder, const std::string& path) {
        above = above.parent_path()) {
     if (!fs::remove(above, notEmpty)) break;
   }
+  const fs::directory_iterator entries(folder);
+  if (std::distance(entries, {}) == 1) fs::remove(fs::path(folder) / markName, notEmpty);
 }
 
 }  // namespace pelorin::photo

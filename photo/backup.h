@@ -6,7 +6,8 @@
 namespace pelorin::photo {
 
 // A folder of backups holds files under the whole paths they had: it needs no list that could be
-// lost, and what stands in it can be put back by hand.
+// lost, and what stands in it can be put back by hand. A file of its own, ".quenby-backup",
+// tells it from other folders.
 
 /// Where `folder` keeps the file at `path`, links followed.
 /// @throws std::filesystem::filesystem_error when there is no such file.
@@ -22,7 +23,11 @@ bool isReplaced(const std::string& folder, const std::string& path);
 /// @throws std::system_error; nothing is then left behind but empty folders.
 void keepBackup(const std::string& folder, const std::string& path);
 
-/// The paths of the files that `folder` keeps, sorted.
+/// Whether `folder` is one of backups, or empty.
+/// @throws std::filesystem::filesystem_error.
+bool isBackupFolder(const std::string& folder);
+
+/// The paths of the files that `folder` keeps, sorted; what killed processes left in it goes.
 /// @throws std::filesystem::filesystem_error.
 std::vector<std::string> keptFiles(const std::string& folder);
 

@@ -1,6 +1,5 @@
 #include <fmt/format.h>
 
-#include <filesystem>
 #include <memory>
 #include <string>
 #include <vector>
@@ -23,9 +22,9 @@ struct UndoOptions {
 };
 
 ExitCode runUndo(const UndoOptions& options) {
-  std::error_code ignored;
-  if (!std::filesystem::is_directory(options.folder, ignored)) {
-    throw UsageError(options.folder + ": is no folder; name the one given with --backup");
+  if (!photo::isBackupFolder(options.folder)) {
+    throw UsageError(options.folder +
+                     ": is no folder of backups; name the one given with --backup");
   }
   std::vector<Input> files;
   for (const std::string& path : photo::keptFiles(options.folder)) files.push_back({path, {}});

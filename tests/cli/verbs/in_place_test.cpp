@@ -62,6 +62,28 @@ TEST(InPlace, ReplacesPhotosAndUndoRestoresAllOfThem) {
   EXPECT_EQ(quenby({"undo", photos.folder / "kept"}).exitCode, 3);
 }
 
+TEST(InPlace, UndoTakesNoOtherFolderForBackups) {
+  const Photos photos;
+  for (const std::string& folder : std::vector<std::string>{
+           photos.folder / "in", photos.folder / "in/a.jpg", photos.folder / "none"}) {
+    const Finished run = quenby({"undo", folder});
+    EXPECT_EQ(run.exitCode, 2);
+    EXPECT_THAT(run.errors,
+                HasSubstr(folder + ": is no folder of backups; name the one given with"));
+  }
+  EXPECT_EQ(photos.folder.read("in/a.jpg"), photos.old);
+}
+
+TEST(InPlace, UndoPassesOverWhatAKilledCopyLeft) {
+  const Photos photos;
+  ASSERT_EQ(photos.enhance({"--backup", photos.folder / "kept"}).exitCode, 0);
+  const std::string left = "kept" + (photos.folder / "in/.quenby-1-0.tmp");
+  photos.folder.write(left, photos.old);
+  EXPECT_EQ(quenby({"undo", photos.folder / "kept"}).exitCode, 0);
+  EXPECT_FALSE(photos.folder.has(left));
+  EXPECT_FALSE(photos.folder.has("in/.quenby-1-0.tmp"));
+}
+
 TEST(InPlace, DoesNoPhotoTwiceWhoseBackupIsThere) {
   const Photos photos;
   const std::string kept = photos.folder / "kept";
