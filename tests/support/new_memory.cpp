@@ -62,6 +62,14 @@ void* operator new(std::size_t size) {
 void* operator new[](std::size_t size) {
   return operator new(size);
 }
+// std::stable_sort takes its memory so; the blocks are freed below all the same.
+void* operator new(std::size_t size, const std::nothrow_t&) noexcept {
+  void* const block = std::malloc(size);
+  return block == nullptr ? nullptr : pelorin::test_support::watched(block, size);
+}
+void* operator new[](std::size_t size, const std::nothrow_t& never) noexcept {
+  return operator new(size, never);
+}
 void operator delete(void* block) noexcept {
   std::free(block);
 }
