@@ -15,5 +15,6 @@ int main(int argc, char** argv) {
   addScore(commandLine);
   addKeypoints(commandLine);
   addUndo(commandLine);
+  addPages(commandLine);
   return static_cast<int>(commandLine.run(argc, argv));
 }

@@ -8,6 +8,8 @@
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
+#include <string_view>
+#include <utility>
 
 #include "cli/frame/errors.h"
 #include "cli/frame/interrupt.h"
@@ -26,6 +28,30 @@ std::vector<std::string> optionNames(const CLI::App& app) {
   return names;
 }
 
+std::vector<OptionText> optionTexts(const CLI::App& app) {
+  std::vector<OptionText> texts;
+  for (const CLI::Option* option : app.get_options()) {
+    OptionText text = {.names = {},
+                       .value = option->get_type_name(),
+                       .help = option->get_description(),
+                       .heading = option->get_group(),
+                       .required = option->get_required(),
+                       .repeated = option->get_items_expected_max() > 1};
+    for (const std::string& name : option->get_snames()) text.names.push_back("-" + name);
+    for (const std::string& name : option->get_lnames()) text.names.push_back("--" + name);
+    if (text.names.empty() && text.value.empty()) text.value = option->get_name(true);
+    if (option->get_items_expected_max() == 0) text.value.clear();
+    texts.push_back(std::move(text));
+  }
+  return texts;
+}
+
+constexpr const char* exampleHeading = "Examples:\n";
+
+std::string exampleLine(const std::string& example) {
+  return "  " + example + "\n";
+}
+
 // A file that is opened while a standard stream is closed gets its number, and what is said to a
 // person ends in a photo. Opened the wrong way round, uses of the stream stay errors.
 void keepStandardDescriptors() {
@@ -42,7 +68,7 @@ void keepStandardDescriptors() {
 CommandLine::CommandLine()
     : app_(std::make_unique<CLI::App>("Quenby makes photos better, one or a thousand at a time.")) {
   app_->name("quenby");
-  app_->set_version_flag("--version", "quenby " PELORIN_VERSION, "Print the version and leave");
+  app_->set_version_flag("-V,--version", "quenby " PELORIN_VERSION, "Print the version and leave");
   app_->set_help_flag("-h,--help", "Print this help and leave");
   app_->require_subcommand(0, 1);
   app_->get_formatter()->label("SUBCOMMAND", "VERB");
@@ -60,10 +86,12 @@ CommandLine::~CommandLine() = default;
 Verb CommandLine::addVerb(const std::string& name, const std::string& summary,
                           const std::string& examples, std::function<ExitCode()> work) {
   CLI::App* verb = app_->add_subcommand(name, summary);
-  std::string footer = "Examples:\n";
+  std::vector<std::string> lines;
+  std::string footer = exampleHeading;
   for (std::size_t start = 0; start < examples.size();) {
     const std::size_t end = std::min(examples.find('\n', start), examples.size());
-    footer += "  " + examples.substr(start, end - start) + "\n";
+    lines.push_back(examples.substr(start, end - start));
+    footer += exampleLine(lines.back());
     start = end + 1;
   }
   footer +=
@@ -71,14 +99,40 @@ Verb CommandLine::addVerb(const std::string& name, const std::string& summary,
       "130 interrupted.";
   verb->footer(footer);
   verb->group("Verbs");
-  verbs_.push_back({verb, std::move(work)});
+  verbs_.push_back({verb, std::move(lines), std::move(work)});
   return Verb(verb);
+}
+
+void CommandLine::hide(const std::string& name) {
+  const auto verb =
+      std::ranges::find(verbs_, name, [](const Work& w) { return w.verb->get_name(); });
+  verb->hidden = true;
+  verb->verb->group("");
 }
 
 std::vector<std::string> CommandLine::verbNames() const {
   std::vector<std::string> names;
-  for (const Work& work : verbs_) names.push_back(work.verb->get_name());
+  for (const Work& work : verbs_) {
+    if (!work.hidden) names.push_back(work.verb->get_name());
+  }
   return names;
+}
+
+CommandText CommandLine::text() const {
+  CommandText text = {.name = app_->get_name(),
+                      .version = PELORIN_VERSION,
+                      .summary = app_->get_description(),
+                      .options = optionTexts(*app_),
+                      .verbs = {}};
+  for (const Work& work : verbs_) {
+    if (work.hidden) continue;
+    std::size_t shown = std::string_view(exampleHeading).size();
+    for (const std::string& example : work.examples) shown += exampleLine(example).size();
+    text.verbs.push_back({work.verb->get_name(), work.verb->get_description(),
+                          optionTexts(*work.verb), work.examples,
+                          work.verb->get_footer().substr(shown)});
+  }
+  return text;
 }
 
 ExitCode CommandLine::refuse(const std::string& message, const CLI::App* verb) const {
@@ -104,9 +158,9 @@ ExitCode CommandLine::run(int argc, char** argv) {
     arguments.erase(arguments.begin());
     arguments.push_back("--help");
   }
-  const std::vector<std::string> verbs = verbNames();
-  if (!arguments[0].starts_with('-') && std::ranges::find(verbs, arguments[0]) == verbs.end()) {
-    return refuse(unknownName("verb", arguments[0], verbs), nullptr);
+  const auto isCalled = [&](const Work& work) { return work.verb->get_name() == arguments[0]; };
+  if (!arguments[0].starts_with('-') && std::ranges::none_of(verbs_, isCalled)) {
+    return refuse(unknownName("verb", arguments[0], verbNames()), nullptr);
   }
   for (std::string& argument : arguments) {
     // CLI11 takes [a,b] for a list; here it can only be a file's name.

@@ -5,6 +5,7 @@
 #include <string>
 #include <vector>
 
+#include "cli/frame/command_text.h"
 #include "cli/frame/exit_code.h"
 #include "cli/frame/verb.h"
 
@@ -33,13 +34,21 @@ class CommandLine {
   Verb addVerb(const std::string& name, const std::string& summary, const std::string& examples,
                std::function<ExitCode()> work);
 
+  /// Hides a verb that is no user's from the help.
+  void hide(const std::string& name);
+
+  /// The help of everything added so far that is not hidden.
+  CommandText text() const;
+
   /// Reads the arguments and runs the verb they name.
   ExitCode run(int argc, char** argv);
 
  private:
   struct Work {
     CLI::App* verb;
+    std::vector<std::string> examples;
     std::function<ExitCode()> run;
+    bool hidden = false;
   };
 
   ExitCode refuse(const std::string& message, const CLI::App* verb) const;

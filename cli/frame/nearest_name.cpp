@@ -40,7 +40,8 @@ std::string nearestName(const std::string& name, const std::vector<std::string>&
   int least = std::numeric_limits<int>::max();
   for (const std::string& candidate : candidates) {
     const int changes = distance(name, candidate);
-    if (changes < least) {
+    const bool isNear = changes < static_cast<int>(std::max(name.size(), candidate.size()));
+    if (isNear && changes < least) {
       least = changes;
       nearest = candidate;
     }

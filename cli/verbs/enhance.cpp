@@ -43,7 +43,7 @@ void addEnhance(CommandLine& commandLine) {
       "quenby enhance --raw 640x480 in.rgba -o out.rgba --filter AE08bit",
       [options] { return runEnhance(*options); });
   verb.option("--filter", options->filter, "AE0 unless given; AE08bit needs less memory")
-      .type("NAME");
+      .type("FILTER");
   options->parameters =
       FilterOptions(verb, {&filterNamed(options->filter)}, "slider=0.4;gtmOnly=true;");
   addFilterFilesOptions(verb, options->files, "{stem}, {filter}, {ext} and {slider}");

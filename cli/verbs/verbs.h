@@ -14,6 +14,7 @@ void addLook(CommandLine& commandLine);
 void addLooks(CommandLine& commandLine);
 void addKeypoints(CommandLine& commandLine);
 void addMasks(CommandLine& commandLine);
+void addPages(CommandLine& commandLine);  // for the build
 void addScore(CommandLine& commandLine);
 void addSheet(CommandLine& commandLine);
 void addUndo(CommandLine& commandLine);

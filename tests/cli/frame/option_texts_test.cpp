@@ -20,7 +20,8 @@ TEST(NearestName, TakesTheFewestChanges) {
   EXPECT_EQ(nearestName("ae08bit", names), "AE08bit");
   EXPECT_EQ(nearestName("passthru", names), "PassThrough");
   EXPECT_EQ(nearestName("winter", names), "WinterRGB");
-  EXPECT_EQ(nearestName("", names), "AE0");
+  EXPECT_EQ(nearestName("", names), "");
+  EXPECT_EQ(nearestName("frobnicate", names), "");
   EXPECT_EQ(nearestName("x", {}), "");
 }
 

@@ -10,9 +10,11 @@ using testing::IsEmpty;
 using testing::StartsWith;
 
 TEST(CommandLine, PrintsItsVersion) {
-  const Finished run = quenby({"--version"});
-  EXPECT_EQ(run.exitCode, 0);
-  EXPECT_THAT(run.output, testing::MatchesRegex("quenby [0-9]+\\.[0-9]+\\.[0-9]+\n"));
+  for (const char* option : {"--version", "-V"}) {
+    const Finished run = quenby({option});
+    EXPECT_EQ(run.exitCode, 0);
+    EXPECT_THAT(run.output, testing::MatchesRegex("quenby [0-9]+\\.[0-9]+\\.[0-9]+\n"));
+  }
 }
 
 TEST(CommandLine, HelpsWithAListOfVerbs) {
@@ -45,6 +47,12 @@ TEST(CommandLine, NamesTheNearestVerb) {
   const Finished run = quenby({"enhnce", "a.jpg"});
   EXPECT_EQ(run.exitCode, 2);
   EXPECT_THAT(run.errors, StartsWith("quenby: unknown verb 'enhnce'; did you mean 'enhance'?"));
+}
+
+TEST(CommandLine, NamesNoVerbThatIsFar) {
+  const Finished run = quenby({"frobnicate"});
+  EXPECT_EQ(run.exitCode, 2);
+  EXPECT_THAT(run.errors, StartsWith("quenby: unknown verb 'frobnicate' (see quenby --help)"));
 }
 
 TEST(CommandLine, NamesTheNearestOption) {
