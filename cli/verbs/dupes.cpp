@@ -32,22 +32,19 @@ namespace {
 struct DupesOptions {
   InputOptions inputs;
   ReportOptions report;
-  std::string threshold = "0";
+  std::string threshold = fmt::format("{}", photo::leastDupeScore);
   std::string scale = "auto";
   std::string cache;
   std::string keep;
   std::string html;
   bool assumeFileTime = false;
   bool unknownTimes = false;
+  bool pairs = false;
   bool overwrite = false;
   int jobs = 1;
 };
 
 constexpr const char* verbName = "dupes";
-
-// Time tells more than light: pictures that merely have as many dark and bright parts reach 0 when
-// nothing is known of the time between. Copies and exposures of one scene are above 3.
-constexpr float leastUntimedScore = 3.0f;
 
 // A few hundred pieces: enough to share among cores and to show how far the search is.
 bool searchPairs(const std::vector<photo::Shot>& shots, float threshold,
@@ -231,7 +228,7 @@ void groupAlike(const std::vector<photo::ShotPair>& pairs, DupeReport& report) {
   for (const photo::ShotPair& pair : pairs) {
     if (pair.timesKnown) {
       timed.push_back(pair);
-    } else if (pair.score >= leastUntimedScore) {
+    } else if (pair.score >= photo::leastLookAlikeScore) {
       untimed.push_back(pair);
     }
   }
@@ -262,8 +259,9 @@ ExitCode runDupes(const DupesOptions& options) {
   std::vector<photo::ShotPair> pairs;
   if (!searchPairs(scan.library.shots, threshold, options, pairs)) return ExitCode::interrupted;
 
-  DupeReport report = {threshold, std::move(scan.library.photos), {},
-                       {},        std::move(scan.failed),         !options.keep.empty()};
+  DupeReport report = {threshold,    std::move(scan.library.photos), {},
+                       {},           std::move(scan.failed),         !options.keep.empty(),
+                       options.pairs};
   groupAlike(pairs, report);
   if (report.rank && !scorePhotos(options, cache.get(), scan.cacheTrouble, report)) {
     return ExitCode::interrupted;
@@ -289,13 +287,14 @@ void addDupes(CommandLine& commandLine) {
       verbName, "Find near-duplicates among photos: the same scene, a moment apart",
       "quenby dupes -r holiday\n"
       "quenby dupes -r photos -j 0 --cache photos.cache --html report.html\n"
-      "quenby dupes *.jpg --threshold 1.5 --keep best\n"
+      "quenby dupes *.jpg --threshold 2.5 --keep best\n"
       "quenby dupes -r photos --keep best --jsonl | jq -r '.ranking[]? | select(.keep | not).file'",
       [options] { return runDupes(*options); });
   addInputOptions(verb, options->inputs);
   verb.option("--threshold", options->threshold,
-              "Smallest score of a pair; 0 unless given, larger is stricter, the same photo "
-              "twice scores about 3.6")
+              fmt::format("Smallest score of a pair; {} unless given, larger is stricter, the same "
+                          "photo twice scores about 3.65",
+                          photo::leastDupeScore))
       .type("SCORE");
   verb.option("--scale", options->scale,
               "Decode photos at 1/1, 1/2, 1/4 or 1/8 of their size; auto, unless given, is "
@@ -304,8 +303,12 @@ void addDupes(CommandLine& commandLine) {
   verb.flag("--assume-mtime", options->assumeFileTime,
             "Photos without a capture time take that of their file; otherwise they are left out");
   verb.flag("--unknown-times", options->unknownTimes,
-            "Also tell which photos look alike where a time is not known: apart from the groups, "
-            "with scores from 3 on, and never ranked by --keep");
+            fmt::format("Also tell which photos look alike where a time is not known: apart from "
+                        "the groups, with scores from {} on, and never ranked by --keep",
+                        photo::leastLookAlikeScore));
+  verb.flag("--pairs", options->pairs,
+            "Tell every pair of a group with its score, time and distance; a group of n photos has "
+            "n (n - 1) / 2");
   verb.option("--cache", options->cache,
               "Keep what was read in this file, so that the next run reads only new and "
               "changed photos")

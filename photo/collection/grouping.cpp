@@ -8,27 +8,6 @@
 namespace pelorin::photo {
 namespace {
 
-// Disjoint sets; the first photo of a set stands for it.
-class Sets {
- public:
-  explicit Sets(std::size_t count) : parent_(count) {
-    std::iota(parent_.begin(), parent_.end(), std::size_t{0});
-  }
-
-  std::size_t of(std::size_t photo) {
-    while (parent_[photo] != photo) photo = parent_[photo] = parent_[parent_[photo]];
-    return photo;
-  }
-
-  void join(std::size_t a, std::size_t b) {
-    const auto [first, second] = std::minmax({of(a), of(b)});
-    parent_[second] = first;
-  }
-
- private:
-  std::vector<std::size_t> parent_;
-};
-
 // The groups of `members`, sets of photos in ascending order, with the pairs inside them.
 std::vector<DupeGroup> groupsOf(std::size_t photoCount,
                                 std::vector<std::vector<std::size_t>> members,
@@ -50,16 +29,6 @@ std::vector<DupeGroup> groupsOf(std::size_t photoCount,
 }
 
 }  // namespace
-
-std::vector<DupeGroup> groupPairs(std::size_t photoCount, const std::vector<ShotPair>& pairs) {
-  Sets sets(photoCount);
-  for (const ShotPair& pair : pairs) sets.join(pair.first, pair.second);
-  std::vector<std::vector<std::size_t>> members(photoCount);  // by the set's first photo
-  for (std::size_t photo = 0; photo < photoCount; ++photo) {
-    members[sets.of(photo)].push_back(photo);
-  }
-  return groupsOf(photoCount, std::move(members), pairs);
-}
 
 std::vector<DupeGroup> groupWholly(std::size_t photoCount, const std::vector<ShotPair>& pairs) {
   std::vector<std::vector<std::size_t>> partners(photoCount);  // ascending

@@ -7,16 +7,13 @@
 
 namespace pelorin::photo {
 
-/// Photos that pairs tie together, directly or through others.
+/// Photos of which every two are a pair.
 struct DupeGroup {
   std::vector<std::size_t> photos;  ///< Ascending, at least two.
   std::vector<ShotPair> pairs;      ///< The pairs among them, in the given order.
 };
 
-/// The groups that `pairs` make of `photoCount` photos, by their first photo.
-std::vector<DupeGroup> groupPairs(std::size_t photoCount, const std::vector<ShotPair>& pairs);
-
-/// Groups in which every two photos are a pair: each photo stays in one, the pairs with the highest
+/// The groups that `pairs` make of `photoCount` photos, by their first photo: each photo stays in one, the pairs with the highest
 /// scores come together first, and a pair whose groups cannot be joined whole is in none.
 std::vector<DupeGroup> groupWholly(std::size_t photoCount, const std::vector<ShotPair>& pairs);
 

@@ -407,7 +407,7 @@ QUENBY_API int32_t quenby_dupe_window(float threshold, int32_t same_orientation,
 /** Every pair of shots that reaches `threshold`, by `first`, then `second`. Shots without a time are
  * compared with all others, the time between taken as 0.
  * @param shots      may be null when `count` is 0.
- * @param threshold  not NaN; 0 is what `quenby dupes` takes.
+ * @param threshold  not NaN; 1.5 is what `quenby dupes` takes.
  * @param pairs      receives them; quenby_pairs_free frees them. */
 QUENBY_API int32_t quenby_find_pairs(const quenby_shot* shots, size_t count, float threshold,
                                      const quenby_cancel* cancel, quenby_pairs* pairs,

@@ -76,6 +76,7 @@ std::string figure(const photo::ScannedPhoto& photo, const std::vector<std::uint
 }
 
 std::string pairTable(const DupeReport& report, const photo::DupeGroup& group) {
+  if (toldPairs(report, group).empty()) return "";
   std::string html =
       "<table>\n<tr><th>Photo</th><th>Photo</th><th>Score</th><th>Seconds apart</th>"
       "<th>Distance</th><th>Orientation</th></tr>\n";
@@ -107,8 +108,8 @@ std::string htmlReport(const DupeReport& report,
         rank ? photo::rankGroup(group, report.photos) : std::vector<photo::Ranked>{};
     std::map<std::size_t, const photo::Ranked*> rankedOf;
     for (const photo::Ranked& ranked : ranking) rankedOf[ranked.photo] = &ranked;
-    html += fmt::format("<section>\n<h2>Group {}{}</h2>\n<div class=\"photos\">\n", g + 1,
-                        looksAlone ? ": look alike, time unknown" : "");
+    html += fmt::format("<section>\n<h2>Group {}{}</h2>\n<p>{}</p>\n<div class=\"photos\">\n",
+                        g + 1, looksAlone ? ": look alike, time unknown" : "", groupSummary(group));
     for (const std::size_t i : group.photos) {
       const photo::Ranked* ranked = rank ? rankedOf[i] : nullptr;
       html += figure(report.photos[i], thumbnails[i], ranked,

@@ -22,7 +22,7 @@ def test_find_duplicates_finds_what_the_command_finds(quenby_command, photo, png
     copy = tmp_path / "copy.png"
     copy.write_bytes(png.read_bytes())
     paths = [str(path) for path in (photo, bright, png, other, copy)]
-    wanted = json.loads(quenby_command("dupes", *paths, "--json", "--threshold", "-1", "--unknown-times"))
+    wanted = json.loads(quenby_command("dupes", *paths, "--json", "--threshold", "-1", "--unknown-times", "--pairs"))
     found = quenby.find_duplicates([*paths, text, photo], threshold=-1, workers=2)
     assert len(found.groups) > 0
     for groups, said in ((found.groups, wanted["groups"]), (found.look_alikes, wanted["lookAlikes"])):

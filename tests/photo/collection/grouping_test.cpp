@@ -12,35 +12,17 @@ ShotPair pairOf(std::size_t first, std::size_t second) {
   return pair;
 }
 
-TEST(Grouping, JoinsWhatPairsTieTogetherDirectlyOrThroughOthers) {
-  const std::vector<ShotPair> pairs = {pairOf(0, 4), pairOf(2, 6), pairOf(4, 5), pairOf(1, 5)};
-  const std::vector<DupeGroup> groups = groupPairs(8, pairs);
-  ASSERT_EQ(groups.size(), 2u);
-  EXPECT_EQ(groups[0].photos, (std::vector<std::size_t>{0, 1, 4, 5}));
-  EXPECT_EQ(groups[0].pairs, (std::vector<ShotPair>{pairs[0], pairs[2], pairs[3]}));
-  EXPECT_EQ(groups[1].photos, (std::vector<std::size_t>{2, 6}));
-  EXPECT_EQ(groups[1].pairs, std::vector<ShotPair>{pairs[1]});
+TEST(WholeGroups, LeaveOutPhotosWithoutAPair) {
+  EXPECT_TRUE(groupWholly(5, {}).empty());
+  EXPECT_TRUE(groupWholly(0, {}).empty());
 }
 
-TEST(Grouping, LeavesOutPhotosWithoutAPair) {
-  EXPECT_TRUE(groupPairs(5, {}).empty());
-  EXPECT_TRUE(groupPairs(0, {}).empty());
-}
-
-TEST(Grouping, OrdersGroupsByTheirFirstPhotoWhateverTheOrderOfPairs) {
-  const std::vector<DupeGroup> groups = groupPairs(6, {pairOf(3, 4), pairOf(1, 5), pairOf(0, 2)});
+TEST(WholeGroups, StandInTheOrderOfTheirFirstPhotos) {
+  const std::vector<DupeGroup> groups = groupWholly(6, {pairOf(3, 4), pairOf(1, 5), pairOf(0, 2)});
   ASSERT_EQ(groups.size(), 3u);
   EXPECT_EQ(groups[0].photos.front(), 0u);
   EXPECT_EQ(groups[1].photos.front(), 1u);
   EXPECT_EQ(groups[2].photos.front(), 3u);
-}
-
-TEST(Grouping, TakesALongChain) {
-  std::vector<ShotPair> pairs;
-  for (std::size_t i = 100'000; i-- > 1;) pairs.push_back(pairOf(i - 1, i));
-  const std::vector<DupeGroup> groups = groupPairs(100'000, pairs);
-  ASSERT_EQ(groups.size(), 1u);
-  EXPECT_EQ(groups[0].photos.size(), 100'000u);
 }
 
 // A and B, B and C alike, A and C not: no group may say that one stands for the other.

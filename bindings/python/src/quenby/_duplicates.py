@@ -19,7 +19,7 @@ from ._pixels import AnyPhoto, Path, file_bytes, floats, pixels_of, rgba_of
 Cdf = npt.NDArray[np.float32]
 
 # As the command has it: without times, pictures that merely have as many dark and bright parts reach 0.
-_least_untimed_score = 3.0
+_least_untimed_score = 3.5
 
 
 def _shot_of(file: bytes, cancel: Optional[Cancel] = None) -> CShot:
@@ -135,7 +135,7 @@ def _groups(names: list[str], given: list[CPair]) -> tuple[Group, ...]:
 
 def find_duplicates(
     paths: Iterable[Path],
-    threshold: float = 0.0,
+    threshold: float = 1.5,
     *,
     workers: Optional[int] = None,
     cancel: Optional[Cancel] = None,

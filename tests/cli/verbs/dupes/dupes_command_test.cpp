@@ -1,3 +1,4 @@
+#include <fmt/format.h>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <signal.h>
@@ -46,15 +47,19 @@ class Holiday {
     folder.write("held/turned.jpg", sceneJpeg(3, 100, takenAt("17:00:03", "", "", 6)));
     folder.write("held/late.jpg", sceneJpeg(3, 100, takenAt("17:00:20", "", "", 6)));
     folder.write("untimed/a.jpg", sceneJpeg(0, 100, {}));
-    folder.write("untimed/b.jpg", sceneJpeg(0, 90, {}));
+    folder.write("untimed/b.jpg", sceneJpeg(0, 100, {}));
   }
 
+  // Shots of these scenes differ more than those of real ones.
   Finished dupes(std::vector<std::string> arguments) const {
+    if (!std::count(arguments.begin(), arguments.end(), "--threshold")) {
+      arguments.insert(arguments.end(), {"--threshold", "0"});
+    }
     arguments.insert(arguments.begin(), {"dupes", "-r", folder.path()});
     return quenby(arguments);
   }
   Json json(std::vector<std::string> arguments = {}, int exitCode = 0) const {
-    arguments.push_back("--json");
+    arguments.insert(arguments.end(), {"--json", "--pairs"});
     const Finished run = dupes(arguments);
     EXPECT_EQ(run.exitCode, exitCode) << run.errors;
     return parsedJson(run.output);
@@ -219,7 +224,7 @@ TEST(DupesCommand, TellsApartWhatLooksAlikeAtATimeNotKnown) {
   EXPECT_EQ(alike["pairs"][0]["timesKnown"], false);
   EXPECT_EQ(alike["pairs"][0]["timeDifference"], 0.0);
   EXPECT_THAT(
-      holiday.dupes({"--unknown-times"}).output,
+      holiday.dupes({"--unknown-times", "--pairs"}).output,
       AllOf(HasSubstr("look alike, time unknown"), HasSubstr("time apart not known, taken as 0")));
 }
 
@@ -258,6 +263,40 @@ TEST(DupesCommand, TakesFileTimesOnlyWhenAsked) {
   fs::last_write_time(holiday.folder / "untimed/b.jpg", now + std::chrono::hours(1));
   const Json far = holiday.json({"--assume-mtime"});
   EXPECT_EQ(pairOf(holiday, far, "untimed/a.jpg", "untimed/b.jpg"), nullptr);
+}
+
+TEST(DupesCommand, TakesTheMeasuredThresholdUnlessOneIsGiven) {
+  const Holiday holiday;
+  EXPECT_EQ(parsedJson(quenby({"dupes", "-r", holiday.folder.path(), "--json"}).output),
+            parsedJson(holiday.dupes({"--threshold", "1.5", "--json"}).output));
+}
+
+// Pairs grow with the square of a group: they are told when somebody asks.
+TEST(DupesCommand, TellsMembersInsteadOfPairsAndWhichGroupsAreLarge) {
+  const TemporaryFolder folder;
+  const std::string first = folder.write("00.jpg", sceneJpeg(1, 100, takenAt("10:00:00")));
+  const auto run = [&](std::size_t photos, const std::vector<std::string>& more) {
+    for (std::size_t i = folder.content().size(); i < photos; ++i) {
+      fs::copy_file(first, folder / fmt::format("{:02}.jpg", i));
+    }
+    std::vector<std::string> arguments = {"dupes", "-r", folder.path()};
+    arguments.insert(arguments.end(), more.begin(), more.end());
+    return quenby(arguments);
+  };
+  const Finished small = run(20, {"--json"});
+  EXPECT_EQ(parsedJson(small.output)["groups"][0]["large"], false);
+  const Finished large = run(40, {"--json"});
+  const Json group = parsedJson(large.output)["groups"][0];
+  EXPECT_EQ(group["photos"].size(), 40u);
+  EXPECT_FALSE(group.contains("pairs"));
+  EXPECT_EQ(group["lowestScore"], group["highestScore"]);
+  EXPECT_EQ(group["seconds"], 0.0);
+  EXPECT_EQ(group["large"], true);
+  EXPECT_LT(large.output.size(), small.output.size() * 21 / 10);
+  EXPECT_THAT(run(40, {}).output, HasSubstr("Group 1: 40 photos, score 3.64, within 0.00 s; more "
+                                            "than 20: a series rather than doubles"));
+  EXPECT_EQ(parsedJson(run(40, {"--json", "--pairs"}).output)["groups"][0]["pairs"].size(),
+            40u * 39 / 2);
 }
 
 TEST(DupesCommand, IsStricterWithALargerThreshold) {

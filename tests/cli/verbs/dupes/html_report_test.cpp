@@ -10,7 +10,7 @@ using testing::HasSubstr;
 using testing::Not;
 
 DupeReport smallReport() {
-  DupeReport report = {0.5f, {}, {}, {}, {}, true};
+  DupeReport report = {0.5f, {}, {}, {}, {}, /*rank=*/true, /*pairs=*/true};
   for (const char* name : {"one.jpg", "<b>&\"two\".jpg", "three.jpg"}) {
     report.photos.push_back({name, 400, 300, 1, 1000, photo::TimeSource::none, ""});
   }
