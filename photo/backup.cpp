@@ -7,6 +7,7 @@
 #include <cerrno>
 #include <filesystem>
 #include <iterator>
+#include <stdexcept>
 #include <string_view>
 #include <system_error>
 
@@ -17,29 +18,58 @@ namespace fs = std::filesystem;
 namespace pelorin::photo {
 namespace {
 
-// Tells a folder of backups from others, whose files would go astray.
-constexpr const char* markName = ".quenby-backup";
+[[noreturn]] void throwError(int code, const fs::path& path) {
+  throw std::system_error(code, std::generic_category(), path.string());
+}
 
-void markFolder(const fs::path& folder) {
-  constexpr std::string_view text =
-      "Photos that quenby replaced in place; quenby undo puts them back.\n";
+// Tells a folder of backups from others, whose files would go astray.
+struct Mark {
+  const char* name;
+  std::string_view text;
+};
+constexpr Mark replacedMark = {
+    ".quenby-backup", "Photos that quenby replaced in place; quenby undo puts them back.\n"};
+constexpr Mark movedMark = {".quenby-moved",
+                            "Photos that quenby moved away; quenby undo puts them back.\n"};
+
+bool hasMark(const fs::path& folder, const Mark& mark) {
   std::error_code ignored;
-  if (fs::exists(folder / markName, ignored)) return;
+  return fs::exists(folder / mark.name, ignored);
+}
+
+bool isMarkName(const fs::path& name) {
+  return name == replacedMark.name || name == movedMark.name;
+}
+
+void markFolder(const fs::path& folder, const Mark& mark) {
+  if (hasMark(folder, mark)) return;
+  const Mark& other = &mark == &movedMark ? replacedMark : movedMark;
+  if (hasMark(folder, other)) throwError(EEXIST, folder / other.name);
   sweepLeftovers(folder.string());
-  writeFileAtomically((folder / markName).string(),
-                      {reinterpret_cast<const std::uint8_t*>(text.data()), text.size()});
+  writeFileAtomically((folder / mark.name).string(),
+                      {reinterpret_cast<const std::uint8_t*>(mark.text.data()), mark.text.size()});
 }
 
 fs::path placeIn(const std::string& folder, const fs::path& path) {
   return fs::path(folder) / path.relative_path();
 }
 
-[[noreturn]] void throwError(int code, const fs::path& path) {
-  throw std::system_error(code, std::generic_category(), path.string());
+// The mark comes first: until it is there, nothing else is in the folder.
+void makeRoom(const std::string& folder, const fs::path& backup, const Mark& mark) {
+  fs::create_directories(folder);
+  markFolder(folder, mark);
+  fs::create_directories(backup.parent_path());
 }
 
-void copyWhole(const std::string& from, const std::string& to) {
-  writeFileAtomically(to, readFile(from), {.keepTimes = true, .like = from});
+void copyWhole(const std::string& from, const std::string& to, bool mayReplace) {
+  writeFileAtomically(to, readFile(from),
+                      {.mayReplace = mayReplace, .keepTimes = true, .like = from});
+}
+
+// What this process is about to lose is read again from where it stands now.
+void removeCopied(const std::string& file, const std::string& copy) {
+  if (readFile(file) != readFile(copy)) throwError(EEXIST, copy);
+  if (::unlink(file.c_str()) != 0) throwError(errno, file);
 }
 
 }  // namespace
@@ -58,20 +88,37 @@ bool isReplaced(const std::string& folder, const std::string& path) {
 void keepBackup(const std::string& folder, const std::string& path) {
   const fs::path original = fs::canonical(path);
   const fs::path backup = placeIn(folder, original);
-  fs::create_directories(backup.parent_path());
-  markFolder(folder);
+  makeRoom(folder, backup, replacedMark);
   if (::link(original.c_str(), backup.c_str()) == 0) {
     syncFolder(backup.parent_path().string());
   } else if (errno == EEXIST) {
     if (isReplaced(folder, path)) throwError(EEXIST, backup);
   } else {
-    copyWhole(original.string(), backup.string());
+    copyWhole(original.string(), backup.string(), /*mayReplace=*/true);
   }
 }
 
+void moveToBackups(const std::string& folder, const std::string& path) {
+  const fs::path whole = fs::absolute(path);
+  const fs::path original = fs::canonical(whole.parent_path()) / whole.filename();
+  if (!fs::is_regular_file(fs::symlink_status(original))) throwError(EINVAL, original);
+  const fs::path backup = placeIn(folder, original);
+  makeRoom(folder, backup, movedMark);
+  if (renameToNew(original.c_str(), backup.c_str()) != 0) {
+    if (errno != EXDEV) throwError(errno, backup);
+    // A run that was killed between the two steps left a copy.
+    if (!fs::exists(backup)) copyWhole(original.string(), backup.string(), /*mayReplace=*/false);
+    syncFolder(backup.parent_path().string());
+    removeCopied(original.string(), backup.string());
+  }
+  syncFolder(backup.parent_path().string());
+  syncFolder(original.parent_path().string());
+}
+
 bool isBackupFolder(const std::string& folder) {
-  return fs::is_directory(folder) &&
-         (fs::is_empty(folder) || fs::exists(fs::path(folder) / markName));
+  if (!fs::is_directory(folder)) return false;
+  sweepLeftovers(folder);
+  return (fs::is_empty(folder) || hasMark(folder, replacedMark) || hasMark(folder, movedMark));
 }
 
 std::vector<std::string> keptFiles(const std::string& folder) {
@@ -79,7 +126,7 @@ std::vector<std::string> keptFiles(const std::string& folder) {
   sweepLeftovers(folder);
   for (const fs::directory_entry& entry : fs::recursive_directory_iterator(folder)) {
     if (entry.is_directory()) sweepLeftovers(entry.path().string());
-    if (!entry.is_regular_file() || entry.path().filename() == markName) continue;
+    if (!entry.is_regular_file() || isMarkName(entry.path().filename())) continue;
     paths.push_back((fs::path("/") / entry.path().lexically_relative(folder)).string());
   }
   std::sort(paths.begin(), paths.end());
@@ -88,13 +135,17 @@ std::vector<std::string> keptFiles(const std::string& folder) {
 
 void restoreBackup(const std::string& folder, const std::string& path) {
   const fs::path backup = placeIn(folder, path);
-  if (::rename(backup.c_str(), path.c_str()) == 0) {
+  const bool wasMoved = hasMark(folder, movedMark);
+  if (wasMoved) fs::create_directories(fs::path(path).parent_path());
+  if ((wasMoved ? renameToNew : ::rename)(backup.c_str(), path.c_str()) == 0) {
     // Two names of one file are both left by a rename.
     ::unlink(backup.c_str());
     syncFolder(fs::path(path).parent_path().string());
+  } else if (wasMoved && errno == EEXIST) {
+    throw std::runtime_error("there is a file of that name now; move it away first");
   } else if (errno == EXDEV) {
-    copyWhole(backup.string(), path);
-    ::unlink(backup.c_str());
+    copyWhole(backup.string(), path, /*mayReplace=*/!wasMoved);
+    removeCopied(backup.string(), path);
   } else {
     throwError(errno, path);
   }
@@ -104,7 +155,10 @@ void restoreBackup(const std::string& folder, const std::string& path) {
     if (!fs::remove(above, notEmpty)) break;
   }
   const fs::directory_iterator entries(folder);
-  if (std::distance(entries, {}) == 1) fs::remove(fs::path(folder) / markName, notEmpty);
+  if (std::distance(entries, {}) != 1) return;
+  for (const Mark& mark : {replacedMark, movedMark}) {
+    fs::remove(fs::path(folder) / mark.name, notEmpty);
+  }
 }
 
 }  // namespace pelorin::photo

@@ -6,8 +6,8 @@
 namespace pelorin::photo {
 
 // A folder of backups holds files under the whole paths they had: it needs no list that could be
-// lost, and what stands in it can be put back by hand. A file of its own, ".quenby-backup",
-// tells it from other folders.
+// lost, and what stands in it can be put back by hand. A file of its own tells it from other folders:
+// ".quenby-backup" where photos were replaced, ".quenby-moved" where they were moved away.
 
 /// Where `folder` keeps the file at `path`, links followed.
 /// @throws std::filesystem::filesystem_error when there is no such file.
@@ -23,7 +23,14 @@ bool isReplaced(const std::string& folder, const std::string& path);
 /// @throws std::system_error; nothing is then left behind but empty folders.
 void keepBackup(const std::string& folder, const std::string& path);
 
-/// Whether `folder` is one of backups, or empty.
+/// Moves the file at `path`, itself and no link to it, into `folder`, on the disk before this
+/// returns: by its name or, to another disk, as a copy with its times, permissions and attributes that
+/// was read again before the file goes. At every moment one of the two is whole.
+/// @throws std::system_error, with EEXIST where another file has that place in `folder`; the file is
+///         then where it was.
+void moveToBackups(const std::string& folder, const std::string& path);
+
+/// Whether `folder` is one of backups, or empty; what killed processes left in it goes.
 /// @throws std::filesystem::filesystem_error.
 bool isBackupFolder(const std::string& folder);
 
@@ -31,8 +38,10 @@ bool isBackupFolder(const std::string& folder);
 /// @throws std::filesystem::filesystem_error.
 std::vector<std::string> keptFiles(const std::string& folder);
 
-/// Puts the file that was at `path` back, in one step, and takes it out of `folder`.
-/// @throws std::system_error; the file at `path` and the backup are then as they were.
+/// Puts the file that was at `path` back, in one step, and takes it out of `folder`. It takes the place
+/// of what replaced it; where it was moved away, the place must be free.
+/// @throws std::system_error, std::runtime_error where the place is taken; the file at `path` and the
+///         backup are then as they were.
 void restoreBackup(const std::string& folder, const std::string& path);
 
 }  // namespace pelorin::photo

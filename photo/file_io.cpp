@@ -158,24 +158,6 @@ bool isTemporaryName(std::string_view name) {
   });
 }
 
-// The rename that fails where there is a file.
-int renameToNew(const char* from, const char* to) {
-  if (::syscall(SYS_renameat2, AT_FDCWD, from, AT_FDCWD, to, RENAME_NOREPLACE) == 0) return 0;
-  if (errno != ENOSYS && errno != EINVAL && errno != ENOTSUP) return -1;
-  // File systems without it: a second name is never given over a file.
-  if (::link(from, to) == 0) return ::unlink(from);
-  if (errno == EEXIST) return -1;
-  // And without second names: an empty file keeps the place.
-  const int place = ::open(to, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0600);
-  if (place < 0) return -1;
-  ::close(place);
-  if (::rename(from, to) == 0) return 0;
-  const int code = errno;
-  ::unlink(to);
-  errno = code;
-  return -1;
-}
-
 }  // namespace
 
 std::vector<std::uint8_t> readFile(const std::string& path) {
@@ -251,6 +233,23 @@ void Replacement::replace() {
 void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes,
                          const ReplaceOptions& options) {
   Replacement(path, bytes, options).replace();
+}
+
+int renameToNew(const char* from, const char* to) {
+  if (::syscall(SYS_renameat2, AT_FDCWD, from, AT_FDCWD, to, RENAME_NOREPLACE) == 0) return 0;
+  if (errno != ENOSYS && errno != EINVAL && errno != ENOTSUP) return -1;
+  // File systems without it: a second name is never given over a file.
+  if (::link(from, to) == 0) return ::unlink(from);
+  if (errno == EEXIST) return -1;
+  // And without second names: an empty file keeps the place.
+  const int place = ::open(to, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0600);
+  if (place < 0) return -1;
+  ::close(place);
+  if (::rename(from, to) == 0) return 0;
+  const int code = errno;
+  ::unlink(to);
+  errno = code;
+  return -1;
 }
 
 // A name that is not on the disk yet means the old file after a power cut, which is whole.

@@ -58,6 +58,10 @@ class Replacement {
 void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes,
                          const ReplaceOptions& options = {});
 
+/// The rename that fails where there is a file (EEXIST), in one step.
+/// @returns 0, or -1 with `errno`.
+int renameToNew(const char* from, const char* to);
+
 /// Makes sure that the names in a folder are on the disk, where its file system can. Never fails.
 void syncFolder(const std::string& folder);
 

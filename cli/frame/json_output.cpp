@@ -50,6 +50,10 @@ std::string textOf(const Json& object, int indent) {
 
 }  // namespace
 
+std::string textOf(const Json& object) {
+  return textOf(object, -1);
+}
+
 void JsonOutput::add(const Json& object) {
   if (lines_) {
     std::printf("%s\n", textOf(object, -1).c_str());

@@ -1,12 +1,16 @@
 #pragma once
 
 #include <nlohmann/json.hpp>
+#include <string>
 
 #include "cli/frame/talk.h"
 
 namespace pelorin::cli {
 
 using Json = nlohmann::ordered_json;
+
+/// An object in one line, as `JsonOutput` writes it.
+std::string textOf(const Json& object);
 
 /// Data on stdout: nothing without `--json` or `--jsonl`; one object a line with `--jsonl`; with
 /// `--json` one object, or an array of them unless the user named a single file.

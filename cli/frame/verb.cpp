@@ -4,8 +4,8 @@
 
 namespace pelorin::cli {
 
-Option Option::required() {
-  option_->required();
+Option Option::required(bool isRequired) {
+  option_->required(isRequired);
   return *this;
 }
 

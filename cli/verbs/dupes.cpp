@@ -15,7 +15,9 @@
 #include "cli/frame/number_text.h"
 #include "cli/frame/talk.h"
 #include "cli/frame/used_files.h"
+#include "cli/verbs/dupes/act_on_plan.h"
 #include "cli/verbs/dupes/html_report.h"
+#include "cli/verbs/dupes/plan_file.h"
 #include "cli/verbs/dupes/report.h"
 #include "cli/verbs/dupes/scan_photos.h"
 #include "cli/verbs/dupes/thumbnail.h"
@@ -36,6 +38,9 @@ struct DupesOptions {
   std::string scale = "auto";
   std::string cache;
   std::string keep;
+  std::vector<std::string> keepUnder;
+  std::string plan;
+  ActionOptions actions;
   std::string html;
   bool assumeFileTime = false;
   bool unknownTimes = false;
@@ -236,9 +241,63 @@ void groupAlike(const std::vector<photo::ShotPair>& pairs, DupeReport& report) {
   report.lookAlikes = photo::groupWholly(report.photos.size(), untimed);
 }
 
+bool ranks(const DupesOptions& options) {
+  return !options.keep.empty() || !options.keepUnder.empty() || options.actions.wanted();
+}
+
+bool isBelow(const fs::path& path, const fs::path& folder) {
+  const fs::path below = path.lexically_relative(folder);
+  return !below.empty() && *below.begin() != "..";
+}
+
+std::vector<fs::path> referenceFolders(const DupesOptions& options) {
+  std::vector<fs::path> folders;
+  for (const std::string& folder : options.keepUnder) {
+    std::error_code failed;
+    folders.push_back(fs::canonical(folder, failed));
+    // A misspelt folder would leave its photos unprotected.
+    if (failed || !fs::is_directory(folders.back())) {
+      throw UsageError("--keep-under: " + folder + ": is no folder");
+    }
+  }
+  return folders;
+}
+
+void markReferences(const std::vector<fs::path>& folders,
+                    std::vector<photo::ScannedPhoto>& photos) {
+  for (photo::ScannedPhoto& photo : photos) {
+    std::error_code failed;
+    const fs::path path = fs::canonical(photo.path, failed);
+    photo.isReference = std::any_of(folders.begin(), folders.end(),
+                                    [&](const fs::path& folder) { return isBelow(path, folder); });
+  }
+}
+
+ExitCode runPlan(const DupesOptions& options) {
+  if (!options.inputs.names.empty()) {
+    throw UsageError("--plan: the photos are those of the plan; leave out " +
+                     options.inputs.names[0]);
+  }
+  if (!options.actions.wanted()) {
+    throw UsageError("--plan: say what to do, with --move-to DIR or --link");
+  }
+  const std::vector<photo::Removal> plan = readPlan(options.plan);
+  std::vector<Input> files;
+  for (const photo::Removal& removal : plan) {
+    for (const photo::KnownFile& file : removal.removed) files.push_back({file.path, {}});
+    for (const photo::KnownFile& file : removal.kept) files.push_back({file.path, {}});
+  }
+  checkActions(options.actions, files);
+  return actOnPlan(plan, options.actions, options.report);
+}
+
 ExitCode runDupes(const DupesOptions& options) {
+  if (!options.plan.empty()) return runPlan(options);
+  if (options.inputs.names.empty()) throw UsageError("IN is required: photos, or folders with -r");
   const float threshold = readFiniteNumber("--threshold", options.threshold);
   const std::vector<Input> inputs = withoutRepetitions(expandInputs(options.inputs));
+  const std::vector<fs::path> references = referenceFolders(options);
+  checkActions(options.actions, inputs);
   if (inputs.empty()) {
     Talk(verbName, options.report.quiet, 0).note("no photos found");
     return ExitCode::nothingToDo;
@@ -260,14 +319,21 @@ ExitCode runDupes(const DupesOptions& options) {
   if (!searchPairs(scan.library.shots, threshold, options, pairs)) return ExitCode::interrupted;
 
   DupeReport report = {threshold,    std::move(scan.library.photos), {},
-                       {},           std::move(scan.failed),         !options.keep.empty(),
+                       {},           std::move(scan.failed),         ranks(options),
                        options.pairs};
+  markReferences(references, report.photos);
   groupAlike(pairs, report);
   if (report.rank && !scorePhotos(options, cache.get(), scan.cacheTrouble, report)) {
     return ExitCode::interrupted;
   }
   if (!options.html.empty() && !writeHtml(options, report)) return ExitCode::interrupted;
-  printReport(options, report);
+  ExitCode acted = ExitCode::allDone;
+  if (options.actions.wanted()) {
+    acted = actOnPlan(photo::planRemovals(report.groups, report.photos), options.actions,
+                      options.report);
+  } else {
+    printReport(options, report);
+  }
 
   Talk talk(verbName, options.report.quiet, 0);
   noteUntimed(options, report, talk);
@@ -276,7 +342,7 @@ ExitCode runDupes(const DupesOptions& options) {
     fmt::print(stderr, "quenby {}: {}\n", verbName, shownText(scan.cacheTrouble));
   }
   const bool trouble = !report.failed.empty() || !scan.cacheTrouble.empty();
-  return trouble ? ExitCode::someFailed : ExitCode::allDone;
+  return trouble && acted != ExitCode::interrupted ? ExitCode::someFailed : acted;
 }
 
 }  // namespace
@@ -288,9 +354,12 @@ void addDupes(CommandLine& commandLine) {
       "quenby dupes -r holiday\n"
       "quenby dupes -r photos -j 0 --cache photos.cache --html report.html\n"
       "quenby dupes *.jpg --threshold 2.5 --keep best\n"
+      "quenby dupes -r import library --keep-under library --move-to doubles --apply\n"
+      "quenby dupes --plan duplicates.json --move-to doubles --apply\n"
       "quenby dupes -r photos --keep best --jsonl | jq -r '.ranking[]? | select(.keep | not).file'",
       [options] { return runDupes(*options); });
   addInputOptions(verb, options->inputs);
+  verb.named("IN").required(false);  // a plan names its own
   verb.option("--threshold", options->threshold,
               fmt::format("Smallest score of a pair; {} unless given, larger is stricter, the same "
                           "photo twice scores about 3.65",
@@ -318,6 +387,16 @@ void addDupes(CommandLine& commandLine) {
               "natural it looks (NIQE), then by the size of the file; photos of equal "
               "resolution are read again for that; nothing is ever deleted")
       .oneOf({"best"});
+  verb.option("--keep-under", options->keepUnder,
+              "Never suggest photos below this folder for removal: of others like them only one "
+              "with more pixels stays")
+      .type("DIR")
+      .oneValueEach();
+  addActionOptions(verb, options->actions);
+  verb.option("--plan", options->plan,
+              "Act on what was chosen in the page of --html and saved there, instead of searching")
+      .type("FILE")
+      .group("Acting");
   verb.option("--html", options->html,
               "Write a page with the groups' pictures side by side; reads those photos again")
       .type("FILE")

@@ -24,7 +24,8 @@ struct UndoOptions {
 ExitCode runUndo(const UndoOptions& options) {
   if (!photo::isBackupFolder(options.folder)) {
     throw UsageError(options.folder +
-                     ": is no folder of backups; name the one given with --backup");
+                     ": is no folder of backups; name the one given with --backup or "
+                     "--move-to");
   }
   std::vector<Input> files;
   for (const std::string& path : photo::keptFiles(options.folder)) files.push_back({path, {}});
@@ -57,13 +58,14 @@ ExitCode runUndo(const UndoOptions& options) {
 
 void addUndo(CommandLine& commandLine) {
   const auto options = std::make_shared<UndoOptions>();
-  Verb verb = commandLine.addVerb("undo", "Put photos back that --in-place replaced",
+  Verb verb = commandLine.addVerb("undo", "Put photos back that --in-place replaced or dupes moved",
                                   "quenby enhance -r holiday --in-place --backup before\n"
                                   "quenby undo before",
                                   [options] { return runUndo(*options); });
-  verb.option("DIR", options->folder,
-              "The folder given with --backup: every photo in it goes back where it was, with its "
-              "times, permissions and attributes, and leaves the folder")
+  verb.option(
+          "DIR", options->folder,
+          "The folder given with --backup or --move-to: every photo in it goes back where it was, "
+          "with its times, permissions and attributes, and leaves the folder")
       .required()
       .type("");
   verb.flag("-n,--dry-run", options->planOnly, "Print what would go back, and do nothing");

@@ -69,20 +69,43 @@ std::string whyNot(const ScannedPhoto& photo, const ScannedPhoto& best) {
   return "as many pixels and bytes, listed later" + andQuality(photo);
 }
 
+// References first, by merit, then the others.
+std::vector<Ranked> rankBesideReferences(const std::vector<std::size_t>& order,
+                                         const std::vector<ScannedPhoto>& photos) {
+  const std::uint64_t most = photos[order[0]].pixels();
+  std::vector<Ranked> ranking;
+  const ScannedPhoto* larger = nullptr;  // the one that no reference stands for
+  for (const std::size_t i : order) {
+    const ScannedPhoto& photo = photos[i];
+    if (photo.isReference) {
+      ranking.push_back({i, true, "in a reference folder, " + megapixels(photo)});
+    } else if (larger != nullptr) {
+      ranking.push_back({i, false, whyNot(photo, *larger)});
+    } else if (photo.pixels() > most) {
+      larger = &photo;
+      ranking.push_back({i, true, "more pixels than any reference, " + megapixels(photo)});
+    } else {
+      ranking.push_back({i, false, "no more pixels than a reference, " + megapixels(photo)});
+    }
+  }
+  return ranking;
+}
+
 }  // namespace
 
 std::vector<Ranked> rankGroup(const DupeGroup& group, const std::vector<ScannedPhoto>& photos) {
   std::vector<std::size_t> order = group.photos;
   const auto merits = [](const ScannedPhoto& photo) {
-    return std::tuple(photo.pixels(), naturalness(photo), photo.bytes);
+    return std::tuple(photo.isReference, photo.pixels(), naturalness(photo), photo.bytes);
   };
   std::stable_sort(order.begin(), order.end(), [&](std::size_t a, std::size_t b) {
     return merits(photos[a]) > merits(photos[b]);
   });
   const ScannedPhoto& best = photos[order[0]];
-  std::vector<Ranked> ranking = {{order[0], whyBest(best, photos[order[1]])}};
+  if (best.isReference) return rankBesideReferences(order, photos);
+  std::vector<Ranked> ranking = {{order[0], true, whyBest(best, photos[order[1]])}};
   for (std::size_t i = 1; i < order.size(); ++i) {
-    ranking.push_back({order[i], whyNot(photos[order[i]], best)});
+    ranking.push_back({order[i], false, whyNot(photos[order[i]], best)});
   }
   return ranking;
 }

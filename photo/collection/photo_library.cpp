@@ -21,7 +21,10 @@ void PhotoLibrary::add(const std::string& path, const PhotoRecord& record,
   ScannedPhoto photo = {
       path, record.width, record.height, record.orientation, std::nullopt, TimeSource::none, ""};
   Shot shot = {record.cdf, record.orientation, std::nullopt};
-  if (stamp) photo.bytes = stamp->bytes;
+  if (stamp) {
+    photo.bytes = stamp->bytes;
+    photo.modified = stamp->modified;
+  }
   if (record.captureTime) {
     photo.timeSource = TimeSource::camera;
     photo.time = record.captureTime->text;

@@ -21,6 +21,9 @@ struct ScannedPhoto {
   /// How natural the full-size picture looks, lower is better; NaN when it is too small to tell and
   /// none where it was not needed or could not be had.
   std::optional<float> niqe = std::nullopt;
+  /// When the file was last changed, as `FileStamp` has it; none without a file.
+  std::optional<std::int64_t> modified = std::nullopt;
+  bool isReference = false;  ///< Never suggested for removal.
 
   std::uint64_t pixels() const { return std::uint64_t{width} * height; }
   bool isScored() const { return niqe && !std::isnan(*niqe); }

@@ -110,11 +110,9 @@ std::string groupAsText(const DupeReport& report, const photo::DupeGroup& group,
                         shownName(report.photos[pair.second].path), pairAsText(pair));
   }
   if (!report.rank || looksAlone) return text;
-  const char* verdict = "keep";
   for (const photo::Ranked& ranked : photo::rankGroup(group, report.photos)) {
-    text += fmt::format("  {} {}: {}\n", verdict, shownName(report.photos[ranked.photo].path),
-                        ranked.reason);
-    verdict = "rather not";
+    text += fmt::format("  {} {}: {}\n", ranked.keep ? "keep" : "rather not",
+                        shownName(report.photos[ranked.photo].path), ranked.reason);
   }
   return text;
 }
@@ -140,7 +138,7 @@ Json groupAsJson(const DupeReport& report, const photo::DupeGroup& group) {
     for (const photo::Ranked& ranked : photo::rankGroup(group, report.photos)) {
       const photo::ScannedPhoto& photo = report.photos[ranked.photo];
       ranking.push_back({{"file", photo.path},
-                         {"keep", ranking.empty()},
+                         {"keep", ranked.keep},
                          {"niqe", photo.isScored() ? Json(nineDigits(*photo.niqe)) : Json()},
                          {"reason", ranked.reason}});
     }

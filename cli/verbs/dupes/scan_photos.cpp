@@ -7,6 +7,8 @@
 #include "cli/frame/each_photo.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/interrupt.h"
+#include "cli/frame/photo_files.h"
+#include "photo/photo.h"
 
 namespace pelorin::cli {
 namespace {
@@ -42,8 +44,9 @@ class Scan {
         unread, options_.jobs, talk,
         {.work =
              [&](std::size_t job) {
-               return photo::readPhotoRecord(readInput(unread[job]), options_.scale,
-                                             interruptToken());
+               const std::vector<std::uint8_t> file = readInput(unread[job]);
+               tellNotices(unread[job], photo::readFacts(file), talk);
+               return photo::readPhotoRecord(file, options_.scale, interruptToken());
              },
          .done =
              [&](std::size_t job, const photo::PhotoRecord& record) {
@@ -98,8 +101,11 @@ std::vector<Input> withoutRepetitions(const std::vector<Input>& inputs) {
   std::set<std::filesystem::path> seen;
   std::vector<Input> once;
   for (const Input& input : inputs) {
-    const bool isNew = seen.insert(std::filesystem::absolute(input.path).lexically_normal()).second;
-    if (isNew) once.push_back(input);
+    // A link to a photo is the photo: neither may stand for the other.
+    std::error_code failed;
+    std::filesystem::path place = std::filesystem::weakly_canonical(input.path, failed);
+    if (failed) place = std::filesystem::absolute(input.path).lexically_normal();
+    if (seen.insert(place).second) once.push_back(input);
   }
   return once;
 }

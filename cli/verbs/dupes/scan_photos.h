@@ -29,7 +29,7 @@ struct ScanResult {
 /// @throws CacheError when the cache cannot be read.
 ScanResult scanPhotos(const std::vector<Input>& inputs, const ScanOptions& options, Talk& talk);
 
-/// The inputs without those that name the same path again.
+/// The inputs without those that name the same path again, also through links.
 std::vector<Input> withoutRepetitions(const std::vector<Input>& inputs);
 
 }  // namespace pelorin::cli

@@ -165,6 +165,7 @@ TEST(Formats, OfSixteenBitsAreSaidOnceARun) {
   }
   EXPECT_THAT(quenby({"info", folder / "a.png"}).errors, HasSubstr("has 16 bits a channel"));
   EXPECT_EQ(quenby({"info", "-q", folder / "a.png"}).errors, "");
+  EXPECT_THAT(quenby({"dupes", folder / "a.png"}).errors, HasSubstr("has 16 bits a channel"));
 }
 
 }  // namespace
