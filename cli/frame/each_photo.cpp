@@ -22,6 +22,10 @@ PhotoTally runPhotoLoop(const std::vector<Input>& photos, int jobs, Talk& talk,
   std::vector<std::optional<std::string>> reasons(photos.size());
   PhotoTally tally = {.photos = photos.size()};
   const auto work = [&](std::size_t index) {
+    if (!photos[index].trouble.empty()) {
+      reasons[index] = photos[index].trouble;
+      return;
+    }
     try {
       stopIfInterrupted();
       loop.work(index);

@@ -2,6 +2,7 @@
 
 #include <fmt/format.h>
 
+#include <algorithm>
 #include <optional>
 
 #include "cli/frame/each_photo.h"
@@ -11,6 +12,7 @@
 #include "cli/frame/jobs.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/photo_files.h"
+#include "cli/frame/print_plan.h"
 #include "cli/frame/raw_option.h"
 #include "cli/frame/recycled_memory.h"
 #include "photo/filter_photo.h"
@@ -34,8 +36,6 @@ struct Done {
 
 Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter) {
   Work work = {filter, FaceChoice(options.faces), {}, {}, 0};
-  work.pixels = (std::uint64_t{static_cast<unsigned>(options.memory)} << 20) /
-                static_cast<unsigned>(jobsAtOnce(options.jobs));
   work.save = {.raw = !options.raw.empty(),
                .quality = options.quality,
                .keep = keepOptions(options.keep),
@@ -68,28 +68,10 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   return {filtered.size.width, filtered.size.height, filtered.lost, filtered.facts.notices};
 }
 
-Json describe(const PlannedFile& file, const char* status) {
-  return {{"input", file.input.path}, {"output", file.output}, {"status", status}};
-}
-
 Json jsonOf(const std::vector<photo::Loss>& lost) {
   Json list = Json::array();
   for (const photo::Loss& loss : lost) list.push_back({{"what", loss.what}, {"why", loss.why}});
   return list;
-}
-
-ExitCode printPlan(const std::vector<PlannedFile>& plan, bool inPlace, JsonOutput& json) {
-  bool something = false;
-  for (const PlannedFile& file : plan) {
-    something = something || !file.skipped;
-    json.add(describe(file, file.skipped ? "exists" : "planned"));
-    if (json.wanted()) continue;
-    fmt::print("{} -> {}{}\n", shownText(file.input.path), shownText(file.output),
-               !file.skipped ? ""
-               : inPlace     ? " (replaced already: skipped)"
-                             : " (exists: skipped without --overwrite)");
-  }
-  return something ? ExitCode::allDone : ExitCode::nothingToDo;
 }
 
 }  // namespace
@@ -121,36 +103,42 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
 
 ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
                      const FilterToApply& filter) {
-  const Work work = readOptions(options, filter);
+  Work work = readOptions(options, filter);
   const bool raw = work.photo.raw.has_value();
   if (options.outputs.inPlace && (raw || work.photo.scale != 1)) {
     throw UsageError("--in-place: photos are replaced at their full size (no --scale, no --raw)");
   }
-  if (options.outputs.output.empty() && options.outputs.name.empty() && !options.outputs.inPlace) {
-    throw UsageError(
-        "say where results go: -o FILE, -o FOLDER, --name to put them beside, or --in-place");
-  }
   if (options.outputs.output == "-" && (options.report.json || options.report.jsonLines)) {
     throw UsageError("-o -: standard output takes the picture or --json, not both");
   }
-  const std::vector<Input> inputs = expandInputs(options.inputs);
-  checkInPlace(options.outputs, inputs);
+  const std::vector<Input> named = expandInputs(options.inputs);
+  checkInPlace(options.outputs, named);
   if (options.outputs.name.empty()) {
     options.outputs.name = raw ? "{stem}_{filter}.rgba" : "{stem}_{filter}.{ext}";
   }
   std::map<std::string, std::string> values = filter.values;
   values["filter"] = filter.filter.name;
-  const std::vector<PlannedFile> plan =
-      planOutputs(inputs, options.inputs, options.outputs, values);
-  for (const PlannedFile& file : plan) requireFormatOf(file.output, raw);
+  const std::vector<PlannedFile> plan = planOutputs(named, options.inputs, options.outputs, values);
+  std::vector<Input> inputs;
+  for (const PlannedFile& file : plan) {
+    requireFormatOf(file.output, raw);
+    inputs.push_back(file.input);
+  }
 
-  const bool singleFile = isSingleFile(options.inputs, inputs);
-  JsonOutput json(options.report, singleFile);
-  if (options.outputs.planOnly) return printPlan(plan, options.outputs.inPlace, json);
+  JsonOutput json(options.report, isSingleFile(options.inputs, named));
+  Talk talk(verb, options.report.quiet, options.outputs.planOnly ? 0 : plan.size());
+  const bool inPlace = options.outputs.inPlace;
+  if (options.outputs.planOnly) {
+    return printPlan(
+        plan, inPlace ? " (replaced already: skipped)" : " (exists: skipped without --overwrite)",
+        talk, json);
+  }
 
-  if (options.jobs == 1 && plan.size() > 1) recycleFreedMemory();
+  const std::size_t atOnce =
+      std::clamp<std::size_t>(plan.size(), 1, static_cast<std::size_t>(jobsAtOnce(options.jobs)));
+  work.pixels = (std::uint64_t{static_cast<unsigned>(options.memory)} << 20) / atOnce;
+  if (atOnce == 1 && plan.size() > 1) recycleFreedMemory();
   const OutputFolders folders(plan);
-  Talk talk(verb, options.report.quiet, plan.size());
   std::size_t skipped = 0;
   const PhotoTally tally = eachPhoto<std::optional<Done>>(
       inputs, options.jobs, talk,
@@ -162,15 +150,10 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
            [&](std::size_t index, const std::optional<Done>& done) {
              if (!done) {
                ++skipped;
-               talk.error(
-                   plan[index].output,
-                   options.outputs.inPlace
-                       ? "was replaced already, as its backup tells; quenby undo puts it back"
-                       : "exists already; add --overwrite to replace it");
-               json.add(describe(plan[index], "exists"));
+               json.add(planAsJson(plan[index], "exists"));
                return;
              }
-             Json object = describe(plan[index], "done");
+             Json object = planAsJson(plan[index], "done");
              object["width"] = done->width;
              object["height"] = done->height;
              object["filter"] = filter.filter.name;
@@ -184,19 +167,25 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
            },
        .failed =
            [&](std::size_t index, const std::string& reason) {
-             Json object = describe(plan[index], "failed");
+             Json object = planAsJson(plan[index], "failed");
              object["error"] = reason;
              json.add(object);
            }});
   const std::size_t done = tally.done - skipped;
+  const char* const whatToDo =
+      inPlace ? "replaced already, as the backups tell; quenby undo puts them back"
+              : "there already; --overwrite replaces them";
   if (plan.size() > 1) {
-    talk.note(fmt::format("{} of {} photos done, {} failed, {} there already", done, plan.size(),
-                          tally.failed, skipped));
+    talk.note(fmt::format("{} of {} photos done, {} failed{}", done, plan.size(), tally.failed,
+                          skipped == 0 ? "" : fmt::format(", {} {}", skipped, whatToDo)));
+  } else if (skipped > 0) {
+    talk.note(plan[0].output +
+              (inPlace ? ": was replaced already, as its backup tells; quenby undo puts it back"
+                       : ": exists already; add --overwrite to replace it"));
   }
   if (tally.interrupted) talk.note("interrupted; finished files stand");
   const ExitCode code = tally.exitCode(talk);
-  if (code != ExitCode::allDone || skipped == 0) return code;
-  return done == 0 ? ExitCode::nothingToDo : ExitCode::someFailed;
+  return code == ExitCode::allDone && done == 0 ? ExitCode::nothingToDo : code;
 }
 
 }  // namespace pelorin::cli

@@ -26,7 +26,7 @@ struct FilterFilesOptions {
   int rotate = 0;
   int scale = 1;
   int quality = 90;
-  int jobs = 1;
+  int jobs = 0;
   int memory = 128;  ///< MiB of pixels kept, by all jobs together.
 };
 

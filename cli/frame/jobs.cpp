@@ -9,7 +9,8 @@
 namespace pelorin::cli {
 
 void addJobsOption(Verb verb, int& atOnce) {
-  verb.option("-j,--jobs", atOnce, "Files at once, each on one core; 0: as many as cores")
+  verb.option("-j,--jobs", atOnce,
+              "Files at once, each on one core; as many as cores unless given, or 0")
       .between(0, 1024)
       .type("N")
       .group("Reporting");

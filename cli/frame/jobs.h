@@ -8,7 +8,7 @@
 
 namespace pelorin::cli {
 
-/// Adds `-j N` to a verb: 1 unless given, 0 for one a core.
+/// Adds `-j N` to a verb: `atOnce` unless given, 0 for one a core.
 void addJobsOption(Verb verb, int& atOnce);
 
 /// How many that is: `atOnce`, or one a core for 0.

@@ -12,13 +12,14 @@ namespace fs = std::filesystem;
 namespace pelorin::cli {
 namespace {
 
-void requirePlaceFor(const std::string& path) {
+void requirePlaceFor(const std::string& path, bool makesFolder) {
   if (path == "-") return;
   std::error_code ignored;
   if (path.empty() || path.back() == '/' || fs::is_directory(path, ignored)) {
     throw UsageError(path + ": is a folder; name a file in it");
   }
   const fs::path folder = fs::path(path).parent_path();
+  if (makesFolder && !fs::exists(folder, ignored)) return;
   if (!folder.empty() && !fs::is_directory(folder, ignored)) {
     throw UsageError(folder.string() + ": there is no such folder; make it first (mkdir -p)");
   }
@@ -50,7 +51,7 @@ Input loneInput(const std::string& name) {
   std::error_code ignored;
   if (name.empty()) throw UsageError("the input has an empty name");
   if (fs::is_directory(name, ignored)) throw UsageError(name + ": is a folder; name one photo");
-  return {name, {}};
+  return inputNamed(name);
 }
 
 std::optional<ExitCode> stopBeforeWork(const std::vector<Input>& inputs,
@@ -60,25 +61,32 @@ std::optional<ExitCode> stopBeforeWork(const std::vector<Input>& inputs,
   bool kept = false;
   refuseSharedFiles(outputs, usedFiles(inputs));
   for (const std::string& output : outputs) {
-    requirePlaceFor(output);
+    requirePlaceFor(output, options.makesFolder);
     if (options.overwrite || !holdsAFile(output)) continue;
-    talk.error(output, "exists already; add --overwrite to replace it");
+    talk.note(output + ": exists already; add --overwrite to replace it");
     kept = true;
   }
   if (!kept && !options.planOnly) {
     sweepFolders(outputs);
     return std::nullopt;
   }
+  bool failed = false;
+  for (const Input& input : inputs) {
+    if (input.trouble.empty()) continue;
+    failed = true;
+    talk.error(input.shownName(), input.trouble);
+  }
   Json plan = {{"inputs", Json::array()}, {"outputs", outputs}};
-  plan["status"] = kept ? "exists" : "planned";
+  plan["status"] = failed ? "failed" : kept ? "exists" : "planned";
   for (const Input& input : inputs) {
     plan["inputs"].push_back(input.path);
-    if (kept || json.wanted()) continue;
+    if (kept || json.wanted() || !input.trouble.empty()) continue;
     for (const std::string& output : outputs) {
       fmt::print("{} -> {}\n", shownText(input.path), shownText(output));
     }
   }
   json.add(plan);
+  if (failed) return ExitCode::someFailed;
   return kept ? ExitCode::nothingToDo : ExitCode::allDone;
 }
 

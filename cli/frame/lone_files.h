@@ -19,6 +19,7 @@ struct LoneOutputOptions {
   std::string output;
   bool overwrite = false;
   bool planOnly = false;
+  bool makesFolder = false;  ///< Where the one its files stand in is missing.
 };
 
 /// Adds `-o`, `--overwrite` and `-n` to a verb.

@@ -1,5 +1,7 @@
 #include "cli/frame/outputs.h"
 
+#include <algorithm>
+#include <set>
 #include <system_error>
 
 #include "cli/frame/errors.h"
@@ -66,7 +68,9 @@ void refuseClashes(const std::vector<PlannedFile>& plan, const InputOptions& nam
   for (const std::string& name : named.names) {
     if (name.starts_with('@')) lists.add(name.substr(1), name);
   }
+  for (const std::string& list : named.lists) lists.add(list, list);
   for (const PlannedFile& file : plan) {
+    if (!file.input.trouble.empty()) continue;
     const std::string* const other = outputs.find(file.output);
     if (other != nullptr) {
       throw UsageError(file.output + ": both " + *other + " and " + file.input.shownName() +
@@ -76,8 +80,7 @@ void refuseClashes(const std::vector<PlannedFile>& plan, const InputOptions& nam
     if (lists.find(file.output) != nullptr) {
       throw UsageError(file.output + ": is the list of inputs; change --name or -o");
     }
-    const std::string* const replaced = inputs.find(file.output);
-    if (replaced == nullptr) continue;
+    if (inputs.find(file.output) == nullptr) continue;
     UsedFiles own;
     own.add(file.input.path, file.input.path);
     if (own.find(file.output) == nullptr) {
@@ -91,14 +94,37 @@ void refuseClashes(const std::vector<PlannedFile>& plan, const InputOptions& nam
   }
 }
 
+void requireFolderOrNothing(const std::string& output, bool endsInSlash) {
+  std::error_code ignored;
+  if (fs::is_directory(output, ignored)) return;
+  if (fs::exists(output, ignored)) {
+    throw UsageError(output + ": is not a folder; choose another output");
+  }
+  if (!endsInSlash && photo::isPictureExtension(fs::path(output).extension().string())) {
+    throw UsageError(output + ": is called like one picture; several need a folder (" + output +
+                     "/ would be one)");
+  }
+}
+
+// A folder that was gone through before holds what was made then; "*.jpg" names it as well.
+void leaveOutResults(std::vector<PlannedFile>& plan, bool overwrite) {
+  std::set<std::string> results;
+  for (const PlannedFile& file : plan) results.insert(file.output);
+  std::erase_if(plan, [&](const PlannedFile& file) {
+    return (file.input.found || !overwrite) && file.input.path != file.output &&
+           results.contains(file.input.path);
+  });
+}
+
 }  // namespace
 
 void addOutputOptions(Verb verb, OutputOptions& options, const std::string& defaultName,
                       const std::string& placeholders) {
   verb.option("-o,--output", options.output,
               "A " + photo::pictureExtensions() +
-                  " file, an existing folder, or - (standard output); without it results stand "
-                  "beside their inputs, called by --name")
+                  " file, a folder (made where it is missing: end its name in / for a single "
+                  "photo), or - (standard output); without it results stand beside their inputs, "
+                  "called by --name")
       .type("FILE|DIR")
       .group("Output");
   verb.option("--name", options.name,
@@ -154,12 +180,14 @@ std::vector<PlannedFile> planOutputs(const std::vector<Input>& inputs, const Inp
   const std::string& output = options.output;
   const bool toStandardOutput = output == "-";
   std::error_code ignored;
-  const bool intoFolder = output.empty() || fs::is_directory(output, ignored);
   const bool oneFile = isSingleFile(named, inputs);
+  const bool endsInSlash = output.ends_with('/');
+  const bool intoFolder = output.empty() || (!oneFile && !toStandardOutput) || endsInSlash ||
+                          fs::is_directory(output, ignored);
 
   if (toStandardOutput && !oneFile) throw UsageError("-o -: only one file fits standard output");
+  if (intoFolder && !output.empty()) requireFolderOrNothing(output, endsInSlash);
   if (!intoFolder && !toStandardOutput) {
-    if (!oneFile || output.back() == '/') requireFolder(output);
     const fs::path parent = fs::path(output).parent_path();
     if (!parent.empty()) requireFolder(parent);
   }
@@ -179,16 +207,29 @@ std::vector<PlannedFile> planOutputs(const std::vector<Input>& inputs, const Inp
     file.skipped = exists && !options.overwrite;
     plan.push_back(std::move(file));
   }
+  if (output.empty() && !options.inPlace) leaveOutResults(plan, options.overwrite);
   refuseClashes(plan, named, options.overwrite || options.inPlace);
   return plan;
 }
 
-OutputFolders::OutputFolders(const std::vector<PlannedFile>& plan) {
+namespace {
+
+std::vector<std::string> outputsToMake(const std::vector<PlannedFile>& plan) {
   std::vector<std::string> outputs;
   for (const PlannedFile& file : plan) {
-    if (file.skipped || file.output == "-") continue;
-    make(fs::path(file.output).parent_path());
-    outputs.push_back(file.output);
+    if (!file.skipped && file.input.trouble.empty()) outputs.push_back(file.output);
+  }
+  return outputs;
+}
+
+}  // namespace
+
+OutputFolders::OutputFolders(const std::vector<PlannedFile>& plan)
+    : OutputFolders(outputsToMake(plan)) {}
+
+OutputFolders::OutputFolders(const std::vector<std::string>& outputs) {
+  for (const std::string& output : outputs) {
+    if (output != "-") make(fs::path(output).parent_path());
   }
   sweepFolders(outputs);
 }

@@ -12,7 +12,7 @@ namespace pelorin::cli {
 
 /// Where results go, as the user said it.
 struct OutputOptions {
-  std::string output;  ///< `-o`: a file, an existing folder, "-", or empty.
+  std::string output;  ///< `-o`: a file, a folder, "-", or empty.
   std::string name;    ///< `--name`: how files in a folder are called.
   bool overwrite = false;
   bool planOnly = false;
@@ -44,10 +44,14 @@ struct PlannedFile {
 /// after `name`, whose {stem} is the input's name without its extension, whose {ext}
 /// is the usual extension of the input's format ("jpg" where it has none) and whose other
 /// placeholders are `values`; below it stand the input's own sub-folders.
-/// @param named  what the user typed as inputs: several, a folder or a list need an output folder.
+/// @param named  what the user typed as inputs: several, a folder or a list go into a folder.
+///
+/// `-o` names a folder, which need not exist, where it ends in a slash or where there may be several
+/// inputs. Where results stand beside photos, those that are results of others are left out; with
+/// `--overwrite` only where they were not named.
 /// @throws UsageError when two inputs would become one file, when a result would replace an input
-///         (its own is allowed with `--overwrite`), when the output folder is missing, and for a
-///         name that is no file name or has an unknown placeholder.
+///         (its own is allowed with `--overwrite`), when the folder of a single file is missing, and
+///         for a name that is no file name or has an unknown placeholder.
 std::vector<PlannedFile> planOutputs(const std::vector<Input>& inputs, const InputOptions& named,
                                      const OutputOptions& options,
                                      const std::map<std::string, std::string>& values);
@@ -58,6 +62,7 @@ class OutputFolders {
  public:
   /// @throws std::filesystem::filesystem_error when one cannot be made.
   explicit OutputFolders(const std::vector<PlannedFile>& plan);
+  explicit OutputFolders(const std::vector<std::string>& outputs);
   ~OutputFolders();
   OutputFolders(const OutputFolders&) = delete;
   OutputFolders& operator=(const OutputFolders&) = delete;

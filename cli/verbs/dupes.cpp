@@ -46,7 +46,7 @@ struct DupesOptions {
   bool unknownTimes = false;
   bool pairs = false;
   bool overwrite = false;
-  int jobs = 1;
+  int jobs = 0;
 };
 
 constexpr const char* verbName = "dupes";

@@ -30,7 +30,7 @@ struct InfoOptions {
   FaceOptions faces;
   std::string raw;
   std::string slider = "0.4";
-  int jobs = 1;
+  int jobs = 0;
 };
 
 struct Info {

@@ -173,6 +173,10 @@ void addKeypoints(CommandLine& commandLine) {
   verb.flag("--overwrite", options->drawing.overwrite, "Replace a drawing that is there")
       .needs(verb.named("--draw"))
       .group("Output");
+  verb.flag("-n,--dry-run", options->drawing.planOnly,
+            "Print what would become what, and do nothing")
+      .needs(verb.named("--draw"))
+      .group("Output");
   addRawOption(verb, options->raw);
   Option text =
       verb.flag("--text", options->text,

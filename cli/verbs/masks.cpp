@@ -10,6 +10,7 @@
 #include "cli/frame/json_output.h"
 #include "cli/frame/lone_files.h"
 #include "cli/frame/nearest_name.h"
+#include "cli/frame/outputs.h"
 #include "cli/frame/photo_files.h"
 #include "cli/frame/raw_option.h"
 #include "cli/pictures/grey_picture.h"
@@ -92,6 +93,7 @@ ExitCode runMasks(const MasksOptions& options) {
   JsonOutput json(options.report, true);
   if (const auto code = stopBeforeWork({input}, paths, options.outputs, talk, json)) return *code;
 
+  const OutputFolders folders(paths);
   const PhotoTally tally = eachPhoto<Masks>(
       {input}, /*jobs=*/1, talk,
       {.work =
@@ -118,6 +120,7 @@ ExitCode runMasks(const MasksOptions& options) {
 
 void addMasks(CommandLine& commandLine) {
   const auto options = std::make_shared<MasksOptions>();
+  options->outputs.makesFolder = true;
   Verb verb = commandLine.addVerb(
       "masks", "Write what auto-enhance sees of a photo: its two masks, as pictures",
       "quenby masks photo.jpg -o masks/\n"
@@ -126,7 +129,8 @@ void addMasks(CommandLine& commandLine) {
       [options] { return runMasks(*options); });
   addLoneInput(verb, options->input);
   addLoneOutputOptions(verb, options->outputs, "DIR",
-                       "The folder for bilateral.png, the smoothed lightness, and ltm.png, the "
+                       "The folder (made where it is missing) for bilateral.png, the smoothed "
+                       "lightness, and ltm.png, the "
                        "flatness; with --raw bilateral.f32 and ltm.f32");
   verb.named("--output").required();
   verb.option("--filter", options->filter, "AE0 (unless given) or AE08bit").type("NAME");

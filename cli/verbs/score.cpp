@@ -13,6 +13,7 @@
 #include "cli/frame/number_text.h"
 #include "cli/frame/outputs.h"
 #include "cli/frame/photo_files.h"
+#include "cli/frame/print_plan.h"
 #include "cli/frame/raw_option.h"
 #include "cli/pictures/heat_map.h"
 #include "cli/verbs/score_output.h"
@@ -33,7 +34,7 @@ struct ScoreOptions {
   Option mapGiven;
   std::optional<std::string> failAbove;
   std::string raw;
-  int jobs = 1;
+  int jobs = 0;
 };
 
 Image<RGBA8Pixel> heatMapOf(const photo::Photo& photo, const Input& input,
@@ -83,10 +84,14 @@ ExitCode runScore(const ScoreOptions& options) {
   photoOptions.raw = readRawSize(options.raw, options.inputs);
   const std::vector<Input> inputs = expandInputs(options.inputs);
   const std::vector<PlannedFile> maps = planMaps(options, inputs);
+  const bool singleFile = isSingleFile(options.inputs, inputs);
+  Talk talk("score", options.format.report.quiet, options.maps.planOnly ? 0 : inputs.size());
+  if (options.maps.planOnly) {
+    JsonOutput json(options.format.report, singleFile);
+    return printPlan(maps, " (exists: skipped without --overwrite)", talk, json);
+  }
   const OutputFolders folders(maps);
-
-  ScoreOutput output(options.format, isSingleFile(options.inputs, inputs));
-  Talk talk("score", options.format.report.quiet, inputs.size());
+  ScoreOutput output(options.format, singleFile);
   std::size_t scored = 0, above = 0, mapsKept = 0;
   const auto report = [&](std::size_t index, const ScoredPhoto& photo) {
     const Input& input = inputs[index];
@@ -105,7 +110,6 @@ ExitCode runScore(const ScoreOptions& options) {
     }
     if (!maps.empty() && maps[index].skipped) {
       ++mapsKept;
-      talk.error(maps[index].output, "exists already; add --overwrite to replace it");
     }
   };
   const PhotoTally tally = eachPhoto<ScoredPhoto>(
@@ -118,9 +122,12 @@ ExitCode runScore(const ScoreOptions& options) {
        .done = report,
        .failed = [&](std::size_t index,
                      const std::string& reason) { output.addFailed(inputs[index], reason); }});
+  if (mapsKept > 0) {
+    talk.note(fmt::format("{} of {} maps there already; --overwrite replaces them", mapsKept,
+                          maps.size()));
+  }
   const ExitCode code = tally.exitCode(talk);
   if (code != ExitCode::allDone) return code;
-  if (mapsKept > 0) return ExitCode::someFailed;
   if (above > 0) return ExitCode::aboveLimit;
   return scored == 0 ? ExitCode::nothingToDo : ExitCode::allDone;
 }
@@ -168,6 +175,10 @@ void addScore(CommandLine& commandLine) {
       .needs(options->mapGiven)
       .group("Output");
   verb.flag("--overwrite", options->maps.overwrite, "Replace maps that are there already")
+      .needs(options->mapGiven)
+      .group("Output");
+  verb.flag("-n,--dry-run", options->maps.planOnly,
+            "Print which maps would be made, and do nothing")
       .needs(options->mapGiven)
       .group("Output");
   addRawOption(verb, options->raw);

@@ -45,7 +45,7 @@ struct SheetOptions {
   std::optional<std::string> title;
   std::uint32_t cell = 320;
   int quality = 90;
-  int jobs = 1;
+  int jobs = 0;
 };
 
 /// What one photo contributes.
@@ -67,6 +67,7 @@ photo::PictureSize roomFor(const Input& input, const photo::OpenOptions& options
   const photo::PictureSize box{cell, cell};
   if (options.raw) return photo::fitWithin({options.raw->width, options.raw->height}, box);
   if (input.isStandardInput()) return box;
+  if (!input.trouble.empty()) return {cell, cell / 4};
   try {
     const photo::PhotoFacts facts = photo::readFacts(readInput(input));
     const bool onItsSide = photo::uprightTurn(facts.orientation).quarters % 2 != 0;

@@ -1,4 +1,5 @@
 #include <gmock/gmock.h>
+#include <sys/stat.h>
 
 #include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
@@ -10,6 +11,7 @@ namespace {
 using testing::ElementsAre;
 using testing::HasSubstr;
 using testing::IsEmpty;
+using testing::Not;
 
 // Fast, and as good as any filter where only names matter.
 Finished enhance(std::vector<std::string> arguments, const Bytes& input = {}) {
@@ -61,7 +63,66 @@ TEST(Folders, NeedTheRecursiveOption) {
 
 TEST(Folders, WithoutPhotosAreNothingToDo) {
   const TemporaryFolder folder;
-  EXPECT_EQ(enhance({"-r", folder.makeFolder("in"), "-o", folder.makeFolder("out")}).exitCode, 3);
+  const Finished run =
+      enhance({"-r", folder.makeFolder("in"), "-o", folder.makeFolder("out"), "--json"});
+  EXPECT_EQ(run.exitCode, 3);
+  EXPECT_EQ(run.output, "[]\n");
+}
+
+TEST(Folders, NameWhatTheyHoldThatIsNoFileAndGoOn) {
+  const TemporaryFolder folder;
+  folder.write("in/a.jpg", smallJpeg());
+  ASSERT_EQ(mkfifo((folder / "in/pipe.jpg").c_str(), 0600), 0);
+  ASSERT_EQ(mkfifo((folder / "in/other").c_str(), 0600), 0);  // not called like a photo
+  std::filesystem::create_symlink("nowhere", folder / "in/link.jpg");
+  std::filesystem::create_symlink("/dev/null", folder / "in/null.png");
+  std::filesystem::create_symlink(".", folder / "in/loop");
+  for (const std::string verb : {"enhance", "info", "score", "sheet", "dupes"}) {
+    std::vector<std::string> arguments = {verb, "-r", folder / "in"};
+    if (verb == "enhance") arguments.insert(arguments.end(), {"-o", folder / "out/"});
+    if (verb == "sheet") arguments.insert(arguments.end(), {"-o", folder / "sheet.png"});
+    const Finished run = quenby(arguments);
+    EXPECT_EQ(run.exitCode, 1) << verb;
+    EXPECT_THAT(run.errors, HasSubstr("in/pipe.jpg: is a pipe, not a file")) << verb;
+    EXPECT_THAT(run.errors, HasSubstr("in/link.jpg: is a link to nothing")) << verb;
+    EXPECT_THAT(run.errors, HasSubstr("in/null.png: is a device, not a file")) << verb;
+    EXPECT_THAT(run.errors, Not(HasSubstr("other"))) << verb;
+  }
+  EXPECT_TRUE(folder.has("out/a_AE0.jpg"));
+}
+
+TEST(Folders, ThatCannotBeReadAreNamed) {
+  const TemporaryFolder folder;
+  folder.write("in/a.jpg", smallJpeg());
+  std::filesystem::permissions(folder.makeFolder("in/closed"), std::filesystem::perms::none);
+  std::filesystem::permissions(folder.path(), std::filesystem::perms{0755});
+  // Whoever may read everything becomes somebody else.
+  const std::string command = "$QUENBY info -r " + folder / "in";
+  const Finished run = shell(
+      "[ $(id -u) != 0 ] || nobody='setpriv --reuid 65534 --clear-groups'; "
+      "$nobody test -x $QUENBY || exit 77; $nobody " +
+      command);
+  std::filesystem::permissions(folder / "in/closed", std::filesystem::perms{0755});
+  if (run.exitCode == 77) GTEST_SKIP() << "nobody may run the command here";
+  EXPECT_EQ(run.exitCode, 1);
+  EXPECT_THAT(run.output, HasSubstr("in/a.jpg"));
+  EXPECT_THAT(run.errors, HasSubstr("in/closed: cannot be read: Permission denied"));
+}
+
+TEST(Folders, HideWhatSystemsPutBesidePhotos) {
+  const TemporaryFolder folder;
+  for (const char* name : {"a.jpg", ".b.jpg", "._a.jpg", "@eaDir/c.jpg", "x/.thumbnails/d.jpg"}) {
+    folder.write(name, smallJpeg());
+  }
+  const std::vector<std::string> plan = {"-r", folder.path(), "-n", "-o", folder / "out/"};
+  EXPECT_EQ(enhance(plan).output, folder / "a.jpg -> " + folder / "out/a_PassThrough.jpg\n");
+  std::vector<std::string> all = plan;
+  all.push_back("--hidden");
+  const std::string shown = enhance(all).output;
+  EXPECT_EQ(std::count(shown.begin(), shown.end(), '\n'), 5);
+  all.insert(all.end(), {"--exclude", "@*", "--exclude", "x/*/d.jpg", "--exclude", ".?.jpg"});
+  EXPECT_EQ(enhance(all).output, folder / "._a.jpg -> " + folder / "out/._a_PassThrough.jpg\n" +
+                                     folder / "a.jpg -> " + folder / "out/a_PassThrough.jpg\n");
 }
 
 TEST(Lists, NameOneFileALine) {
@@ -82,6 +143,29 @@ TEST(Lists, MayComeFromStandardInput) {
   EXPECT_EQ(enhance({"@-", "-o", out}, Bytes(a.begin(), a.end())).exitCode, 0);
   EXPECT_TRUE(folder.has("out/a_PassThrough.jpg"));
   EXPECT_EQ(enhance({"@-", "-", "-o", out}).exitCode, 2);
+}
+
+TEST(Lists, WithANulHoldAnyName) {
+  const TemporaryFolder folder;
+  folder.write("in/a\nb.jpg", smallJpeg());
+  folder.write("in/c\r.jpg", smallJpeg());
+  const std::string out = folder / "out/";
+  const Finished run = shell("find " + folder / "in" + " -type f -print0" +
+                             " | $QUENBY enhance --filter PassThrough @- -o " + out);
+  EXPECT_EQ(run.exitCode, 0) << run.errors;
+  const Finished from = shell("cd " + folder / "in" +
+                              " && find . -type f -print0 > ../list && $QUENBY info --jsonl "
+                              "--files-from ../list && $QUENBY info --files-from - < ../list");
+  EXPECT_EQ(from.exitCode, 0) << from.errors;
+  EXPECT_THAT(from.output, HasSubstr("\"./c\\r.jpg\""));
+  EXPECT_TRUE(folder.has("out/a\nb_PassThrough.jpg"));
+  EXPECT_TRUE(folder.has("out/c\r_PassThrough.jpg"));
+}
+
+TEST(Lists, AreNeededWhereNothingIsNamed) {
+  const Finished run = quenby({"info"});
+  EXPECT_EQ(run.exitCode, 2);
+  EXPECT_THAT(run.errors, HasSubstr("name the photos, or a list of them with --files-from"));
 }
 
 TEST(Lists, ThatCannotBeReadAreRefused) {
@@ -128,11 +212,34 @@ TEST(Names, ThatMeanNothingAreRefused) {
   EXPECT_THAT(folder.content(), ElementsAre("a.jpg"));
 }
 
-TEST(Outputs, NeedAPlace) {
+TEST(Outputs, StandBesideTheirInputsAndAreNoInputsLater) {
   const TemporaryFolder folder;
-  const Finished run = enhance({folder.write("a.jpg", smallJpeg())});
-  EXPECT_EQ(run.exitCode, 2);
-  EXPECT_THAT(run.errors, HasSubstr("-o FILE"));
+  folder.write("in/a.jpg", smallJpeg());
+  EXPECT_EQ(enhance({folder / "in/a.jpg"}).exitCode, 0);
+  folder.write("in/b.jpg", smallJpeg());
+  const std::string all = folder / "in/*.jpg";
+  for (const int expected : {0, 3, 3}) {
+    const Finished run =
+        shell("$QUENBY enhance --filter PassThrough " + all + (expected == 0 ? "" : " -j 1"));
+    EXPECT_EQ(run.exitCode, expected) << run.errors;
+    EXPECT_EQ(enhance({"-r", folder / "in"}).exitCode, 3);
+  }
+  EXPECT_EQ(enhance({"-r", folder / "in", "--overwrite"}).exitCode, 0);
+  EXPECT_THAT(folder.content(), ElementsAre("in/", "in/a.jpg", "in/a_PassThrough.jpg", "in/b.jpg",
+                                            "in/b_PassThrough.jpg"));
+}
+
+TEST(Outputs, MakeTheirFolder) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("a.jpg", smallJpeg());
+  EXPECT_EQ(enhance({a, "-o", folder / "new/er/"}).exitCode, 0);
+  EXPECT_EQ(enhance({a, folder.write("b.jpg", smallJpeg()), "-o", folder / "two"}).exitCode, 0);
+  EXPECT_EQ(enhance({folder / "none.jpg", "-o", folder / "for-nothing/"}).exitCode, 1);
+  EXPECT_EQ(quenby({"masks", a, "-o", folder / "masks"}).exitCode, 0);
+  EXPECT_THAT(folder.content(),
+              ElementsAre("a.jpg", "b.jpg", "masks/", "masks/bilateral.png", "masks/ltm.png",
+                          "new/", "new/er/", "new/er/a_PassThrough.jpg", "two/",
+                          "two/a_PassThrough.jpg", "two/b_PassThrough.jpg"));
 }
 
 TEST(Outputs, OfSeveralInputsNeedAFolder) {
@@ -141,7 +248,8 @@ TEST(Outputs, OfSeveralInputsNeedAFolder) {
   const std::string b = folder.write("b.jpg", smallJpeg());
   EXPECT_EQ(enhance({a, b, "-o", folder / "c.jpg"}).exitCode, 2);
   EXPECT_EQ(enhance({a, b, "-o", "-"}).exitCode, 2);
-  EXPECT_EQ(enhance({a, "-o", folder / "new/"}).exitCode, 2);
+  EXPECT_EQ(enhance({a, "-o", folder / "new/c.jpg"}).exitCode, 2);
+  EXPECT_EQ(enhance({a, b, "-o", b}).exitCode, 2);
   EXPECT_THAT(folder.content(), ElementsAre("a.jpg", "b.jpg"));
 }
 
@@ -162,7 +270,10 @@ TEST(Outputs, ThatAreThereAlreadyDoNotStopTheOthers) {
   const std::string a = folder.write("a.jpg", smallJpeg());
   const std::string b = folder.write("b.jpg", smallJpeg());
   folder.write("out/a_PassThrough.jpg", std::string("old"));
-  EXPECT_EQ(enhance({a, b, "-o", folder / "out"}).exitCode, 1);
+  const Finished run = enhance({a, b, "-o", folder / "out"});
+  EXPECT_EQ(run.exitCode, 0);
+  EXPECT_EQ(run.errors,
+            "1 of 2 photos done, 0 failed, 1 there already; --overwrite replaces them\n");
   EXPECT_EQ(text(folder.read("out/a_PassThrough.jpg")), "old");
   EXPECT_TRUE(folder.has("out/b_PassThrough.jpg"));
 }
@@ -301,6 +412,29 @@ TEST(Plan, WithNothingLeftIsNothingToDo) {
   EXPECT_EQ(enhance({a, "-o", folder.write("b.jpg", smallJpeg()), "-n"}).exitCode, 3);
 }
 
+TEST(Plan, SaysWhatIsMissing) {
+  const TemporaryFolder folder;
+  const std::string a = folder.write("a.jpg", smallJpeg()), none = folder / "none.jpg";
+  const Finished run = enhance({none, a, "-n", "--jsonl"});
+  EXPECT_EQ(run.exitCode, 1);
+  EXPECT_THAT(run.errors, HasSubstr(none + ": No such file or directory; check the path"));
+  EXPECT_THAT(run.output, HasSubstr("\"failed\""));
+  EXPECT_THAT(run.output, HasSubstr("\"planned\""));
+  for (const std::vector<std::string>& verb :
+       {std::vector<std::string>{"curve", none, "-o", folder / "c.png", "-n"},
+        {"keypoints", none, "--draw", folder / "c.png", "-n"},
+        {"score", none, "--map", folder / "c.png", "-n"},
+        {"sheet", none, a, "-o", folder / "c.png", "-n"},
+        {"masks", none, "-o", folder / "masks", "-n"}}) {
+    const Finished plan = quenby(verb);
+    EXPECT_EQ(plan.exitCode, 1) << verb[0];
+    EXPECT_THAT(plan.errors, HasSubstr("none.jpg: No such file")) << verb[0];
+  }
+  EXPECT_EQ(quenby({"score", a, "--map", folder / "c.png", "-n"}).output,
+            a + " -> " + folder / "c.png\n");
+  EXPECT_THAT(folder.content(), ElementsAre("a.jpg"));
+}
+
 // `script` gives the command a terminal.
 TEST(ProgressBar, AppearsOnATerminalOnly) {
   const TemporaryFolder folder;
@@ -326,7 +460,9 @@ TEST(Quiet, SaysErrorsOnly) {
   const std::string out = folder.makeFolder("out");
   EXPECT_THAT(enhance({a, b, "-o", out, "--quiet"}).errors, IsEmpty());
   EXPECT_THAT(enhance({a, b, "-o", out, "--overwrite"}).errors, HasSubstr("2 of 2 photos done"));
-  EXPECT_THAT(enhance({a, b, "-o", out, "-q"}).errors, HasSubstr("exists already"));
+  EXPECT_THAT(enhance({a, b, "-o", out, "-q"}).errors, IsEmpty());
+  EXPECT_THAT(enhance({a, "-o", out, "-q"}).errors, IsEmpty());
+  EXPECT_THAT(enhance({folder / "none", b, "-o", out, "-q"}).errors, HasSubstr("none: No such"));
 }
 
 }  // namespace

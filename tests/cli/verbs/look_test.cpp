@@ -226,10 +226,10 @@ TEST(LookVerb, RefusesValuesThatAreNone) {
   }
 }
 
-TEST(LookVerb, NeedsALookAPhotoAndAPlaceForIt) {
+TEST(LookVerb, NeedsALookAndAPhoto) {
   EXPECT_EQ(quenby({"look"}).exitCode, 2);
   EXPECT_EQ(quenby({"look", "winter"}).exitCode, 2);
-  EXPECT_EQ(quenby({"look", "winter", "no.jpg"}).exitCode, 2);
+  EXPECT_EQ(quenby({"look", "winter", "no.jpg"}).exitCode, 1);
   EXPECT_THAT(quenby({"look", "--help"}).output, HasSubstr("Examples:\n  quenby look "));
 }
 
