@@ -16,15 +16,17 @@ namespace fs = std::filesystem;
 namespace pelorin::photo {
 namespace {
 
-KnownFile knownFile(const ScannedPhoto& photo) {
-  return {fs::absolute(photo.path).lexically_normal().string(), {*photo.bytes, *photo.modified}};
-}
-
 bool isUnchanged(const KnownFile& file) {
   return stampOf(file.path) == file.stamp;
 }
 
 }  // namespace
+
+std::optional<KnownFile> knownFile(const ScannedPhoto& photo) {
+  if (!photo.bytes || !photo.modified) return std::nullopt;
+  return KnownFile{fs::absolute(photo.path).lexically_normal().string(),
+                   {*photo.bytes, *photo.modified}};
+}
 
 std::vector<Removal> planRemovals(const std::vector<DupeGroup>& groups,
                                   const std::vector<ScannedPhoto>& photos) {
@@ -32,9 +34,8 @@ std::vector<Removal> planRemovals(const std::vector<DupeGroup>& groups,
   for (const DupeGroup& group : groups) {
     Removal removal;
     for (const Ranked& ranked : rankGroup(group, photos)) {
-      const ScannedPhoto& photo = photos[ranked.photo];
-      if (!photo.modified) continue;  // came through standard input
-      (ranked.keep ? removal.kept : removal.removed).push_back(knownFile(photo));
+      const std::optional<KnownFile> file = knownFile(photos[ranked.photo]);
+      if (file) (ranked.keep ? removal.kept : removal.removed).push_back(*file);
     }
     if (!removal.kept.empty() && !removal.removed.empty()) plan.push_back(std::move(removal));
   }

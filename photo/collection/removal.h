@@ -1,5 +1,6 @@
 #pragma once
 
+#include <optional>
 #include <stdexcept>
 #include <string>
 #include <vector>
@@ -22,7 +23,10 @@ struct Removal {
   std::vector<KnownFile> kept, removed;  ///< Neither is empty.
 };
 
-/// What ranking the groups suggests; groups of which nothing would go are left out. Paths are absolute.
+/// The file behind a photo, by its whole path; none for one of standard input.
+std::optional<KnownFile> knownFile(const ScannedPhoto& photo);
+
+/// What ranking the groups suggests; groups of which nothing would go are left out.
 std::vector<Removal> planRemovals(const std::vector<DupeGroup>& groups,
                                   const std::vector<ScannedPhoto>& photos);
 

@@ -44,9 +44,10 @@ photo::KnownFile readEntry(const std::string& plan, const Json& entry) {
 }  // namespace
 
 std::string planEntry(const photo::KnownFile& file) {
-  return textOf({{"file", file.path},
-                 {"bytes", file.stamp.bytes},
-                 {"modified", std::to_string(file.stamp.modified)}});
+  const std::string text = textOf({{"file", file.path},
+                                   {"bytes", file.stamp.bytes},
+                                   {"modified", std::to_string(file.stamp.modified)}});
+  return Json::parse(text).dump(/*indent=*/-1, ' ', /*ensure_ascii=*/true);
 }
 
 std::vector<photo::Removal> readPlan(const std::string& path) {

@@ -13,7 +13,7 @@ namespace pelorin::cli {
 // with FILE {"file": path, "bytes": size, "modified": nanoseconds since 1970 as text}, and
 // "fileBase64" beside a path that is no UTF-8.
 
-/// FILE of a plan, as text.
+/// FILE of a plan, as text in ASCII.
 std::string planEntry(const photo::KnownFile& file);
 
 /// Reads a plan.

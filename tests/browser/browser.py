@@ -1,0 +1,111 @@
+"""A headless Chromium through its driver, for tests of pages. Needs Python's own library alone."""
+
+import base64
+import json
+import shutil
+import subprocess
+import sys
+import time
+import urllib.error
+import urllib.request
+
+SKIPPED = 77
+ELEMENT = "element-6066-11e4-a52e-4f735466cecf"
+TAB, SPACE, ENTER = "\ue004", " ", "\ue007"
+
+
+def skip_unless_installed():
+    """Ends the test in words where there is no browser."""
+    for program in ("chromium", "chromedriver"):
+        if shutil.which(program) is None:
+            print(f"skipped: {program} is not installed")
+            sys.exit(SKIPPED)
+
+
+class Browser:
+    """A browser with one window; gone at the end of its `with`."""
+
+    def __init__(self, downloads, width=1000, height=900):
+        self.driver = subprocess.Popen(
+            ["chromedriver", "--port=0"], stdout=subprocess.PIPE, stderr=subprocess.DEVNULL, text=True
+        )
+        port = None
+        for line in self.driver.stdout:
+            if "started successfully on port" in line:
+                port = int(line.rstrip(". \n").rsplit(" ", 1)[1])
+                break
+        if port is None:
+            raise RuntimeError("chromedriver does not start")
+        self.url = f"http://127.0.0.1:{port}/session"
+        arguments = ["--headless=new", "--no-sandbox", "--disable-gpu", "--disable-dev-shm-usage",
+                     f"--window-size={width},{height}"]
+        options = {
+            "args": arguments,
+            "prefs": {"download.default_directory": str(downloads)},
+        }
+        wanted = {"goog:chromeOptions": options, "goog:loggingPrefs": {"browser": "ALL"}}
+        try:
+            session = self._post("", {"capabilities": {"alwaysMatch": wanted}})
+        except BaseException:
+            self.driver.kill()
+            raise
+        self.url += "/" + session["sessionId"]
+
+    def __enter__(self):
+        return self
+
+    def __exit__(self, *error):
+        try:
+            self._send("DELETE", "")
+        finally:
+            self.driver.terminate()
+            self.driver.wait()
+
+    def _send(self, method, path, body=None):
+        data = None if body is None else json.dumps(body).encode()
+        request = urllib.request.Request(
+            self.url + path, data, {"Content-Type": "application/json"}, method=method
+        )
+        try:
+            with urllib.request.urlopen(request, timeout=60) as answer:
+                return json.load(answer)["value"]
+        except urllib.error.HTTPError as error:
+            raise RuntimeError(json.load(error)["value"]["message"]) from None
+
+    def _post(self, path, body):
+        return self._send("POST", path, body)
+
+    def open(self, path):
+        """Shows a file."""
+        self._post("/url", {"url": path.as_uri()})
+
+    def run(self, script, *arguments):
+        """What a script returns."""
+        return self._post("/execute/sync", {"script": script, "args": list(arguments)})
+
+    def find(self, selector):
+        return self._post("/element", {"using": "css selector", "value": selector})[ELEMENT]
+
+    def click(self, selector):
+        self._post(f"/element/{self.find(selector)}/click", {})
+
+    def press(self, *keys):
+        """Presses keys one after the other, wherever the focus is."""
+        actions = [{"type": kind, "value": key} for key in keys for kind in ("keyDown", "keyUp")]
+        self._post("/actions", {"actions": [{"type": "key", "id": "keyboard", "actions": actions}]})
+
+    def complaints(self):
+        """What the console has been told since it was last asked: errors of scripts, what was refused."""
+        return [entry["message"] for entry in self._post("/se/log", {"type": "browser"})]
+
+    def screenshot(self, path):
+        path.write_bytes(base64.b64decode(self._send("GET", "/screenshot")))
+
+
+def wait_for(path, seconds=20):
+    """Waits until a download is there."""
+    end = time.monotonic() + seconds
+    while not path.exists():
+        if time.monotonic() > end:
+            raise RuntimeError(f"{path} does not come")
+        time.sleep(0.02)
