@@ -5,6 +5,7 @@
 
 #include "image_processing/autoenhance/enhance_rows.h"
 #include "image_processing/autoenhance/lab_tone_pass.h"
+#include "image_processing/autoenhance/photo_analysis.h"
 #include "image_processing/core/parameter_strings.h"
 #include "image_processing/filters/through_picture.h"
 
@@ -69,10 +70,10 @@ template <typename TB, typename TL>
 void AEFilterT<TB, TL>::prepare(const FilterParams& options) {
   const Image<RGBA8Pixel>& photo = *state->image;
   if (!options.readBool("gtmOnly")) {
-    prepareImage(photo, state->metadata, state->config, statistics_, masks_);
+    prepareImage(photo, state->metadata, state->config, statistics_, masks_, state->workers);
     return;
   }
-  analyzeImage(photo, state->metadata, statistics_);
+  statistics_ = analysePhoto(photo, state->metadata, state->workers);
   if (options.readBool("gtmExtraMemory")) allocateImageMasks(photo, masks_);
 }
 
@@ -83,7 +84,7 @@ void AEFilterT<TB, TL>::applyConfig(const std::string& params, const FilterConfi
   FilterConfig adjusted = config;
   updateFilterConfigForSliderValue(options.readFloat("slider"), &adjusted);
   if (options.readBool("gtmOnly")) adjusted.detailGainHigh = 0.0f;
-  apply(*state->image, statistics_, adjusted, masks_, output);
+  apply(*state->image, statistics_, adjusted, masks_, output, state->workers);
 }
 
 template <typename TB, typename TL>

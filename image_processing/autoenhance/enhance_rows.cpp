@@ -7,15 +7,11 @@
 #include "image_processing/autoenhance/colour/lab_constants.h"
 #include "image_processing/autoenhance/enhance_row.h"
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
-#include "image_processing/autoenhance/lightness/face_lightness.h"
-#include "image_processing/autoenhance/lightness/image_statistics.h"
-#include "image_processing/autoenhance/lightness/lightness_histogram.h"
-#include "image_processing/autoenhance/lightness/lightness_row.h"
 #include "image_processing/autoenhance/masks/bilateral_grid.h"
 #include "image_processing/autoenhance/masks/grid_blur.h"
-#include "image_processing/autoenhance/masks/grid_splat.h"
 #include "image_processing/autoenhance/masks/mask_rows.h"
 #include "image_processing/autoenhance/masks/spatial_extent.h"
+#include "image_processing/autoenhance/photo_analysis.h"
 #include "image_processing/core/parameter_strings.h"
 #include "image_processing/filters/mapped_rows.h"
 
@@ -36,10 +32,9 @@ class RecentRows {
         room_(width, (held + 2 * band_ - 2) / band_ * band_),
         rows_(room_.height) {}
 
-  /// Sees to it that all rows below `end` were read. @returns false when the work gave up.
-  bool readUpTo(std::uint32_t end, const RowWork& work) {
+  /// Sees to it that all rows below `end` were read.
+  void readUpTo(std::uint32_t end) {
     while (read_ < end) {
-      if (shallStop(work)) return false;
       const std::uint32_t count = std::min(band_, height_ - read_);
       const RGBA8Pixel* const rows = source_.next(count, room_.row(read_ % room_.height));
       for (std::uint32_t i = 0; i < count; ++i) {
@@ -47,7 +42,6 @@ class RecentRows {
       }
       read_ += count;
     }
-    return true;
   }
 
   const RGBA8Pixel* row(std::uint32_t y) const { return rows_[y % rows_.size()]; }
@@ -59,6 +53,23 @@ class RecentRows {
   std::vector<const RGBA8Pixel*> rows_;
   std::uint32_t read_ = 0;
 };
+
+/// Looks at rows while the next ones come.
+std::optional<ImageStatistics> analyseAsTheyCome(const AnalysisSubject& subject, RowSource& rows,
+                                                 const RowWork& work) {
+  PhotoAnalysis found(subject);
+  RowBands bands(subject.width, subject.height, work, 2);
+  const Stage read = {1, [&](std::int64_t band, std::size_t) { bands.read(band, rows); }};
+  const Stage look = {1, [&](std::int64_t band, std::size_t) {
+                        const RGBA8Pixel* row = bands.pixels(band);
+                        const std::uint32_t first = bands.first(band);
+                        const std::uint32_t end = first + bands.rows(band);
+                        for (std::uint32_t y = first; y < end; ++y, row += subject.width)
+                          found.addRow(y, row);
+                      }};
+  if (!runStages(bands.count(), {read, look}, work.workers, work.stop)) return std::nullopt;
+  return found.statistics();
+}
 
 template <typename Mask>
 class EnhanceRows : public RowFilter {
@@ -77,30 +88,18 @@ class EnhanceRows : public RowFilter {
   bool looksFirst() const override { return true; }
 
   bool look(RowSource& rows, const RowWork& work) override {
-    LightnessHistogramSimd counter;
-    FaceLightness faces(metadata_, width_, height_, lightnessBins, lightnessScale);
-    LightnessRow lightness(width_);
-    std::optional<GridSplatter> splatter;
+    AnalysisSubject subject{width_, height_, metadata_};
     if (masked_) {
-      cellSize_ = gridCellSize(spatialExtent(width_, height_, config_));
-      grid_.emplace(makeGrid(width_, height_, cellSize_));
-      splatter.emplace(*grid_, width_, cellSize_);
+      subject.cellSize = cellSize_ = gridCellSize(spatialExtent(width_, height_, config_));
+      subject.grid = &grid_.emplace(makeGrid(width_, height_, cellSize_));
     }
-    const std::uint32_t band = std::min(work.bandHeight, height_);
-    const Image<RGBA8Pixel> room(width_, band);
-    for (std::uint32_t y = 0; y < height_;) {
-      if (shallStop(work)) return false;
-      const std::uint32_t end = std::min(y + band, height_);
-      const RGBA8Pixel* pixels = rows.next(end - y, room.data.get());
-      for (; y < end; ++y, pixels += width_) {
-        const float* const row = lightness.of(pixels);
-        if (splatter) splatter->addRow(y, row);
-        counter.add(row, width_);
-        faces.addRow(pixels);
-      }
-    }
-    if (grid_) blur(*grid_, config_.bilateralRange);
-    statistics_ = analyzeImage(counter, faces);
+    const RGBA8Pixel* const photo = rows.standing();
+    const std::optional<ImageStatistics> statistics =
+        photo != nullptr ? analysePhoto(subject, photo, work.workers, work.bandHeight, work.stop)
+                         : analyseAsTheyCome(subject, rows, work);
+    if (!statistics) return false;
+    statistics_ = *statistics;
+    if (grid_) blur(*grid_, config_.bilateralRange, work.workers);
     return true;
   }
 
@@ -122,28 +121,76 @@ class EnhanceRows : public RowFilter {
   bool filterWithMasks(const PreparedTonePass& pass, RowSource& rows, RowSink& filtered,
                        const RowWork& work) {
     using Masks = MaskRows<Mask, Mask>;
-    const std::uint32_t held = Masks::rowsHeld(height_, config_);
-    RecentRows photo(rows, width_, height_, held, work.bandHeight);
+    Workers* const workers = work.workers;
+    const std::size_t parts = tasksFor(workers);
+    const auto steps = workers == nullptr ? 1 : std::max<int>(1, work.bandHeight / sumRowsAtOnce);
+    // The steps that may be under way from one stage to another, those stages' own included.
+    const auto stepsOver = [&](std::size_t stages) {
+      return steps * static_cast<int>(bandsUnderWay(stages, workers));
+    };
+    RecentRows photo(rows, width_, height_, Masks::rowsHeld(height_, config_, stepsOver(4)),
+                     work.bandHeight);
     Masks masks(
         *grid_, cellSize_, width_, height_, config_, metadata_,
-        [&](std::uint32_t y) { return photo.row(y); }, RowRing<Mask>(width_, held));
-    typename Masks::Scratch scratch(masks);
-    const Image<Mask> ltm(width_, 1);
-    const Image<RGBA8Pixel> made(width_, sumRowsAtOnce);
-    std::uint32_t y = 0;
-    for (std::int64_t step = 0; step < masks.steps(); ++step) {
-      if (!photo.readUpTo(masks.photoEnd(step), work)) return false;
-      masks.prepare(step, scratch);
-      masks.sum(step, scratch);
-      const std::uint32_t first = y;
-      for (; y < masks.maskEnd(step); ++y) {
-        masks.writeLtm(y, ltm.data.get());
-        pass.enhance(photo.row(y), masks.bilateral(y), ltm.data.get(), made.row(y - first), width_);
-      }
-      if (y > first) filtered.write(made.data.get(), y - first);
-    }
-    return true;
+        [&](std::uint32_t y) { return photo.row(y); },
+        RowRing<Mask>(width_, Masks::rowsHeld(height_, config_, stepsOver(3))), stepsOver(3));
+    std::vector<typename Masks::Scratch> preparing;
+    for (std::size_t i = 0; i < std::min<std::size_t>(parts, steps); ++i)
+      preparing.emplace_back(masks);
+    LightnessRow summing(width_);
+    std::vector<Finishing> finishing;
+    for (std::size_t i = 0; i < parts; ++i) finishing.emplace_back(width_);
+    std::vector<Image<RGBA8Pixel>> made;
+    for (std::int64_t i = bandsUnderWay(2, workers); i > 0; --i)
+      made.emplace_back(width_, static_cast<std::uint32_t>(steps * sumRowsAtOnce));
+
+    const std::int64_t bands = (masks.steps() + steps - 1) / steps;
+    const auto stepEnd = [&](std::int64_t band) {
+      return std::min((band + 1) * steps, masks.steps());
+    };
+    const auto rowEnd = [&](std::int64_t band) {
+      return band < 0 ? 0 : masks.maskEnd(stepEnd(band) - 1);
+    };
+    const auto rowsOf = [&](std::int64_t band) { return rowEnd(band) - rowEnd(band - 1); };
+    const auto roomOf = [&](std::int64_t band) -> const Image<RGBA8Pixel>& {
+      return made[static_cast<std::size_t>(band) % made.size()];
+    };
+    const Stage read = {1, [&](std::int64_t band, std::size_t) {
+                          photo.readUpTo(masks.photoEnd(stepEnd(band) - 1));
+                        }};
+    const Stage prepare = {preparing.size(), [&](std::int64_t band, std::size_t part) {
+                             auto step = band * steps + static_cast<std::int64_t>(part);
+                             for (; step < stepEnd(band); step += preparing.size())
+                               masks.prepare(step, preparing[part]);
+                           }};
+    const Stage sum = {1, [&](std::int64_t band, std::size_t) {
+                         for (std::int64_t step = band * steps; step < stepEnd(band); ++step)
+                           masks.sum(step, summing);
+                       }};
+    const Stage enhance = {parts, [&](std::int64_t band, std::size_t part) {
+                             const std::uint32_t before = rowEnd(band - 1), rows = rowsOf(band);
+                             Mask* const ltm = finishing[part].ltm.data.get();
+                             auto i = static_cast<std::uint32_t>(partStart(rows, part, parts));
+                             for (; i < partStart(rows, part + 1, parts); ++i) {
+                               const std::uint32_t y = before + i;
+                               masks.writeLtm(y, ltm, finishing[part].faces);
+                               pass.enhance(photo.row(y), masks.bilateral(y), ltm,
+                                            roomOf(band).row(i), width_);
+                             }
+                           }};
+    const Stage write = {1, [&](std::int64_t band, std::size_t) {
+                           if (rowsOf(band) > 0)
+                             filtered.write(roomOf(band).data.get(), rowsOf(band));
+                         }};
+    return runStages(bands, {read, prepare, sum, enhance, write}, workers, work.stop);
   }
+
+  /// What a task works with that finishes rows.
+  struct Finishing {
+    explicit Finishing(std::uint32_t width) : ltm(width, 1) {}
+    Image<Mask> ltm;
+    FaceBlendRows::Scratch faces;
+  };
 
   std::uint32_t width_, height_;
   ImageMetadata metadata_;

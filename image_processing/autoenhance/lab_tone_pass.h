@@ -5,6 +5,7 @@
 #include "image_processing/autoenhance/lightness/image_statistics.h"
 #include "image_processing/autoenhance/masks/image_masks.h"
 #include "image_processing/core/image.h"
+#include "image_processing/core/workers.h"
 #include "image_processing/filters/filter_config.h"
 
 namespace pelorin::image_processing {
@@ -13,7 +14,8 @@ namespace pelorin::image_processing {
 /// @throws std::bad_alloc; `output` is then untouched.
 template <typename TB, typename TL>
 void apply(const Image<RGBA8Pixel>& source, const ImageStatistics& statistics,
-           const FilterConfig& config, const ImageMasks<TB, TL>& masks, Image<RGBA8Pixel>& output);
+           const FilterConfig& config, const ImageMasks<TB, TL>& masks, Image<RGBA8Pixel>& output,
+           Workers* workers = nullptr);
 
 /// The pass over the pixels: to Lab, L through the tone curve and, with masks, recombined from
 /// smoothed base and detail, back to sRGB with a and b unchanged, then vibrance. Alpha is copied.
@@ -25,12 +27,14 @@ void apply(const Image<RGBA8Pixel>& source, const ImageStatistics& statistics,
 /// @param scale   L of white, 100.
 /// @param masks   of the size of `source`, computed or filled by hand; those that are smaller, were
 ///                only allocated, or are not there at all, are off.
+/// @param workers share the work; null for none.
 ///
 /// Keeps no state; calls with different outputs may run at once. For (float, float) and
 /// (QuantizedFloat<unsigned char>, the same).
 template <typename TB, typename TL>
 void imageVibranceLabAndToneCurve(const Image<RGBA8Pixel>& source, Image<RGBA8Pixel>& output,
                                   const FilterConfig& config, const std::vector<float>& curve,
-                                  float scale, const ImageMasks<TB, TL>& masks);
+                                  float scale, const ImageMasks<TB, TL>& masks,
+                                  Workers* workers = nullptr);
 
 }  // namespace pelorin::image_processing

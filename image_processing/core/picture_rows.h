@@ -20,6 +20,7 @@ class PictureSource : public RowSource {
     next_ += count;
     return rows;
   }
+  const RGBA8Pixel* standing() const override { return picture_.row(next_); }
 
  private:
   Image<RGBA8Pixel> picture_;

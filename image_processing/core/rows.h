@@ -19,6 +19,9 @@ class RowSource {
   /// @returns `room`, written; or where the rows stand, unchanged as long as the source is used.
   /// What it throws passes through.
   virtual const RGBA8Pixel* next(std::uint32_t count, RGBA8Pixel* room) = 0;
+
+  /// Where all rows that are left stand already, back to back; null where they come one by one.
+  virtual const RGBA8Pixel* standing() const { return nullptr; }
 };
 
 /// Takes the rows of a picture from top to bottom.

@@ -9,9 +9,10 @@ namespace pelorin::image_processing {
 
 FilteredImage::FilteredImage(std::shared_ptr<Image<RGBA8Pixel>>& image,
                              const ImageMetadata& metadata, const std::string& sessionName,
-                             const FilterConfig& config, std::shared_ptr<FilterFactory> factory)
+                             const FilterConfig& config, std::shared_ptr<FilterFactory> factory,
+                             Workers* workers)
     : state_(std::make_shared<FilteredImageState>(
-          FilteredImageState{image, metadata, sessionName, config})),
+          FilteredImageState{image, metadata, sessionName, config, workers})),
       factory_(std::move(factory)) {}
 
 std::shared_ptr<AbstractFilter> FilteredImage::setupFilter(const std::string& name,

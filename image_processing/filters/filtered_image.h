@@ -5,6 +5,7 @@
 #include <mutex>
 #include <string>
 
+#include "image_processing/core/workers.h"
 #include "image_processing/filters/abstract_filter.h"
 #include "image_processing/filters/filter_factory.h"
 
@@ -15,9 +16,10 @@ namespace pelorin::image_processing {
 class FilteredImage {
  public:
   /// Shares `image` and keeps copies of the rest. `factory` decides which names exist.
+  /// @param workers  share the work of the filters and outlive them; null for none.
   FilteredImage(std::shared_ptr<Image<RGBA8Pixel>>& image, const ImageMetadata& metadata,
                 const std::string& sessionName, const FilterConfig& config,
-                std::shared_ptr<FilterFactory> factory);
+                std::shared_ptr<FilterFactory> factory, Workers* workers = nullptr);
 
   /// The session's filter of that name, made and initialised with `params` on the first request:
   /// later ones get the same filter and their `params` are ignored. Empty when the name is unknown.

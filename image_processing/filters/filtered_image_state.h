@@ -5,6 +5,7 @@
 
 #include "image_processing/core/image.h"
 #include "image_processing/core/image_metadata.h"
+#include "image_processing/core/workers.h"
 #include "image_processing/filters/filter_config.h"
 
 namespace pelorin::image_processing {
@@ -15,6 +16,7 @@ struct FilteredImageState {
   ImageMetadata metadata;
   std::string sessionName;  ///< For the caller's own use; nothing depends on it.
   FilterConfig config;
+  Workers* workers = nullptr;  ///< Share the work of its filters; null for none.
 };
 
 }  // namespace pelorin::image_processing

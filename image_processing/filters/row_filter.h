@@ -6,6 +6,7 @@
 
 #include "image_processing/core/image_metadata.h"
 #include "image_processing/core/rows.h"
+#include "image_processing/core/workers.h"
 #include "image_processing/filters/filter_config.h"
 
 namespace pelorin::image_processing {
@@ -22,6 +23,8 @@ struct RowRequest {
 struct RowWork {
   std::uint32_t bandHeight = 16;    ///< Rows asked for at a time, at least 1.
   std::function<bool()> stop = {};  ///< Asked between bands whether to give up; may be empty.
+  /// Share the work; null for none. Source and sink are used by one thread at a time, `stop` by any.
+  Workers* workers = nullptr;
 };
 
 /// A filter at work on one picture that comes as rows, and needs no more memory than some of them

@@ -30,7 +30,7 @@ class ThroughPicture : public RowFilter {
     if (!forEachBand(collect)) return false;
 
     auto state = std::make_shared<FilteredImageState>(
-        FilteredImageState{picture, request_.metadata, "", request_.config});
+        FilteredImageState{picture, request_.metadata, "", request_.config, work.workers});
     const std::unique_ptr<AbstractFilter> filter = makeFilter_(state);
     filter->init(request_.params);
     filter->applyConfig(request_.params, request_.config, *picture);

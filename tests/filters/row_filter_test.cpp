@@ -2,16 +2,13 @@
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <cstring>
 #include <memory>
 #include <stdexcept>
 #include <string>
 #include <vector>
 
-#include "image_processing/core/picture_rows.h"
-#include "image_processing/filters/default_filter_factory.h"
-#include "image_processing/filters/filtered_image.h"
+#include "tests/filters/filtered_by_rows.h"
 #include "tests/support/faces.h"
 #include "tests/support/pictures.h"
 #include "tests/support/slow_build.h"
@@ -28,64 +25,39 @@ const FilterDescription& filterNamed(const std::string& name) {
   return *DefaultFilterFactory::filterFactory()->find(name);
 }
 
-/// Rows that come into the room they are given, as a decoder's do.
-class DecodedRows : public RowSource {
- public:
-  explicit DecodedRows(Image<RGBA8Pixel> picture) : picture_(std::move(picture)) {}
-
-  const RGBA8Pixel* next(std::uint32_t count, RGBA8Pixel* room) override {
-    std::copy_n(picture_.row(next_), std::size_t{picture_.width} * count, room);
-    next_ += count;
-    return room;
+std::vector<RowWork> waysToWork() {
+  std::vector<RowWork> ways;
+  for (const std::uint32_t bandHeight : {1u, 16u, 64u}) ways.push_back({.bandHeight = bandHeight});
+  if (slowBuild) ways.erase(ways.begin() + 1, ways.end());
+  for (const auto& [bandHeight, count] : {std::pair{64u, 2u}, {1u, 3u}, {16u, 1u}, {16u, 8u}}) {
+    ways.push_back({.bandHeight = bandHeight, .workers = &threads(count)});
+    if (slowBuild) break;
   }
-
- private:
-  Image<RGBA8Pixel> picture_;
-  std::uint32_t next_ = 0;
-};
-
-Image<RGBA8Pixel> byPicture(const FilterDescription& filter, const Image<RGBA8Pixel>& picture,
-                            const RowRequest& request) {
-  auto photo = std::make_shared<Image<RGBA8Pixel>>(picture);
-  FilteredImage session(photo, request.metadata, "", request.config,
-                        DefaultFilterFactory::filterFactory());
-  Image<RGBA8Pixel> output(picture.width, picture.height);
-  session.applyFilterWithParams(filter.name, request.params, request.config, output);
-  return output;
-}
-
-template <typename Source>
-Image<RGBA8Pixel> byRows(const FilterDescription& filter, const Image<RGBA8Pixel>& picture,
-                         const RowRequest& request, const RowWork& work) {
-  const std::unique_ptr<RowFilter> rows = filter.makeRowFilter(request);
-  if (rows->looksFirst()) {
-    Source source(picture);
-    EXPECT_TRUE(rows->look(source, work));
-  }
-  Image<RGBA8Pixel> output(picture.width, picture.height);
-  Source source(picture);
-  PictureSink sink(output);
-  EXPECT_TRUE(rows->filter(source, sink, work));
-  return output;
+  return ways;
 }
 
 testing::AssertionResult rowsGiveThePicture(const FilterDescription& filter,
                                             const Image<RGBA8Pixel>& picture,
                                             const RowRequest& request) {
   const Image<RGBA8Pixel> expected = byPicture(filter, picture, request);
-  for (const std::uint32_t bandHeight : {1u, 16u, 64u}) {
+  for (const RowWork& work : waysToWork()) {
     for (const bool decoded : {false, true}) {
-      const RowWork work{.bandHeight = bandHeight};
       const Image<RGBA8Pixel> actual = decoded
                                            ? byRows<DecodedRows>(filter, picture, request, work)
                                            : byRows<PictureSource>(filter, picture, request, work);
       if (std::memcmp(actual.data.get(), expected.data.get(), expected.byteSize()) == 0) continue;
       return testing::AssertionFailure()
              << filter.name << " " << request.params << ", " << picture.width << " x "
-             << picture.height << ", bands of " << bandHeight;
+             << picture.height << ", bands of " << work.bandHeight << ", " << tasksFor(work.workers)
+             << " threads";
     }
   }
-  return testing::AssertionSuccess();
+  const Image<RGBA8Pixel> shared = byPicture(filter, picture, request, &threads(3));
+  if (std::memcmp(shared.data.get(), expected.data.get(), expected.byteSize()) == 0)
+    return testing::AssertionSuccess();
+  return testing::AssertionFailure()
+         << filter.name << " " << request.params << ", " << picture.width << " x " << picture.height
+         << ", a session with workers";
 }
 
 std::vector<std::pair<std::uint32_t, std::uint32_t>> sizes() {

@@ -166,7 +166,7 @@ Kernel gridSplat(const Photo& photo) {
 Kernel gridBlur(const Photo& photo) {
   const auto grid = std::make_shared<Grid>(0, 0);
   return kernelOf(
-      blur, blurScalar,
+      +[](Grid& grid, float range) { blur(grid, range); }, blurScalar,
       [=, before = splatted(photo)](auto* kernel) {
         Grid blurred = before;
         kernel(blurred, sigmaRange);
@@ -307,7 +307,10 @@ Kernel look(const Photo& photo) {
   const auto vignette = std::make_shared<CubicRadialMask>(maskOf<Filter>());
   const Output<RGBA8Pixel> out(photo.width, photo.height);
   return kernelOf(
-      applyLook, applyLookScalar,
+      +[](const Look& look, const Photo& photo, Image<RGBA8Pixel>& output) {
+        applyLook(look, photo, output);
+      },
+      applyLookScalar,
       [=, kept = vignette, output = out.image,
        look = lookOf<Filter>(withVignette ? vignette.get() : nullptr)](auto* kernel) mutable {
         kernel(look, photo, output);

@@ -27,15 +27,14 @@ FaceLightness::FaceLightness(const ImageMetadata& metadata, std::uint32_t width,
   steps_.resize(width);
 }
 
-void FaceLightness::addRow(const RGBA8Pixel* pixels) {
+void FaceLightness::addRow(std::uint32_t y, const RGBA8Pixel* pixels) {
   bool changed = false;
-  for (; nextEdge_ < edges_.size() && edges_[nextEdge_].y == y_; ++nextEdge_) {
+  for (; nextEdge_ < edges_.size() && edges_[nextEdge_].y <= y; ++nextEdge_) {
     const Edge& edge = edges_[nextEdge_];
     changes_[edge.left] += edge.change;
     changes_[edge.end] -= edge.change;
     changed = true;
   }
-  ++y_;
   if (changed) findRuns();
   if (runs_.empty()) return;
   const std::uint32_t first = runs_.front().first;

@@ -18,8 +18,11 @@ class FaceLightness {
   FaceLightness(const ImageMetadata& metadata, std::uint32_t width, std::uint32_t height, int bins,
                 float scale);
 
-  /// Counts the next row's `width` pixels; the first is row 0. @throws std::bad_alloc.
-  void addRow(const RGBA8Pixel* pixels);
+  /// Counts the `width` pixels of row `y`, which is below those before. @throws std::bad_alloc.
+  void addRow(std::uint32_t y, const RGBA8Pixel* pixels);
+
+  /// Counts what `other` has counted, of other rows of the same photo. Never throws.
+  void add(const FaceLightness& other) { histogram_.add(other.histogram_); }
 
   /// The first entry at which the CDF of the rows so far reaches one half; -1 without face pixels,
   /// or when that is the last entry. @throws std::bad_alloc.
@@ -47,7 +50,6 @@ class FaceLightness {
   std::vector<std::int64_t> changes_;  // boxes of a column less those of the one before
   std::vector<Run> runs_;              // of the row, from left to right; none without boxes
   std::vector<std::uint16_t> steps_;   // of the row's pixels from the first run to the last
-  std::int64_t y_ = 0;
 };
 
 }  // namespace pelorin::image_processing

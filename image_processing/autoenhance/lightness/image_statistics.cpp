@@ -13,7 +13,7 @@ std::int32_t faceMedianBin(const Image<RGBA8Pixel>& image, const ImageMetadata& 
                            float scale) {
   if (metadata.faces.empty()) return -1;
   FaceLightness faces(metadata, image.width, image.height, bins, scale);
-  for (std::uint32_t y = 0; y < image.height; ++y) faces.addRow(image.row(y));
+  for (std::uint32_t y = 0; y < image.height; ++y) faces.addRow(y, image.row(y));
   return faces.medianBin();
 }
 
@@ -26,12 +26,7 @@ void analyzeImage(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata,
   for (std::uint32_t y = 0; y < image.height; ++y) {
     counter.add(lightness.of(image.row(y)), image.width);
   }
-  analyzeImage(counter, image, metadata, statistics);
-}
-
-void analyzeImage(const LightnessHistogramSimd& counted, const Image<RGBA8Pixel>& image,
-                  const ImageMetadata& metadata, ImageStatistics& statistics) {
-  computeCDF(normalised(counted.counts()), statistics.cdf);
+  computeCDF(normalised(counter.counts()), statistics.cdf);
   statistics.faceMedianBin = faceMedianBin(image, metadata, lightnessBins, lightnessScale);
 }
 

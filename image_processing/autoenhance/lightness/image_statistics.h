@@ -25,11 +25,7 @@ struct ImageStatistics {
 void analyzeImage(const Image<RGBA8Pixel>& image, const ImageMetadata& metadata,
                   ImageStatistics& statistics);
 
-/// The same where every pixel of `image` has been counted.
-void analyzeImage(const LightnessHistogramSimd& counted, const Image<RGBA8Pixel>& image,
-                  const ImageMetadata& metadata, ImageStatistics& statistics);
-
-/// The same where those of the faces have been counted as well, in the same bins.
+/// The same where the pixels have been counted, and those of the faces in the same bins.
 ImageStatistics analyzeImage(const LightnessHistogramSimd& counted, const FaceLightness& faces);
 
 /// Statistics in `bins` bins (at least 1) over L in [0, scale].

@@ -1,6 +1,7 @@
 #include "image_processing/autoenhance/lightness/lightness_histogram.h"
 
 #include <algorithm>
+#include <functional>
 #include <numeric>
 
 #include "image_processing/autoenhance/colour/companding_steps.h"
@@ -10,6 +11,10 @@
 
 namespace pelorin::image_processing {
 namespace {
+
+void addTo(std::vector<std::uint64_t>& counts, const std::vector<std::uint64_t>& others) {
+  std::transform(counts.begin(), counts.end(), others.begin(), counts.begin(), std::plus<>());
+}
 
 std::uint64_t sum(const std::vector<std::uint64_t>& counts) {
   return std::accumulate(counts.begin(), counts.end(), std::uint64_t{0});
@@ -29,6 +34,14 @@ LightnessHistogram::LightnessHistogram(int bins, float scale) : binOfStep_(compa
 
 void LightnessHistogram::add(const std::uint16_t* steps, std::size_t count, std::uint64_t times) {
   for (std::size_t i = 0; i < count; ++i) counts_[binOfStep_[steps[i]]] += times;
+}
+
+void LightnessHistogram::add(const LightnessHistogram& other) {
+  addTo(counts_, other.counts_);
+}
+
+void LightnessHistogramSimd::add(const LightnessHistogramSimd& other) {
+  addTo(counts_, other.counts_);
 }
 
 bool LightnessHistogram::empty() const {

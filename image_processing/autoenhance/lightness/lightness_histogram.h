@@ -24,6 +24,9 @@ class LightnessHistogram {
   /// Counts `count` pixels, of which `steps` are the companding steps, `times` each. Never throws.
   void add(const std::uint16_t* steps, std::size_t count, std::uint64_t times = 1);
 
+  /// Counts what another histogram with the same bins has counted. Never throws.
+  void add(const LightnessHistogram& other);
+
   bool empty() const;
 
   /// The share of each bin. @throws std::bad_alloc.
@@ -42,6 +45,9 @@ class LightnessHistogramSimd {
 
   /// Counts `count` pixels of a photo's L / 100. Never throws.
   void add(const float* lightness, std::size_t count);
+
+  /// Counts what another one has counted. Never throws.
+  void add(const LightnessHistogramSimd& other);
 
   /// Pixels in each bin. @throws std::bad_alloc.
   std::vector<std::uint64_t> counts() const;

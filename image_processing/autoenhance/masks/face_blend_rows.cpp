@@ -38,23 +38,27 @@ FaceBlendRows::FaceBlendRows(const ImageMetadata& metadata, std::uint32_t width,
 }
 
 template <typename TL>
-void FaceBlendRows::blendRow(const RGBA8Pixel* pixels, TL* mask) {
-  const std::int64_t y = y_++;
-  std::erase_if(active_, [&](std::uint32_t i) { return regions_[i].region.rows->last < y; });
-  for (; nextStart_ < starts_.size(); ++nextStart_) {
-    const std::uint32_t region = starts_[nextStart_];
-    if (regions_[region].region.rows->first != y) break;
-    active_.insert(std::upper_bound(active_.begin(), active_.end(), region), region);
+void FaceBlendRows::blendRow(std::uint32_t y, const RGBA8Pixel* pixels, TL* mask,
+                             Scratch& scratch) const {
+  std::vector<std::uint32_t>& active = scratch.active_;
+  const auto isOver = [&](std::uint32_t i) { return regions_[i].region.rows->last < y; };
+  std::erase_if(active, isOver);
+  for (; scratch.nextStart_ < starts_.size(); ++scratch.nextStart_) {
+    const std::uint32_t region = starts_[scratch.nextStart_];
+    if (regions_[region].region.rows->first > y) break;
+    if (isOver(region)) continue;
+    active.insert(std::upper_bound(active.begin(), active.end(), region), region);
   }
-  if (active_.empty()) return;
-  findSkin(pixels);
-  for (const std::uint32_t i : active_) {
+  if (active.empty()) return;
+  findSkin(pixels, scratch);
+  const std::vector<SkinPixel>& skin = scratch.skin_;
+  for (const std::uint32_t i : active) {
     const Window& rows = *regions_[i].region.rows;
     const Window& columns = *regions_[i].region.columns;
     const float atY = rows.weights[static_cast<std::size_t>(y - rows.first)];
-    auto pixel = std::lower_bound(skin_.begin(), skin_.end(), columns.first,
+    auto pixel = std::lower_bound(skin.begin(), skin.end(), columns.first,
                                   [](const SkinPixel& s, std::int64_t x) { return s.x < x; });
-    for (; pixel != skin_.end() && pixel->x <= columns.last; ++pixel) {
+    for (; pixel != skin.end() && pixel->x <= columns.last; ++pixel) {
       const float atX = columns.weights[static_cast<std::size_t>(pixel->x - columns.first)];
       const float weight = atX * atY * pixel->skin;
       TL& out = mask[pixel->x];
@@ -68,22 +72,24 @@ void FaceBlendRows::blendRow(const RGBA8Pixel* pixels, TL* mask) {
 }
 
 // Pixels that are no skin at all have the weight 0 for every face, which changes no mask.
-void FaceBlendRows::findSkin(const RGBA8Pixel* pixels) {
-  std::int64_t first = regions_[active_.front()].region.columns->first, last = first;
-  for (const std::uint32_t i : active_) {
+void FaceBlendRows::findSkin(const RGBA8Pixel* pixels, Scratch& scratch) const {
+  const std::vector<std::uint32_t>& active = scratch.active_;
+  std::int64_t first = regions_[active.front()].region.columns->first, last = first;
+  for (const std::uint32_t i : active) {
     first = std::min(first, regions_[i].region.columns->first);
     last = std::max(last, regions_[i].region.columns->last);
   }
   const ColourTables& tables = colourTables();
-  skin_.clear();
+  scratch.skin_.clear();
   for (std::int64_t x = first; x <= last; ++x) {
     const Lab lab = rgbToLab(tables, pixels[x].r, pixels[x].g, pixels[x].b);
     const float skin = tables.skinA(lab.a) * tables.skinB(lab.b);
-    if (skin != 0.0f) skin_.push_back({static_cast<std::uint32_t>(x), skin});
+    if (skin != 0.0f) scratch.skin_.push_back({static_cast<std::uint32_t>(x), skin});
   }
 }
 
-template void FaceBlendRows::blendRow(const RGBA8Pixel*, float*);
-template void FaceBlendRows::blendRow(const RGBA8Pixel*, QuantizedFloat<unsigned char>*);
+template void FaceBlendRows::blendRow(std::uint32_t, const RGBA8Pixel*, float*, Scratch&) const;
+template void FaceBlendRows::blendRow(std::uint32_t, const RGBA8Pixel*,
+                                      QuantizedFloat<unsigned char>*, Scratch&) const;
 
 }  // namespace pelorin::image_processing

@@ -12,18 +12,32 @@ namespace pelorin::image_processing {
 /// Draws all faces of a photo into its LTM mask, a row at a time, each into what the one before
 /// left: `blendFaceIntoMask` for one after the other gives the same bytes. A row's skin is looked
 /// for once however many faces cross it, and faces that cover the same part of the photo cost
-/// little beyond the first.
+/// little beyond the first. Any thread may use it.
 class FaceBlendRows {
+  struct SkinPixel {
+    std::uint32_t x;
+    float skin;
+  };
+
  public:
+  /// What a thread works with: the faces that its latest row crossed.
+  class Scratch {
+    friend FaceBlendRows;
+
+    std::size_t nextStart_ = 0;          // the first in `starts_` that the rows have not come to
+    std::vector<std::uint32_t> active_;  // their numbers, in the order of the faces
+    std::vector<SkinPixel> skin_;        // of the row, from left to right
+  };
+
   /// Boxes may reach out of the photo; null ones are none. @throws std::bad_alloc.
   FaceBlendRows(const ImageMetadata& metadata, std::uint32_t width, std::uint32_t height);
 
-  /// Blends the next row, the first being row 0.
+  /// Blends row `y`, which is below those that `scratch` served before.
   /// @param pixels  the photo's, `width` of them.
   /// @param mask    read and written, likewise.
   /// May throw std::bad_alloc. For float and QuantizedFloat<unsigned char>.
   template <typename TL>
-  void blendRow(const RGBA8Pixel* pixels, TL* mask);
+  void blendRow(std::uint32_t y, const RGBA8Pixel* pixels, TL* mask, Scratch& scratch) const;
 
  private:
   // A face's weights over the rows or the columns of its region, from `first` to `last`.
@@ -40,19 +54,11 @@ class FaceBlendRows {
     Region region;
     std::uint64_t times;
   };
-  struct SkinPixel {
-    std::uint32_t x;
-    float skin;
-  };
 
-  void findSkin(const RGBA8Pixel* pixels);
+  void findSkin(const RGBA8Pixel* pixels, Scratch& scratch) const;
 
   std::vector<Repeated> regions_;      // in the order of the faces
   std::vector<std::uint32_t> starts_;  // their numbers by first row
-  std::size_t nextStart_ = 0;          // the first that the rows have not come to
-  std::vector<std::uint32_t> active_;  // their numbers, in the order of the faces
-  std::vector<SkinPixel> skin_;        // of the row, from left to right
-  std::int64_t y_ = 0;
 };
 
 }  // namespace pelorin::image_processing

@@ -2,6 +2,7 @@
 
 #include "image_processing/autoenhance/masks/gaussian_approximation.h"
 #include "image_processing/autoenhance/masks/grid.h"
+#include "image_processing/core/workers.h"
 
 namespace pelorin::image_processing {
 
@@ -25,7 +26,8 @@ inline GaussianApproximation<float> rangeBell(std::int64_t radius) {
 /// `spatialBell` in space, mirrored at the borders, and `rangeBell` in lightness, where nothing
 /// lies beyond the ends. A radius of 0 or less leaves 0 in every node. Nodes hold finite numbers
 /// from 0 on. @throws std::bad_alloc for one line of cells.
-void blur(Grid& grid, float sigmaRange);
+/// @param workers  share the work; null for none.
+void blur(Grid& grid, float sigmaRange, Workers* workers = nullptr);
 
 /// The definition of `blur`.
 void blurScalar(Grid& grid, float sigmaRange);

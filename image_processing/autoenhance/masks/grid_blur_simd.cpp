@@ -14,7 +14,7 @@ HWY_BEFORE_NAMESPACE();
 namespace pelorin::image_processing::HWY_NAMESPACE {
 namespace {
 #if HWY_TARGET == HWY_SCALAR
-void blur(Grid& grid, float sigmaRange) {
+void blur(Grid& grid, float sigmaRange, Workers*) {
   blurScalar(grid, sigmaRange);
 }
 #else
@@ -33,6 +33,11 @@ struct SpatialBell {
     return hn::Add(hn::Add(hn::Mul(before, previous), here), hn::Mul(after, next));
   }
 };
+
+HWY_INLINE SpatialBell spatialWeights() {
+  const GaussianApproximation<float> bell = spatialBell();
+  return {hn::Set(Floats(), bell(-1.0f)), hn::Set(Floats(), bell(1.0f))};
+}
 
 /// Blurs the floats of `count` cells that lie `stride` floats apart.
 HWY_INLINE void blurLine(const SpatialBell& bell, float* cells, std::int64_t count,
@@ -77,15 +82,37 @@ HWY_INLINE void blurLightness(const float* bell, float* cell) {
   }
 }
 
-void blur(Grid& grid, float sigmaRange) {
-  const GaussianApproximation<float> spatial = spatialBell();
-  const SpatialBell bell{hn::Set(Floats(), spatial(-1.0f)), hn::Set(Floats(), spatial(1.0f))};
-  const auto floats = [&](std::int64_t row) { return &(*grid.row(row))[0].value; };
-  const auto columns = static_cast<std::ptrdiff_t>(grid.columns);
-  for (std::int64_t y = 0; y < grid.rows; ++y) blurLine(bell, floats(y), columns, cellFloats);
-  for (std::ptrdiff_t x = 0; x < columns; ++x) {
-    blurLine(bell, floats(0) + x * cellFloats, grid.rows, columns * cellFloats);
+/// Blurs cells, rows or columns of the grid, from `first` to before `end`.
+void blurRows(Grid& grid, std::int64_t first, std::int64_t end) {
+  const SpatialBell bell = spatialWeights();
+  for (std::int64_t y = first; y < end; ++y) {
+    blurLine(bell, &(*grid.row(y))[0].value, grid.columns, cellFloats);
   }
+}
+
+void blurColumns(Grid& grid, std::int64_t first, std::int64_t end) {
+  const SpatialBell bell = spatialWeights();
+  const auto stride = static_cast<std::ptrdiff_t>(grid.columns * cellFloats);
+  for (std::int64_t x = first; x < end; ++x) {
+    blurLine(bell, &grid.row(0)[x][0].value, grid.rows, stride);
+  }
+}
+
+void blurCells(const float* bell, Grid& grid, std::int64_t first, std::int64_t end) {
+  for (std::int64_t i = first; i < end; ++i) blurLightness(bell, &grid.cells[i][0].value);
+}
+
+void blur(Grid& grid, float sigmaRange, Workers* workers) {
+  const std::size_t parts = tasksFor(workers);
+  const auto share = [&](std::int64_t count, const auto& blurSome) {
+    runTasks(workers, parts, [&](std::size_t i) {
+      const auto total = static_cast<std::uint64_t>(count);
+      blurSome(static_cast<std::int64_t>(partStart(total, i, parts)),
+               static_cast<std::int64_t>(partStart(total, i + 1, parts)));
+    });
+  };
+  share(grid.rows, [&](std::int64_t first, std::int64_t end) { blurRows(grid, first, end); });
+  share(grid.columns, [&](std::int64_t first, std::int64_t end) { blurColumns(grid, first, end); });
 
   const std::int64_t radius = rangeRadius(sigmaRange);
   const GaussianApproximation<float> range = rangeBell(radius);
@@ -94,7 +121,8 @@ void blur(Grid& grid, float sigmaRange) {
     float* const both = weights + 2 * (distance + gridBins - 1);
     both[0] = both[1] = std::abs(distance) <= radius ? range(static_cast<float>(distance)) : 0.0f;
   }
-  for (GridCell& cell : grid.cells) blurLightness(weights, &cell[0].value);
+  share(static_cast<std::int64_t>(grid.cells.size()),
+        [&](std::int64_t first, std::int64_t end) { blurCells(weights, grid, first, end); });
 }
 #endif
 
@@ -105,8 +133,8 @@ HWY_AFTER_NAMESPACE();
 #if HWY_ONCE
 namespace pelorin::image_processing {
 HWY_EXPORT(blur);
-void blur(Grid& grid, float sigmaRange) {
-  HWY_DYNAMIC_DISPATCH(blur)(grid, sigmaRange);
+void blur(Grid& grid, float sigmaRange, Workers* workers) {
+  HWY_DYNAMIC_DISPATCH(blur)(grid, sigmaRange, workers);
 }
 }  // namespace pelorin::image_processing
 #endif

@@ -5,6 +5,7 @@
 #include "image_processing/autoenhance/lightness/image_statistics.h"
 #include "image_processing/core/image.h"
 #include "image_processing/core/image_metadata.h"
+#include "image_processing/core/workers.h"
 #include "image_processing/filters/filter_config.h"
 
 namespace pelorin::image_processing {
@@ -40,20 +41,23 @@ void computeImageMasks(const Image<RGBA8Pixel>& photo, const ImageMetadata& meta
                        const FilterConfig& config, ImageMasks<TB, TL>& masks);
 
 /// `analyzeImage` and `computeImageMasks` in one: the photo's lightness is found once for both.
+/// @param workers  share the work; null for none.
 /// @throws std::bad_alloc; the statistics may be there all the same.
 template <typename TB, typename TL>
 void prepareImage(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
                   const FilterConfig& config, ImageStatistics& statistics,
-                  ImageMasks<TB, TL>& masks);
+                  ImageMasks<TB, TL>& masks, Workers* workers = nullptr);
 
-/// Computes both masks through the grid and counts the photo's pixels on the way. Two passes over
-/// the photo: neither its lightness nor the table of sums ever exists as a whole.
+/// Computes both masks through the grid and the photo's statistics on the way. Two passes over the
+/// photo: neither its lightness nor the table of sums ever exists as a whole.
+/// @param photo           of at least one pixel.
 /// @param bilateral, ltm  written; of the photo's size.
+/// @param workers         share the work; null for none.
 /// @throws std::bad_alloc.
 template <typename TB, typename TL>
-void computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
-                        const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
-                        LightnessHistogramSimd& counter);
+ImageStatistics computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
+                                   const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
+                                   Workers* workers = nullptr);
 
 /// Fills the LTM mask: flatness when `amount` is above 0, else 0, then the faces one by one, each
 /// blending into what the one before left.

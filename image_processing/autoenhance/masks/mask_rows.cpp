@@ -90,16 +90,16 @@ void MaskRows<TB, TL>::prepare(std::int64_t step, Scratch& scratch) {
 }
 
 template <typename TB, typename TL>
-void MaskRows<TB, TL>::sum(std::int64_t step, Scratch& scratch) {
+void MaskRows<TB, TL>::sum(std::int64_t step, LightnessRow& scratch) {
   if (!table_) return;
   forEachTableRow(step, /*first=*/false, [&](std::int64_t i, std::uint32_t source) {
-    table_->weigh(i, scratch.lightness.of(photo_(source)), bilateral_.row(source));
+    table_->weigh(i, scratch.of(photo_(source)), bilateral_.row(source));
   });
   table_->sum(step * stepRows);
 }
 
 template <typename TB, typename TL>
-void MaskRows<TB, TL>::writeLtm(std::uint32_t y, TL* mask) {
+void MaskRows<TB, TL>::writeLtm(std::uint32_t y, TL* mask, FaceBlendRows::Scratch& scratch) const {
   if (table_) {
     table_->shape(y, mask);
   } else {
@@ -107,7 +107,7 @@ void MaskRows<TB, TL>::writeLtm(std::uint32_t y, TL* mask) {
     none = 0.0f;
     std::fill_n(mask, width_, none);
   }
-  faces_.blendRow(photo_(y), mask);
+  faces_.blendRow(y, photo_(y), mask, scratch);
 }
 
 template class MaskRows<float, float>;

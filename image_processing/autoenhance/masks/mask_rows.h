@@ -16,9 +16,9 @@
 namespace pelorin::image_processing {
 
 /// The two masks of a photo, made from the top in steps of some rows, of its splat and blurred grid.
-/// A step is prepared, summed and finished; what is prepared needs no order among steps and may run
-/// on several threads, the rest goes step after step. So neither the photo, nor its
-/// lightness, nor a mask has to exist as a whole.
+/// A step is prepared, then summed, then its rows are finished; sums go step after step, all else
+/// needs no order and may run on several threads, each with a scratch of its own. So neither the photo, nor
+/// its lightness, nor a mask has to exist as a whole.
 ///
 /// For (float, float) and (QuantizedFloat<unsigned char>, the same).
 template <typename TB, typename TL>
@@ -47,7 +47,7 @@ class MaskRows {
   /// The rows of the masks that are finished with step `i` and those before it are those below this.
   std::uint32_t maskEnd(std::int64_t step) const;
 
-  /// What a thread works with.
+  /// What a thread prepares with.
   class Scratch {
    public:
     /// @throws std::bad_alloc.
@@ -61,13 +61,13 @@ class MaskRows {
   void prepare(std::int64_t step, Scratch& scratch);
 
   /// Sums what is prepared: after the step before it.
-  void sum(std::int64_t step, Scratch& scratch);
+  void sum(std::int64_t step, LightnessRow& scratch);
 
   const TB* bilateral(std::uint32_t y) const { return bilateral_.row(y); }
 
-  /// Writes the LTM mask of row `y`, once its step is summed: row after row, the first being row 0.
+  /// Writes the LTM mask of row `y`, once its step is summed; `scratch` served no row below before.
   /// May throw std::bad_alloc where there are faces.
-  void writeLtm(std::uint32_t y, TL* mask);
+  void writeLtm(std::uint32_t y, TL* mask, FaceBlendRows::Scratch& scratch) const;
 
  private:
   /// Of the smoothing.

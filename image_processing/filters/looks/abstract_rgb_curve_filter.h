@@ -43,7 +43,7 @@ class AbstractRGBCurveFilter : public AbstractFilter {
   /// `init` comes first. Throws std::bad_alloc alone.
   void applyConfig(const std::string& params, const FilterConfig&,
                    Image<RGBA8Pixel>& output) override {
-    applyLook(lookFor(params), *state->image, output);
+    applyLook(lookFor(params), *state->image, output, state->workers);
   }
 
   static std::unique_ptr<RowFilter> forRows(const RowRequest& request) {

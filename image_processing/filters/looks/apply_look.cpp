@@ -6,10 +6,18 @@
 
 namespace pelorin::image_processing {
 
-void applyLook(const Look& look, const Image<RGBA8Pixel>& source, Image<RGBA8Pixel>& output) {
+void applyLook(const Look& look, const Image<RGBA8Pixel>& source, Image<RGBA8Pixel>& output,
+               Workers* workers) {
   const LookRows rows(look, source.width, source.height);
-  rows.apply(0, source.data.get(), output.data.get(),
-             std::min(source.pixelCount(), output.pixelCount()));
+  const std::size_t pixels = std::min(source.pixelCount(), output.pixelCount());
+  const std::size_t parts = tasksFor(workers);
+  runTasks(workers, parts, [&](std::size_t part) {
+    const auto y = static_cast<std::uint32_t>(partStart(source.height, part, parts));
+    const auto endY = static_cast<std::uint32_t>(partStart(source.height, part + 1, parts));
+    const std::size_t first = std::min(std::size_t{y} * source.width, pixels);
+    const std::size_t end = std::min(std::size_t{endY} * source.width, pixels);
+    rows.apply(y, source.data.get() + first, output.data.get() + first, end - first);
+  });
 }
 
 }  // namespace pelorin::image_processing

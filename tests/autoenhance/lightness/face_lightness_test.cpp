@@ -18,7 +18,7 @@ using test_support::withFaces;
 
 std::int32_t medianByRows(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata, int bins) {
   FaceLightness faces(metadata, photo.width, photo.height, bins, lightnessScale);
-  for (std::uint32_t y = 0; y < photo.height; ++y) faces.addRow(photo.row(y));
+  for (std::uint32_t y = 0; y < photo.height; ++y) faces.addRow(y, photo.row(y));
   return faces.medianBin();
 }
 

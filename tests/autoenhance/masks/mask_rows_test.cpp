@@ -68,15 +68,16 @@ Masks<T> byRows(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
       grid, cellSize, photo.width, photo.height, config, metadata,
       [&](std::uint32_t y) { return photo.row(y); }, RowRing<T>(photo.width, held), stepsAtOnce);
   typename Rows::Scratch scratch(rows);
+  FaceBlendRows::Scratch faces;
   std::uint32_t y = 0;
   for (std::int64_t first = 0; first < rows.steps(); first += stepsAtOnce) {
     const std::int64_t end = std::min(first + stepsAtOnce, rows.steps());
     for (std::int64_t step = end; step-- > first;) rows.prepare(step, scratch);
     for (std::int64_t step = first; step < end; ++step) {
-      rows.sum(step, scratch);
+      rows.sum(step, scratch.lightness);
       for (; y < rows.maskEnd(step); ++y) {
         std::copy_n(rows.bilateral(y), photo.width, masks.bilateral.row(y));
-        rows.writeLtm(y, masks.ltm.row(y));
+        rows.writeLtm(y, masks.ltm.row(y), faces);
       }
     }
   }
