@@ -6,6 +6,7 @@
 #include <utility>
 
 #include "image_processing/core/picture_rows.h"
+#include "image_processing/core/stages.h"
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/parameter_check.h"
 #include "photo/photo_writer.h"
@@ -80,10 +81,10 @@ void requireFinite(const std::vector<Face>& faces) {
   }
 }
 
-FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const std::string& filter,
-                          const std::string& params, const std::vector<Face>& faces,
-                          const OpenOptions& open, const SaveOptions& save, const Format* format,
-                          const FilterMemory& memory) {
+FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const FilterRequest& request,
+                          const Format* format, const FilterResources& resources) {
+  checkRequest(request);
+  const OpenOptions& open = request.open;
   std::unique_ptr<RowReader> reader = openRows(file, open);
   Photo photo{nullptr, reader->facts(), reader->metadata(), {}};
   if (open.upright)
@@ -93,24 +94,29 @@ FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const std::string&
   if (format == nullptr) format = formatNamed(photo.facts.format);
 
   const std::unique_ptr<RowFilter> rows =
-      DefaultFilterFactory::filterFactory()->find(filter)->makeRowFilter(
-          {.width = size.width,
-           .height = size.height,
-           .metadata =
-               metadataWithFaces(allFaces(faces, photo), size.width, size.height, open.scale),
-           .params = params});
-  const RowWork work{.stop = [&] { return open.stop.stop_requested(); }};
+      filterFor(request.filter, request.params)
+          .makeRowFilter({.width = size.width,
+                          .height = size.height,
+                          .metadata = metadataWithFaces(allFaces(request.faces, photo), size.width,
+                                                        size.height, open.scale),
+                          .params = request.params});
+  RowWork work{.stop = [&] { return open.stop.stop_requested(); }};
+  if (tasksFor(resources.workers) > 1) {
+    work.workers = resources.workers;
+    work.bandHeight = sharedBandHeight(size.width, size.height);
+  }
   const auto stopUnless = [](bool done) {
     if (!done) throw Stopped();
   };
 
   SparePixels none;
-  SparePixels& spare = memory.spare != nullptr ? *memory.spare : none;
+  SparePixels& spare = resources.spare != nullptr ? *resources.spare : none;
   const bool asksAlpha = format->keepsAlpha && photo.facts.hasAlpha;
   const bool isTurned = photo.metadata.turn != Turn{};
-  const bool fits = std::uint64_t{size.width} * size.height <= memory.pixels / sizeof(RGBA8Pixel);
+  const bool fits =
+      std::uint64_t{size.width} * size.height <= resources.pixels / sizeof(RGBA8Pixel);
   if (isTurned || asksAlpha) {
-    photo.image = readTurned(*reader, photo.metadata.turn, spare);
+    photo.image = readTurned(*reader, photo.metadata.turn, spare, work.workers);
   } else if (rows->looksFirst() && (fits || photo.facts.progressive)) {
     photo.image = spare.picture(size.width, size.height);
   }
@@ -126,7 +132,7 @@ FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const std::string&
   }
 
   const bool hasAlpha = asksAlpha && !isOpaque(photo.image->data.get(), photo.image->pixelCount());
-  PhotoWriter writer(size, *format, hasAlpha, photo.metadata, save);
+  PhotoWriter writer(size, *format, hasAlpha, photo.metadata, request.save);
   WrittenRows written(writer);
   if (photo.image != nullptr) {
     PictureSource picture(*photo.image);
@@ -140,16 +146,6 @@ FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const std::string&
   FilteredPhoto filtered{{}, size, std::move(photo.facts)};
   filtered.file = writer.finish(&filtered.lost);
   return filtered;
-}
-
-std::vector<std::uint8_t> filterPhoto(std::span<const std::uint8_t> file,
-                                      const FilterRequest& request, const Format* format,
-                                      std::vector<Loss>* lost) {
-  checkRequest(request);
-  FilteredPhoto filtered = filterPhoto(file, request.filter, request.params, request.faces,
-                                       request.open, request.save, format);
-  if (lost != nullptr) *lost = std::move(filtered.lost);
-  return std::move(filtered.file);
 }
 
 }  // namespace pelorin::photo

@@ -37,37 +37,25 @@ struct FilteredPhoto {
   std::vector<Loss> lost = {};  ///< What of the metadata is not in the file.
 };
 
-/// How a photo is filtered by rows; nothing of it changes a byte.
-struct FilterMemory {
+/// What the filtering of a photo may use; nothing of it changes a byte.
+struct FilterResources {
   /// Bytes of decoded pixels, 4 each, that are kept for a filter that goes over them twice. A photo
   /// with more is decoded twice instead. One that is turned, whose rows come in several passes or
   /// whose transparency must be known first is kept in any case.
   std::uint64_t pixels = std::uint64_t{128} << 20;
   SparePixels* spare = nullptr;  ///< Where kept pixels may come from and go; may be null.
+  /// Share the work: decoding, filtering and encoding go on at the same time. Null for none.
+  image_processing::Workers* workers = nullptr;
 };
 
-/// Filters a photo into a file, by rows: with hardly any memory beside what `memory` allows for
-/// pixels, and the bytes of the two files. The result has the bytes of the filter on the whole
-/// picture.
-/// @param filter  a name in the registry.
-/// @param faces   beside those that its file knows of.
+/// Filters a photo into the file that the command writes for the same options: upright, filtered,
+/// with the metadata kept. It goes by rows, with hardly any memory beside what `resources` allows for
+/// pixels and the bytes of the two files, and has the bytes of the filter on the whole picture.
 /// @param format  of the result; null for that of `file`.
-/// @throws PhotoError as `open` and `save`, and for a face in pixels that lies outside the picture;
-///         Stopped; what the filter throws.
-FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const std::string& filter,
-                          const std::string& params, const std::vector<Face>& faces,
-                          const OpenOptions& open, const SaveOptions& save, const Format* format,
-                          const FilterMemory& memory = {});
-
-/// The bytes of the file that the command writes for the same options: upright, filtered, with the
-/// metadata kept.
-/// @param format  of the result; null for that of `file`.
-/// @param lost    where to tell what of the metadata is not in the file; may be null.
 /// @throws std::invalid_argument that names what is wrong with the request: filter, params, quality,
-///         rotation, scale or faces; PhotoError, with Stopped when a stop token says so;
-///         std::bad_alloc.
-std::vector<std::uint8_t> filterPhoto(std::span<const std::uint8_t> file,
-                                      const FilterRequest& request, const Format* format,
-                                      std::vector<Loss>* lost = nullptr);
+///         rotation, scale or faces; PhotoError as `open` and `save`, and for a face in pixels that
+///         lies outside the picture; Stopped when a stop token says so; std::bad_alloc.
+FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const FilterRequest& request,
+                          const Format* format = nullptr, const FilterResources& resources = {});
 
 }  // namespace pelorin::photo

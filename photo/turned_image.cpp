@@ -2,11 +2,18 @@
 
 #include <algorithm>
 #include <cstddef>
+#include <vector>
+
+#include "image_processing/core/stages.h"
 
 namespace pelorin::photo {
 
+using image_processing::bandsUnderWay;
 using image_processing::Image;
 using image_processing::RGBA8Pixel;
+using image_processing::runStages;
+using image_processing::Stage;
+using image_processing::Workers;
 
 void turnRows(const RGBA8Pixel* rows, std::uint32_t first, std::uint32_t count, PictureSize size,
               Turn turn, const Image<RGBA8Pixel>& result) {
@@ -41,7 +48,8 @@ void turnRows(const RGBA8Pixel* rows, std::uint32_t first, std::uint32_t count, 
   }
 }
 
-std::shared_ptr<Image<RGBA8Pixel>> readTurned(RowReader& reader, Turn turn, SparePixels& spare) {
+std::shared_ptr<Image<RGBA8Pixel>> readTurned(RowReader& reader, Turn turn, SparePixels& spare,
+                                              Workers* workers) {
   const PictureSize size = reader.size(), upright = turnedSize(size, turn);
   const std::shared_ptr<Image<RGBA8Pixel>> picture = spare.picture(upright.width, upright.height);
   if (turn == Turn{}) {
@@ -49,13 +57,25 @@ std::shared_ptr<Image<RGBA8Pixel>> readTurned(RowReader& reader, Turn turn, Spar
     return picture;
   }
   constexpr std::uint32_t rowsRead = 64;  // what a processor has room for beside its work
-  const Image<RGBA8Pixel> room(size.width, std::min(size.height, rowsRead));
-  for (std::uint32_t y = 0; y < size.height;) {
-    const std::uint32_t count = std::min(size.height - y, room.height);
-    reader.read(room.data.get(), count);
-    turnRows(room.data.get(), y, count, size, turn, *picture);
-    y += count;
-  }
+  std::vector<Image<RGBA8Pixel>> rooms;
+  for (std::int64_t i = bandsUnderWay(2, workers); i > 0; --i)
+    rooms.emplace_back(size.width, std::min(size.height, rowsRead));
+  const auto roomOf = [&](std::int64_t band) {
+    return rooms[static_cast<std::size_t>(band) % rooms.size()].data.get();
+  };
+  const auto firstOf = [](std::int64_t band) {
+    return static_cast<std::uint32_t>(band) * rowsRead;
+  };
+  const auto rowsOf = [&](std::int64_t band) {
+    return std::min(size.height - firstOf(band), rowsRead);
+  };
+  const Stage read = {
+      1, [&](std::int64_t band, std::size_t) { reader.read(roomOf(band), rowsOf(band)); }};
+  const Stage turnThem = {1, [&](std::int64_t band, std::size_t) {
+                            turnRows(roomOf(band), firstOf(band), rowsOf(band), size, turn,
+                                     *picture);
+                          }};
+  runStages((std::int64_t{size.height} + rowsRead - 1) / rowsRead, {read, turnThem}, workers);
   return picture;
 }
 

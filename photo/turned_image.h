@@ -4,6 +4,7 @@
 #include <memory>
 
 #include "image_processing/core/image.h"
+#include "image_processing/core/workers.h"
 #include "photo/picture_size.h"
 #include "photo/rows.h"
 #include "photo/spare_pixels.h"
@@ -26,9 +27,10 @@ void turnRows(const image_processing::RGBA8Pixel* rows, std::uint32_t first, std
               const image_processing::Image<image_processing::RGBA8Pixel>& result);
 
 /// All rows of a reader, turned while they come, so that there is one picture and not two.
-/// @param spare  where its pixels may come from.
+/// @param spare    where its pixels may come from.
+/// @param workers  let the turning and the reading go on at the same time; null for none.
 /// @throws what the reader throws; std::bad_alloc.
 std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> readTurned(
-    RowReader& reader, Turn turn, SparePixels& spare);
+    RowReader& reader, Turn turn, SparePixels& spare, image_processing::Workers* workers = nullptr);
 
 }  // namespace pelorin::photo

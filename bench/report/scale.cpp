@@ -69,8 +69,8 @@ std::vector<Subject> subjects(const std::string& command) {
           {"quenby enhance", {0.84, 0.15, 0.16}, [=](PhotoSize size) {
              const PhotoFiles files(size);
              return repeated([&] {
-               return runCommand(
-                   {command, "enhance", files.first(), "-o", files.results(), "--overwrite"});
+               return runCommand({command, "enhance", files.first(), "-o", files.results(),
+                                  "--overwrite", "--threads", "1"});
              });
            }}};
 }

@@ -42,8 +42,9 @@ std::string wholeFileTable(const std::string& command, const std::string& avx2On
   std::vector<Row> rows = {
       {"`quenby --version`: start and end of a process", {command, "--version"}}};
   const auto enhance = [&](const std::string& filter, const std::string& input) {
-    return std::vector<std::string>{command,         "enhance",     "-r",      input,      "-o",
-                                    files.results(), "--overwrite", "--quiet", "--filter", filter};
+    return std::vector<std::string>{command,         "enhance",     "-r",      input,       "-o",
+                                    files.results(), "--overwrite", "--quiet", "--threads", "1",
+                                    "--filter",      filter};
   };
   for (const char* filter : {"PassThrough", "AE0", "AE08bit", "WinterRGB"}) {
     rows.push_back({fmt::format("`--filter {}`", filter), enhance(filter, files.first())});

@@ -2,6 +2,7 @@
 
 #include <limits>
 #include <memory>
+#include <utility>
 
 #include "bindings/c/pixels.h"
 #include "photo/collection/photo_record.h"
@@ -190,9 +191,10 @@ int32_t quenby_filter_file(const uint8_t* file, size_t size, const char* filter,
                                        .open = openOptions(open, cancel),
                                        .save = saveOptions(save, cancel)};
     auto made = std::make_unique<quenby_file>();
-    made->bytes =
-        photo::filterPhoto(bytesOf(file, size), request,
-                           format == nullptr ? nullptr : &formatCalled(format), &made->lost);
+    photo::FilteredPhoto filtered = photo::filterPhoto(
+        bytesOf(file, size), request, format == nullptr ? nullptr : &formatCalled(format));
+    made->bytes = std::move(filtered.file);
+    made->lost = std::move(filtered.lost);
     *result = made.release();
   });
 }

@@ -54,7 +54,7 @@ jbyteArray filterBytes(JNIEnv* env, jobject, jbyteArray array, jobject buffer, j
                                      .open = {.scale = scale, .rotate = rotation, .stop = stop},
                                      .save = {.quality = quality, .stop = stop}};
   const FileBytes file(env, array, buffer, offset, length);
-  return javaArray(env, photo::filterPhoto(file.bytes(), request, photo::formatNamed("JPEG")));
+  return javaArray(env, photo::filterPhoto(file.bytes(), request, photo::formatNamed("JPEG")).file);
 }
 
 jfloat niqe(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset, jint length,

@@ -3,19 +3,20 @@
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <memory>
 #include <optional>
 
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/interrupt.h"
-#include "cli/frame/jobs.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/photo_files.h"
 #include "cli/frame/print_plan.h"
 #include "cli/frame/raw_option.h"
 #include "cli/frame/recycled_memory.h"
 #include "photo/filter_photo.h"
+#include "photo/thread_workers.h"
 
 namespace pelorin::cli {
 namespace {
@@ -25,7 +26,8 @@ struct Work {
   FaceChoice faces;
   photo::OpenOptions photo;
   SaveChoice save;
-  std::uint64_t pixels;  // bytes of them that a file may keep
+  std::uint64_t pixels;                                // bytes of them that a file may keep
+  std::unique_ptr<photo::ThreadWorkers> workers = {};  // of all files at once; null for none
 };
 
 struct Done {
@@ -59,10 +61,15 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   thread_local photo::SparePixels spare;  // each worker's own
   photo::OpenOptions open = work.photo;
   open.stop = interruptToken();
-  const photo::FilteredPhoto filtered = photo::filterPhoto(
-      readInput(file.input), work.filter.filter.name, work.filter.params, work.faces.of(file.input),
-      open, saveOptions(work.save), &outputFormat(file.output, work.save),
-      {.pixels = work.pixels, .spare = &spare});
+  const photo::FilteredPhoto filtered =
+      photo::filterPhoto(readInput(file.input),
+                         {.filter = work.filter.filter.name,
+                          .params = work.filter.params,
+                          .faces = work.faces.of(file.input),
+                          .open = open,
+                          .save = saveOptions(work.save)},
+                         &outputFormat(file.output, work.save),
+                         {.pixels = work.pixels, .spare = &spare, .workers = work.workers.get()});
   tellNotices(file.input, filtered.facts, talk);
   writePhoto(file.output, filtered.file, filtered.lost, work.save);
   return {filtered.size.width, filtered.size.height, filtered.lost, filtered.facts.notices};
@@ -92,6 +99,7 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
   addRawOption(verb, options.raw);
   verb.named("--raw").help("Read and write packed RGBA bytes of this size instead of photos");
   addJobsOption(verb, options.jobs);
+  addThreadsOption(verb, options.threads);
   verb.option("--memory", options.memory,
               "MiB for decoded pixels, 128 unless given, shared by the files at once; photos that "
               "need more are decoded twice, or kept where that cannot be")
@@ -138,6 +146,11 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
       std::clamp<std::size_t>(plan.size(), 1, static_cast<std::size_t>(jobsAtOnce(options.jobs)));
   work.pixels = (std::uint64_t{static_cast<unsigned>(options.memory)} << 20) / atOnce;
   if (atOnce == 1 && plan.size() > 1) recycleFreedMemory();
+  const std::size_t threads = threadsForEach(options.threads, options.jobs, plan.size());
+  if (threads > 1) {
+    // One of the threads is the job's own.
+    work.workers = std::make_unique<photo::ThreadWorkers>(atOnce * (threads - 1) + 1);
+  }
   const OutputFolders folders(plan);
   std::size_t skipped = 0;
   const PhotoTally tally = eachPhoto<std::optional<Done>>(

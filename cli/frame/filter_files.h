@@ -7,6 +7,7 @@
 #include "cli/frame/exit_code.h"
 #include "cli/frame/face_choice.h"
 #include "cli/frame/inputs.h"
+#include "cli/frame/jobs.h"
 #include "cli/frame/keep_option.h"
 #include "cli/frame/outputs.h"
 #include "cli/frame/talk.h"
@@ -27,7 +28,8 @@ struct FilterFilesOptions {
   int scale = 1;
   int quality = 90;
   int jobs = 0;
-  int memory = 128;  ///< MiB of pixels kept, by all jobs together.
+  int threads = usualThreads;  ///< On each file.
+  int memory = 128;            ///< MiB of pixels kept, by all jobs together.
 };
 
 /// Adds all of them to a verb. Results in a folder are called `{stem}_{filter}` by default.

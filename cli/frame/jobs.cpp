@@ -16,9 +16,26 @@ void addJobsOption(Verb verb, int& atOnce) {
       .group("Reporting");
 }
 
+void addThreadsOption(Verb verb, int& threads) {
+  verb.option("--threads", threads,
+              "Threads on each file; 0: as many as there are cores for it, which is usual for one "
+              "file, 1 for several")
+      .between(0, 1024)
+      .type("N")
+      .group("Reporting");
+}
+
 int jobsAtOnce(int atOnce) {
   if (atOnce != 0) return atOnce;
   return static_cast<int>(std::max(1u, std::thread::hardware_concurrency()));
+}
+
+std::size_t threadsForEach(int threads, int jobs, std::size_t files) {
+  const std::size_t cores = std::max(1u, std::thread::hardware_concurrency());
+  const std::size_t atOnce = std::clamp<std::size_t>(files, 1, jobsAtOnce(jobs));
+  const std::size_t most = std::max<std::size_t>(1, cores / atOnce);
+  if (threads == usualThreads) return files <= 1 ? most : 1;
+  return threads == 0 ? most : std::min<std::size_t>(threads, most);
 }
 
 bool runJobs(std::size_t count, int atOnce, const std::function<void(std::size_t)>& work,

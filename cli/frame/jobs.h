@@ -14,6 +14,18 @@ void addJobsOption(Verb verb, int& atOnce);
 /// How many that is: `atOnce`, or one a core for 0.
 int jobsAtOnce(int atOnce);
 
+/// Adds `--threads N` to a verb, what `threadsForEach` takes.
+void addThreadsOption(Verb verb, int& threads);
+
+/// `--threads` where it is not given.
+inline constexpr int usualThreads = -1;
+
+/// How many threads work on each of some files: as `--threads` says, 0 for all that there are; unless
+/// given all for one file, and one for each of several. Together they are never more than the cores,
+/// as long as there are not more jobs.
+/// @param jobs  as `-j` says.
+std::size_t threadsForEach(int threads, int jobs, std::size_t files);
+
 /// Runs `work(0)` ... `work(count - 1)`, `atOnce` of them at the same time, each on one thread, and
 /// calls `report` on the calling thread in that order, as soon as the order allows. Ctrl-C starts
 /// no further work; what was done by then is reported.

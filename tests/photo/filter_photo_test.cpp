@@ -2,12 +2,14 @@
 
 #include <gtest/gtest.h>
 
+#include <map>
 #include <memory>
 #include <string>
 #include <vector>
 
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/filtered_image.h"
+#include "photo/thread_workers.h"
 #include "tests/photo/metadata/phone_photos.h"
 #include "tests/support/jpeg_files.h"
 #include "tests/support/pictures.h"
@@ -34,22 +36,37 @@ Bytes byPicture(const Bytes& file, const FilterRequest& request, const Format& f
   return save(output, format, photo.metadata, request.save);
 }
 
+std::string parametersOf(const std::string& filter) {
+  return filter.starts_with("AE") ? "slider=0.7;" : "";
+}
+
+Workers& threads(std::size_t count) {
+  static std::map<std::size_t, ThreadWorkers> all;
+  return all.try_emplace(count, count).first->second;
+}
+
+std::vector<FilterResources> ways() {
+  constexpr std::uint64_t all = std::uint64_t{1} << 30;
+  return {{.pixels = 0},
+          {.pixels = all},
+          {.pixels = 0, .workers = &threads(2)},
+          {.pixels = all, .workers = &threads(3)}};
+}
+
 void expectSameFiles(const Bytes& file, const std::string& what) {
-  FilterRequest request{.filter = "", .params = "slider=0.7;"};
+  FilterRequest request;
   request.faces = {{0.2f, 0.2f, 0.7f, 0.6f}};
   for (const std::string filter : {"AE0", "AE08bit", "WinterRGB", "PassThrough"}) {
     for (const int scale : {1, 2}) {
       request.filter = filter;
+      request.params = parametersOf(filter);
       request.open.scale = scale;
       for (const Format& format : formats()) {
         const Bytes expected = byPicture(file, request, format);
-        for (const std::uint64_t pixels : {std::uint64_t{0}, std::uint64_t{1} << 30}) {
-          const FilteredPhoto filtered =
-              filterPhoto(file, filter, request.params, request.faces, request.open, request.save,
-                          &format, {.pixels = pixels});
-          EXPECT_EQ(filtered.file, expected)
+        for (const FilterResources& resources : ways()) {
+          EXPECT_EQ(filterPhoto(file, request, &format, resources).file, expected)
               << what << ", " << filter << " at 1/" << scale << " to " << format.name << ", "
-              << pixels << " bytes kept";
+              << resources.pixels << " bytes kept, " << tasksFor(resources.workers) << " threads";
         }
       }
     }
@@ -70,8 +87,8 @@ TEST(FilterPhoto, GivesTheFileOfTheWholePictureWhetherItsPixelsAreKeptOrNot) {
 
 TEST(FilterPhoto, TellsSizeFactsAndLosses) {
   const Bytes png = save(photoLikePicture(41, 29, 1), "PNG");
-  const FilteredPhoto filtered =
-      filterPhoto(png, "SummerRGB", "", {}, {.rotate = 90}, {}, formatNamed("JPEG"));
+  const FilteredPhoto filtered = filterPhoto(
+      png, {.filter = "SummerRGB", .params = "", .open = {.rotate = 90}}, formatNamed("JPEG"));
   EXPECT_EQ(filtered.size, (PictureSize{29, 41}));
   EXPECT_EQ(filtered.facts.format, "PNG");
   ASSERT_EQ(filtered.lost.size(), 1u);
@@ -82,20 +99,18 @@ TEST(FilterPhoto, HasNoFileOfADamagedPhoto) {
   Bytes file = makeJpeg(JpegRecipe{.width = 200, .height = 150});
   file.resize(file.size() * 2 / 3);
   for (const char* filter : {"AE0", "WinterRGB"}) {
-    for (const std::uint64_t pixels : {std::uint64_t{0}, std::uint64_t{1} << 30}) {
-      EXPECT_THROW(
-          filterPhoto(file, filter, "slider=0.4;", {}, {}, {}, nullptr, {.pixels = pixels}),
-          PhotoError);
-    }
+    const FilterRequest request{.filter = filter, .params = parametersOf(filter)};
+    for (const FilterResources& resources : ways())
+      EXPECT_THROW(filterPhoto(file, request, nullptr, resources), PhotoError);
   }
 }
 
 TEST(FilterPhoto, StopsWhenItIsAskedTo) {
   std::stop_source stop;
   stop.request_stop();
-  EXPECT_THROW(filterPhoto(makeJpeg(JpegRecipe{}), "AE0", "slider=0.4;", {},
-                           {.stop = stop.get_token()}, {}, nullptr),
-               Stopped);
+  const FilterRequest request{
+      .filter = "AE0", .params = "slider=0.4;", .open = {.stop = stop.get_token()}};
+  EXPECT_THROW(filterPhoto(makeJpeg(JpegRecipe{}), request), Stopped);
 }
 
 }  // namespace

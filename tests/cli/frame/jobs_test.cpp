@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <atomic>
 #include <mutex>
 #include <numeric>
@@ -28,6 +29,30 @@ TEST(Jobs, AreReportedInOrderHoweverManyRunAtOnce) {
 TEST(Jobs, OfNoneAreFinished) {
   EXPECT_TRUE(runJobs(
       0, 4, [](std::size_t) { FAIL(); }, [](std::size_t) { FAIL(); }));
+}
+
+TEST(ThreadsForEach, AreAllCoresForOneFileAndOneForEachOfSeveral) {
+  const std::size_t cores = std::max(1u, std::thread::hardware_concurrency());
+  EXPECT_EQ(threadsForEach(usualThreads, 1, 1), cores);
+  EXPECT_EQ(threadsForEach(usualThreads, 0, 1), cores);
+  EXPECT_EQ(threadsForEach(usualThreads, 1, 5), 1u);
+  EXPECT_EQ(threadsForEach(usualThreads, 0, 5), 1u);
+}
+
+TEST(ThreadsForEach, AreNeverMoreThanTheCoresForAllFilesAtOnce) {
+  const std::size_t cores = std::max(1u, std::thread::hardware_concurrency());
+  for (const int threads : {0, 1, 2, 3, 1000}) {
+    for (const int jobs : {0, 1, 2, 1000}) {
+      for (const std::size_t files : {1, 2, 100}) {
+        const std::size_t each = threadsForEach(threads, jobs, files);
+        const auto atOnce = std::min<std::size_t>(jobsAtOnce(jobs), files);
+        EXPECT_LE(each * std::min(atOnce, cores), cores);
+        EXPECT_GE(each, 1u);
+        EXPECT_TRUE(threads == 0 || each <= static_cast<std::size_t>(threads));
+      }
+    }
+  }
+  EXPECT_EQ(threadsForEach(0, 1, 9), cores);
 }
 
 TEST(Jobs, AreReportedOnTheCallingThread) {

@@ -118,13 +118,13 @@ TEST(ColourProfiles, GoAlongByteForByteAndTheNumbersAreTheFiles) {
 TEST(ColourProfiles, DoNotChangeWhatAFilterMakesOfTheNumbers) {
   const Image<RGBA8Pixel> picture = chart();
   const FilterRequest request = {.filter = "AE0", .params = "slider=0.7;"};
-  const Bytes plain = filterPhoto(save(picture, "PNG"), request, formatNamed("PNG"));
+  const Bytes plain = filterPhoto(save(picture, "PNG"), request, formatNamed("PNG")).file;
   const Photo expected = open(plain);
   EXPECT_FALSE(samePixels(*expected.image, picture));
   for (const Space& space : spaces) {
     const Bytes profile = profileOf(space);
     const Bytes file = save(picture, "PNG", withProfile(profile, picture));
-    const Photo filtered = open(filterPhoto(file, request, formatNamed("PNG")));
+    const Photo filtered = open(filterPhoto(file, request, formatNamed("PNG")).file);
     EXPECT_TRUE(samePixels(*filtered.image, *expected.image)) << space.name;
     EXPECT_EQ(colourProfileOf(filtered.metadata.segments), profile) << space.name;
   }
