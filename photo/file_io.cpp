@@ -18,39 +18,17 @@
 #include <system_error>
 #include <utility>
 
+#include "photo/descriptor.h"
+#include "photo/photo_error.h"
+#include "photo/stream_io.h"
+
 namespace fs = std::filesystem;
 
 namespace pelorin::photo {
 namespace {
 
-constexpr std::uint64_t largestFile = std::uint64_t{1} << 31;
-
 // A temporary is called so, with numbers between the two.
 constexpr std::string_view temporaryStart = ".quenby-", temporaryEnd = ".tmp";
-
-[[noreturn]] void throwError(int code, const std::string& path) {
-  throw std::system_error(code, std::generic_category(), path);
-}
-
-// Gone with its scope.
-class Descriptor {
- public:
-  Descriptor(const std::string& path, int flags, mode_t mode = 0)
-      : descriptor_(::open(path.c_str(), flags | O_CLOEXEC, mode)) {
-    if (descriptor_ < 0) throwError(errno, path);
-  }
-  ~Descriptor() {
-    if (descriptor_ >= 0) ::close(descriptor_);
-  }
-  Descriptor(Descriptor&& other) noexcept : descriptor_(other.release()) {}
-  Descriptor& operator=(Descriptor&&) = delete;
-
-  int get() const { return descriptor_; }
-  int release() { return std::exchange(descriptor_, -1); }
-
- private:
-  int descriptor_;
-};
 
 void writeAll(Descriptor& file, const std::string& path, std::span<const std::uint8_t> bytes) {
   while (!bytes.empty()) {
@@ -58,7 +36,7 @@ void writeAll(Descriptor& file, const std::string& path, std::span<const std::ui
     if (count >= 0) {
       bytes = bytes.subspan(static_cast<std::size_t>(count));
     } else if (errno != EINTR) {
-      throwError(errno, path);
+      throwSystemError(errno, path);
     }
   }
 }
@@ -71,7 +49,7 @@ bool cannotBeSynced(int code) {
 void sync(const Descriptor& file, const std::string& path) {
   while (::fsync(file.get()) != 0) {
     if (cannotBeSynced(errno)) return;
-    if (errno != EINTR) throwError(errno, path);
+    if (errno != EINTR) throwSystemError(errno, path);
   }
 }
 
@@ -80,7 +58,7 @@ fs::path linkTarget(fs::path path) {
   constexpr int mostLinks = 40;
   std::error_code ignored;
   for (int links = 0; fs::is_symlink(fs::symlink_status(path, ignored)); ++links) {
-    if (links == mostLinks) throwError(ELOOP, path);
+    if (links == mostLinks) throwSystemError(ELOOP, path);
     path = path.parent_path() / fs::read_symlink(path);
   }
   return path;
@@ -110,7 +88,7 @@ void copyAttributes(const std::string& from, const Descriptor& to, const std::st
     if (size < 0) continue;
     const auto count = static_cast<std::size_t>(size);
     if (::fsetxattr(to.get(), name, value.data(), count, 0) != 0 && !isNotAllowed(errno)) {
-      throwError(errno, path);
+      throwSystemError(errno, path);
     }
   }
 }
@@ -120,22 +98,24 @@ void takeAfter(const struct stat& old, const std::string& oldPath, const Descrip
                const std::string& path) {
   const bool keepsOwner = ::fchown(file.get(), old.st_uid, old.st_gid) == 0;
   const mode_t permissions = old.st_mode & (keepsOwner ? 07777 : 0777);
-  if (::fchmod(file.get(), permissions) != 0) throwError(errno, path);
+  if (::fchmod(file.get(), permissions) != 0) throwSystemError(errno, path);
   copyAttributes(oldPath, file, path);
 }
 
 void takeTimes(const struct stat& old, const Descriptor& file, const std::string& path) {
   const timespec times[] = {old.st_atim, old.st_mtim};
-  if (::futimens(file.get(), times) != 0) throwError(errno, path);
+  if (::futimens(file.get(), times) != 0) throwSystemError(errno, path);
 }
 
 // A new empty file in `folder`, whose path `path` gets; locked, so that nobody takes it for left.
-Descriptor makeTemporary(const fs::path& folder, mode_t mode, std::string& path) {
+Descriptor makeTemporary(const fs::path& folder, mode_t mode, std::string& path,
+                         RecordedTemporary& record) {
   static std::atomic<unsigned> counter = 0;
   for (;;) {
     std::string name = folder / (std::string(temporaryStart) + std::to_string(::getpid()) + "-" +
                                  std::to_string(counter++) + std::string(temporaryEnd));
     try {
+      record.record(name);
       Descriptor file(name, O_WRONLY | O_CREAT | O_EXCL, mode);
       path = std::move(name);
       ::flock(file.get(), LOCK_EX | LOCK_NB);
@@ -160,23 +140,35 @@ bool isTemporaryName(std::string_view name) {
 
 }  // namespace
 
-std::vector<std::uint8_t> readFile(const std::string& path) {
-  const Descriptor file(path, O_RDONLY);
+void refuseSize(const ReadOptions& options) {
+  throw PhotoError(PhotoError::Kind::tooLarge, "is larger than " +
+                                                   std::to_string(options.largest >> 20) +
+                                                   " MiB, the most that is read of a file");
+}
+
+std::vector<std::uint8_t> readFile(const std::string& path, const ReadOptions& options) {
+  return readDescriptor(Descriptor(path, O_RDONLY | O_NONBLOCK).get(), path, options);
+}
+
+std::vector<std::uint8_t> readDescriptor(int descriptor, const std::string& path,
+                                         const ReadOptions& options) {
   struct stat status = {};
-  if (::fstat(file.get(), &status) != 0) throwError(errno, path);
-  constexpr std::size_t block = 65536;
-  const bool isRegular = S_ISREG(status.st_mode);
-  if (isRegular && std::uint64_t(status.st_size) > largestFile) throwError(EFBIG, path);
+  if (::fstat(descriptor, &status) != 0) throwSystemError(errno, path);
+  if (!S_ISREG(status.st_mode)) return readToEnd(descriptor, path, options);
+  if (std::uint64_t(status.st_size) > options.largest) refuseSize(options);
   // One byte more than there is, so that the end shows without growing.
-  std::vector<std::uint8_t> bytes(isRegular ? std::size_t(status.st_size) + 1 : block);
+  std::vector<std::uint8_t> bytes(std::size_t(status.st_size) + 1);
   std::size_t used = 0;
   for (;;) {
+    if (options.wait.stop.stop_requested()) throw Stopped();
     if (used == bytes.size()) bytes.resize(used * 2);
-    const ssize_t count = ::read(file.get(), bytes.data() + used, bytes.size() - used);
-    if (count < 0 && errno != EINTR) throwError(errno, path);
+    constexpr std::size_t most = std::size_t{1} << 26;  // between two looks at the stop token
+    const ssize_t count =
+        ::read(descriptor, bytes.data() + used, std::min(most, bytes.size() - used));
+    if (count < 0 && errno != EINTR) throwSystemError(errno, path);
     if (count == 0) break;
     if (count > 0) used += static_cast<std::size_t>(count);
-    if (used > largestFile) throwError(EFBIG, path);
+    if (used > options.largest) refuseSize(options);
   }
   bytes.resize(used);
   return bytes;
@@ -191,23 +183,22 @@ Replacement::Replacement(const std::string& path, std::span<const std::uint8_t> 
   if (exists && (!S_ISREG(old.st_mode) || old.st_nlink == 0)) {
     // Renaming over a device would put an ordinary file in its place; a file without a name, reached
     // through its descriptor, has none to take over.
-    Descriptor file(path, O_WRONLY | O_TRUNC);
-    writeAll(file, path, bytes);
-    // A full disk may show only on closing.
-    if (::close(file.release()) != 0 && errno != EINTR) throwError(errno, path);
+    writeStream(path, bytes, options.wait);
     return;
   }
-  if (exists && !options.mayReplace) throwError(EEXIST, path);
+  if (exists && !options.mayReplace) throwSystemError(EEXIST, path);
   // The rename needs only the folder; a protected file stays protected all the same.
-  if (exists && ::faccessat(AT_FDCWD, path.c_str(), W_OK, AT_EACCESS) != 0) throwError(errno, path);
+  if (exists && ::faccessat(AT_FDCWD, path.c_str(), W_OK, AT_EACCESS) != 0)
+    throwSystemError(errno, path);
   const fs::path target = linkTarget(path);
   target_ = target;
   folder_ = target.has_parent_path() ? target.parent_path().string() : ".";
   mayReplace_ = options.mayReplace;
   const std::string& model = options.like.empty() ? path : options.like;
-  if (!options.like.empty() && ::stat(model.c_str(), &old) != 0) throwError(errno, model);
+  if (!options.like.empty() && ::stat(model.c_str(), &old) != 0) throwSystemError(errno, model);
   const bool hasModel = exists || !options.like.empty();
-  Descriptor file = makeTemporary(target.parent_path(), hasModel ? 0600 : 0666, temporary_);
+  Descriptor file =
+      makeTemporary(target.parent_path(), hasModel ? 0600 : 0666, temporary_, recorded_);
   if (hasModel) takeAfter(old, model, file, temporary_);
   writeAll(file, temporary_, bytes);
   if (hasModel && options.keepTimes) takeTimes(old, file, temporary_);
@@ -224,8 +215,10 @@ void Replacement::replace() {
   if (temporary_.empty()) return;
   const char* const from = temporary_.c_str();
   const char* const to = target_.c_str();
-  if ((mayReplace_ ? ::rename(from, to) : renameToNew(from, to)) != 0) throwError(errno, target_);
+  if ((mayReplace_ ? ::rename(from, to) : renameToNew(from, to)) != 0)
+    throwSystemError(errno, target_);
   temporary_.clear();
+  recorded_.forget();
   ::close(std::exchange(lock_, -1));
   syncFolder(folder_);
 }

@@ -1,22 +1,47 @@
 #pragma once
 
+#include <chrono>
 #include <cstdint>
 #include <span>
+#include <stop_token>
 #include <string>
 #include <vector>
 
+#include "photo/temporaries.h"
+
 namespace pelorin::photo {
 
+/// How long to wait for others.
+struct Waiting {
+  std::stop_token stop = {};  ///< Ends any waiting; the default never does.
+  /// How long a named pipe may have nobody at its other end.
+  std::chrono::milliseconds patience = std::chrono::seconds(10);
+};
+
+struct ReadOptions {
+  std::uint64_t largest = std::uint64_t{1} << 30;  ///< Bytes that are read at most.
+  Waiting wait = {};
+};
+
 /// A whole file in memory; pipes and devices are read to their end.
-/// @throws std::system_error when it cannot be opened or read (a directory included), or is over
-///         2 GiB.
-std::vector<std::uint8_t> readFile(const std::string& path);
+/// @throws std::system_error when it cannot be opened or read (a directory included); PhotoError when
+///         it is too large, which of a file is known before it is read, and when nobody writes to a
+///         pipe; Stopped while waiting.
+std::vector<std::uint8_t> readFile(const std::string& path, const ReadOptions& options = {});
+
+/// The same of an open file, such as standard input, which stays open.
+std::vector<std::uint8_t> readDescriptor(int descriptor, const std::string& path,
+                                         const ReadOptions& options = {});
+
+/// @throws PhotoError that tells the limit.
+[[noreturn]] void refuseSize(const ReadOptions& options);
 
 /// What becomes of a file that is there already.
 struct ReplaceOptions {
   bool mayReplace = true;  ///< Else it stays, and to replace it is an error (EEXIST).
   bool keepTimes = false;  ///< The new file has its times of access and change.
   std::string like = {};   ///< The file whose times, permissions and so on count instead.
+  Waiting wait = {};       ///< For whoever reads, where that is a pipe.
 };
 
 /// A file that is written beside another and then takes its place. A replaced file keeps its
@@ -49,6 +74,7 @@ class Replacement {
 
   std::string target_, temporary_, folder_;  // all empty when written directly
   bool mayReplace_ = true;
+  RecordedTemporary recorded_;
   int lock_ = -1;  // the open temporary: others see from it that it is in use
 };
 

@@ -10,8 +10,9 @@
 
 namespace pelorin::cli {
 
-/// All bytes of a file or of standard input.
-/// @throws std::system_error when they cannot be read, Interrupted on Ctrl-C while waiting.
+/// All bytes of a file or of standard input, the one place where inputs are read: no more of them than
+/// `photo::ReadOptions` allows.
+/// @throws as `photo::readFile`; Interrupted on Ctrl-C while waiting.
 std::vector<std::uint8_t> readInput(const Input& input);
 
 /// Writes a file in one step, old or new and never half; "-" and special files (/dev/null, a named

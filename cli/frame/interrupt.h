@@ -9,7 +9,8 @@ namespace pelorin::cli {
 /// Thrown by work that stops because of Ctrl-C.
 using Interrupted = photo::Stopped;
 
-/// From here on SIGINT and SIGTERM only set a mark, so that no file is left half-written.
+/// From here on SIGINT and SIGTERM set a mark, for work to stop and tell what is finished. Half a
+/// second later, or on a second one, the process ends wherever it is; no file is left half-written.
 void installInterruptHandler();
 
 /// The mark, for work that is asked to stop by a token.

@@ -93,7 +93,6 @@ ExitCode runMasks(const MasksOptions& options) {
   JsonOutput json(options.report, true);
   if (const auto code = stopBeforeWork({input}, paths, options.outputs, talk, json)) return *code;
 
-  const OutputFolders folders(paths);
   const PhotoTally tally = eachPhoto<Masks>(
       {input}, /*jobs=*/1, talk,
       {.work =
@@ -101,6 +100,7 @@ ExitCode runMasks(const MasksOptions& options) {
              photo::Photo photo = loadPhoto(input, photoOptions, talk);
              const std::vector<Face> known = allFaces(faces.of(input), photo);
              const Masks masks = masksOf(std::move(photo), options.filter, known, options.exact);
+             const OutputFolders folders(paths);
              writeMasks(masks, bilateralPath, ltmPath, raw,
                         {.mayReplace = options.outputs.overwrite});
              return masks;

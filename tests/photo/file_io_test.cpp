@@ -14,6 +14,8 @@
 #include <system_error>
 #include <thread>
 
+#include "photo/photo_error.h"
+
 namespace pelorin::photo {
 namespace {
 
@@ -126,8 +128,31 @@ TEST_F(FileIo, SaysWhyAFileCannotBeRead) {
 
 TEST_F(FileIo, RefusesToReadAFileTooLargeForAnyPhoto) {
   writeFileAtomically(path("file"), {});
-  fs::resize_file(path("file"), (std::uintmax_t{1} << 31) + 1);  // a hole, not bytes on the disk
-  EXPECT_EQ(errorNumberOf([&] { readFile(path("file")); }), EFBIG);
+  fs::resize_file(path("file"), (std::uintmax_t{1} << 30) + 1);  // a hole, not bytes on the disk
+  EXPECT_THROW(readFile(path("file")), PhotoError);
+  EXPECT_THROW(readFile("/dev/zero", {.largest = 100'000}), PhotoError);
+  writeFileAtomically(path("file"), countingBytes(10));
+  EXPECT_EQ(readFile(path("file"), {.largest = 10}).size(), 10u);
+  EXPECT_THROW(readFile(path("file"), {.largest = 9}), PhotoError);
+}
+
+TEST_F(FileIo, WaitsForNobodyAtTheOtherEndOfAPipeForEver) {
+  ASSERT_EQ(::mkfifo(path("pipe").c_str(), 0600), 0);
+  const Waiting none = {.patience = std::chrono::milliseconds(0)};
+  EXPECT_THROW(readFile(path("pipe"), {.wait = none}), PhotoError);
+  EXPECT_THROW(writeFileAtomically(path("pipe"), countingBytes(10), {.wait = none}), PhotoError);
+  std::stop_source stopped;
+  stopped.request_stop();
+  const Waiting stop = {.stop = stopped.get_token()};
+  EXPECT_THROW(readFile(path("pipe"), {.wait = stop}), Stopped);
+  EXPECT_THROW(writeFileAtomically(path("pipe"), countingBytes(10), {.wait = stop}), Stopped);
+}
+
+TEST_F(FileIo, RemovesItsTemporariesWhenTheProcessIsToEnd) {
+  const Replacement replacement(path("new"), countingBytes(10));
+  EXPECT_EQ(entries(), 1u);
+  removeTemporaries();
+  EXPECT_EQ(entries(), 0u);
 }
 
 TEST_F(FileIo, SaysWhyAFileCannotBeWrittenAndLeavesNothingBehind) {

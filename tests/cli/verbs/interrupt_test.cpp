@@ -1,5 +1,7 @@
+#include <fcntl.h>
 #include <gmock/gmock.h>
 #include <signal.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <chrono>
@@ -42,6 +44,47 @@ TEST(CtrlC, KeepsFinishedFilesAndLeavesNothingHalfWritten) {
       EXPECT_EQ(std::distance(std::filesystem::directory_iterator(out), {}), 2);
     }
   }
+}
+
+// The exact filter would be at it for minutes and looks up at nothing.
+TEST(CtrlC, EndsWorkThatDoesNotStopOfItself) {
+  const TemporaryFolder folder;
+  int input[2];
+  ASSERT_EQ(pipe2(input, O_CLOEXEC), 0);
+  Process process(
+      {quenbyPath(), "masks", "-", "--raw", "1500x1500", "--exact", "-o", folder / "masks"},
+      input[0]);
+  close(input[0]);
+  const Bytes pixels(std::size_t{1500} * 1500 * 4);
+  for (std::size_t at = 0; at < pixels.size();) {
+    const ssize_t count = write(input[1], pixels.data() + at, pixels.size() - at);
+    ASSERT_GT(count, 0);
+    at += static_cast<std::size_t>(count);
+  }
+  close(input[1]);
+  std::this_thread::sleep_for(std::chrono::milliseconds(100));
+  process.send(SIGTERM);
+  const Finished run = process.wait();
+  EXPECT_EQ(run.exitCode, 130);
+  EXPECT_THAT(run.errors, testing::HasSubstr("interrupted"));
+  EXPECT_THAT(folder.content(), testing::IsEmpty());
+}
+
+TEST(CtrlC, EndsWaitingForThePartnerOfAPipe) {
+  const TemporaryFolder folder;
+  const std::string photo = folder.write("a.jpg", smallJpeg()), pipe = folder / "pipe";
+  ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
+  const int null = open("/dev/null", O_RDONLY | O_CLOEXEC);
+  for (const std::vector<std::string>& command :
+       {std::vector<std::string>{quenbyPath(), "enhance", photo, "-o", pipe},
+        {quenbyPath(), "enhance", pipe, "-o", folder / "b.jpg"}}) {
+    Process process(command, null);
+    std::this_thread::sleep_for(std::chrono::milliseconds(200));
+    process.send(SIGINT);
+    EXPECT_EQ(process.wait().exitCode, 130);
+  }
+  close(null);
+  EXPECT_THAT(folder.content(), testing::ElementsAre("a.jpg", "pipe"));
 }
 
 }  // namespace
