@@ -3,6 +3,9 @@ include(CMakePackageConfigHelpers)
 
 set_target_properties(pelorin_image_processing PROPERTIES EXPORT_NAME image_processing)
 install(TARGETS pelorin_image_processing pelorin_highway ${engine_libraries} EXPORT QuenbyTargets)
+if(TARGET pelorin_instruction_sets)
+  install(TARGETS pelorin_instruction_sets EXPORT QuenbyTargets)
+endif()
 install(DIRECTORY ${PROJECT_SOURCE_DIR}/image_processing
         DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/quenby
         FILES_MATCHING PATTERN "*.h")
