@@ -24,8 +24,10 @@ bool isUnchanged(const KnownFile& file) {
 
 std::optional<KnownFile> knownFile(const ScannedPhoto& photo) {
   if (!photo.bytes || !photo.modified) return std::nullopt;
-  return KnownFile{fs::absolute(photo.path).lexically_normal().string(),
-                   {*photo.bytes, *photo.modified}};
+  // Links on the way are followed ("link/../a.jpg" is not "a.jpg"), the last one is not.
+  const fs::path path = fs::absolute(photo.path);
+  const fs::path place = fs::weakly_canonical(path.parent_path()) / path.filename();
+  return KnownFile{place.string(), {*photo.bytes, *photo.modified}};
 }
 
 std::vector<Removal> planRemovals(const std::vector<DupeGroup>& groups,

@@ -180,6 +180,21 @@ TEST(DupesPlan, TakesALinkToAPhotoForThePhoto) {
   EXPECT_TRUE(folder.has("real/photo.jpg"));
 }
 
+TEST(DupesPlan, FollowsLinksToFoldersOnTheWayToAPhoto) {
+  const Doubles doubles;
+  doubles.folder.makeFolder("elsewhere/below");
+  doubles.folder.write("elsewhere/small.jpg", doubles.folder.read("in/small.jpg"));
+  fs::create_directory_symlink("elsewhere/below", doubles.folder / "link");
+  const std::string meant = doubles.folder / "link/../small.jpg";
+  doubles.folder.write("small.jpg", "not meant");
+  const Finished run =
+      quenby({"dupes", doubles.folder / "in/a.jpg", meant, "--move-to", doubles.away(), "--apply"});
+  EXPECT_EQ(run.exitCode, 0) << run.errors;
+  EXPECT_FALSE(doubles.folder.has("elsewhere/small.jpg"));
+  EXPECT_TRUE(doubles.folder.has("small.jpg"));
+  EXPECT_TRUE(doubles.folder.has(doubles.moved("elsewhere/small.jpg")));
+}
+
 Json entryOf(const std::string& path) {
   const auto stamp = photo::stampOf(path);
   return {{"file", path}, {"bytes", stamp->bytes}, {"modified", std::to_string(stamp->modified)}};
