@@ -15,6 +15,7 @@ int main(int argc, char** argv) {
   addScore(commandLine);
   addKeypoints(commandLine);
   addUndo(commandLine);
+  addWatch(commandLine);
   addPages(commandLine);
   return static_cast<int>(commandLine.run(argc, argv));
 }

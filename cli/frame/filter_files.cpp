@@ -83,11 +83,7 @@ Json jsonOf(const std::vector<photo::Loss>& lost) {
 
 }  // namespace
 
-void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
-                           const std::string& placeholders) {
-  addInputOptions(verb, options.inputs);
-  addOutputOptions(verb, options.outputs, "{stem}_{filter}.{ext}", placeholders);
-  addInPlaceOptions(verb, options.outputs);
+void addFilteringOptions(Verb verb, FilterFilesOptions& options) {
   addFaceOptions(verb, options.faces);
   verb.option("--rotate", options.rotate,
               "Turn further by so many degrees clockwise, a multiple of 90")
@@ -96,8 +92,6 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
       .oneOf({"1", "2", "4", "8"});
   addQualityOption(verb, options.quality);
   addKeepOptions(verb, options.keep);
-  addRawOption(verb, options.raw);
-  verb.named("--raw").help("Read and write packed RGBA bytes of this size instead of photos");
   addJobsOption(verb, options.jobs);
   addThreadsOption(verb, options.threads);
   verb.option("--memory", options.memory,
@@ -106,11 +100,21 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
       .between(0, 1 << 20)
       .type("MIB")
       .group("Reporting");
+}
+
+void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
+                           const std::string& placeholders) {
+  addInputOptions(verb, options.inputs);
+  addOutputOptions(verb, options.outputs, "{stem}_{filter}.{ext}", placeholders);
+  addInPlaceOptions(verb, options.outputs);
+  addFilteringOptions(verb, options);
+  addRawOption(verb, options.raw);
+  verb.named("--raw").help("Read and write packed RGBA bytes of this size instead of photos");
   addReportOptions(verb, options.report);
 }
 
 ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
-                     const FilterToApply& filter) {
+                     const FilterToApply& filter, const ToldFile& told) {
   Work work = readOptions(options, filter);
   const bool raw = work.photo.raw.has_value();
   if (options.outputs.inPlace && (raw || work.photo.scale != 1)) {
@@ -164,6 +168,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
              if (!done) {
                ++skipped;
                json.add(planAsJson(plan[index], "exists"));
+               if (told) told(plan[index], "exists");
                return;
              }
              Json object = planAsJson(plan[index], "done");
@@ -177,12 +182,14 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
              for (const photo::Loss& loss : done->lost) {
                talk.note(plan[index].output + ": " + lossText(loss));
              }
+             if (told) told(plan[index], "done");
            },
        .failed =
            [&](std::size_t index, const std::string& reason) {
              Json object = planAsJson(plan[index], "failed");
              object["error"] = reason;
              json.add(object);
+             if (told) told(plan[index], "failed");
            }});
   const std::size_t done = tally.done - skipped;
   const char* const whatToDo =

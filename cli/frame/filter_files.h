@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <map>
 #include <string>
 #include <vector>
@@ -32,6 +33,9 @@ struct FilterFilesOptions {
   int memory = 128;            ///< MiB of pixels kept, by all jobs together.
 };
 
+/// Adds what a verb may do with a photo beside the filter: faces, turning, quality, metadata, jobs.
+void addFilteringOptions(Verb verb, FilterFilesOptions& options);
+
 /// Adds all of them to a verb. Results in a folder are called `{stem}_{filter}` by default.
 /// @param placeholders  what `--name` may hold, for the help.
 void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
@@ -44,9 +48,13 @@ struct FilterToApply {
   std::map<std::string, std::string> values;  ///< For `--name`, beside {stem} and {filter}.
 };
 
+/// What became of a file of a plan: "done", "exists" or "failed".
+using ToldFile = std::function<void(const PlannedFile& file, const std::string& status)>;
+
 /// Plans, then loads, filters and saves every file, reports, and says how it went.
+/// @param told  called for each file in order, on the calling thread; may be empty.
 /// @throws UsageError before any work.
 ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
-                     const FilterToApply& filter);
+                     const FilterToApply& filter, const ToldFile& told = {});
 
 }  // namespace pelorin::cli

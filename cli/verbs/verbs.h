@@ -18,5 +18,6 @@ void addPages(CommandLine& commandLine);  // for the build
 void addScore(CommandLine& commandLine);
 void addSheet(CommandLine& commandLine);
 void addUndo(CommandLine& commandLine);
+void addWatch(CommandLine& commandLine);
 
 }  // namespace pelorin::cli

@@ -123,75 +123,49 @@ std::optional<PhotoRecord> readRecord(sqlite3_stmt* statement, const Key& key, i
   return record;
 }
 
-// A statement is ready for its next use on every way out.
-class Use {
- public:
-  explicit Use(sqlite3_stmt* statement) : statement_(statement) {}
-  ~Use() {
-    sqlite3_reset(statement_);
-    sqlite3_clear_bindings(statement_);
-  }
-  Use(const Use&) = delete;
-  Use& operator=(const Use&) = delete;
-
- private:
-  sqlite3_stmt* statement_;
-};
-
 }  // namespace
 
-void PhotoCache::Close::operator()(sqlite3* database) const {
-  sqlite3_close(database);
-}
-void PhotoCache::Close::operator()(sqlite3_stmt* statement) const {
-  sqlite3_finalize(statement);
-}
-
-PhotoCache::PhotoCache(const std::string& file) : file_(file) {
-  sqlite3* database = nullptr;
-  const int code =
-      sqlite3_open_v2(file.c_str(), &database, SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE, nullptr);
-  database_.reset(database);
-  if (code != SQLITE_OK) fail(code);
-  sqlite3_busy_timeout(database, millisecondsToWait);
+PhotoCache::PhotoCache(const std::string& file)
+    : file_(file), database_(file, millisecondsToWait, [this](int code) { fail(code); }) {
   prepareTables();
-  find_ = prepare(findPhoto);
-  store_ = prepare(storePhoto);
-  findScore_ = prepare(findScoreOfPhoto);
-  storeScore_ = prepare(storeScoreOfPhoto);
+  find_ = database_.prepare(findPhoto);
+  store_ = database_.prepare(storePhoto);
+  findScore_ = database_.prepare(findScoreOfPhoto);
+  storeScore_ = database_.prepare(storeScoreOfPhoto);
 }
 
 PhotoCache::~PhotoCache() = default;
 
 void PhotoCache::prepareTables() {
-  const auto isNew = [this] { return number("SELECT count(*) FROM sqlite_master") == 0; };
+  const auto isNew = [this] { return database_.number("SELECT count(*) FROM sqlite_master") == 0; };
   // Only an empty file is written to before it is known to be ours.
   if (isNew()) {
-    execute("BEGIN IMMEDIATE");
+    database_.execute("BEGIN IMMEDIATE");
     if (isNew()) {  // else another run was faster
-      execute(makeTables);
-      execute(fmt::format("PRAGMA application_id = {}", applicationId).c_str());
-      execute(fmt::format("PRAGMA user_version = {}", layoutVersion).c_str());
+      database_.execute(makeTables);
+      database_.execute(fmt::format("PRAGMA application_id = {}", applicationId).c_str());
+      database_.execute(fmt::format("PRAGMA user_version = {}", layoutVersion).c_str());
     }
-    execute("COMMIT");
+    database_.execute("COMMIT");
   }
-  if (number("PRAGMA application_id") != applicationId) refuse("is not a cache of photos");
-  if (number("PRAGMA user_version") != layoutVersion) {
+  if (database_.number("PRAGMA application_id") != applicationId)
+    refuse("is not a cache of photos");
+  if (database_.number("PRAGMA user_version") != layoutVersion) {
     refuse("was made by another version");
   }
   // With a log, storing waits for no disk and readers for no writer. Where it cannot be had, the
   // cache is only slower.
-  sqlite3_exec(database_.get(), "PRAGMA journal_mode = WAL", nullptr, nullptr, nullptr);
-  execute("PRAGMA synchronous = NORMAL");
+  database_.succeeds("PRAGMA journal_mode = WAL");
+  database_.execute("PRAGMA synchronous = NORMAL");
 }
 
 std::optional<PhotoRecord> PhotoCache::find(const std::string& photo, const FileStamp& stamp,
                                             int scale) {
-  const Use use(find_.get());
+  const StatementUse use(find_.get());
   const Key key = keyOf(photo, stamp);
   bindKey(find_.get(), key);
   sqlite3_bind_int(find_.get(), 5, scale);
-  if (!step(find_.get())) return std::nullopt;
+  if (!database_.step(find_.get())) return std::nullopt;
   std::optional<PhotoRecord> record = readRecord(find_.get(), key, scale);
   if (!record) refuse("is damaged");
   return record;
@@ -199,21 +173,21 @@ std::optional<PhotoRecord> PhotoCache::find(const std::string& photo, const File
 
 void PhotoCache::store(const std::string& photo, const FileStamp& stamp, int scale,
                        const PhotoRecord& record) {
-  const Use use(store_.get());
+  const StatementUse use(store_.get());
   const Key key = keyOf(photo, stamp);
   bindKey(store_.get(), key);
   sqlite3_bind_int(store_.get(), 5, scale);
   bindRecord(store_.get(), key, scale, record);
-  step(store_.get());
+  database_.step(store_.get());
 }
 
 std::optional<float> PhotoCache::findScore(const std::string& photo, const FileStamp& stamp) {
   sqlite3_stmt* const statement = findScore_.get();
-  const Use use(statement);
+  const StatementUse use(statement);
   const Key key = keyOf(photo, stamp);
   bindKey(statement, key);
   sqlite3_bind_text(statement, 5, niqeModelId, -1, SQLITE_STATIC);
-  if (!step(statement)) return std::nullopt;
+  if (!database_.step(statement)) return std::nullopt;
   const bool tooSmall = sqlite3_column_type(statement, 0) == SQLITE_NULL;
   const float score = tooSmall ? std::numeric_limits<float>::quiet_NaN()
                                : static_cast<float>(sqlite3_column_double(statement, 0));
@@ -223,36 +197,13 @@ std::optional<float> PhotoCache::findScore(const std::string& photo, const FileS
 
 void PhotoCache::storeScore(const std::string& photo, const FileStamp& stamp, float score) {
   sqlite3_stmt* const statement = storeScore_.get();
-  const Use use(statement);
+  const StatementUse use(statement);
   const Key key = keyOf(photo, stamp);
   bindKey(statement, key);
   sqlite3_bind_text(statement, 5, niqeModelId, -1, SQLITE_STATIC);
   if (!std::isnan(score)) sqlite3_bind_double(statement, 6, score);
   sqlite3_bind_int64(statement, 7, checksum(key, score));
-  step(statement);
-}
-
-void PhotoCache::execute(const char* sql) {
-  const int code = sqlite3_exec(database_.get(), sql, nullptr, nullptr, nullptr);
-  if (code != SQLITE_OK) fail(code);
-}
-
-std::int64_t PhotoCache::number(const char* sql) {
-  const Statement statement = prepare(sql);
-  return step(statement.get()) ? sqlite3_column_int64(statement.get(), 0) : 0;
-}
-
-PhotoCache::Statement PhotoCache::prepare(const char* sql) {
-  sqlite3_stmt* statement = nullptr;
-  const int code = sqlite3_prepare_v2(database_.get(), sql, -1, &statement, nullptr);
-  if (code != SQLITE_OK) fail(code);
-  return Statement(statement);
-}
-
-bool PhotoCache::step(sqlite3_stmt* statement) {
-  const int code = sqlite3_step(statement);
-  if (code != SQLITE_ROW && code != SQLITE_DONE) fail(code);
-  return code == SQLITE_ROW;
+  database_.step(statement);
 }
 
 void PhotoCache::fail(int code) {

@@ -1,14 +1,11 @@
 #pragma once
 
-#include <memory>
 #include <optional>
 #include <stdexcept>
 #include <string>
 
+#include "photo/collection/database.h"
 #include "photo/collection/photo_record.h"
-
-struct sqlite3;
-struct sqlite3_stmt;
 
 namespace pelorin::photo {
 
@@ -47,23 +44,13 @@ class PhotoCache {
   void storeScore(const std::string& photo, const FileStamp& stamp, float score);
 
  private:
-  struct Close {
-    void operator()(sqlite3* database) const;
-    void operator()(sqlite3_stmt* statement) const;
-  };
-  using Statement = std::unique_ptr<sqlite3_stmt, Close>;
-
   void prepareTables();
-  void execute(const char* sql);
-  std::int64_t number(const char* sql);
-  Statement prepare(const char* sql);
-  bool step(sqlite3_stmt* statement);
   [[noreturn]] void fail(int code);
   [[noreturn]] void refuse(const std::string& why);
 
   std::string file_;
-  std::unique_ptr<sqlite3, Close> database_;
-  Statement find_, store_, findScore_, storeScore_;
+  Database database_;
+  Database::Statement find_, store_, findScore_, storeScore_;
 };
 
 }  // namespace pelorin::photo

@@ -1,0 +1,58 @@
+#include "photo/collection/database.h"
+
+#include <sqlite3.h>
+
+#include <utility>
+
+namespace pelorin::photo {
+
+void Database::Close::operator()(sqlite3* database) const {
+  sqlite3_close(database);
+}
+void Database::Close::operator()(sqlite3_stmt* statement) const {
+  sqlite3_finalize(statement);
+}
+
+Database::Database(const std::string& file, int millisecondsToWait, Fail fail)
+    : fail_(std::move(fail)) {
+  sqlite3* database = nullptr;
+  const int code =
+      sqlite3_open_v2(file.c_str(), &database, SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE, nullptr);
+  database_.reset(database);
+  if (code != SQLITE_OK) fail_(code);
+  sqlite3_busy_timeout(database, millisecondsToWait);
+}
+
+void Database::execute(const char* sql) {
+  const int code = sqlite3_exec(database_.get(), sql, nullptr, nullptr, nullptr);
+  if (code != SQLITE_OK) fail_(code);
+}
+
+bool Database::succeeds(const char* sql) {
+  return sqlite3_exec(database_.get(), sql, nullptr, nullptr, nullptr) == SQLITE_OK;
+}
+
+std::int64_t Database::number(const char* sql) {
+  const Statement statement = prepare(sql);
+  return step(statement.get()) ? sqlite3_column_int64(statement.get(), 0) : 0;
+}
+
+Database::Statement Database::prepare(const char* sql) {
+  sqlite3_stmt* statement = nullptr;
+  const int code = sqlite3_prepare_v2(database_.get(), sql, -1, &statement, nullptr);
+  if (code != SQLITE_OK) fail_(code);
+  return Statement(statement);
+}
+
+bool Database::step(sqlite3_stmt* statement) {
+  const int code = sqlite3_step(statement);
+  if (code != SQLITE_ROW && code != SQLITE_DONE) fail_(code);
+  return code == SQLITE_ROW;
+}
+
+StatementUse::~StatementUse() {
+  sqlite3_reset(statement_);
+  sqlite3_clear_bindings(statement_);
+}
+
+}  // namespace pelorin::photo
