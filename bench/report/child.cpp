@@ -55,23 +55,20 @@ Spent inChild(const std::function<Spent()>& work) {
   return spent;
 }
 
-Spent runCommand(const std::vector<std::string>& arguments, const std::string& preload) {
-  const std::string setting = "LD_PRELOAD=" + preload;
-  std::vector<char*> pointers, environment;  // posix_spawn only reads
+Spent runCommand(const std::vector<std::string>& arguments) {
+  std::vector<char*> pointers;  // posix_spawn only reads
   for (const std::string& argument : arguments) {
     pointers.push_back(const_cast<char*>(argument.c_str()));
   }
   pointers.push_back(nullptr);
-  if (!preload.empty()) environment.push_back(const_cast<char*>(setting.c_str()));
-  environment.push_back(nullptr);
+  char* const environment[] = {nullptr};
   posix_spawn_file_actions_t actions;
   posix_spawn_file_actions_init(&actions);
   posix_spawn_file_actions_addopen(&actions, STDOUT_FILENO, "/dev/null", O_WRONLY, 0);
   pid_t child;
   int status = 1;
   rusage usage{};
-  if (posix_spawn(&child, pointers[0], &actions, nullptr, pointers.data(), environment.data()) !=
-          0 ||
+  if (posix_spawn(&child, pointers[0], &actions, nullptr, pointers.data(), environment) != 0 ||
       wait4(child, &status, 0, &usage) != child || status != 0) {
     fail("a measured command failed");
   }

@@ -20,9 +20,8 @@ Spent inChild(const std::function<Spent()>& work);
 /// Runs a command from its start to its end, its standard output going nowhere; its peak is that of
 /// the whole process.
 /// @param arguments  the program's path first.
-/// @param preload    a shared library to load into it, or none.
 /// Ends this process when the command fails.
-Spent runCommand(const std::vector<std::string>& arguments, const std::string& preload = "");
+Spent runCommand(const std::vector<std::string>& arguments);
 
 /// Peak memory of this process so far.
 std::uint64_t peakBytesOfThisProcess();

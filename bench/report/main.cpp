@@ -14,6 +14,7 @@
 
 #include "bench/report/scale.h"
 #include "bench/report/stages.h"
+#include "bench/report/threads.h"
 #include "bench/report/whole_file.h"
 #include "bench/support/instruction_sets.h"
 #include "photo/file_io.h"
@@ -68,7 +69,8 @@ void report(const std::string& folder, const std::vector<std::string>& wanted) {
   const std::vector<std::pair<std::string, std::function<std::string()>>> parts = {
       {"machine", machine},
       {"stages", stagesTable},
-      {"files", [] { return wholeFileTable(QUENBY_COMMAND, AVX2_ONLY); }},
+      {"files", [] { return wholeFileTable(QUENBY_COMMAND, AVX2_COMMAND); }},
+      {"threads", threadsTable},
       {"scale", [&] { return scale(folder); }},
   };
   const std::string path = folder + "/performance.md";
@@ -88,7 +90,7 @@ void report(const std::string& folder, const std::vector<std::string>& wanted) {
 
 int main(int argc, char** argv) {
   if (argc < 2) {
-    std::fputs("performance_report FOLDER [machine|stages|files|scale ...]\n", stderr);
+    std::fputs("performance_report FOLDER [machine|stages|files|threads|scale ...]\n", stderr);
     return 2;
   }
   try {

@@ -28,7 +28,7 @@ double fastest(const std::vector<double>& seconds) {
 
 }  // namespace
 
-std::string wholeFileTable(const std::string& command, const std::string& avx2Only) {
+std::string wholeFileTable(const std::string& command, const std::string& avx2Command) {
   const PhotoFiles files(size, photosInARun);
   const std::vector<std::uint8_t> bytes = photo::readFile(files.first());
   CodecFloor floor(bytes, size.width, size.height);
@@ -51,6 +51,11 @@ std::string wholeFileTable(const std::string& command, const std::string& avx2On
     rows.push_back({fmt::format("`--filter {}`, each of {} photos", filter, photosInARun),
                     enhance(filter, files.folder()), photosInARun});
   }
+  for (const char* filter : {"AE0", "WinterRGB"}) {
+    std::vector<std::string> arguments = enhance(filter, files.first());
+    arguments.insert(arguments.end(), {"--memory", "0"});
+    rows.push_back({fmt::format("`--filter {} --memory 0`", filter), arguments});
+  }
   const std::vector<InstructionSet> sets = instructionSets();
 
   // Round by round, so that the machine's moods meet all of them. The fastest counts: a run also
@@ -61,9 +66,9 @@ std::string wholeFileTable(const std::string& command, const std::string& avx2On
     floorTimes.push_back(secondsOf([&] { floor.run(); }));
     for (std::size_t r = 0; r < rows.size(); ++r) {
       for (std::size_t s = 0; s < sets.size(); ++s) {
-        const std::string preload = sets[s].name == std::string_view("AVX2") ? avx2Only : "";
-        times[r * sets.size() + s].push_back(runCommand(rows[r].arguments, preload).seconds /
-                                             rows[r].photos);
+        std::vector<std::string> arguments = rows[r].arguments;
+        if (sets[s].name == std::string_view("AVX2")) arguments[0] = avx2Command;
+        times[r * sets.size() + s].push_back(runCommand(arguments).seconds / rows[r].photos);
       }
     }
   }
