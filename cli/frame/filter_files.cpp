@@ -138,7 +138,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
   }
 
   JsonOutput json(options.report, isSingleFile(options.inputs, named));
-  Talk talk(verb, options.report.quiet, options.outputs.planOnly ? 0 : plan.size());
+  Talk talk(verb, options.report, options.outputs.planOnly ? 0 : plan.size());
   const bool inPlace = options.outputs.inPlace;
   if (options.outputs.planOnly) {
     return printPlan(

@@ -54,7 +54,9 @@ std::string textOf(const Json& object) {
   return textOf(object, -1);
 }
 
-void JsonOutput::add(const Json& object) {
+void JsonOutput::add(const Json& members) {
+  Json object = {{"schema", jsonSchema}};
+  object.update(members);
   if (lines_) {
     std::printf("%s\n", textOf(object, -1).c_str());
     std::fflush(stdout);

@@ -12,6 +12,10 @@ using Json = nlohmann::ordered_json;
 /// An object in one line, as `JsonOutput` writes it.
 std::string textOf(const Json& object);
 
+/// The version of the JSON that is printed, the first member of every object; docs/json.md tells what it
+/// promises.
+constexpr int jsonSchema = 1;
+
 /// Data on stdout: nothing without `--json` or `--jsonl`; one object a line with `--jsonl`; with
 /// `--json` one object, or an array of them unless the user named a single file.
 ///
@@ -27,7 +31,8 @@ class JsonOutput {
   ~JsonOutput();
 
   bool wanted() const { return json_ || lines_; }
-  void add(const Json& object);
+  /// @param members  of an object.
+  void add(const Json& members);
 
  private:
   bool json_, lines_, single_;

@@ -3,6 +3,7 @@
 #include <fmt/format.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cstdio>
 #include <utility>
 
@@ -18,6 +19,12 @@ void addReportOptions(Verb verb, ReportOptions& options) {
       .excludes(json)
       .group("Reporting");
   verb.flag("-q,--quiet", options.quiet, "Say nothing but errors").group("Reporting");
+  verb.option(
+          "--progress", options.progress,
+          "Tell how far the work is: auto, unless given, with a bar on a terminal; json as lines "
+          "of JSON on standard error")
+      .oneOf({"auto", "json", "none"})
+      .group("Reporting");
 }
 
 Talk::Talk(std::string verb, bool quiet, std::size_t files)
@@ -26,6 +33,13 @@ Talk::Talk(std::string verb, bool quiet, std::size_t files)
       hasBar_(!quiet && files > 1 && isatty(STDERR_FILENO) == 1),
       files_(files) {
   showBar();
+}
+
+Talk::Talk(std::string verb, const ReportOptions& report, std::size_t files)
+    : Talk(std::move(verb), report.quiet || report.progress != "auto", files) {
+  quiet_ = report.quiet;
+  printsProgress_ = report.progress == "json" && files > 0;
+  printProgress();
 }
 
 Talk::~Talk() {
@@ -53,6 +67,7 @@ void Talk::fileDone() {
   const std::lock_guard lock(mutex_);
   ++done_;
   showBar();
+  printProgress();
 }
 
 void Talk::say(const std::string& line) {
@@ -65,11 +80,40 @@ void Talk::hideBar() {
   if (hasBar_) fmt::print(stderr, "\r\033[K");
 }
 
+double Talk::elapsed() const {
+  return std::chrono::duration<double>(std::chrono::steady_clock::now() - start_).count();
+}
+
+double Talk::secondsLeft(double elapsed) const {
+  if (done_ == 0) return -1.0;
+  return elapsed * static_cast<double>(files_ - done_) / static_cast<double>(done_);
+}
+
 void Talk::showBar() {
   if (!hasBar_) return;
   constexpr std::size_t width = 40;
   const std::size_t filled = done_ * width / files_;
   fmt::print(stderr, "\r[{:#<{}}{:<{}}] {}/{}", "", filled, "", width - filled, done_, files_);
+  const double seconds = elapsed(), left = secondsLeft(seconds);
+  if (seconds > 0.0 && left >= 0.0) {
+    fmt::print(stderr, "  {:.1f}/s", static_cast<double>(done_) / seconds);
+    const auto whole = static_cast<long>(std::min(left + 0.5, 1e9));
+    if (done_ < files_) fmt::print(stderr, "  {}:{:02} left", whole / 60, whole % 60);
+  }
+  fmt::print(stderr, "\033[K");
+  std::fflush(stderr);
+}
+
+void Talk::printProgress() {
+  if (!printsProgress_) return;
+  const double seconds = elapsed(), left = secondsLeft(seconds);
+  fmt::print(stderr, R"({{"schema":1,"verb":"{}","done":{},"total":{},"seconds":{:.3f})", verb_,
+             done_, files_, seconds);
+  if (left >= 0.0) {
+    fmt::print(stderr, R"(,"rate":{:.3f},"secondsLeft":{:.3f})",
+               static_cast<double>(done_) / std::max(seconds, 1e-3), left);
+  }
+  fmt::print(stderr, "}}\n");
   std::fflush(stderr);
 }
 

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <chrono>
 #include <cstddef>
 #include <mutex>
 #include <set>
@@ -14,15 +15,19 @@ struct ReportOptions {
   bool json = false;
   bool jsonLines = false;
   bool quiet = false;
+  std::string progress = "auto";  ///< "auto", "json" or "none".
 };
 
-/// Adds `--json`, `--jsonl` and `--quiet` to a verb.
+/// Adds `--json`, `--jsonl`, `--quiet` and `--progress` to a verb.
 void addReportOptions(Verb verb, ReportOptions& options);
 
-/// Everything that is said to a person, on stderr: errors, notes, and one progress bar when stderr
-/// is a terminal and there are several files. Any thread may speak.
+/// Everything that is said to a person, on stderr: errors, notes, and how far the work is: one bar
+/// when stderr is a terminal and there are several files, or a line of JSON a file for programs. Any
+/// thread may speak.
 class Talk {
  public:
+  Talk(std::string verb, const ReportOptions& report, std::size_t files);
+  /// Tells no progress but to a person.
   Talk(std::string verb, bool quiet, std::size_t files);
   ~Talk();
   Talk(const Talk&) = delete;
@@ -40,9 +45,14 @@ class Talk {
   void say(const std::string& line);
   void hideBar();
   void showBar();
+  void printProgress();
+  /// Seconds until all files are done; negative where nothing is known yet.
+  double secondsLeft(double elapsed) const;
+  double elapsed() const;
 
   std::string verb_;
-  bool quiet_, hasBar_;
+  bool quiet_, hasBar_, printsProgress_ = false;
+  std::chrono::steady_clock::time_point start_ = std::chrono::steady_clock::now();
   std::size_t files_, done_ = 0;
   std::set<std::string> topics_;
   std::mutex mutex_;

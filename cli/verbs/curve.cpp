@@ -92,7 +92,7 @@ ExitCode runCurve(const CurveOptions& options) {
     throw UsageError("standard output takes one of -o -, --text and --json");
   }
   requireFormatOf(output, /*raw=*/false);
-  Talk talk("curve", options.report.quiet, 1);
+  Talk talk("curve", options.report, 1);
   const bool plotted = !output.empty();
   const std::vector<std::string> outputs(plotted ? 1 : 0, output);
   if (const auto code = stopBeforeWork({input}, outputs, options.outputs, talk, json)) return *code;

@@ -56,7 +56,7 @@ bool searchPairs(const std::vector<photo::Shot>& shots, float threshold,
                  const DupesOptions& options, std::vector<photo::ShotPair>& pairs) {
   const photo::PairSearch search(shots, threshold, options.unknownTimes);
   const std::size_t pieces = std::min<std::size_t>(search.stepCount(), 400);
-  Talk talk(verbName, options.report.quiet, pieces);
+  Talk talk(verbName, options.report, pieces);
   std::vector<std::vector<photo::ShotPair>> found(pieces);
   const bool finished = runJobs(
       pieces, options.jobs,
@@ -93,7 +93,7 @@ bool scorePhotos(const DupesOptions& options, photo::PhotoCache* cache, std::str
   }
   std::vector<Input> inputs;
   for (const Unscored& photo : unscored) inputs.push_back({report.photos[photo.photo].path, {}});
-  Talk talk(verbName, options.report.quiet, inputs.size());
+  Talk talk(verbName, options.report, inputs.size());
   const PhotoTally tally =
       eachPhoto<float>(inputs, options.jobs, talk,
                        {.work =
@@ -135,7 +135,7 @@ bool writeHtml(const DupesOptions& options, DupeReport& report) {
   using Thumbnail = std::vector<std::uint8_t>;
   std::vector<Thumbnail> thumbnails(report.photos.size());
   {
-    Talk talk(verbName, options.report.quiet, inputs.size());
+    Talk talk(verbName, options.report, inputs.size());
     const PhotoTally tally = eachPhoto<Thumbnail>(
         inputs, options.jobs, talk,
         {.work = [&](std::size_t job) { return thumbnailOf(report.photos[shown[job]], talk); },
@@ -308,7 +308,7 @@ ExitCode runDupes(const DupesOptions& options) {
 
   ScanResult scan;
   {
-    Talk talk(verbName, options.report.quiet, inputs.size());
+    Talk talk(verbName, options.report, inputs.size());
     scan = scanPhotos(inputs,
                       {options.scale == "auto" ? photo::automaticScale : std::stoi(options.scale),
                        options.jobs, options.assumeFileTime, cache.get()},

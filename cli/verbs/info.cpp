@@ -142,7 +142,7 @@ ExitCode runInfo(const InfoOptions& options) {
   const std::vector<Input> inputs = expandInputs(options.inputs);
 
   JsonOutput json(options.report, isSingleFile(options.inputs, inputs));
-  Talk talk("info", options.report.quiet, inputs.size());
+  Talk talk("info", options.report, inputs.size());
   const PhotoTally tally = eachPhoto<Info>(
       inputs, options.jobs, talk,
       {.work =

@@ -110,7 +110,7 @@ ExitCode runKeypoints(const KeypointsOptions& options) {
   }
   requireFormatOf(path, /*raw=*/false);
   const std::vector<std::string> outputs(path.empty() ? 0 : 1, path);
-  Talk talk("keypoints", options.report.quiet, 1);
+  Talk talk("keypoints", options.report, 1);
   JsonOutput json(options.report, true);
   if (const auto code = stopBeforeWork({input}, outputs, options.drawing, talk, json)) return *code;
 

@@ -89,7 +89,7 @@ ExitCode runMasks(const MasksOptions& options) {
   const std::string bilateralPath = folder / ("bilateral" + extension);
   const std::string ltmPath = folder / ("ltm" + extension);
   const std::vector<std::string> paths = {bilateralPath, ltmPath};
-  Talk talk("masks", options.report.quiet, 1);
+  Talk talk("masks", options.report, 1);
   JsonOutput json(options.report, true);
   if (const auto code = stopBeforeWork({input}, paths, options.outputs, talk, json)) return *code;
 

@@ -85,7 +85,7 @@ ExitCode runScore(const ScoreOptions& options) {
   const std::vector<Input> inputs = expandInputs(options.inputs);
   const std::vector<PlannedFile> maps = planMaps(options, inputs);
   const bool singleFile = isSingleFile(options.inputs, inputs);
-  Talk talk("score", options.format.report.quiet, options.maps.planOnly ? 0 : inputs.size());
+  Talk talk("score", options.format.report, options.maps.planOnly ? 0 : inputs.size());
   if (options.maps.planOnly) {
     JsonOutput json(options.format.report, singleFile);
     return printPlan(maps, " (exists: skipped without --overwrite)", talk, json);

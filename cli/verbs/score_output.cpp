@@ -40,20 +40,25 @@ std::string quotedForCsv(const std::string& text) {
 }
 
 void printCsvHead(bool withFeatures) {
-  fmt::print("file,width,height,score,blocks,model");
+  fmt::print("file,width,height,score,blocks,model,error");
   for (int i = 0; withFeatures && i < featureCount; ++i) fmt::print(",feature{}", i);
   fmt::print("\n");
 }
 
 void printCsvRow(const Input& input, const ScoredPhoto& photo, bool withFeatures) {
   const std::string score = photo.isTooSmall() ? "" : fmt::format("{:.9g}", photo.niqe.score);
-  fmt::print("{},{},{},{},{},{}", quotedForCsv(pathForCsv(input.path)), photo.width, photo.height,
+  fmt::print("{},{},{},{},{},{},", quotedForCsv(pathForCsv(input.path)), photo.width, photo.height,
              score, photo.blocks(), niqeModelId);
   if (withFeatures && photo.isTooSmall()) fmt::print("{:,<{}}", "", featureCount);
   for (const float mean : photo.niqe.meanFeatures) {
     if (withFeatures) fmt::print(",{:.9g}", mean);
   }
   fmt::print("\n");
+}
+
+void printCsvFailure(const Input& input, const std::string& error, bool withFeatures) {
+  fmt::print("{},,,,,,{}{:,<{}}\n", quotedForCsv(pathForCsv(input.path)),
+             quotedForCsv(shownText(error)), "", withFeatures ? featureCount : 0);
 }
 
 void printTableRow(const Input& input, const ScoredPhoto& photo) {
@@ -89,6 +94,7 @@ void ScoreOutput::add(const Input& input, const ScoredPhoto& photo) {
 }
 
 void ScoreOutput::addFailed(const Input& input, const std::string& error) {
+  if (format_.csv && !json_.wanted()) printCsvFailure(input, error, format_.features);
   json_.add({{"file", input.path}, {"error", error}});
 }
 

@@ -31,7 +31,7 @@ class ScoreOutput {
   ScoreOutput(const ScoreFormat& format, bool singleFile);
 
   void add(const Input& input, const ScoredPhoto& photo);
-  /// A photo that could not be read; only JSON has room for it.
+  /// A photo that could not be read, for programs; a person is told elsewhere.
   void addFailed(const Input& input, const std::string& error);
 
  private:

@@ -139,7 +139,7 @@ ExitCode runSheet(const SheetOptions& options) {
   if (output == "-" && json.wanted()) {
     throw UsageError("-o -: standard output takes the sheet or --json, not both");
   }
-  Talk talk("sheet", options.report.quiet, inputs.size());
+  Talk talk("sheet", options.report, inputs.size());
   if (inputs.empty()) {
     talk.note("no photos found");
     return ExitCode::nothingToDo;

@@ -30,7 +30,7 @@ ExitCode runUndo(const UndoOptions& options) {
   std::vector<Input> files;
   for (const std::string& path : photo::keptFiles(options.folder)) files.push_back({path, {}});
   JsonOutput json(options.report, /*singleFile=*/false);
-  Talk talk("undo", options.report.quiet, files.size());
+  Talk talk("undo", options.report, files.size());
   const char* const status = options.planOnly ? "planned" : "restored";
   const PhotoTally tally = eachPhoto<bool>(
       files, /*jobs=*/1, talk,

@@ -118,7 +118,7 @@ ExitCode actOnPlan(const std::vector<photo::Removal>& plan, const ActionOptions&
   }
   if (options.apply) sweepFolders(paths);
   JsonOutput json(report, /*singleFile=*/false);
-  Talk talk("dupes", report.quiet, files.size());
+  Talk talk("dupes", report, files.size());
   const char* const verb = options.link ? "link" : "move";
   const auto told = [&](std::size_t index, const Outcome& outcome) {
     Json object = {{"file", files[index].path}, {"action", verb}, {"status", outcome.status}};

@@ -449,6 +449,9 @@ TEST(ProgressBar, AppearsOnATerminalOnly) {
   EXPECT_EQ(seen.exitCode, 0) << seen.output;
   EXPECT_THAT(seen.output, HasSubstr("1/2"));
   EXPECT_THAT(seen.output, HasSubstr("[########################################] 2/2"));
+  EXPECT_THAT(seen.output, HasSubstr(" 1/2  "));
+  EXPECT_THAT(seen.output, HasSubstr("/s  0:"));
+  EXPECT_THAT(onTerminal(command + " --progress none").output, Not(HasSubstr("1/2")));
   EXPECT_THAT(onTerminal(command + " -q").output, IsEmpty());
   EXPECT_THAT(shell(command).errors, testing::Not(HasSubstr("1/2")));
 }

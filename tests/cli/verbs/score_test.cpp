@@ -88,16 +88,24 @@ TEST_F(Score, IsATableForAPerson) {
 
 TEST_F(Score, IsARowOfCommaSeparatedValues) {
   const Finished run = quenby({"score", "--csv", "--raw", "300x210", raw});
-  EXPECT_EQ(run.output, "file,width,height,score,blocks,model\n" + raw + ",300,210," +
-                            nineDigitText(expected.score) + ",6,niqe-pristine-1\n");
-  std::string head = "file,width,height,score,blocks,model";
-  std::string row = raw + ",300,210," + nineDigitText(expected.score) + ",6,niqe-pristine-1";
+  EXPECT_EQ(run.output, "file,width,height,score,blocks,model,error\n" + raw + ",300,210," +
+                            nineDigitText(expected.score) + ",6,niqe-pristine-1,\n");
+  std::string head = "file,width,height,score,blocks,model,error";
+  std::string row = raw + ",300,210," + nineDigitText(expected.score) + ",6,niqe-pristine-1,";
   for (int i = 0; i < 36; ++i) {
     head += ",feature" + std::to_string(i);
     row.append(",").append(nineDigitText(expected.meanFeatures[static_cast<std::size_t>(i)]));
   }
   EXPECT_EQ(quenby({"score", "--csv", "--features", "--raw", "300x210", raw}).output,
             head + "\n" + row + "\n");
+}
+
+TEST_F(Score, HasARowForWhatFailed) {
+  const std::string none = folder / "none.jpg";
+  const std::string row = none + ",,,,,,No such file or directory; check the path";
+  EXPECT_THAT(quenby({"score", "--csv", none, good}).output, HasSubstr("\n" + row + "\n"));
+  EXPECT_THAT(quenby({"score", "--csv", "--features", none, good}).output,
+              HasSubstr("\n" + row + std::string(36, ',') + "\n"));
 }
 
 TEST_F(Score, QuotesOddFileNamesInCsv) {
@@ -122,9 +130,9 @@ TEST_F(Score, OfATooSmallPictureIsOneClearLineAndNoNumber) {
   EXPECT_TRUE(json[1]["score"].is_number());
 
   EXPECT_THAT(quenby({"score", "--csv", small, good}).output,
-              HasSubstr(small + ",200,95,,0,niqe-pristine-1\n"));
+              HasSubstr(small + ",200,95,,0,niqe-pristine-1,\n"));
   EXPECT_THAT(quenby({"score", "--csv", "--features", small, good}).output,
-              HasSubstr(small + ",200,95,,0,niqe-pristine-1" + std::string(36, ',') + "\n"));
+              HasSubstr(small + ",200,95,,0,niqe-pristine-1" + std::string(37, ',') + "\n"));
   EXPECT_EQ(quenby({"score", "--features", small}).output, "");
 }
 
