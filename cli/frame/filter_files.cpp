@@ -10,6 +10,7 @@
 #include "cli/frame/errors.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/interrupt.h"
+#include "cli/frame/jobs_option.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/photo_files.h"
 #include "cli/frame/print_plan.h"

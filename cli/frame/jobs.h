@@ -4,18 +4,11 @@
 #include <functional>
 
 #include "cli/frame/interrupt.h"
-#include "cli/frame/verb.h"
 
 namespace pelorin::cli {
 
-/// Adds `-j N` to a verb: `atOnce` unless given, 0 for one a core.
-void addJobsOption(Verb verb, int& atOnce);
-
 /// How many that is: `atOnce`, or one a core for 0.
 int jobsAtOnce(int atOnce);
-
-/// Adds `--threads N` to a verb, what `threadsForEach` takes.
-void addThreadsOption(Verb verb, int& threads);
 
 /// `--threads` where it is not given.
 inline constexpr int usualThreads = -1;

@@ -12,6 +12,7 @@
 #include "cli/frame/errors.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/jobs.h"
+#include "cli/frame/jobs_option.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/talk.h"
 #include "cli/frame/used_files.h"

@@ -8,7 +8,7 @@
 #include "cli/frame/each_photo.h"
 #include "cli/frame/face_choice.h"
 #include "cli/frame/inputs.h"
-#include "cli/frame/jobs.h"
+#include "cli/frame/jobs_option.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/photo_files.h"

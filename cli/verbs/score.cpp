@@ -9,7 +9,7 @@
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/interrupt.h"
-#include "cli/frame/jobs.h"
+#include "cli/frame/jobs_option.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/outputs.h"
 #include "cli/frame/photo_files.h"

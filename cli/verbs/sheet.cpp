@@ -11,7 +11,7 @@
 #include "cli/frame/face_choice.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/interrupt.h"
-#include "cli/frame/jobs.h"
+#include "cli/frame/jobs_option.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/lone_files.h"
 #include "cli/frame/photo_files.h"
