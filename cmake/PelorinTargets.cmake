@@ -73,11 +73,29 @@ function(pelorin_run_early test)
   set_tests_properties(${test} PROPERTIES COST 100)
 endfunction()
 
-# pelorin_test(<file> [THREADS] [LABEL <label>] [SOURCES ...] DEPENDS ...): the tests in <file>.cpp,
-# run by ctest one by one. THREADS marks tests that start threads: the thread sanitizer's run builds
-# and runs those; their label is "threads", whatever LABEL says. LABEL machine marks what another
-# processor or compiler would break first: whole results, kernels, natives; a short run on an emulated
-# machine builds and runs those.
+# The tests of a program, run by ctest one by one, or in one go where starting a program is what most of
+# them cost: under sanitizers and emulation.
+# pelorin_add_tests(<program> [PREFIX <prefix>] [FILTER <filter>] [PROPERTIES ...])
+function(pelorin_add_tests program)
+  cmake_parse_arguments(PARSE_ARGV 1 arg "" "PREFIX;FILTER" "PROPERTIES")
+  if(arg_FILTER)
+    set(filter TEST_FILTER ${arg_FILTER})
+    set(option --gtest_filter=${arg_FILTER})
+  endif()
+  if(PELORIN_TESTS_ONE_BY_ONE)
+    gtest_discover_tests(${program} TEST_PREFIX "${arg_PREFIX}" ${filter} DISCOVERY_MODE PRE_TEST
+                         DISCOVERY_TIMEOUT 60 PROPERTIES TIMEOUT 600 ${arg_PROPERTIES})
+  else()
+    add_test(NAME ${program} COMMAND ${program} --gtest_brief=1 ${option})
+    set_tests_properties(${program} PROPERTIES TIMEOUT 900 ${arg_PROPERTIES})
+  endif()
+endfunction()
+
+# pelorin_test(<file> [THREADS] [LABEL <label>] [SOURCES ...] DEPENDS ...): the tests in <file>.cpp.
+# THREADS marks tests that start threads: the thread sanitizer's run builds and runs those; their label
+# is "threads", whatever LABEL says. LABEL machine marks what another processor or compiler would break
+# first: whole results, kernels, sizes, conversions, natives; a short run on an emulated machine builds
+# and runs those.
 function(pelorin_test file)
   cmake_parse_arguments(PARSE_ARGV 1 arg "THREADS" "LABEL" "SOURCES;DEPENDS")
   if(NOT arg_SOURCES)
@@ -98,8 +116,7 @@ function(pelorin_test file)
     set(labels LABELS threads)
     add_dependencies(thread_tests ${name})
   endif()
-  gtest_discover_tests(${name} DISCOVERY_MODE PRE_TEST DISCOVERY_TIMEOUT 60
-                       PROPERTIES TIMEOUT 600 ${labels})
+  pelorin_add_tests(${name} PROPERTIES ${labels})
 endfunction()
 
 # pelorin_bench(<name> DEPENDS ...): the benchmarks in <name>.cpp.
