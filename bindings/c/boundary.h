@@ -69,6 +69,9 @@ T* array(T* first, std::size_t count, const char* name) {
 /// have fewer.
 template <typename T>
 constexpr std::size_t oldestSize = sizeof(T);
+template <>
+inline constexpr std::size_t oldestSize<quenby_open_options> = offsetof(quenby_open_options,
+                                                                        workers);
 
 /// No struct of any caller is so large.
 constexpr std::size_t largestStruct = 4096;

@@ -2,9 +2,11 @@
 
 #include <limits>
 #include <memory>
+#include <optional>
 #include <utility>
 
 #include "bindings/c/pixels.h"
+#include "bindings/c/workers.h"
 #include "photo/collection/photo_record.h"
 #include "photo/filter_photo.h"
 
@@ -191,8 +193,12 @@ int32_t quenby_filter_file(const uint8_t* file, size_t size, const char* filter,
                                        .open = openOptions(open, cancel),
                                        .save = saveOptions(save, cancel)};
     auto made = std::make_unique<quenby_file>();
+    std::optional<CallersWorkers> workers;
+    const quenby_open_options options = optionsOf(open, "options");
+    if (options.workers != nullptr) workers.emplace(*options.workers);
     photo::FilteredPhoto filtered = photo::filterPhoto(
-        bytesOf(file, size), request, format == nullptr ? nullptr : &formatCalled(format));
+        bytesOf(file, size), request, format == nullptr ? nullptr : &formatCalled(format),
+        {.workers = workers ? &*workers : nullptr});
     made->bytes = std::move(filtered.file);
     made->lost = std::move(filtered.lost);
     *result = made.release();

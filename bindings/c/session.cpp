@@ -1,8 +1,10 @@
 #include <memory>
+#include <optional>
 #include <string>
 
 #include "bindings/c/photos.h"
 #include "bindings/c/pixels.h"
+#include "bindings/c/workers.h"
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/filtered_image.h"
 #include "photo/filter_photo.h"
@@ -20,6 +22,7 @@ struct quenby_session {
 
   const uint32_t width, height;
   FilteredImage filters;
+  std::optional<CallersWorkers> workers = {};
 };
 
 int32_t quenby_session_open(const quenby_pixels* pixels, const quenby_face* faces,
@@ -62,6 +65,15 @@ int32_t quenby_session_apply(quenby_session* session, const char* filter, const 
     session->filters.applyFilterWithParams(name, text, defaultFilterConfigValue, output.picture());
     photo::stopIfAsked(tokenOf(cancel));
     output.close();
+  });
+}
+
+int32_t quenby_session_share(quenby_session* session, const quenby_workers* workers,
+                             quenby_error* error) {
+  return guarded(error, [&] {
+    required(session, "session");
+    session->workers.emplace(required(workers, "workers"));
+    session->filters.share(&*session->workers);
   });
 }
 

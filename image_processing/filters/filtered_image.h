@@ -21,6 +21,9 @@ class FilteredImage {
                 const std::string& sessionName, const FilterConfig& config,
                 std::shared_ptr<FilterFactory> factory, Workers* workers = nullptr);
 
+  /// Lends the session other workers, before any other call uses it.
+  void share(Workers* workers) { state_->workers = workers; }
+
   /// The session's filter of that name, made and initialised with `params` on the first request:
   /// later ones get the same filter and their `params` are ignored. Empty when the name is unknown.
   /// The filter shares the session's state and may outlive the session.

@@ -7,7 +7,7 @@
  * is whatever else a function cannot mean; every function may also end with QUENBY_OUT_OF_MEMORY.
  *
  * Threads. Nothing here keeps state outside of its objects or starts a thread: a call does its work on
- * the thread that calls. Functions that take an object as const, and quenby_session_apply, may be
+ * the thread that calls, and on those that the caller lends it (quenby_workers). Functions that take an object as const, and quenby_session_apply, may be
  * called by any number of threads at once; objects are freed when no call uses them any more.
  *
  * Ownership. What a call is given it has done with when it returns, unless it says otherwise. Every
@@ -83,6 +83,20 @@ QUENBY_API int32_t quenby_cancel_new(quenby_cancel** cancel, quenby_error* error
 QUENBY_API void quenby_cancel_request(quenby_cancel* cancel);
 
 QUENBY_API void quenby_cancel_free(quenby_cancel* cancel);
+
+/* ---- Workers ---- */
+
+/** Threads of the caller's that share the work on one picture. What comes out is the same, to the byte,
+ * for any number of them. */
+typedef struct quenby_workers {
+  size_t struct_size;
+  size_t count;  /**< How many tasks can be at work at the same time, 1 ... 1024. */
+  void* context; /**< For `run`. */
+  /** Calls task(state, 0) ... task(state, tasks - 1), each once and on any thread, and returns when all
+   * have returned. None waits for another: one thread is enough. Any thread may call it, several at
+   * once as well; tasks do not. */
+  void (*run)(void* context, size_t tasks, void (*task)(void* state, size_t index), void* state);
+} quenby_workers;
 
 /* ---- Pixels and faces ---- */
 
@@ -190,6 +204,7 @@ typedef struct quenby_open_options {
   uint64_t max_pixels; /**< Of the picture as stored: 268435456 unless given. */
   int32_t max_scans;   /**< Of a progressive file: 100 unless given. */
   uint32_t flags;
+  const quenby_workers* workers; /**< Of quenby_filter_file alone; null for none. */
 } quenby_open_options;
 
 /** Bits of quenby_save_options.flags. */
@@ -347,6 +362,11 @@ QUENBY_API int32_t quenby_session_open_photo(const quenby_photo* photo, const qu
 QUENBY_API int32_t quenby_session_apply(quenby_session* session, const char* filter,
                                         const char* params, uint8_t* rgba, size_t stride,
                                         const quenby_cancel* cancel, quenby_error* error);
+
+/** Lets workers share the work of a session from here on, before any other call uses it.
+ * @param workers  copied; what they are made of outlives the session. */
+QUENBY_API int32_t quenby_session_share(quenby_session* session, const quenby_workers* workers,
+                                        quenby_error* error);
 
 QUENBY_API void quenby_session_free(quenby_session* session);
 

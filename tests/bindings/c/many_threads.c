@@ -1,6 +1,7 @@
 /* Eight threads at once, and calls that another thread cancels. */
 #define _POSIX_C_SOURCE 200809L
 #include <pthread.h>
+#include <stddef.h>
 #include <stdlib.h>
 #include <string.h>
 
@@ -43,6 +44,71 @@ static void same_bytes(int sessions_of_their_own) {
     void* same = NULL;
     CHECK(pthread_join(all[i], &same) == 0 && same != NULL);
   }
+}
+
+/* Tasks for some threads, which take one after the other. */
+struct shared_tasks {
+  pthread_mutex_t mutex;
+  size_t next, tasks;
+  void (*task)(void* state, size_t index);
+  void* state;
+};
+
+static void* take_tasks(void* all) {
+  struct shared_tasks* const shared_tasks = all;
+  for (;;) {
+    pthread_mutex_lock(&shared_tasks->mutex);
+    const size_t index = shared_tasks->next++;
+    pthread_mutex_unlock(&shared_tasks->mutex);
+    if (index >= shared_tasks->tasks) return NULL;
+    shared_tasks->task(shared_tasks->state, index);
+  }
+}
+
+/* With two threads beside this one, and a note in `context` that it was called. */
+static void run_tasks(void* context, size_t tasks, void (*task)(void* state, size_t index),
+                      void* state) {
+  struct shared_tasks all = {PTHREAD_MUTEX_INITIALIZER, 0, tasks, task, state};
+  pthread_t helpers[2];
+  *(int*)context = 1;
+  for (int i = 0; i < 2; ++i) CHECK(pthread_create(&helpers[i], NULL, take_tasks, &all) == 0);
+  take_tasks(&all);
+  for (int i = 0; i < 2; ++i) CHECK(pthread_join(helpers[i], NULL) == 0);
+}
+
+static void with_workers(void) {
+  int used = 0;
+  const quenby_workers workers = {sizeof(workers), 3, &used, run_tasks};
+  quenby_session* session = NULL;
+  CHECK(quenby_session_open(&pixels, NULL, 0, 0, &session, NULL) == QUENBY_OK);
+  CHECK(quenby_session_share(session, &workers, NULL) == QUENBY_OK);
+  CHECK(apply_all(session) && used);
+  quenby_session_free(session);
+
+  quenby_file *alone = NULL, *shared_file = NULL;
+  quenby_open_options options = {sizeof(options), 1, 0, 0, 0, 0, &workers};
+  CHECK(quenby_filter_file(photo.data, photo.size, "AE0", "slider=0.4;", NULL, 0, NULL, NULL, NULL,
+                           NULL, &alone, NULL) == QUENBY_OK);
+  used = 0;
+  CHECK(quenby_filter_file(photo.data, photo.size, "AE0", "slider=0.4;", NULL, 0, &options, NULL,
+                           NULL, NULL, &shared_file, NULL) == QUENBY_OK);
+  CHECK(used && quenby_file_size(alone) == quenby_file_size(shared_file) &&
+        memcmp(quenby_file_data(alone), quenby_file_data(shared_file), quenby_file_size(alone)) ==
+            0);
+  quenby_file_free(shared_file);
+
+  /* What goes wrong in a task comes back. */
+  CHECK(quenby_filter_file(photo.data, photo.size / 2, "AE0", "slider=0.4;", NULL, 0, &options,
+                           NULL, NULL, NULL, &shared_file, NULL) == QUENBY_TRUNCATED);
+
+  /* Options of a program that knew no workers. */
+  options.struct_size = offsetof(quenby_open_options, workers);
+  used = 0;
+  CHECK(quenby_filter_file(photo.data, photo.size, "AE0", "slider=0.4;", NULL, 0, &options, NULL,
+                           NULL, NULL, &shared_file, NULL) == QUENBY_OK);
+  CHECK(!used);
+  quenby_file_free(shared_file);
+  quenby_file_free(alone);
 }
 
 /* Works until it is cancelled. */
@@ -116,6 +182,7 @@ int main(void) {
   DONE(quenby_session_open(&pixels, NULL, 0, QUENBY_BORROW_PIXELS, &shared, &error));
   same_bytes(0);
   same_bytes(1);
+  with_workers();
   cancelled_before();
   cancelled_by_another_thread();
   quenby_session_free(shared);

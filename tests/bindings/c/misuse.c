@@ -1,6 +1,7 @@
 /* Every function with what it cannot be meant to be called with: null, 0, extremes, NaN. */
 #include <limits.h>
 #include <math.h>
+#include <stddef.h>
 #include <stdlib.h>
 #include <string.h>
 
@@ -167,7 +168,7 @@ static void files(struct bytes photo) {
                              NULL, NULL, NULL, &file, e));
   const size_t size = sizeof(quenby_open_options);
   const quenby_open_options open[] = {{.struct_size = 0},
-                                      {.struct_size = size - 1},
+                                      {.struct_size = offsetof(quenby_open_options, workers) - 1},
                                       {.struct_size = SIZE_MAX},
                                       {.struct_size = size, .scale = 3},
                                       {.struct_size = size, .scale = -1},
@@ -263,6 +264,45 @@ static void bad_files(struct bytes photo) {
           quenby_photo_open(photo.data, photo.size, &few_pixels, NULL, &made, &error));
   REFUSED(QUENBY_TOO_LARGE,
           quenby_read_shot(photo.data, photo.size, &few_pixels, NULL, &shot, &error));
+}
+
+static void leave_a_task_out(void* context, size_t tasks, void (*task)(void* state, size_t index),
+                             void* state) {
+  (void)context;
+  for (size_t i = 1; i < tasks; ++i) task(state, i);
+}
+
+static void run_one_that_is_not(void* context, size_t tasks,
+                                void (*task)(void* state, size_t index), void* state) {
+  (void)context;
+  for (size_t i = 1; i <= tasks; ++i) task(state, i);
+}
+
+static void workers(void) {
+  quenby_pixels pixels = made_pixels(40, 30, 1);
+  uint8_t* const out = malloc(40 * 30 * 4);
+  quenby_workers some = {sizeof(some), 2, NULL, leave_a_task_out};
+  quenby_session* session = NULL;
+  CHECK(quenby_session_open(&pixels, NULL, 0, 0, &session, &error) == QUENBY_OK);
+  INVALID(quenby_session_share(NULL, &some, e));
+  INVALID(quenby_session_share(session, NULL, e));
+  some.count = 0;
+  INVALID(quenby_session_share(session, &some, e));
+  some.count = 2;
+  some.run = NULL;
+  INVALID(quenby_session_share(session, &some, e));
+  some.run = leave_a_task_out;
+  some.struct_size = 3;
+  INVALID(quenby_session_share(session, &some, e));
+  some.struct_size = sizeof(some);
+  CHECK(quenby_session_share(session, &some, &error) == QUENBY_OK);
+  INVALID(quenby_session_apply(session, "AE0", "slider=0.4;", out, 160, NULL, e));
+  some.run = run_one_that_is_not;
+  CHECK(quenby_session_share(session, &some, &error) == QUENBY_OK);
+  INVALID(quenby_session_apply(session, "AE0", "slider=0.4;", out, 160, NULL, e));
+  quenby_session_free(session);
+  free(out);
+  free_pixels(&pixels);
 }
 
 static void sessions(void) {
@@ -409,6 +449,7 @@ int main(void) {
   files(photo);
   bad_files(photo);
   sessions();
+  workers();
   duplicates();
   the_rest();
   messages();
