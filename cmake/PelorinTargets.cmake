@@ -14,6 +14,12 @@ set(THREADS_PREFER_PTHREAD_FLAG ON)
 # twice. No errno and no traps lets the compiler vectorise roots and conversions; values stay.
 add_compile_options(-ffp-contract=off -fno-math-errno -fno-trapping-math -Wall -Wextra)
 
+# Addresses are chosen as a program starts, where the linker can; imports are resolved by then and
+# read-only from there on; no stack is executable.
+include(CheckPIESupported)
+check_pie_supported()
+add_link_options(-Wl,-z,relro -Wl,-z,now -Wl,-z,noexecstack)
+
 # A sanitizer that only prints would let a test pass.
 if(PELORIN_SANITIZE)
   add_compile_options(-fsanitize=${PELORIN_SANITIZE} -fno-omit-frame-pointer

@@ -1,0 +1,2 @@
+// Linked without what protects the others.
+void plantedWeakness() {}
