@@ -3,8 +3,7 @@
 namespace pelorin::cli {
 
 void addJobsOption(Verb verb, int& atOnce) {
-  verb.option("-j,--jobs", atOnce,
-              "Files at once, each on one core; as many as cores unless given, or 0")
+  verb.option("-j,--jobs", atOnce, "Files at once; as many as cores unless given, or 0")
       .between(0, 1024)
       .type("N")
       .group("Reporting");

@@ -1,5 +1,7 @@
 #include <gmock/gmock.h>
 
+#include <algorithm>
+#include <cstdlib>
 #include <cstring>
 
 #include "image_processing/filters/default_filter_factory.h"
@@ -110,6 +112,45 @@ TEST(Enhance, GivesTheSameFilesHoweverManyAtOnce) {
               enhancedDirectly(folder.read("in/" + name), "AE0", "slider=0.4;"));
   }
   EXPECT_FALSE(folder.has("one/3b.jpg"));
+}
+
+TEST(Enhance, GivesTheSameFileHoweverManyThreads) {
+  const TemporaryFolder folder;
+  const Bytes photo = jpegOf(photoLikePicture(300, 200, 4));
+  const std::string in = folder.write("in.jpg", photo), out = folder / "out.jpg";
+  const Bytes expected = enhancedDirectly(photo, "AE0", "slider=0.4;");
+  for (const char* threads : {"0", "1", "2", "5"}) {
+    const Finished run = quenby({"enhance", in, "-o", out, "--overwrite", "--threads", threads});
+    ASSERT_EQ(run.exitCode, 0) << run.errors;
+    EXPECT_EQ(folder.read("out.jpg"), expected) << threads;
+  }
+  EXPECT_EQ(quenby({"enhance", in, "-o", out, "--overwrite", "--threads", "-1"}).exitCode, 2);
+}
+
+// 8 megapixels are 31 MiB decoded; the command itself takes some 50 of addresses.
+TEST(Enhance, DecodesAgainWhatDoesNotFitIntoMemory) {
+  if (std::getenv("QUENBY_COMMAND") != nullptr) {
+    GTEST_SKIP()
+        << "another command may be a sanitizer's, which takes more addresses than there are";
+  }
+  const TemporaryFolder folder;
+  const Image<RGBA8Pixel> some = photoLikePicture(2000, 50, 3), whole(2000, 4000);
+  for (std::uint32_t y = 0; y < whole.height; ++y)
+    std::copy_n(some.row(y % some.height), whole.width, whole.row(y));
+  const std::string in = folder.write("in.jpg", jpegOf(whole)), out = folder / "out.jpg";
+  ASSERT_EQ(quenby({"enhance", in, "-o", out}).exitCode, 0);
+  const Bytes expected = folder.read("out.jpg");
+
+  const std::string command =
+      "ulimit -v 73728; \"$QUENBY\" enhance '" + in + "' -o '" + out + "' --overwrite --memory ";
+  const Finished kept = shell(command + "128");
+  EXPECT_EQ(kept.exitCode, 1);
+  EXPECT_NE(kept.errors.find("memory"), std::string::npos) << kept.errors;
+  EXPECT_EQ(folder.read("out.jpg"), expected);
+  folder.write("out.jpg", std::string("older"));
+  const Finished again = shell(command + "0");
+  EXPECT_EQ(again.exitCode, 0) << again.errors;
+  EXPECT_EQ(folder.read("out.jpg"), expected);
 }
 
 TEST(Enhance, ReportsAsJson) {
