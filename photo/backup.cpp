@@ -44,7 +44,11 @@ bool isMarkName(const fs::path& name) {
 void markFolder(const fs::path& folder, const Mark& mark) {
   if (hasMark(folder, mark)) return;
   const Mark& other = &mark == &movedMark ? replacedMark : movedMark;
-  if (hasMark(folder, other)) throwError(EEXIST, folder / other.name);
+  if (hasMark(folder, other)) {
+    throw std::runtime_error(folder.string() + " keeps photos that were " +
+                             (&mark == &movedMark ? "replaced" : "moved") +
+                             "; name another folder");
+  }
   sweepLeftovers(folder.string());
   writeFileAtomically((folder / mark.name).string(),
                       {reinterpret_cast<const std::uint8_t*>(mark.text.data()), mark.text.size()});
@@ -68,7 +72,9 @@ void copyWhole(const std::string& from, const std::string& to, bool mayReplace) 
 
 // What this process is about to lose is read again from where it stands now.
 void removeCopied(const std::string& file, const std::string& copy) {
-  if (readFile(file) != readFile(copy)) throwError(EEXIST, copy);
+  if (readFile(file) != readFile(copy)) {
+    throw std::runtime_error(copy + " is another file; name another folder");
+  }
   if (::unlink(file.c_str()) != 0) throwError(errno, file);
 }
 
@@ -105,8 +111,8 @@ void moveToBackups(const std::string& folder, const std::string& path) {
   const fs::path backup = placeIn(folder, original);
   makeRoom(folder, backup, movedMark);
   if (renameToNew(original.c_str(), backup.c_str()) != 0) {
-    if (errno != EXDEV) throwError(errno, backup);
-    // A run that was killed between the two steps left a copy.
+    if (errno != EXDEV && errno != EEXIST) throwError(errno, backup);
+    // What a run left that was killed between copying and removing is as good as a copy of this one.
     if (!fs::exists(backup)) copyWhole(original.string(), backup.string(), /*mayReplace=*/false);
     syncFolder(backup.parent_path().string());
     removeCopied(original.string(), backup.string());

@@ -26,8 +26,8 @@ void keepBackup(const std::string& folder, const std::string& path);
 /// Moves the file at `path`, itself and no link to it, into `folder`, on the disk before this
 /// returns: by its name or, to another disk, as a copy with its times, permissions and attributes that
 /// was read again before the file goes. At every moment one of the two is whole.
-/// @throws std::system_error, with EEXIST where another file has that place in `folder`; the file is
-///         then where it was.
+/// @throws std::system_error, std::runtime_error where another file has that place in `folder`; the
+///         file is then where it was.
 void moveToBackups(const std::string& folder, const std::string& path);
 
 /// Whether `folder` is one of backups, or empty; what killed processes left in it goes.

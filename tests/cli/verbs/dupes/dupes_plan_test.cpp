@@ -85,7 +85,13 @@ TEST(DupesPlan, MovesAllButTheBestAndUndoPutsThemBack) {
   // The next run has nothing to do.
   EXPECT_EQ(doubles.dupes({"--move-to", doubles.away(), "--apply"}).exitCode, 3);
 
-  // Another file has come to one of the places.
+  // Another photo has come to one of the places and is to go there as well.
+  doubles.folder.write("in/small.jpg", sceneJpeg(1, 90, takenAt("10:00:00"), 160, 120));
+  const Finished full = doubles.dupes({"--move-to", doubles.away(), "--apply"});
+  EXPECT_EQ(full.exitCode, 1);
+  EXPECT_THAT(full.errors, HasSubstr("is another file; name another folder"));
+  EXPECT_TRUE(doubles.folder.has("in/small.jpg"));
+
   doubles.folder.write("in/small.jpg", "another");
   const Finished taken = quenby({"undo", doubles.away()});
   EXPECT_EQ(taken.exitCode, 1);
@@ -296,7 +302,9 @@ TEST(DupesPlan, RefusesWhatCannotBeMeant) {
   EXPECT_EQ(quenby({"dupes", "--plan", plan}).exitCode, 2);
   // A folder of photos that were replaced is none for photos that are moved.
   doubles.folder.write("away/.quenby-backup", "");
-  EXPECT_EQ(doubles.dupes({"--move-to", doubles.away(), "--apply"}).exitCode, 1);
+  const Finished other = doubles.dupes({"--move-to", doubles.away(), "--apply"});
+  EXPECT_EQ(other.exitCode, 1);
+  EXPECT_THAT(other.errors, HasSubstr("keeps photos that were replaced; name another folder"));
   fs::remove_all(doubles.away());
   fs::remove(plan);
   EXPECT_EQ(doubles.folder.content(), doubles.before);
