@@ -6,12 +6,13 @@
 #include <algorithm>
 #include <cerrno>
 #include <filesystem>
-#include <iterator>
 #include <stdexcept>
 #include <string_view>
 #include <system_error>
 
+#include "photo/descriptor.h"
 #include "photo/file_io.h"
+#include "photo/metadata/md5.h"
 
 namespace fs = std::filesystem;
 
@@ -19,7 +20,7 @@ namespace pelorin::photo {
 namespace {
 
 [[noreturn]] void throwError(int code, const fs::path& path) {
-  throw std::system_error(code, std::generic_category(), path.string());
+  throwSystemError(code, path.string());
 }
 
 // Tells a folder of backups from others, whose files would go astray.
@@ -37,8 +38,17 @@ bool hasMark(const fs::path& folder, const Mark& mark) {
   return fs::exists(folder / mark.name, ignored);
 }
 
+// What photos became, for whoever puts the old ones back: a digest, a space and a path between NULs
+// each. Only ever added to, so that what is lost of it by a power cut is its end.
+constexpr const char* resultsName = ".quenby-results";
+
 bool isMarkName(const fs::path& name) {
-  return name == replacedMark.name || name == movedMark.name;
+  return name == replacedMark.name || name == movedMark.name || name == resultsName;
+}
+
+std::string recordOf(const std::string& path, std::span<const std::uint8_t> file) {
+  const std::string nul(1, '\0');
+  return nul + md5Hex({reinterpret_cast<const char*>(file.data()), file.size()}) + " " + path + nul;
 }
 
 void markFolder(const fs::path& folder, const Mark& mark) {
@@ -104,6 +114,33 @@ void keepBackup(const std::string& folder, const std::string& path) {
   }
 }
 
+void recordResult(const std::string& folder, const std::string& path,
+                  std::span<const std::uint8_t> file) {
+  const std::string record = recordOf(fs::canonical(path).string(), file);
+  const std::string results = (fs::path(folder) / resultsName).string();
+  const Descriptor list(results, O_WRONLY | O_APPEND | O_CREAT, 0600);
+  // In one call, so that runs at the same time do not mix theirs.
+  const ssize_t count = ::write(list.get(), record.data(), record.size());
+  if (count != static_cast<ssize_t>(record.size())) throwError(count < 0 ? errno : ENOSPC, results);
+  if (::fdatasync(list.get()) != 0 && errno != EINVAL) throwError(errno, results);
+}
+
+bool isChangedSince(const std::string& folder, const std::string& path) {
+  std::error_code ignored;
+  const fs::path backup = placeIn(folder, path);
+  if (hasMark(folder, movedMark) || !fs::exists(path, ignored)) return false;
+  if (fs::equivalent(backup, path, ignored)) return false;
+  const std::vector<std::uint8_t> now = readFile(path);
+  if (fs::file_size(backup, ignored) == now.size() && readFile(backup.string()) == now) {
+    return false;
+  }
+  const std::string results = (fs::path(folder) / resultsName).string();
+  if (!fs::exists(results, ignored)) return true;
+  const std::vector<std::uint8_t> list = readFile(results);
+  const std::string record = recordOf(path, now);
+  return std::search(list.begin(), list.end(), record.begin(), record.end()) == list.end();
+}
+
 void moveToBackups(const std::string& folder, const std::string& path) {
   const fs::path whole = fs::absolute(path);
   const fs::path original = fs::canonical(whole.parent_path()) / whole.filename();
@@ -161,9 +198,12 @@ void restoreBackup(const std::string& folder, const std::string& path) {
     if (!fs::remove(above, notEmpty)) break;
   }
   const fs::directory_iterator entries(folder);
-  if (std::distance(entries, {}) != 1) return;
-  for (const Mark& mark : {replacedMark, movedMark}) {
-    fs::remove(fs::path(folder) / mark.name, notEmpty);
+  const bool onlyOurs = std::all_of(begin(entries), end(entries), [](const auto& entry) {
+    return isMarkName(entry.path().filename());
+  });
+  if (!onlyOurs) return;
+  for (const char* name : {resultsName, replacedMark.name, movedMark.name}) {
+    fs::remove(fs::path(folder) / name, notEmpty);
   }
 }
 

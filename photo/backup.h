@@ -1,5 +1,7 @@
 #pragma once
 
+#include <cstdint>
+#include <span>
 #include <string>
 #include <vector>
 
@@ -29,6 +31,16 @@ void keepBackup(const std::string& folder, const std::string& path);
 /// @throws std::system_error, std::runtime_error where another file has that place in `folder`; the
 ///         file is then where it was.
 void moveToBackups(const std::string& folder, const std::string& path);
+
+/// Notes in `folder`, on the disk before this returns, what the file at `path` that it keeps is about to
+/// become. @throws std::system_error.
+void recordResult(const std::string& folder, const std::string& path,
+                  std::span<const std::uint8_t> file);
+
+/// Whether putting back the file that was at `path` would destroy what another program has made of
+/// it: it has neither the content that `folder` keeps nor one that was recorded.
+/// @throws as `readFile`.
+bool isChangedSince(const std::string& folder, const std::string& path);
 
 /// Whether `folder` is one of backups, or empty; what killed processes left in it goes.
 /// @throws std::filesystem::filesystem_error.

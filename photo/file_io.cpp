@@ -202,6 +202,11 @@ Replacement::Replacement(const std::string& path, std::span<const std::uint8_t> 
   if (hasModel) takeAfter(old, model, file, temporary_);
   writeAll(file, temporary_, bytes);
   if (hasModel && options.keepTimes) takeTimes(old, file, temporary_);
+  if (!options.timesOf.empty()) {
+    struct stat other = {};
+    if (::stat(options.timesOf.c_str(), &other) != 0) throwSystemError(errno, options.timesOf);
+    takeTimes(other, file, temporary_);
+  }
   sync(file, temporary_);
   lock_ = file.release();
 }

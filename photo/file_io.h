@@ -41,7 +41,9 @@ struct ReplaceOptions {
   bool mayReplace = true;  ///< Else it stays, and to replace it is an error (EEXIST).
   bool keepTimes = false;  ///< The new file has its times of access and change.
   std::string like = {};   ///< The file whose times, permissions and so on count instead.
-  Waiting wait = {};       ///< For whoever reads, where that is a pipe.
+  std::string timesOf =
+      {};             ///< Another file whose times the new one has, whatever `keepTimes` says.
+  Waiting wait = {};  ///< For whoever reads, where that is a pipe.
 };
 
 /// A file that is written beside another and then takes its place. A replaced file keeps its

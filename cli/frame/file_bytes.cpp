@@ -40,7 +40,10 @@ void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes,
     photo::ReplaceOptions replace = options;
     replace.wait.stop = interruptToken();
     photo::Replacement replacement(path, bytes, replace);
-    if (!backup.empty()) photo::keepBackup(backup, path);
+    if (!backup.empty()) {
+      photo::keepBackup(backup, path);
+      photo::recordResult(backup, path, bytes);
+    }
     replacement.replace();
   } catch (const Interrupted&) {
     throw;

@@ -27,7 +27,8 @@ struct Work {
   FaceChoice faces;
   photo::OpenOptions photo;
   SaveChoice save;
-  std::uint64_t pixels;                                // bytes of them that a file may keep
+  bool inPlace = false, keepsTimes = false;
+  std::uint64_t pixels = 0;                            // bytes of them that a file may keep
   std::unique_ptr<photo::ThreadWorkers> workers = {};  // of all files at once; null for none
 };
 
@@ -38,13 +39,15 @@ struct Done {
 };
 
 Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter) {
-  Work work = {filter, FaceChoice(options.faces), {}, {}, 0};
+  Work work = {filter, FaceChoice(options.faces), {}, {}};
+  work.inPlace = options.outputs.inPlace;
+  work.keepsTimes = options.outputs.keepsTimes();
   work.save = {.raw = !options.raw.empty(),
                .quality = options.quality,
                .keep = keepOptions(options.keep),
                .strict = options.keep.strict,
-               .replace = {.mayReplace = options.outputs.overwrite || options.outputs.inPlace,
-                           .keepTimes = options.outputs.inPlace},
+               .replace = {.mayReplace = options.outputs.overwrite || work.inPlace,
+                           .keepTimes = work.inPlace && work.keepsTimes},
                .backup = options.outputs.backup};
   if (work.faces.areNamed() && !filter.filter.parameters().readsFaces) {
     throw UsageError("--face: has no effect on " + filter.filter.name);
@@ -62,17 +65,23 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   thread_local photo::SparePixels spare;  // each worker's own
   photo::OpenOptions open = work.photo;
   open.stop = interruptToken();
+  const std::vector<std::uint8_t> bytes = readInput(file.input);
   const photo::FilteredPhoto filtered =
-      photo::filterPhoto(readInput(file.input),
+      photo::filterPhoto(bytes,
                          {.filter = work.filter.filter.name,
                           .params = work.filter.params,
                           .faces = work.faces.of(file.input),
                           .open = open,
                           .save = saveOptions(work.save)},
-                         &outputFormat(file.output, work.save),
+                         // A name may lie; what stands in place of a photo is of its kind.
+                         work.inPlace ? nullptr : &outputFormat(file.output, work.save),
                          {.pixels = work.pixels, .spare = &spare, .workers = work.workers.get()});
   tellNotices(file.input, filtered.facts, talk);
-  writePhoto(file.output, filtered.file, filtered.lost, work.save);
+  SaveChoice save = work.save;
+  if (!work.inPlace && work.keepsTimes && !file.input.isStandardInput()) {
+    save.replace.timesOf = file.input.path;
+  }
+  writePhoto(file.output, filtered.file, filtered.lost, save);
   return {filtered.size.width, filtered.size.height, filtered.lost, filtered.facts.notices};
 }
 

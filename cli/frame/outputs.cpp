@@ -140,7 +140,9 @@ void addOutputOptions(Verb verb, OutputOptions& options, const std::string& defa
 
 void addInPlaceOptions(Verb verb, OutputOptions& options) {
   verb.flag("--in-place", options.inPlace,
-            "Results replace their photos, whose times stay; needs --backup or --no-backup")
+            "Results replace their photos, in the format that these have whatever they are called; "
+            "needs "
+            "--backup or --no-backup")
       .group("Output");
   verb.option("--backup", options.backup,
               "Keep the replaced photos in this folder; quenby undo DIR puts them back, and photos "
@@ -148,6 +150,11 @@ void addInPlaceOptions(Verb verb, OutputOptions& options) {
       .type("DIR")
       .group("Output");
   verb.flag("--no-backup", options.noBackup, "Replace photos for good").group("Output");
+  verb.option("--times", options.times,
+              "Whether results have the times of their photos (keep, usual for --in-place) or that "
+              "of being written (now, usual elsewhere)")
+      .oneOf({"keep", "now"})
+      .group("Output");
 }
 
 void checkInPlace(const OutputOptions& options, const std::vector<Input>& inputs) {

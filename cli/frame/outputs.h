@@ -19,6 +19,10 @@ struct OutputOptions {
   bool inPlace = false;  ///< Each result replaces its input, which `backup` keeps.
   bool noBackup = false;
   std::string backup;  ///< A folder.
+  std::string times;   ///< "keep", "now", or empty for what is usual.
+
+  /// Whether results have the times of their photos.
+  bool keepsTimes() const { return times.empty() ? inPlace : times == "keep"; }
 };
 
 /// Adds `-o`, `--name`, `--overwrite` and `-n` to a verb.

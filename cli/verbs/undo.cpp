@@ -17,7 +17,7 @@ namespace {
 
 struct UndoOptions {
   std::string folder;
-  bool planOnly = false;
+  bool planOnly = false, force = false;
   ReportOptions report;
 };
 
@@ -36,6 +36,11 @@ ExitCode runUndo(const UndoOptions& options) {
       files, /*jobs=*/1, talk,
       {.work =
            [&](std::size_t index) {
+             if (!options.force && photo::isChangedSince(options.folder, files[index].path)) {
+               throw FileError(
+                   "was changed by another program since; save it elsewhere, then --force puts "
+                   "the old one in its place");
+             }
              if (!options.planOnly) photo::restoreBackup(options.folder, files[index].path);
              return true;
            },
@@ -69,6 +74,9 @@ void addUndo(CommandLine& commandLine) {
       .required()
       .type("");
   verb.flag("-n,--dry-run", options->planOnly, "Print what would go back, and do nothing");
+  verb.flag("--force", options->force,
+            "Also put back photos in whose place another program has left something else since, "
+            "which is lost");
   addReportOptions(verb, options->report);
 }
 

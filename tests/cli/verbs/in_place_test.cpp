@@ -76,6 +76,59 @@ TEST(InPlace, UndoTakesNoOtherFolderForBackups) {
   EXPECT_EQ(photos.folder.read("in/a.jpg"), photos.old);
 }
 
+TEST(InPlace, UndoDestroysNothingThatAnotherProgramMade) {
+  const Photos photos;
+  const std::string kept = photos.folder / "kept";
+  ASSERT_EQ(photos.enhance({"--backup", kept}).exitCode, 0);
+  photos.folder.write("in/a.jpg", std::string("painted"));
+  const std::string why = photos.folder / "in/a.jpg: was changed by another program since";
+  for (const std::vector<std::string>& arguments :
+       {std::vector<std::string>{"undo", kept, "-n"}, {"undo", kept}, {"undo", kept}}) {
+    const Finished run = quenby(arguments);
+    EXPECT_EQ(run.exitCode, 1);
+    EXPECT_THAT(run.errors, HasSubstr(why));
+  }
+  EXPECT_EQ(photos.folder.read("in/a.jpg"), Bytes({'p', 'a', 'i', 'n', 't', 'e', 'd'}));
+  EXPECT_EQ(photos.folder.read("in/sub/b.jpg"), photos.old);
+  EXPECT_EQ(quenby({"undo", kept, "--force"}).exitCode, 0);
+  EXPECT_EQ(photos.folder.read("in/a.jpg"), photos.old);
+  EXPECT_TRUE(fs::is_empty(kept));
+}
+
+TEST(InPlace, UndoTakesWhatWentMissing) {
+  const Photos photos;
+  ASSERT_EQ(photos.enhance({"--backup", photos.folder / "kept"}).exitCode, 0);
+  fs::remove(photos.folder / "in/a.jpg");
+  EXPECT_EQ(quenby({"undo", photos.folder / "kept"}).exitCode, 0);
+  EXPECT_EQ(photos.folder.read("in/a.jpg"), photos.old);
+}
+
+TEST(InPlace, WritesTheFormatOfThePhotoNotOfItsName) {
+  const Photos photos;
+  const std::string made = photos.folder / "really.png", named = photos.folder / "named.jpg";
+  ASSERT_EQ(quenby({"curve", photos.folder / "in/a.jpg", "-o", made}).exitCode, 0);
+  fs::rename(made, named);
+  ASSERT_EQ(quenby({"enhance", named, "--in-place", "--no-backup"}).exitCode, 0);
+  EXPECT_EQ(photos.folder.read("named.jpg")[1], 'P');
+}
+
+TEST(Times, AreKeptOrNew) {
+  const Photos photos;
+  const auto written = [&](const std::string& times) {
+    const std::string out = "out-" + times + ".jpg";
+    EXPECT_EQ(
+        quenby({"enhance", photos.folder / "in/a.jpg", "-o", photos.folder / out, "--times", times})
+            .exitCode,
+        0);
+    return photos.statusOf(out).st_mtim.tv_sec;
+  };
+  EXPECT_EQ(written("keep"), 1'100'000'000);
+  EXPECT_GT(written("now"), 1'100'000'000);
+  ASSERT_EQ(photos.enhance({"--no-backup", "--times", "now"}).exitCode, 0);
+  EXPECT_GT(photos.statusOf("in/a.jpg").st_mtim.tv_sec, 1'100'000'000);
+  EXPECT_EQ(photos.statusOf("in/a.jpg").st_mode & 07777, 0640u);
+}
+
 TEST(InPlace, UndoPassesOverWhatAKilledCopyLeft) {
   const Photos photos;
   ASSERT_EQ(photos.enhance({"--backup", photos.folder / "kept"}).exitCode, 0);
@@ -132,8 +185,8 @@ TEST(InPlace, LeavesOldOrNewPhotosWhenKilledAndGoesOnAfterwards) {
   const std::string command =
       " $QUENBY enhance -q " + photos.folder / "in/a.jpg" + " --in-place --backup " + kept;
   int kills = 0;
-  for (const std::string name :
-       {"mkdir", "fchown", "fchmod", "write", "utimensat", "fsync", "link", "rename"}) {
+  for (const std::string name : {"mkdir", "fchown", "fchmod", "write", "utimensat", "fsync",
+                                 "fdatasync", "link", "rename"}) {
     for (int time = 1;; ++time) {
       const std::string place = name + " " + std::to_string(time);
       const Finished run = shell("strace -f -o " + trace + " -e inject=" + name +
