@@ -72,6 +72,8 @@ constexpr std::size_t oldestSize = sizeof(T);
 template <>
 inline constexpr std::size_t oldestSize<quenby_open_options> = offsetof(quenby_open_options,
                                                                         workers);
+template <>
+inline constexpr std::size_t oldestSize<quenby_save_options> = offsetof(quenby_save_options, keep);
 
 /// No struct of any caller is so large.
 constexpr std::size_t largestStruct = 4096;

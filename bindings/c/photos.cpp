@@ -3,6 +3,7 @@
 #include <limits>
 #include <memory>
 #include <optional>
+#include <set>
 #include <utility>
 
 #include "bindings/c/pixels.h"
@@ -43,6 +44,21 @@ photo::OpenOptions openOptions(const quenby_open_options* given, const quenby_ca
 
 namespace {
 
+std::set<photo::MetadataKind> kindsOf(uint32_t keep) {
+  using Kind = photo::MetadataKind;
+  constexpr std::pair<uint32_t, Kind> kinds[] = {
+      {QUENBY_KEEP_COPYRIGHT, Kind::copyright}, {QUENBY_KEEP_TIME, Kind::time},
+      {QUENBY_KEEP_EXIF, Kind::exif},           {QUENBY_KEEP_XMP, Kind::xmp},
+      {QUENBY_KEEP_IPTC, Kind::iptc},           {QUENBY_KEEP_GAIN_MAP, Kind::gainMap}};
+  std::set<Kind> kept;
+  for (const auto& [bit, kind] : kinds) {
+    if ((keep & bit) != 0) kept.insert(kind);
+    keep &= ~bit;
+  }
+  if (keep != 0) refuse("options", "unknown kinds to keep");
+  return kept;
+}
+
 photo::SaveOptions saveOptions(const quenby_save_options* given, const quenby_cancel* cancel) {
   const quenby_save_options options = optionsOf(given, "options");
   const auto keeps = [&](uint32_t flag) { return (options.flags & flag) == 0; };
@@ -54,7 +70,9 @@ photo::SaveOptions saveOptions(const quenby_save_options* given, const quenby_ca
                           .keep = {.location = keeps(QUENBY_DROP_LOCATION),
                                    .thumbnail = keeps(QUENBY_DROP_THUMBNAIL),
                                    .gainMap = keeps(QUENBY_DROP_GAIN_MAP)}};
-  if (!keeps(QUENBY_DROP_METADATA)) save.keep.only.emplace();
+  if (!keeps(QUENBY_DROP_METADATA) || options.keep != 0) {
+    save.keep.only = kindsOf(options.keep);
+  }
   if (options.quality != 0) save.quality = options.quality;
   if (save.quality < 1 || save.quality > 100) refuse("quality", "is not from 1 to 100");
   return save;

@@ -215,10 +215,21 @@ enum {
   QUENBY_DROP_GAIN_MAP = 8u
 };
 
+/** Bits of quenby_save_options.keep. */
+enum {
+  QUENBY_KEEP_COPYRIGHT = 1u, /**< Who made it and who may use it, in EXIF, XMP, IPTC and texts. */
+  QUENBY_KEEP_TIME = 2u,      /**< When it was taken, likewise. */
+  QUENBY_KEEP_EXIF = 4u,
+  QUENBY_KEEP_XMP = 8u,
+  QUENBY_KEEP_IPTC = 16u,
+  QUENBY_KEEP_GAIN_MAP = 32u
+};
+
 typedef struct quenby_save_options {
   size_t struct_size;
   int32_t quality; /**< 1 ... 100, 90 unless given; for formats that lose something. */
   uint32_t flags;
+  uint32_t keep; /**< These kinds of metadata and the colour profile alone; 0 for all kinds. */
 } quenby_save_options;
 
 /** What a file says before its picture data. */

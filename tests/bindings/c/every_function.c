@@ -88,6 +88,12 @@ static void files(struct bytes photo) {
 
   const quenby_open_options alone = {.struct_size = sizeof(alone),
                                      .flags = QUENBY_IGNORE_KNOWN_FACES};
+  const quenby_save_options told = {.struct_size = sizeof(told), .keep = QUENBY_KEEP_TIME};
+  DONE(quenby_filter_file(photo.data, photo.size, "AE0", "slider=0.4;", NULL, 0, NULL, NULL, &told,
+                          NULL, &made, &error));
+  same_file(made, by_command("enhance --keep time", "told.jpg"));
+  quenby_file_free(made);
+
   const quenby_save_options bare = {.struct_size = sizeof(bare), .flags = QUENBY_DROP_METADATA};
   DONE(quenby_filter_file(photo.data, photo.size, "AE08bit", "slider=0.4;", NULL, 0, &alone, "PNG",
                           &bare, NULL, &made, &error));

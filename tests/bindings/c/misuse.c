@@ -188,7 +188,8 @@ static void files(struct bytes photo) {
                                       {.struct_size = save_size, .quality = -1},
                                       {.struct_size = save_size, .quality = 101},
                                       {.struct_size = save_size, .quality = INT_MIN},
-                                      {.struct_size = save_size, .flags = 16}};
+                                      {.struct_size = save_size, .flags = 16},
+                                      {.struct_size = save_size, .keep = 64}};
   for (size_t i = 0; i < sizeof(save) / sizeof(*save); ++i)
     save_options_of_every_function(photo, made, save[i]);
 

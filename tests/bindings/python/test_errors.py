@@ -79,6 +79,7 @@ def test_kinds_of_bad_files():
         (lambda: quenby.encode(SMALL, "GIF"), "GIF"),
         (lambda: quenby.encode(SMALL, quality=0), "quality"),
         (lambda: quenby.encode(SMALL, strip=["mood"]), "mood"),
+        (lambda: quenby.encode(SMALL, keep="mood"), "mood"),
         (lambda: quenby.encode(SMALL, like=quenby.read(jpeg(picture(9, 9)))), "size"),
         (lambda: quenby.write("a.gif", SMALL), "gif"),
         (lambda: quenby.fast(SMALL, arc=8), "arc"),

@@ -21,6 +21,7 @@ import quenby
         (["--slider", "0.9", "--quality", "70"], {"slider": 0.9, "quality": 70}),
         (["--scale", "2", "--rotate", "-90"], {"scale": 2, "rotate": -90}),
         (["--faces", "none", "--strip", "all"], {"known_faces": False, "strip": "all"}),
+        (["--keep", "time,xmp"], {"keep": ("time", "xmp")}),
         (
             ["--face", "0.2,0.1,0.6,0.7", "--face", "50,60,90,110"],
             {"faces": [(0.2, 0.1, 0.6, 0.7), (50, 60, 90, 110)]},

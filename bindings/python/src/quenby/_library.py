@@ -101,7 +101,12 @@ class COpenOptions(Growing):
 
 
 class CSaveOptions(Growing):
-    _fields_ = [("struct_size", c_size_t), ("quality", c_int32), ("flags", c_uint32)]
+    _fields_ = [
+        ("struct_size", c_size_t),
+        ("quality", c_int32),
+        ("flags", c_uint32),
+        ("keep", c_uint32),
+    ]
 
 
 class CFacts(Growing):

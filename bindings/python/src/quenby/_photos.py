@@ -20,6 +20,7 @@ from ._pixels import AnyPhoto, Bytes, Face, Path, array_of, faces_of, file_bytes
 
 _as_stored, _ignore_known_faces = 1, 2
 _drop = {"all": 1, "gps": 2, "thumbnail": 4, "gain map": 8}
+_kinds = {"copyright": 1, "time": 2, "exif": 4, "xmp": 8, "iptc": 16, "gain map": 32}
 _formats = {".jpg": "JPEG", ".jpeg": "JPEG", ".jpe": "JPEG", ".png": "PNG"}
 
 
@@ -116,15 +117,21 @@ def open_options(
     )
 
 
-def _save_options(quality: int, strip: Iterable[str]) -> CSaveOptions:
+def _bits(name: str, chosen: Iterable[str], known: dict[str, int]) -> int:
+    bits = 0
+    for what in [chosen] if isinstance(chosen, str) else chosen:
+        if what not in known:
+            raise ValueError(f"{name}: '{what}' is none of {', '.join(known)}")
+        bits |= known[what]
+    return bits
+
+
+def _save_options(quality: int, strip: Iterable[str], keep: Iterable[str]) -> CSaveOptions:
     if not 1 <= quality <= 100:
         raise ValueError("quality: is not from 1 to 100")
-    flags = 0
-    for what in [strip] if isinstance(strip, str) else strip:
-        if what not in _drop:
-            raise ValueError(f"strip: '{what}' is none of {', '.join(_drop)}")
-        flags |= _drop[what]
-    return CSaveOptions(quality=quality, flags=flags)
+    return CSaveOptions(
+        quality=quality, flags=_bits("strip", strip, _drop), keep=_bits("keep", keep, _kinds)
+    )
 
 
 class Photo:
@@ -240,9 +247,10 @@ def _encoded(
     like: Optional[Photo],
     quality: int,
     strip: Iterable[str],
+    keep: Iterable[str],
     cancel: Optional[Cancel],
 ) -> tuple[bytes, list[Loss]]:
-    save = _save_options(quality, strip)
+    save = _save_options(quality, strip, keep)
     rgba = pixels.rgba if isinstance(pixels, Photo) else rgba_of(array_of(pixels))
     given, pointer = pixels_of(rgba), c_void_p()
     rest = (byref(given), utf8(format), byref(save), pointer_of(cancel), byref(pointer))
@@ -260,14 +268,17 @@ def encode(
     like: Optional[Photo] = None,
     quality: int = 90,
     strip: Iterable[str] = (),
+    keep: Iterable[str] = (),
     cancel: Optional[Cancel] = None,
 ) -> bytes:
     """The bytes of a file with these pixels.
 
     like:   a photo of the same size whose metadata goes with them, made to say what the picture is.
     strip:  of the metadata: "all" but the colour profile, "gps", "thumbnail", "gain map".
+    keep:   these kinds of it and the colour profile alone: "copyright", "time", "exif", "xmp", "iptc",
+            "gain map"; all kinds unless given.
     """
-    return _encoded(pixels, format, like, quality, strip, cancel)[0]
+    return _encoded(pixels, format, like, quality, strip, keep, cancel)[0]
 
 
 def _format_for(path: Path) -> str:
@@ -309,12 +320,13 @@ def write(
     like: Optional[Photo] = None,
     quality: int = 90,
     strip: Iterable[str] = (),
+    keep: Iterable[str] = (),
     overwrite: bool = False,
     cancel: Optional[Cancel] = None,
 ) -> list[Loss]:
     """Writes pixels to a file, in the format that its name says; see encode(). Returns what of the
     metadata is not in it. The file appears whole or not at all."""
-    data, losses = _encoded(pixels, _format_for(path), like, quality, strip, cancel)
+    data, losses = _encoded(pixels, _format_for(path), like, quality, strip, keep, cancel)
     _put(path, data, overwrite)
     return losses
 
@@ -332,6 +344,7 @@ def filter_file(
     scale: int = 1,
     known_faces: bool = True,
     strip: Iterable[str] = (),
+    keep: Iterable[str] = (),
     max_pixels: Optional[int] = None,
     max_scans: Optional[int] = None,
     overwrite: bool = False,
@@ -355,7 +368,7 @@ def filter_file(
         format = _format_for(target)
     data = _required_bytes(source)
     open = open_options(scale, rotate, True, known_faces, max_pixels, max_scans)
-    save, pointer = _save_options(quality, strip), c_void_p()
+    save, pointer = _save_options(quality, strip, keep), c_void_p()
     call(
         "filter_file",
         data,
