@@ -28,11 +28,20 @@ if(PELORIN_SANITIZE)
 endif()
 
 # pelorin_library(<name> SOURCES ... [DEPENDS ...] [PRIVATE ...]): the library pelorin_<name> of one
-# folder; PRIVATE is what only its sources include.
+# folder; PRIVATE is what only its sources include. Folders that set PELORIN_INSTALLED_LIBRARIES have
+# shared ones where BUILD_SHARED_LIBS wants them. Their interface may change with every version.
 function(pelorin_library name)
   cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "SOURCES;DEPENDS;PRIVATE")
   set(target pelorin_${name})
-  add_library(${target} STATIC ${arg_SOURCES})
+  if(BUILD_SHARED_LIBS AND PELORIN_INSTALLED_LIBRARIES)
+    add_library(${target} SHARED ${arg_SOURCES})
+    set_target_properties(
+      ${target} PROPERTIES CXX_VISIBILITY_PRESET default VISIBILITY_INLINES_HIDDEN OFF
+                           VERSION ${PROJECT_VERSION} SOVERSION ${PROJECT_VERSION})
+    pelorin_place_beside_each_other(${target})
+  else()
+    add_library(${target} STATIC ${arg_SOURCES})
+  endif()
   target_include_directories(
     ${target} PUBLIC $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}>
                      $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}/quenby>)

@@ -1,14 +1,19 @@
-# The engine by itself, for find_package(Quenby): static libraries, headers, the package files.
+# The engine by itself, for find_package(Quenby): libraries, headers, the package files.
 include(CMakePackageConfigHelpers)
 
 set_target_properties(pelorin_image_processing PROPERTIES EXPORT_NAME image_processing)
 install(TARGETS pelorin_image_processing pelorin_highway ${engine_libraries} EXPORT QuenbyTargets)
+pelorin_install_headers(${PELORIN_ENGINE_API})
+set(libraries ${engine_libraries})
+list(REVERSE libraries)
+set(uses USES libhwy)
 if(TARGET pelorin_instruction_sets)
   install(TARGETS pelorin_instruction_sets EXPORT QuenbyTargets)
+  list(APPEND libraries pelorin_instruction_sets)
+  set(uses "")
 endif()
-install(DIRECTORY ${PROJECT_SOURCE_DIR}/image_processing
-        DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/quenby
-        FILES_MATCHING PATTERN "*.h")
+pelorin_pkg_config(quenby-image-processing "The engine of Quenby, in C++" LIBRARIES ${libraries}
+                   ${uses})
 
 set(package_folder ${CMAKE_INSTALL_LIBDIR}/cmake/Quenby)
 install(EXPORT QuenbyTargets NAMESPACE Quenby:: DESTINATION ${package_folder})

@@ -45,7 +45,7 @@ cat >"$contents/AndroidManifest.xml" <<XML
 XML
 mvn --batch-mode --no-transfer-progress --quiet -Dstyle.color=never --file "$root/java/pom.xml" \
   -Dquenby.build.dir="$root/build/aar/java" --projects quenby --also-make process-classes
-jar --create --file "$contents/classes.jar" -C "$root/build/aar/java/quenby/classes" .
+"$root/tools/sorted_jar.sh" "$contents/classes.jar" "$root/build/aar/java/quenby/classes"
 cp "$root/java/quenby/src/main/resources/META-INF/proguard/quenby.pro" "$contents/proguard.txt"
 : >"$contents/R.txt" # no resources
-jar --create --no-manifest --file "$aar" -C "$contents" .
+"$root/tools/sorted_jar.sh" "$aar" "$contents" --no-manifest

@@ -24,6 +24,9 @@ mkdir -p "$contents/META-INF/licences"
 cp "$root"/build/static/amd64/share/licences/* "$contents/META-INF/licences/"
 
 [ $# -gt 0 ] || set -- package
+# The same from the same files: dated as a release says.
+[ -z "${SOURCE_DATE_EPOCH-}" ] ||
+  set -- -Dproject.build.outputTimestamp="$(date -u -d "@$SOURCE_DATE_EPOCH" +%Y-%m-%dT%H:%M:%SZ)" "$@"
 mvn --batch-mode --no-transfer-progress --quiet -Dstyle.color=never --file "$root/java/pom.xml" -Prelease -DskipTests \
   -Dquenby.jar.contents="$contents" -Dquenby.build.dir="$root/build/jar" \
   --projects .,quenby,quenby-desktop "$@"

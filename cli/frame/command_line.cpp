@@ -11,6 +11,7 @@
 #include <string_view>
 #include <utility>
 
+#include "cli/frame/build_facts.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/interrupt.h"
 #include "cli/frame/nearest_name.h"
@@ -63,12 +64,21 @@ void keepStandardDescriptors() {
   }
 }
 
+bool asksForBuildFacts(const std::vector<std::string>& arguments) {
+  const auto has = [&](const char* option) {
+    return std::ranges::find(arguments, option) != arguments.end();
+  };
+  return arguments.size() == 2 && has("--json") && (has("--version") || has("-V"));
+}
+
 }  // namespace
 
 CommandLine::CommandLine()
     : app_(std::make_unique<CLI::App>("Quenby makes photos better, one or a thousand at a time.")) {
   app_->name("quenby");
   app_->set_version_flag("-V,--version", "quenby " PELORIN_VERSION, "Print the version and leave");
+  app_->add_flag("--json")->description(
+      "With --version: compiler, instruction sets and libraries, too");
   app_->set_help_flag("-h,--help", "Print this help and leave");
   app_->require_subcommand(0, 1);
   app_->get_formatter()->label("SUBCOMMAND", "VERB");
@@ -162,6 +172,10 @@ ExitCode CommandLine::run(int argc, char** argv) {
   if (!arguments[0].starts_with('-') && std::ranges::none_of(verbs_, isCalled)) {
     return refuse(unknownName("verb", arguments[0], verbNames()), nullptr);
   }
+  if (asksForBuildFacts(arguments)) {
+    std::puts(buildFacts().dump(2).c_str());
+    return ExitCode::allDone;
+  }
   for (std::string& argument : arguments) {
     // CLI11 takes [a,b] for a list; here it can only be a file's name.
     if (argument.starts_with('[')) argument.insert(0, "./");
@@ -193,6 +207,7 @@ ExitCode CommandLine::run(int argc, char** argv) {
 
   const Work* work = chosen();
   if (work == nullptr) return refuse("no verb given", nullptr);
+  if (app_->count("--json") > 0) return refuse("--json goes behind the verb", nullptr);
   const std::string name = work->verb->get_name();
   ExitCode code;
   try {

@@ -8,6 +8,7 @@
 #include "image_processing/core/checked_size.h"
 #include "image_processing/core/huge_pages.h"
 #include "image_processing/core/pixel_types.h"
+#include "image_processing/core/same_containers.h"
 
 namespace pelorin::image_processing {
 

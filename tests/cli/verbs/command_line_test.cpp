@@ -1,5 +1,6 @@
 #include <gmock/gmock.h>
 
+#include "cli/frame/json_output.h"
 #include "tests/cli/quenby_process.h"
 
 namespace pelorin::test_support {
@@ -15,6 +16,26 @@ TEST(CommandLine, PrintsItsVersion) {
     EXPECT_EQ(run.exitCode, 0);
     EXPECT_THAT(run.output, testing::MatchesRegex("quenby [0-9]+\\.[0-9]+\\.[0-9]+\n"));
   }
+}
+
+TEST(CommandLine, TellsHowItWasBuilt) {
+  const Finished run = quenby({"--version", "--json"});
+  EXPECT_EQ(run.exitCode, 0);
+  const cli::Json facts = cli::Json::parse(run.output);
+  EXPECT_EQ("quenby " + facts["version"].get<std::string>() + "\n", quenby({"-V"}).output);
+  EXPECT_THAT(facts["compiler"].get<std::string>(), HasSubstr("."));
+  EXPECT_THAT(facts["instructionSets"], testing::Contains(facts["instructionSet"]));
+  for (const char* library : {"highway", "lcms2", "libpng", "pugixml", "sqlite3", "zlib"}) {
+    EXPECT_THAT(facts["libraries"][library].get<std::string>(),
+                testing::ContainsRegex("^[0-9]+[.][0-9]+"))
+        << library;
+  }
+}
+
+TEST(CommandLine, TakesJsonBehindTheVerbAlone) {
+  const Finished run = quenby({"--json", "looks"});
+  EXPECT_EQ(run.exitCode, 2);
+  EXPECT_THAT(run.errors, StartsWith("quenby: --json goes behind the verb"));
 }
 
 TEST(CommandLine, HelpsWithAListOfVerbs) {
