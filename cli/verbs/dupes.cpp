@@ -294,13 +294,15 @@ ExitCode runPlan(const DupesOptions& options) {
 
 ExitCode runDupes(const DupesOptions& options) {
   if (!options.plan.empty()) return runPlan(options);
-  if (options.inputs.names.empty()) throw UsageError("IN is required: photos, or folders with -r");
   const float threshold = readFiniteNumber("--threshold", options.threshold);
   const std::vector<Input> inputs = withoutRepetitions(expandInputs(options.inputs));
   const std::vector<fs::path> references = referenceFolders(options);
   checkActions(options.actions, inputs);
   if (inputs.empty()) {
     Talk(verbName, options.report.quiet, 0).note("no photos found");
+    DupeReport nothing = {};
+    nothing.threshold = threshold;
+    printReport(options, nothing);
     return ExitCode::nothingToDo;
   }
   checkOutputs(options, inputs);

@@ -568,7 +568,9 @@ TEST(DupesCommand, TakesAPhotoFromStandardInput) {
 
 TEST(DupesCommand, HasNothingToDoInAFolderWithoutPhotos) {
   const TemporaryFolder folder;
-  EXPECT_EQ(quenby({"dupes", "-r", folder.path()}).exitCode, 3);
+  const Finished run = quenby({"dupes", "-r", folder.path(), "--json"});
+  EXPECT_EQ(run.exitCode, 3);
+  EXPECT_EQ(parsedJson(run.output)["groups"], nlohmann::json::array());
 }
 
 TEST(DupesCommand, RefusesWhatCannotBeMeant) {
