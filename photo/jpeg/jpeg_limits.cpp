@@ -36,6 +36,20 @@ int countScans(std::span<const std::uint8_t> bytes, int enough) {
   return scans;
 }
 
+// A Huffman code is a bit or more, and every block of 8 x 8 has one: what asks for more blocks than the
+// file has bits would end early, after memory was taken for all of them.
+void checkBlocks(const jpeg_decompress_struct& codec, std::size_t bytes) {
+  if (codec.arith_code) return;  // whose symbols take less than a bit
+  std::uint64_t blocks = 0;
+  for (const jpeg_component_info& component :
+       std::span(codec.comp_info, static_cast<std::size_t>(codec.num_components))) {
+    blocks += std::uint64_t{component.width_in_blocks} * component.height_in_blocks;
+  }
+  if (blocks > std::uint64_t{bytes} * 8) {
+    throw PhotoError(PhotoError::Kind::truncated, "truncated: the picture data ends early");
+  }
+}
+
 }  // namespace
 
 void checkLimits(LibjpegReader& reader, const DecodeLimits& limits) {
@@ -47,12 +61,21 @@ void checkLimits(LibjpegReader& reader, const DecodeLimits& limits) {
                          std::to_string(codec.image_height) + " pixels, at most " +
                          std::to_string(limits.pixels) + " can be read");
   }
-  if (!jpeg_has_multiple_scans(&codec)) return;
   // readHeader has consumed the first scan's start.
   const std::span rest(codec.src->next_input_byte, codec.src->bytes_in_buffer);
-  if (1 + countScans(rest, limits.scans) > limits.scans) {
+  checkBlocks(codec, rest.size());
+  if (!jpeg_has_multiple_scans(&codec)) return;
+  const int scans = 1 + countScans(rest, limits.scans);
+  if (scans > limits.scans) {
     throw PhotoError(PhotoError::Kind::tooLarge,
                      "too many scans: at most " + std::to_string(limits.scans) + " can be read");
+  }
+  constexpr std::uint64_t perByte = 4096;
+  if (pixels * static_cast<std::uint64_t>(scans) > limits.scannedPixels + perByte * rest.size()) {
+    throw PhotoError(PhotoError::Kind::tooLarge, "too many scans: " + std::to_string(scans) +
+                                                     " of " + std::to_string(codec.image_width) +
+                                                     " x " + std::to_string(codec.image_height) +
+                                                     " pixels in a file of this size");
   }
 }
 

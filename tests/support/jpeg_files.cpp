@@ -156,7 +156,13 @@ Bytes withSize(Bytes file, std::uint32_t width, std::uint32_t height) {
 }
 
 Bytes withFrameByte(Bytes file, std::size_t offset, std::uint8_t value) {
-  file[findSegment(file, 0xC0) + 2 + offset] = value;
+  constexpr std::uint8_t prefix = 0xFF, baseline = 0xC0, progressive = 0xC2;
+  std::size_t frame = 2;
+  while (file.at(frame) != prefix ||
+         (file.at(frame + 1) != baseline && file.at(frame + 1) != progressive)) {
+    ++frame;
+  }
+  file[frame + 2 + offset] = value;
   return file;
 }
 

@@ -91,6 +91,26 @@ TEST(DamagedJpeg, MayHoldStrayBytesAfterACompleteScan) {
   EXPECT_EQ(rotateJpeg(longer, 90), rotateJpeg(file, 90));
 }
 
+TEST(DamagedJpeg, IsTruncatedWhereItHasMoreBlocksThanBits) {
+  const Bytes file = makeJpeg({});
+  const Bytes wide = test_support::withSize(file, 16000, 16000);
+  ASSERT_LT(wide.size() * 8, 2000u * 2000u);
+  EXPECT_EQ(jpegErrorOf([&] { decodeJpeg(wide); }), "truncated: the picture data ends early");
+  EXPECT_EQ(jpegErrorOf([&] { rotateJpeg(wide, 90); }), "truncated: the picture data ends early");
+}
+
+TEST(DamagedJpeg, IsRefusedForTheWorkOfItsScansWhateverItsSize) {
+  const Bytes file = makeJpeg({.scans = test_support::progressiveScans(60)});
+  DecodeLimits limits;
+  const JpegHeader header = readJpegHeader(file);
+  limits.scannedPixels = 0;  // what the bytes allow is enough for any photo
+  EXPECT_EQ(decodeJpeg(file, 1, limits).width, header.width);
+  Bytes wide = test_support::withSize(file, 16000, 16000);
+  wide.resize(wide.size() + 16000 * 16000 / 64 / 8 * 3);  // a bit for each block
+  EXPECT_EQ(jpegErrorOf([&] { decodeJpeg(wide); }),
+            "too many scans: 60 of 16000 x 16000 pixels in a file of this size");
+}
+
 TEST(DamagedJpeg, GivesAnErrorOrAPictureWhateverBytesChange) {
   test_support::Random random(/*seed=*/2024);
   const DecodeLimits limits = {.pixels = 1 << 20, .scans = 100};
