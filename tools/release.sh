@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
 # Makes and checks everything that is handed to others, from the commit that is checked out, in
-# build/artefacts: sources, Debian packages, jars, the library for Android, wheels, the Python package as
+# build/artefacts: sources, Debian packages, jars, the library for Android, the wheel, the Python package as
 # sources, and SHA256SUMS.
 #
 #   tools/release.sh           makes and checks them
