@@ -4,8 +4,8 @@
 
 namespace pelorin::cli {
 
-Option Option::required(bool isRequired) {
-  option_->required(isRequired);
+Option Option::required() {
+  option_->required();
   return *this;
 }
 

@@ -23,7 +23,7 @@ class Option {
   Option() = default;
   explicit Option(CLI::Option* option) : option_(option) {}
 
-  Option required(bool isRequired = true);
+  Option required();
   /// What the help calls its value.
   Option type(const std::string& name);
   /// The heading it stands under in the help.

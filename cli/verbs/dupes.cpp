@@ -275,9 +275,8 @@ void markReferences(const std::vector<fs::path>& folders,
 }
 
 ExitCode runPlan(const DupesOptions& options) {
-  if (!options.inputs.names.empty()) {
-    throw UsageError("--plan: the photos are those of the plan; leave out " +
-                     options.inputs.names[0]);
+  if (!options.inputs.names.empty() || !options.inputs.lists.empty()) {
+    throw UsageError("--plan: the photos are those of the plan; leave out the others");
   }
   if (!options.actions.wanted()) {
     throw UsageError("--plan: say what to do, with --move-to DIR or --link");
@@ -362,7 +361,6 @@ void addDupes(CommandLine& commandLine) {
       "quenby dupes -r photos --keep best --jsonl | jq -r '.ranking[]? | select(.keep | not).file'",
       [options] { return runDupes(*options); });
   addInputOptions(verb, options->inputs);
-  verb.named("IN").required(false);  // a plan names its own
   verb.option("--threshold", options->threshold,
               fmt::format("Smallest score of a pair; {} unless given, larger is stricter, the same "
                           "photo twice scores about 3.65",

@@ -558,6 +558,17 @@ TEST(DupesCommand, TakesAPathNamedTwiceForOnePhoto) {
   EXPECT_THAT(run.errors, HasSubstr("no near-duplicates among 1 photos"));
 }
 
+TEST(DupesCommand, TakesAListOfPhotosAlone) {
+  const Holiday holiday;
+  const std::string list = holiday.folder.write(
+      "list", holiday.folder / "zones/a.jpg" + "\n" + holiday.folder / "zones/b.jpg" + "\n");
+  const Finished run = quenby({"dupes", "--files-from", list});
+  EXPECT_EQ(run.exitCode, 0) << run.errors;
+  EXPECT_THAT(run.errors, HasSubstr("2 of 2 photos"));
+  EXPECT_EQ(
+      quenby({"dupes", "--files-from", list, "--plan", list, "--link", "--no-backup"}).exitCode, 2);
+}
+
 TEST(DupesCommand, TakesAPhotoFromStandardInput) {
   const Holiday holiday;
   const Finished run = quenby({"dupes", "-", holiday.folder / "zones/a.jpg", "--json"},
