@@ -27,7 +27,7 @@ void edit(std::vector<MetadataSegment> segments) {
     facesOf(packet, change);
     stateFacts(packet, change, lost);
     turnRegions(packet, change);
-    stateAppended(packet, {.gainMapSize = 7});
+    stateAppended(packet, {.gainMapSize = 7, .videoSize = {}});
   };
   editXmp(segments, state, lost);
   std::vector<Loss> lostAgain;
