@@ -6,15 +6,32 @@
 #include <array>
 #include <cmath>
 #include <cstdlib>
+#include <numbers>
 #include <optional>
 #include <utility>
 
 namespace pelorin::photo {
 namespace {
 
-constexpr std::string_view mwgRegions = "http://www.metadataworkinggroup.com/schemas/regions/";
-constexpr std::string_view areaFields = "http://ns.adobe.com/xmp/sType/Area#";
-constexpr std::string_view sizeFields = "http://ns.adobe.com/xap/1.0/sType/Dimensions#";
+// Lists of regions that state what size they were applied to: the Metadata Working Group's, and
+// ACDSee's, which has the same shape and two areas to a region: as shown, as found.
+struct Dialect {
+  std::string_view space, areaFields, sizeFields;
+  std::array<std::string_view, 2> areas;  // the first one is the face's
+
+  XmpName regions() const { return {space, "Regions"}; }
+};
+constexpr Dialect workingGroup = {"http://www.metadataworkinggroup.com/schemas/regions/",
+                                  "http://ns.adobe.com/xmp/sType/Area#",
+                                  "http://ns.adobe.com/xap/1.0/sType/Dimensions#",
+                                  {"Area"}};
+constexpr Dialect acdsee = {"http://ns.acdsee.com/regions/",
+                            "http://ns.acdsee.com/sType/Area#",
+                            "http://ns.acdsee.com/sType/Dimensions#",
+                            {"DLYArea", "ALGArea"}};
+constexpr const Dialect* dialects[] = {&workingGroup, &acdsee};
+
+constexpr std::string_view appleFace = "http://ns.apple.com/faceinfo/1.0/";
 constexpr std::string_view microsoft = "http://ns.microsoft.com/photo/1.2/";
 constexpr std::string_view microsoftInfo = "http://ns.microsoft.com/photo/1.2/t/RegionInfo#";
 constexpr std::string_view microsoftRegion = "http://ns.microsoft.com/photo/1.2/t/Region#";
@@ -58,9 +75,52 @@ struct Frame {
   Turn turn;  // from that picture to the changed one
 };
 
+// How far a region's contents are turned clockwise, where a program says it: in radians beside the
+// area, or in degrees among the extensions that a phone writes.
+class Roll {
+ public:
+  explicit Roll(const XmpProperty& region)
+      : radians_(region.field({workingGroup.space, "Rotation"})),
+        degrees_(extension(region, "AngleInfoRoll")),
+        yaw_(extension(region, "AngleInfoYaw")) {}
+
+  // In quarters, the nearest of 0 ... 3.
+  std::optional<int> quarters() const {
+    const std::optional<double> quarters = radians_.value ? std::optional(*radians_.value / quarter)
+                                           : degrees_.value ? std::optional(*degrees_.value / 90)
+                                                            : std::nullopt;
+    if (!quarters || std::fabs(*quarters) > 1000) return std::nullopt;
+    return (static_cast<int>(std::lround(*quarters)) % 4 + 4) % 4;
+  }
+
+  void turn(Turn turn) {
+    const int sign = turn.mirrored ? -1 : 1;
+    if (radians_.value)
+      radians_.property.setText(textOf(
+          std::remainder(sign * *radians_.value + turn.quarters * quarter, 4 * quarter) + 0.0));
+    if (degrees_.value)
+      degrees_.property.setText(textOf(positive(sign * *degrees_.value + 90 * turn.quarters)));
+    if (yaw_.value && turn.mirrored) yaw_.property.setText(textOf(positive(-*yaw_.value)));
+  }
+
+ private:
+  static constexpr double quarter = std::numbers::pi / 2;
+
+  static Number extension(const XmpProperty& region, std::string_view name) {
+    return Number(region.field({workingGroup.space, "Extensions"}).field({appleFace, name}));
+  }
+  static double positive(double degrees) {
+    const double rest = std::fmod(degrees, 360);
+    return (rest < 0 ? rest + 360 : rest) + 0.0;
+  }
+
+  Number radians_, degrees_, yaw_;
+};
+
 // What regions refer to that were applied to a picture of this size; nothing when that is another
 // crop.
-std::optional<Frame> frameOf(PictureSize applied, const PictureChange& change) {
+// @param storedRoll  whether their contents are turned as the stored picture is.
+std::optional<Frame> frameOf(PictureSize applied, bool storedRoll, const PictureChange& change) {
   const Turn upright = uprightTurn(change.orientation);
   const auto hasShape = [&](double width, double height) {
     // Up to a pixel of rounding at either size.
@@ -70,6 +130,7 @@ std::optional<Frame> frameOf(PictureSize applied, const PictureChange& change) {
   const double width = change.before.width, height = change.before.height;
   if (hasShape(width, height)) return Frame{applied, change.turn};
   if (upright.swapsAxes() && hasShape(height, width)) {
+    if (storedRoll) return Frame{{applied.height, applied.width}, change.turn};
     // What is left of the turn behind the upright picture: its quarters beyond upright.
     return Frame{applied, {false, (change.turn.quarters - upright.quarters + 4) % 4}};
   }
@@ -80,9 +141,8 @@ std::optional<Frame> frameOf(PictureSize applied, const PictureChange& change) {
 struct AppliedTo {
   Number width, height;
 
-  explicit AppliedTo(const XmpProperty& regions)
-      : width(regions.field({mwgRegions, "AppliedToDimensions"}).field({sizeFields, "w"})),
-        height(regions.field({mwgRegions, "AppliedToDimensions"}).field({sizeFields, "h"})) {}
+  AppliedTo(const XmpProperty& regions, const Dialect& dialect)
+      : width(side(regions, dialect, "w")), height(side(regions, dialect, "h")) {}
 
   std::optional<PictureSize> size() const {
     const auto isSide = [](const Number& side) {
@@ -92,23 +152,46 @@ struct AppliedTo {
     return PictureSize{static_cast<std::uint32_t>(*width.value),
                        static_cast<std::uint32_t>(*height.value)};
   }
+
+ private:
+  static Number side(const XmpProperty& regions, const Dialect& dialect, std::string_view name) {
+    return Number(
+        regions.field({dialect.space, "AppliedToDimensions"}).field({dialect.sizeFields, name}));
+  }
 };
 
-std::optional<Frame> frameOf(const XmpProperty& regions, const PictureChange& change) {
-  return frameOf(AppliedTo(regions).size().value_or(change.before), change);
+std::vector<XmpProperty> itemsOf(const XmpProperty& regions, const Dialect& dialect) {
+  return regions.field({dialect.space, "RegionList"}).items();
 }
 
-// The Metadata Working Group's: centre and size, normalised unless the unit is pixels.
-class WorkingGroupArea {
+// Whether contents are turned as upright ones are in the stored picture.
+bool hasStoredRoll(const XmpProperty& regions, const Dialect& dialect, int orientation) {
+  const Turn upright = uprightTurn(orientation);
+  const int stored = upright.mirrored ? upright.quarters : (4 - upright.quarters) % 4;
+  const std::vector<XmpProperty> items = itemsOf(regions, dialect);
+  return stored != 0 && std::any_of(items.begin(), items.end(), [&](const XmpProperty& region) {
+           return Roll(region).quarters() == stored;
+         });
+}
+
+std::optional<Frame> frameOf(const XmpProperty& regions, const Dialect& dialect,
+                             const PictureChange& change) {
+  return frameOf(AppliedTo(regions, dialect).size().value_or(change.before),
+                 hasStoredRoll(regions, dialect, change.orientation), change);
+}
+
+// Centre and size, normalised unless the unit is pixels.
+class AppliedArea {
  public:
-  explicit WorkingGroupArea(const XmpProperty& region)
-      : area_(region.field({mwgRegions, "Area"})),
+  AppliedArea(const XmpProperty& region, const Dialect& dialect, std::string_view name)
+      : area_(region.field({dialect.space, name})),
+        fields_(dialect.areaFields),
         x_(field("x")),
         y_(field("y")),
         width_(field("w")),
         height_(field("h")),
         diameter_(field("d")),
-        inPixels_(area_.field({areaFields, "unit"}).text() == "pixel") {}
+        inPixels_(area_.field({fields_, "unit"}).text() == "pixel") {}
 
   std::optional<Area> read(PictureSize frame) const {
     if (!x_.value || !y_.value) return std::nullopt;
@@ -143,9 +226,10 @@ class WorkingGroupArea {
   bool inPixels() const { return inPixels_; }
 
  private:
-  Number field(std::string_view name) const { return Number(area_.field({areaFields, name})); }
+  Number field(std::string_view name) const { return Number(area_.field({fields_, name})); }
 
   XmpProperty area_;
+  std::string_view fields_;
   Number x_, y_, width_, height_, diameter_;
   bool inPixels_;
 };
@@ -154,16 +238,19 @@ bool stays(const Frame& frame, bool inPixels, PictureSize picture) {
   return frame.turn == Turn{} && (!inPixels || frame.size == picture);
 }
 
-void turnWorkingGroup(const XmpProperty& regions, const PictureChange& change) {
-  const std::optional<Frame> frame = frameOf(regions, change);
+void turnApplied(const XmpProperty& regions, const Dialect& dialect, const PictureChange& change) {
+  const std::optional<Frame> frame = frameOf(regions, dialect, change);
   if (!frame) return;
-  for (const XmpProperty& region : regions.field({mwgRegions, "RegionList"}).items()) {
-    WorkingGroupArea area(region);
-    const std::optional<Area> was = area.read(frame->size);
-    if (!was || stays(*frame, area.inPixels(), change.after)) continue;
-    area.write(turned(*was, frame->turn), frame->size, change.after);
+  for (const XmpProperty& region : itemsOf(regions, dialect)) {
+    for (const std::string_view name : dialect.areas) {
+      AppliedArea area(region, dialect, name);
+      const std::optional<Area> was = area.read(frame->size);
+      if (!was || stays(*frame, area.inPixels(), change.after)) continue;
+      area.write(turned(*was, frame->turn), frame->size, change.after);
+    }
+    if (frame->turn != Turn{}) Roll(region).turn(frame->turn);
   }
-  AppliedTo applied(regions);
+  AppliedTo applied(regions, dialect);
   if (!applied.size()) return;
   applied.width.property.setText(std::to_string(change.after.width));
   applied.height.property.setText(std::to_string(change.after.height));
@@ -198,8 +285,8 @@ std::vector<XmpProperty> microsoftRegions(const XmpPacket& packet) {
 
 // Microsoft's state no size. Programs that write both dialects give them the same meaning.
 std::optional<Frame> microsoftFrame(const XmpPacket& packet, const PictureChange& change) {
-  const XmpProperty beside = packet.property({mwgRegions, "Regions"});
-  return beside ? frameOf(beside, change) : frameOf(change.before, change);
+  const XmpProperty beside = packet.property(workingGroup.regions());
+  return beside ? frameOf(beside, workingGroup, change) : frameOf(change.before, false, change);
 }
 
 void turnMicrosoft(const XmpPacket& packet, const PictureChange& change) {
@@ -282,9 +369,20 @@ class IptcBoundary {
   bool inPixels_;
 };
 
-bool isFace(const XmpProperty& region) {
-  const std::string type = region.field({mwgRegions, "Type"}).text();
-  return type.empty() || type == "Face" || type == "face";
+// A name that was found and then denied belongs to no face there, or to none at all.
+bool isFace(const XmpProperty& region, const Dialect& dialect) {
+  const std::string type = region.field({dialect.space, "Type"}).text();
+  return (type.empty() || type == "Face" || type == "face") &&
+         region.field({dialect.space, "NameAssignType"}).text() != "denied";
+}
+
+// As shown, or as found where it is not.
+std::optional<Area> faceArea(const XmpProperty& region, const Dialect& dialect, PictureSize frame) {
+  for (const std::string_view name : dialect.areas) {
+    if (const std::optional<Area> area = AppliedArea(region, dialect, name).read(frame))
+      return area;
+  }
+  return std::nullopt;
 }
 
 KnownFace faceAt(const Area& area, std::string name) {
@@ -316,8 +414,10 @@ void addOnce(std::vector<KnownFace>& faces, KnownFace face) {
 
 void turnRegions(XmpPacket& packet, const PictureChange& change) {
   turnMicrosoft(packet, change);  // first: it reads what the others refer to
-  for (const XmpProperty& regions : packet.properties({mwgRegions, "Regions"}))
-    turnWorkingGroup(regions, change);
+  for (const Dialect* dialect : dialects) {
+    for (const XmpProperty& regions : packet.properties(dialect->regions()))
+      turnApplied(regions, *dialect, change);
+  }
   const Frame stored = {change.before, change.turn};
   for (const XmpProperty& regions : packet.properties({iptc, "ImageRegion"})) {
     for (const XmpProperty& region : regions.items()) {
@@ -329,13 +429,16 @@ void turnRegions(XmpPacket& packet, const PictureChange& change) {
 
 std::vector<KnownFace> facesOf(const XmpPacket& packet, const PictureChange& change) {
   std::vector<KnownFace> faces;
-  for (const XmpProperty& regions : packet.properties({mwgRegions, "Regions"})) {
-    const std::optional<Frame> frame = frameOf(regions, change);
-    if (!frame) continue;
-    for (const XmpProperty& region : regions.field({mwgRegions, "RegionList"}).items()) {
-      const std::optional<Area> area = WorkingGroupArea(region).read(frame->size);
-      if (!area || !isFace(region)) continue;
-      addOnce(faces, faceAt(turned(*area, frame->turn), region.field({mwgRegions, "Name"}).text()));
+  for (const Dialect* dialect : dialects) {
+    for (const XmpProperty& regions : packet.properties(dialect->regions())) {
+      const std::optional<Frame> frame = frameOf(regions, *dialect, change);
+      if (!frame) continue;
+      for (const XmpProperty& region : itemsOf(regions, *dialect)) {
+        const std::optional<Area> area = faceArea(region, *dialect, frame->size);
+        if (!area || !isFace(region, *dialect)) continue;
+        addOnce(faces,
+                faceAt(turned(*area, frame->turn), region.field({dialect->space, "Name"}).text()));
+      }
     }
   }
   const std::optional<Frame> frame = microsoftFrame(packet, change);

@@ -21,6 +21,10 @@ inline std::string xmpPacket(const std::string& descriptions, std::size_t paddin
          " xmlns:MPRI=\"http://ns.microsoft.com/photo/1.2/t/RegionInfo#\"\n"
          "   xmlns:MPReg=\"http://ns.microsoft.com/photo/1.2/t/Region#\"\n"
          "   xmlns:Iptc4xmpExt=\"http://iptc.org/std/Iptc4xmpExt/2008-02-29/\"\n"
+         "   xmlns:acdsee-rs=\"http://ns.acdsee.com/regions/\""
+         " xmlns:acdsee-stArea=\"http://ns.acdsee.com/sType/Area#\"\n"
+         "   xmlns:acdsee-stDim=\"http://ns.acdsee.com/sType/Dimensions#\""
+         " xmlns:apple-fi=\"http://ns.apple.com/faceinfo/1.0/\"\n"
          "   xmlns:my=\"urn:something:unknown\">\n" +
          descriptions + "\n </rdf:RDF>\n</x:xmpmeta>" +
          (padding > 0 ? "\n" + std::string(padding - 1, ' ') : "") + "<?xpacket end=\"w\"?>";
