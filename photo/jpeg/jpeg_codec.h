@@ -8,9 +8,9 @@
 #include <span>
 #include <vector>
 
-#include "photo/decode_limits.h"              // IWYU pragma: export
-#include "photo/metadata/metadata_segment.h"  // IWYU pragma: export
-#include "photo/photo_error.h"                // IWYU pragma: export
+#include "photo/decode_limits.h"          // IWYU pragma: export
+#include "photo/jpeg/metadata_segment.h"  // IWYU pragma: export
+#include "photo/photo_error.h"            // IWYU pragma: export
 
 namespace pelorin::photo {
 

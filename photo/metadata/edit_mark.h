@@ -5,8 +5,8 @@
 #include <string>
 #include <vector>
 
+#include "photo/jpeg/metadata_segment.h"
 #include "photo/metadata/loss.h"
-#include "photo/metadata/metadata_segment.h"
 
 namespace pelorin::photo {
 

@@ -3,7 +3,7 @@
 #include <span>
 #include <vector>
 
-#include "photo/metadata/metadata_segment.h"
+#include "photo/jpeg/metadata_segment.h"
 
 namespace pelorin::photo {
 

@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "photo/metadata/metadata_segment.h"
+#include "photo/jpeg/metadata_segment.h"
 #include "photo/picture_size.h"
 #include "photo/turn.h"
 

@@ -4,8 +4,8 @@
 #include <span>
 #include <vector>
 
+#include "photo/jpeg/metadata_segment.h"
 #include "photo/metadata/loss.h"
-#include "photo/metadata/metadata_segment.h"
 
 namespace pelorin::photo {
 

@@ -5,7 +5,7 @@
 #include <string_view>
 #include <vector>
 
-#include "photo/metadata/metadata_segment.h"
+#include "photo/jpeg/metadata_segment.h"
 
 namespace pelorin::photo {
 

@@ -5,8 +5,8 @@
 #include <span>
 #include <vector>
 
+#include "photo/jpeg/metadata_segment.h"
 #include "photo/metadata/loss.h"
-#include "photo/metadata/metadata_segment.h"
 #include "photo/metadata/xmp_packet.h"
 
 namespace pelorin::photo {

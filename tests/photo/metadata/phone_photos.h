@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "image_processing/core/image.h"
-#include "photo/metadata/metadata_segment.h"
+#include "photo/jpeg/metadata_segment.h"
 #include "tests/photo/metadata/exif_segments.h"
 
 namespace pelorin::test_support {
