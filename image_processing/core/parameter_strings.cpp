@@ -48,6 +48,13 @@ double readNumber(const std::string& text) {
   return strtod_l(text.c_str(), nullptr, classicLocale());
 }
 
+std::optional<double> wholeNumber(const std::string& text) {
+  char* end = nullptr;
+  const double number = strtod_l(text.c_str(), &end, classicLocale());
+  if (text.empty() || end != text.c_str() + text.size()) return std::nullopt;
+  return number;
+}
+
 std::string textOf(bool value) {
   return value ? "true" : "false";
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <map>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -23,6 +24,9 @@ std::vector<std::string> splitStringOnceAt(const std::string& text, const std::s
 
 /// The number at the start of `text` as `strtod` reads it; 0 when there is none: "0.4abc" is 0.4.
 double readNumber(const std::string& text);
+
+/// The number that `text` is as a whole, as `strtod` reads it; nothing when it is none.
+std::optional<double> wholeNumber(const std::string& text);
 
 /// "true" or "false".
 std::string textOf(bool value);

@@ -8,6 +8,7 @@
 #include <cstdio>
 #include <cstdlib>
 
+#include "image_processing/core/parameter_strings.h"
 #include "photo/metadata/exif_orientation.h"
 #include "photo/metadata/segments.h"
 #include "photo/metadata/tiff.h"
@@ -72,7 +73,7 @@ std::optional<CaptureTime> readTime(const std::string& text, const std::string& 
       fmt::format("{:04}-{:02}-{:02}T{:02}:{:02}:{:02}", year, month, day, hour, minute, second);
   const auto isDigit = [](char letter) { return letter >= '0' && letter <= '9'; };
   if (!fraction.empty() && std::all_of(fraction.begin(), fraction.end(), isDigit)) {
-    time.seconds += std::strtod(("0." + fraction).c_str(), nullptr);
+    time.seconds += image_processing::readNumber("0." + fraction);
     time.text += "." + fraction;
   }
   const std::optional<int> offset = readOffset(offsetText);

@@ -93,9 +93,10 @@ class ThumbnailPlace {
   bool replace(ThumbnailMaker& thumbnails) {
     if (jpeg_.size == 0) return false;
     const bool atTheEnd = jpeg_.end() == tiff_.size();
-    const std::uint64_t room =
-        atTheEnd ? longestPayload - markSize - std::min<std::uint64_t>(jpeg_.begin, 65000)
-                 : jpeg_.size;
+    constexpr std::uint64_t longest = longestPayload - markSize;
+    const std::uint64_t room = !atTheEnd               ? jpeg_.size
+                               : jpeg_.begin < longest ? longest - jpeg_.begin
+                                                       : 0;
     const std::optional<Thumbnail> thumbnail = thumbnails.make(longerSide(), room);
     if (!thumbnail) return false;
     setNumbers(tiff_, second_, imageWidth, thumbnail->size.width);

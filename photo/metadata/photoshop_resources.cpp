@@ -28,8 +28,9 @@ Resource resourceAt(const std::vector<std::uint8_t>& bytes, std::size_t at) {
   if (left < sizePlace + 4) return {0, 0};
   std::uint64_t size = 0;
   for (std::size_t i = 0; i < 4; ++i) size = size << 8 | resource[sizePlace + i];
-  const std::uint64_t padded = std::min<std::uint64_t>((size + 1) / 2 * 2, left);
-  if (padded > left - sizePlace - 4) return {0, 0};
+  const std::size_t room = left - sizePlace - 4;
+  if (size > room) return {0, 0};
+  const std::uint64_t padded = std::min<std::uint64_t>((size + 1) / 2 * 2, room);  // some forget it
   return {static_cast<unsigned>(resource[4] << 8 | resource[5]),
           static_cast<std::size_t>(sizePlace + 4 + padded), sizePlace + 4,
           static_cast<std::size_t>(size)};

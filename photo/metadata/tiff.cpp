@@ -6,7 +6,7 @@ namespace pelorin::photo {
 namespace {
 
 constexpr std::uint64_t entrySize = 12, headerSize = 8;
-constexpr std::uint16_t shortType = 3, longType = 4;
+constexpr std::uint16_t shortType = 3, longType = 4, directoryType = 13;
 
 // Of the twelve types of TIFF 6.0 and the two that others added; 0 for what is none.
 std::uint64_t sizeOfType(std::uint16_t type) {
@@ -84,7 +84,7 @@ TiffDirectory Tiff::nextDirectory(const TiffDirectory& directory) const {
 }
 
 TiffDirectory Tiff::directoryOf(const TiffEntry* entry) const {
-  if (entry == nullptr || entry->type != longType) return {};
+  if (entry == nullptr || (entry->type != longType && entry->type != directoryType)) return {};
   return directoryAt(read32(entry->valuePlace));
 }
 

@@ -49,7 +49,7 @@ class Tiff {
   TiffDirectory firstDirectory() const;
   /// The one that a directory's link leads to.
   TiffDirectory nextDirectory(const TiffDirectory& directory) const;
-  /// The one whose place an entry of type LONG tells.
+  /// The one whose place an entry of type LONG or IFD tells.
   TiffDirectory directoryOf(const TiffEntry* entry) const;
 
   /// Whether the entry holds at least one SHORT or LONG.

@@ -5,10 +5,11 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
-#include <cstdlib>
 #include <numbers>
 #include <optional>
 #include <utility>
+
+#include "image_processing/core/parameter_strings.h"
 
 namespace pelorin::photo {
 namespace {
@@ -50,11 +51,8 @@ Area turned(Area area, Turn turn) {
 }
 
 std::optional<double> numberOf(const std::string& text) {
-  if (text.empty()) return std::nullopt;
-  char* end = nullptr;
-  const double value = std::strtod(text.c_str(), &end);
-  if (*end != '\0' || !std::isfinite(value)) return std::nullopt;
-  return value;
+  const std::optional<double> number = image_processing::wholeNumber(text);
+  return number && std::isfinite(*number) ? number : std::nullopt;
 }
 
 // Nine digits: what one minus a fraction of six looks like to a reader.

@@ -39,7 +39,8 @@ std::string_view textOf(Bytes bytes) {
 // Unpacked bytes; a size beyond any that exists counts as damage.
 std::vector<std::uint8_t> inflated(Bytes packed, std::string_view what) {
   constexpr std::size_t largest = std::size_t{16} << 20;
-  std::vector<std::uint8_t> bytes(std::max<std::size_t>(packed.size() * 4, 4096));
+  constexpr std::size_t smallest = 4096;
+  std::vector<std::uint8_t> bytes(std::max(std::min(packed.size(), largest / 4) * 4, smallest));
   for (;;) {
     uLongf size = bytes.size();
     const int code = uncompress(bytes.data(), &size, packed.data(), packed.size());
