@@ -1,10 +1,15 @@
 #include "photo/filter_photo.h"
 
+#include <fmt/format.h>
+
+#include <algorithm>
 #include <cmath>
 #include <memory>
+#include <optional>
 #include <stdexcept>
 #include <utility>
 
+#include "image_processing/core/parameter_strings.h"
 #include "image_processing/core/picture_rows.h"
 #include "image_processing/core/stages.h"
 #include "image_processing/filters/default_filter_factory.h"
@@ -22,9 +27,16 @@ namespace {
   throw std::invalid_argument(message);
 }
 
+// A number as one front end writes it is the same in another: 1, 1.0 and 1.0E0.
+std::string shortest(const std::string& value) {
+  const std::optional<double> number = wholeNumber(value);
+  return number ? fmt::format("{}", *number) : value;
+}
+
 void checkRequest(const FilterRequest& request) {
   filterFor(request.filter, request.params);
-  if (request.save.quality < 1 || request.save.quality > 100) {
+  const int quality = request.save.quality;
+  if (quality != sourceQuality && (quality < 1 || quality > 100)) {
     refuse("quality: is not from 1 to 100");
   }
   if (request.open.rotate % 90 != 0) refuse("rotation: is no multiple of 90");
@@ -132,7 +144,9 @@ FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const FilterReques
   }
 
   const bool hasAlpha = asksAlpha && !isOpaque(photo.image->data.get(), photo.image->pixelCount());
-  PhotoWriter writer(size, *format, hasAlpha, photo.metadata, request.save);
+  SaveOptions save = request.save;
+  if (request.mark && !save.mark) save.mark = markOf(request.filter, request.params);
+  PhotoWriter writer(size, *format, hasAlpha, photo.metadata, save);
   WrittenRows written(writer);
   if (photo.image != nullptr) {
     PictureSource picture(*photo.image);
@@ -146,6 +160,30 @@ FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const FilterReques
   FilteredPhoto filtered{{}, size, std::move(photo.facts)};
   filtered.file = writer.finish(&filtered.lost);
   return filtered;
+}
+
+EditMark markOf(const std::string& filter, const std::string& params) {
+  EditMark mark = {PELORIN_VERSION, filter, ""};
+  const FilterParams given(params);
+  for (const auto& [key, value] : given.items()) {
+    if (!mark.params.empty()) mark.params += ';';
+    mark.params += key + "=" + shortest(value);
+  }
+  // XMP holds no others.
+  const auto isText = [](char letter) { return letter >= ' ' && letter <= '~'; };
+  std::replace_if(
+      mark.params.begin(), mark.params.end(), [&](char letter) { return !isText(letter); }, '?');
+  return mark;
+}
+
+const EditMark* earlierEdit(const PhotoFacts& facts, const FilterDescription& filter) {
+  const auto factory = DefaultFilterFactory::filterFactory();
+  const auto found = std::find_if(facts.edits.rbegin(), facts.edits.rend(), [&](const EditMark& e) {
+    if (e.filter == filter.name) return true;
+    const FilterDescription* const other = factory->find(e.filter);
+    return other != nullptr && other->displayName == filter.displayName;
+  });
+  return found == facts.edits.rend() ? nullptr : &*found;
 }
 
 }  // namespace pelorin::photo

@@ -18,7 +18,17 @@ struct FilterRequest {
   std::vector<Face> faces = {};  ///< Beside those the file knows of.
   OpenOptions open = {};
   SaveOptions save = {};
+  bool mark = true;  ///< The file tells of it, unless `save` has another mark.
 };
+
+/// The mark of an edit by this library, which states no time: of equal parameters the same,
+/// however they are written.
+EditMark markOf(const std::string& filter, const std::string& params);
+
+/// The last edit that a photo tells of with this filter, or with one that users see under the same
+/// name; null without one. Lives as long as the facts.
+const EditMark* earlierEdit(const PhotoFacts& facts,
+                            const image_processing::FilterDescription& filter);
 
 /// The filter of this name, when it can do with these parameters.
 /// @throws std::invalid_argument that names what is wrong: the filter, or a key that it does not

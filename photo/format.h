@@ -31,8 +31,10 @@ struct Format {
   void (*removeForeign)(KeptMetadata& kept);
 
   /// @param hasAlpha  whether any pixel is not opaque; without effect unless `keepsAlpha`.
+  /// @param source    of the photo that the picture is made of: what its file is coded like.
   /// @throws PhotoError when the format cannot hold a picture of this size.
-  std::unique_ptr<RowWriter> (*writer)(PictureSize size, bool hasAlpha, const SaveOptions& options);
+  std::unique_ptr<RowWriter> (*writer)(PictureSize size, bool hasAlpha, const SaveOptions& options,
+                                       const Metadata& source);
 };
 
 /// All formats that can be read and written. A new one is a row here and a folder beside this.

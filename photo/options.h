@@ -4,6 +4,7 @@
 #include <stop_token>
 
 #include "photo/decode_limits.h"
+#include "photo/jpeg/jpeg_coding.h"
 #include "photo/metadata/edit_mark.h"
 #include "photo/metadata/kept_metadata.h"
 #include "photo/picture_size.h"
@@ -27,12 +28,18 @@ enum class ColourDetail {
   none,   ///< For grey pictures: one channel, red.
 };
 
+/// As a quality: the one that the photo's own file seems to have, 90 where it tells none.
+constexpr int sourceQuality = -1;
+
 struct SaveOptions {
-  int quality = 90;                   ///< 1 ... 100, for formats that lose something.
-  std::stop_token stop = {};          ///< Asked between steps; the default never stops.
-  KeepOptions keep = {};              ///< Of the metadata.
-  std::optional<EditMark> mark = {};  ///< Added to the history, whatever else is kept.
+  int quality = 90;           ///< 1 ... 100, for formats that lose something, or `sourceQuality`.
+  std::stop_token stop = {};  ///< Asked between steps; the default never stops.
+  KeepOptions keep = {};      ///< Of the metadata.
+  std::optional<EditMark> mark = {};  ///< Added to the history, whatever else is kept, where the
+                                      ///< format holds one.
   ColourDetail colour = ColourDetail::usual;
+  /// Of a JPEG file; else that of the photo's own one, and 4:2:0 where it tells none.
+  std::optional<ChromaSampling> sampling = {};
 };
 
 /// @throws Stopped when `stop` asks for it.

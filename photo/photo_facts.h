@@ -20,7 +20,7 @@ struct PhotoFacts {
   bool hasAlpha = false;
   int orientation = 1;  ///< EXIF, 1 ... 8.
   std::optional<CaptureTime> captureTime = {};
-  std::optional<EditMark> editMark = {};  ///< Of the last edit that Quenby left one for.
+  std::vector<EditMark> edits = {};  ///< Those that Quenby left marks of, in their order.
   std::vector<std::string> notices =
       {};  ///< What a user should know: "16 bits a channel, read as 8".
 };

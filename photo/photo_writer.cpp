@@ -27,7 +27,7 @@ PhotoWriter::PhotoWriter(PictureSize size, const Format& format, bool hasAlpha,
       metadata_(metadata),
       options_(std::move(options)),
       thumbnails_(size),
-      writer_(format.writer(size, hasAlpha, options_)) {
+      writer_(format.writer(size, hasAlpha, options_, metadata)) {
   expectThumbnails(thumbnails_, size, metadata, options_.keep);
 }
 

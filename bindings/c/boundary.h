@@ -74,6 +74,8 @@ inline constexpr std::size_t oldestSize<quenby_open_options> = offsetof(quenby_o
                                                                         workers);
 template <>
 inline constexpr std::size_t oldestSize<quenby_save_options> = offsetof(quenby_save_options, keep);
+template <>
+inline constexpr std::size_t oldestSize<quenby_facts> = offsetof(quenby_facts, last_edit);
 
 /// No struct of any caller is so large.
 constexpr std::size_t largestStruct = 4096;

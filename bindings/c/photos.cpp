@@ -59,13 +59,25 @@ std::set<photo::MetadataKind> kindsOf(uint32_t keep) {
   return kept;
 }
 
+std::optional<photo::ChromaSampling> samplingOf(uint32_t flags) {
+  switch (flags & (QUENBY_SUBSAMPLING_444 | QUENBY_SUBSAMPLING_422 | QUENBY_SUBSAMPLING_420)) {
+    case 0:
+      return std::nullopt;
+    case QUENBY_SUBSAMPLING_444:
+      return photo::ChromaSampling{1, 1};
+    case QUENBY_SUBSAMPLING_422:
+      return photo::ChromaSampling{2, 1};
+    case QUENBY_SUBSAMPLING_420:
+      return photo::ChromaSampling{2, 2};
+    default:
+      refuse("options", "more than one subsampling");
+  }
+}
+
 photo::SaveOptions saveOptions(const quenby_save_options* given, const quenby_cancel* cancel) {
   const quenby_save_options options = optionsOf(given, "options");
   const auto keeps = [&](uint32_t flag) { return (options.flags & flag) == 0; };
-  if (options.flags > (QUENBY_DROP_METADATA | QUENBY_DROP_LOCATION | QUENBY_DROP_THUMBNAIL |
-                       QUENBY_DROP_GAIN_MAP)) {
-    refuse("options", "unknown flags");
-  }
+  if (options.flags >= 2 * QUENBY_SUBSAMPLING_420) refuse("options", "unknown flags");
   photo::SaveOptions save{.stop = tokenOf(cancel),
                           .keep = {.location = keeps(QUENBY_DROP_LOCATION),
                                    .thumbnail = keeps(QUENBY_DROP_THUMBNAIL),
@@ -75,7 +87,13 @@ photo::SaveOptions saveOptions(const quenby_save_options* given, const quenby_ca
   }
   if (options.quality != 0) save.quality = options.quality;
   if (save.quality < 1 || save.quality > 100) refuse("quality", "is not from 1 to 100");
+  if (!keeps(QUENBY_SOURCE_QUALITY)) save.quality = photo::sourceQuality;
+  save.sampling = samplingOf(options.flags);
   return save;
+}
+
+bool wantsMark(const quenby_save_options* given) {
+  return (optionsOf(given, "options").flags & QUENBY_NO_MARK) == 0;
 }
 
 const photo::Format& formatCalled(const char* name) {
@@ -103,6 +121,7 @@ quenby_facts factsOf(const photo::PhotoFacts& from) {
     facts.utc = time.utc.value_or(unknown);
     copyText(facts.capture_time, from.captureTime->text);
   }
+  if (!from.edits.empty()) copyText(facts.last_edit, textOf(from.edits.back()));
   return facts;
 }
 
@@ -209,7 +228,8 @@ int32_t quenby_filter_file(const uint8_t* file, size_t size, const char* filter,
                                        .params = params == nullptr ? "" : params,
                                        .faces = facesOf(faces, face_count),
                                        .open = openOptions(open, cancel),
-                                       .save = saveOptions(save, cancel)};
+                                       .save = saveOptions(save, cancel),
+                                       .mark = wantsMark(save)};
     auto made = std::make_unique<quenby_file>();
     std::optional<CallersWorkers> workers;
     const quenby_open_options options = optionsOf(open, "options");

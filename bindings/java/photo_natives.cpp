@@ -1,8 +1,11 @@
 #include "bindings/java/photo_natives.h"
 
+#include <algorithm>
 #include <array>
 #include <cmath>
 #include <limits>
+#include <optional>
+#include <span>
 #include <stdexcept>
 
 #include "bindings/java/cancellations.h"
@@ -34,6 +37,37 @@ std::vector<photo::Face> facesOf(JNIEnv* env, jfloatArray array) {
   return faces;
 }
 
+std::optional<photo::ChromaSampling> samplingOf(jint subsampling) {
+  switch (subsampling) {
+    case 0:
+      return std::nullopt;
+    case 444:
+      return photo::ChromaSampling{1, 1};
+    case 422:
+      return photo::ChromaSampling{2, 1};
+    case 420:
+      return photo::ChromaSampling{2, 2};
+    default:
+      throw std::invalid_argument("subsampling: is none of 444, 422, 420");
+  }
+}
+
+void tellLosses(JNIEnv* env, const std::vector<photo::Loss>& losses, jobjectArray lost) {
+  std::string text;
+  for (const photo::Loss& loss : losses) {
+    for (std::string part : {loss.what, loss.why}) {
+      std::replace(part.begin(), part.end(), '\0', ' ');
+      text += part;
+      text += '\0';
+    }
+  }
+  const jbyteArray bytes =
+      javaArray(env, std::span(reinterpret_cast<const std::uint8_t*>(text.data()), text.size()));
+  env->SetObjectArrayElement(lost, 0, bytes);
+  env->DeleteLocalRef(bytes);
+  jni::throwCppExceptionIf(env->ExceptionCheck() != JNI_FALSE);
+}
+
 GreenCDF cdfOf(JNIEnv* env, jfloatArray array) {
   const std::vector<float> values = floatsOf(env, array);
   GreenCDF cdf;
@@ -45,16 +79,22 @@ GreenCDF cdfOf(JNIEnv* env, jfloatArray array) {
 }  // namespace
 
 jbyteArray filterBytes(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
-                       jint length, jint quality, jint rotation, jfloatArray faces, jint scale,
-                       jstring filter, jstring params, jlong cancel) {
+                       jint length, jint quality, jint subsampling, jint rotation,
+                       jfloatArray faces, jint scale, jstring filter, jstring params, jboolean mark,
+                       jlong cancel, jobjectArray lost) {
   const std::stop_token stop = cancellations().token(cancel);
-  const photo::FilterRequest request{.filter = toString(env, filter),
-                                     .params = toString(env, params),
-                                     .faces = facesOf(env, faces),
-                                     .open = {.scale = scale, .rotate = rotation, .stop = stop},
-                                     .save = {.quality = quality, .stop = stop}};
+  const photo::FilterRequest request{
+      .filter = toString(env, filter),
+      .params = toString(env, params),
+      .faces = facesOf(env, faces),
+      .open = {.scale = scale, .rotate = rotation, .stop = stop},
+      .save = {.quality = quality, .stop = stop, .sampling = samplingOf(subsampling)},
+      .mark = mark != JNI_FALSE};
   const FileBytes file(env, array, buffer, offset, length);
-  return javaArray(env, photo::filterPhoto(file.bytes(), request, photo::formatNamed("JPEG")).file);
+  const photo::FilteredPhoto made =
+      photo::filterPhoto(file.bytes(), request, photo::formatNamed("JPEG"));
+  if (lost != nullptr) tellLosses(env, made.lost, lost);
+  return javaArray(env, made.file);
 }
 
 jfloat niqe(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset, jint length,
@@ -121,7 +161,7 @@ void freeCancel(JNIEnv*, jobject, jlong handle) {
 void registerPhotoNatives() {
   const JNINativeMethod methods[] = {
       nativeMethod("filter",
-                   "([BLjava/nio/ByteBuffer;IIII[FILjava/lang/String;Ljava/lang/String;J)[B",
+                   "([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[B)[B",
                    photoNative<&filterBytes>()),
       nativeMethod("niqe", "([BLjava/nio/ByteBuffer;IIJ)F", photoNative<&niqe>()),
       nativeMethod("niqeFeatures", "([BLjava/nio/ByteBuffer;IIJ)[F",

@@ -13,11 +13,17 @@ namespace pelorin::quenby {
 // the argument, OutOfMemoryError.
 
 /// The file that `quenby enhance` makes of it, see photo::FilterRequest.
+/// @param quality      1 ... 100, or -1 for what the photo's own file seems to have.
+/// @param subsampling  444, 422 or 420; 0 for that of the photo's own file.
+/// @param mark   whether the file tells of the edit.
+/// @param lost   of one element, which receives what of the metadata is not in the file: what and
+///               why of each, in UTF-8, a zero byte behind either; may be null.
 /// @param faces  left, top, right, bottom of each as fractions of the upright, turned picture; null
 ///               is none. Those that the file knows of come with them.
 jbyteArray filterBytes(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset,
-                       jint length, jint quality, jint rotation, jfloatArray faces, jint scale,
-                       jstring filter, jstring params, jlong cancel);
+                       jint length, jint quality, jint subsampling, jint rotation,
+                       jfloatArray faces, jint scale, jstring filter, jstring params, jboolean mark,
+                       jlong cancel, jobjectArray lost);
 
 /// The NIQE score of the upright picture; NaN when a side is below 96 pixels.
 jfloat niqe(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset, jint length,

@@ -29,11 +29,13 @@ struct Work {
   SaveChoice save;
   bool inPlace = false, keepsTimes = false;
   std::uint64_t pixels = 0;                            // bytes of them that a file may keep
+  bool again = false;                                  // whatever marks a photo carries
   std::unique_ptr<photo::ThreadWorkers> workers = {};  // of all files at once; null for none
 };
 
 struct Done {
-  std::uint32_t width, height;
+  std::string earlier = {};  // the same edit, which stays the only one; nothing else is there then
+  std::uint32_t width = 0, height = 0;
   std::vector<photo::Loss> lost = {};
   std::vector<std::string> notices = {};
 };
@@ -43,12 +45,16 @@ Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter)
   work.inPlace = options.outputs.inPlace;
   work.keepsTimes = options.outputs.keepsTimes();
   work.save = {.raw = !options.raw.empty(),
-               .quality = options.quality,
+               .quality = qualityOf(options.coding, work.inPlace ? photo::sourceQuality : 90),
+               .sampling = samplingOf(options.coding),
                .keep = keepOptions(options.keep),
                .strict = options.keep.strict,
                .replace = {.mayReplace = options.outputs.overwrite || work.inPlace,
                            .keepTimes = work.inPlace && work.keepsTimes},
                .backup = options.outputs.backup};
+  work.again = options.mark.again;
+  if (!options.mark.without && !work.save.raw)
+    work.save.mark = commandMark(filter.filter.name, filter.params);
   if (work.faces.areNamed() && !filter.filter.parameters().readsFaces) {
     throw UsageError("--face: has no effect on " + filter.filter.name);
   }
@@ -66,13 +72,19 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   photo::OpenOptions open = work.photo;
   open.stop = interruptToken();
   const std::vector<std::uint8_t> bytes = readInput(file.input);
+  if (!work.again && !open.raw) {
+    const photo::PhotoFacts facts = photo::readFacts(bytes);
+    if (const photo::EditMark* mark = photo::earlierEdit(facts, work.filter.filter))
+      return {.earlier = textOf(*mark)};
+  }
   const photo::FilteredPhoto filtered =
       photo::filterPhoto(bytes,
                          {.filter = work.filter.filter.name,
                           .params = work.filter.params,
                           .faces = work.faces.of(file.input),
                           .open = open,
-                          .save = saveOptions(work.save)},
+                          .save = saveOptions(work.save),
+                          .mark = false},  // but for the one that is to be saved
                          // A name may lie; what stands in place of a photo is of its kind.
                          work.inPlace ? nullptr : &outputFormat(file.output, work.save),
                          {.pixels = work.pixels, .spare = &spare, .workers = work.workers.get()});
@@ -81,8 +93,12 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   if (!work.inPlace && work.keepsTimes && !file.input.isStandardInput()) {
     save.replace.timesOf = file.input.path;
   }
+  if (file.skipped) save.backup.clear();  // which has the first one, to which undo leads back
   writePhoto(file.output, filtered.file, filtered.lost, save);
-  return {filtered.size.width, filtered.size.height, filtered.lost, filtered.facts.notices};
+  return {.width = filtered.size.width,
+          .height = filtered.size.height,
+          .lost = filtered.lost,
+          .notices = filtered.facts.notices};
 }
 
 Json jsonOf(const std::vector<photo::Loss>& lost) {
@@ -100,8 +116,9 @@ void addFilteringOptions(Verb verb, FilterFilesOptions& options) {
       .type("DEGREES");
   verb.option("--scale", options.scale, "Decode at 1/1, 1/2, 1/4 or 1/8 of the size")
       .oneOf({"1", "2", "4", "8"});
-  addQualityOption(verb, options.quality);
+  addCodingOptions(verb, options.coding);
   addKeepOptions(verb, options.keep);
+  addMarkOptions(verb, options.mark);
   addJobsOption(verb, options.jobs);
   addThreadsOption(verb, options.threads);
   verb.option("--memory", options.memory,
@@ -166,12 +183,13 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
     work.workers = std::make_unique<photo::ThreadWorkers>(atOnce * (threads - 1) + 1);
   }
   const OutputFolders folders(plan);
-  std::size_t skipped = 0;
+  std::size_t skipped = 0, marked = 0;
   const PhotoTally tally = eachPhoto<std::optional<Done>>(
       inputs, options.jobs, talk,
       {.work = [&](std::size_t index) -> std::optional<Done> {
-         return plan[index].skipped ? std::nullopt
-                                    : std::optional(process(work, plan[index], talk));
+         const bool again = inPlace && work.again;
+         return plan[index].skipped && !again ? std::nullopt
+                                              : std::optional(process(work, plan[index], talk));
        },
        .done =
            [&](std::size_t index, const std::optional<Done>& done) {
@@ -179,6 +197,19 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
                ++skipped;
                json.add(planAsJson(plan[index], "exists"));
                if (told) told(plan[index], "exists");
+               return;
+             }
+             if (!done->earlier.empty()) {
+               ++marked;
+               talk.noteOnce(
+                   done->earlier,
+                   fmt::format("{}: {} ({}); --again does it again{}",
+                               plan[index].input.shownName(), filter.doneAlready, done->earlier,
+                               plan.size() > 1 ? " (others like it are not named)" : ""));
+               Json object = planAsJson(plan[index], "edited");
+               object["earlier"] = done->earlier;
+               json.add(object);
+               if (told) told(plan[index], "edited");
                return;
              }
              Json object = planAsJson(plan[index], "done");
@@ -201,13 +232,14 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
              json.add(object);
              if (told) told(plan[index], "failed");
            }});
-  const std::size_t done = tally.done - skipped;
+  const std::size_t done = tally.done - skipped - marked;
   const char* const whatToDo =
       inPlace ? "replaced already, as the backups tell; quenby undo puts them back"
               : "there already; --overwrite replaces them";
   if (plan.size() > 1) {
-    talk.note(fmt::format("{} of {} photos done, {} failed{}", done, plan.size(), tally.failed,
-                          skipped == 0 ? "" : fmt::format(", {} {}", skipped, whatToDo)));
+    talk.note(fmt::format("{} of {} photos done, {} failed{}{}", done, plan.size(), tally.failed,
+                          skipped == 0 ? "" : fmt::format(", {} {}", skipped, whatToDo),
+                          marked == 0 ? "" : fmt::format(", {} {}", marked, filter.doneAlready)));
   } else if (skipped > 0) {
     talk.note(plan[0].output +
               (inPlace ? ": was replaced already, as its backup tells; quenby undo puts it back"

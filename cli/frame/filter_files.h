@@ -5,11 +5,13 @@
 #include <string>
 #include <vector>
 
+#include "cli/frame/coding_option.h"
 #include "cli/frame/exit_code.h"
 #include "cli/frame/face_choice.h"
 #include "cli/frame/inputs.h"
 #include "cli/frame/jobs.h"
 #include "cli/frame/keep_option.h"
+#include "cli/frame/mark_option.h"
 #include "cli/frame/outputs.h"
 #include "cli/frame/talk.h"
 #include "cli/frame/verb.h"
@@ -22,12 +24,13 @@ struct FilterFilesOptions {
   InputOptions inputs;
   OutputOptions outputs;
   ReportOptions report;
+  CodingChoice coding;
   KeepChoice keep;
+  MarkChoice mark;
   FaceOptions faces;
   std::string raw;
   int rotate = 0;
   int scale = 1;
-  int quality = 90;
   int jobs = 0;
   int threads = usualThreads;  ///< On each file.
   int memory = 128;            ///< MiB of pixels kept, by all jobs together.
@@ -46,6 +49,7 @@ struct FilterToApply {
   const image_processing::FilterDescription& filter;
   std::string params;                         ///< As the filter reads it; already checked.
   std::map<std::string, std::string> values;  ///< For `--name`, beside {stem} and {filter}.
+  std::string doneAlready;                    ///< What is said of a photo that carries its mark.
 };
 
 /// What became of a file of a plan: "done", "exists" or "failed".

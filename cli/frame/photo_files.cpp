@@ -67,7 +67,9 @@ photo::SaveOptions saveOptions(const SaveChoice& choice) {
   return {.quality = choice.quality,
           .stop = interruptToken(),
           .keep = choice.keep,
-          .colour = choice.colour};
+          .mark = choice.mark,
+          .colour = choice.colour,
+          .sampling = choice.sampling};
 }
 
 void writePhoto(const std::string& path, std::span<const std::uint8_t> file,

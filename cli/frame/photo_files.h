@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <span>
 #include <string>
 #include <vector>
@@ -28,7 +29,9 @@ struct SaveChoice {
   const photo::Format* unnamed = &photo::usualFormat();  ///< Where the name says none.
   int quality = 90;
   photo::ColourDetail colour = photo::ColourDetail::usual;
+  std::optional<photo::ChromaSampling> sampling = {};  ///< Else as the photo's own file.
   photo::KeepOptions keep = {};
+  std::optional<photo::EditMark> mark = {};
   bool strict = false;  ///< Fail where metadata would be lost.
   photo::ReplaceOptions replace = {};
   std::string backup = {};  ///< The folder that keeps what is replaced; empty for none.

@@ -25,7 +25,8 @@ ExitCode runEnhance(const EnhanceOptions& options) {
     const image_processing::FilterParams given(params);
     if (given.items().contains("slider")) slider = given.at("slider");
   }
-  return filterFiles("enhance", options.files, {filter, params, {{"slider", slider}}});
+  return filterFiles("enhance", options.files,
+                     {filter, params, {{"slider", slider}}, "enhanced already"});
 }
 
 }  // namespace

@@ -13,6 +13,7 @@
 #include "cli/frame/number_text.h"
 #include "cli/frame/photo_files.h"
 #include "cli/frame/raw_option.h"
+#include "cli/frame/shown_text.h"
 #include "cli/verbs/histogram_chart.h"
 #include "cli/verbs/verbs.h"
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
@@ -80,6 +81,13 @@ Json jsonOf(const Input& input, const Info& info, float slider) {
     object["progressive"] = info.facts->progressive;
     object["orientation"] = info.facts->orientation;
     object["captureTime"] = info.facts->captureTime ? Json(info.facts->captureTime->text) : Json();
+    object["edits"] = Json::array();
+    for (const photo::EditMark& mark : info.facts->edits) {
+      object["edits"].push_back({{"filter", mark.filter},
+                                 {"params", mark.params},
+                                 {"version", mark.version},
+                                 {"when", mark.when.empty() ? Json() : Json(mark.when)}});
+    }
   }
   object["faces"] = Json::array();
   for (const photo::KnownFace& face : info.faces) {
@@ -109,6 +117,10 @@ void printFacts(const Info& info) {
              facts.progressive ? "progressive" : "baseline");
   fmt::print("  orientation  {}\n", facts.orientation);
   fmt::print("  taken        {}\n", facts.captureTime ? facts.captureTime->text : "unknown");
+  for (const photo::EditMark& mark : facts.edits) {
+    fmt::print("  edited       {} (Quenby {}{}{})\n", shownText(textOf(mark)),
+               shownText(mark.version), mark.when.empty() ? "" : ", ", shownText(mark.when));
+  }
   for (const photo::KnownFace& face : info.faces) {
     fmt::print("  face         {:.3f},{:.3f},{:.3f},{:.3f} {}\n", face.left, face.top, face.right,
                face.bottom, face.name);

@@ -28,7 +28,8 @@ ExitCode runLook(const LookOptions& options) {
     talk.note(fmt::format("note: '{}' is taken for {}; {} has the same display name", options.look,
                           look.name, fmt::join(others, ", ")));
   }
-  return filterFiles("look", options.files, {look, params, {{"look", look.displayName}}});
+  return filterFiles("look", options.files,
+                     {look, params, {{"look", look.displayName}}, "has the look already"});
 }
 
 }  // namespace

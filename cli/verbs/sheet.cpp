@@ -159,7 +159,7 @@ ExitCode runSheet(const SheetOptions& options) {
                    static_cast<std::uint32_t>(painter.height())},
                   /*hasAlpha=*/false,
                   // Thin text is a large part of the picture.
-                  {.quality = options.quality, .colour = photo::ColourDetail::full});
+                  {.quality = options.quality, .colour = photo::ColourDetail::full}, {});
   const auto add = [&](const Image<RGBA8Pixel>& band) {
     writer->write(band.data.get(), band.height);
   };

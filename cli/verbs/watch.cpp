@@ -214,7 +214,9 @@ class Watch {
     if (isDone) ++done_;
     if (options_.files.report.jsonLines || options_.files.report.quiet) return;
     fmt::print("{} -> {}{}\n", file.input.shownName(), shownText(file.output),
-               isDone ? "" : " (exists: left without --overwrite)");
+               isDone               ? ""
+               : status == "edited" ? " (enhanced already: not again)"
+                                    : " (exists: left without --overwrite)");
     std::fflush(stdout);
   }
 
@@ -257,7 +259,7 @@ ExitCode runWatch(const WatchOptions& options) {
   }
   photo::sweepLeftovers(results.string());
   try {
-    return Watch(options, {filter, params, {}}, folder, results).run();
+    return Watch(options, {filter, params, {}, "enhanced already"}, folder, results).run();
   } catch (const photo::LedgerInUse& error) {
     throw UsageError(error.what());
   }

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "photo/decode_limits.h"          // IWYU pragma: export
+#include "photo/jpeg/jpeg_coding.h"       // IWYU pragma: export
 #include "photo/jpeg/metadata_segment.h"  // IWYU pragma: export
 #include "photo/photo_error.h"            // IWYU pragma: export
 
@@ -24,7 +25,7 @@ struct JpegHeader {
   /// for that many channels: with 1 and 4 it does not describe decoded pixels and must not be
   /// written with them.
   int components;
-  bool progressive;
+  JpegCoding coding;
   /// In file order. Adobe segments are left out: they tell a decoder how this file is coded.
   std::vector<MetadataSegment> metadata;
 };

@@ -44,20 +44,24 @@ std::size_t expectedSize(std::uint32_t width, std::uint32_t height) {
 
 }  // namespace
 
-JpegPictureWriter::JpegPictureWriter(std::uint32_t width, std::uint32_t height, int quality,
-                                     std::span<const MetadataSegment> metadata, Chroma chroma)
+JpegPictureWriter::JpegPictureWriter(std::uint32_t width, std::uint32_t height,
+                                     const JpegMaking& making,
+                                     std::span<const MetadataSegment> metadata)
     : writer_(expectedSize(width, height)) {
   for (const MetadataSegment& segment : metadata) checkSegment(segment);
   jpeg_compress_struct& codec = writer_.codec();
   writer_.run([&] {
     codec.image_width = width;
     codec.image_height = height;
-    codec.input_components = 4;
-    codec.in_color_space = JCS_EXT_RGBA;
+    codec.input_components = making.grey ? 1 : 4;
+    codec.in_color_space = making.grey ? JCS_GRAYSCALE : JCS_EXT_RGBA;
     jpeg_set_defaults(&codec);
-    jpeg_set_quality(&codec, quality, TRUE);
-    if (chroma == Chroma::whole)
-      codec.comp_info[0].h_samp_factor = codec.comp_info[0].v_samp_factor = 1;
+    jpeg_set_quality(&codec, making.quality, TRUE);
+    if (!making.grey) {
+      codec.comp_info[0].h_samp_factor = making.sampling.across;
+      codec.comp_info[0].v_samp_factor = making.sampling.down;
+    }
+    if (making.progressive) jpeg_simple_progression(&codec);
     codec.write_JFIF_header = std::none_of(metadata.begin(), metadata.end(), tellsTheFileFormat);
     jpeg_start_compress(&codec, TRUE);
     for (const MetadataSegment& segment : metadata) {
@@ -67,9 +71,11 @@ JpegPictureWriter::JpegPictureWriter(std::uint32_t width, std::uint32_t height, 
   });
 }
 
-void JpegPictureWriter::write(const std::uint8_t* rgba, std::uint32_t count) {
+void JpegPictureWriter::write(const std::uint8_t* pixels, std::uint32_t count) {
   jpeg_compress_struct& codec = writer_.codec();
   const JDIMENSION first = codec.next_scanline;
+  const std::size_t rowSize =
+      std::size_t{codec.image_width} * static_cast<unsigned>(codec.input_components);
   writer_.run([&] {
     std::array<JSAMPROW, 16> rows;
     while (codec.next_scanline < first + count) {
@@ -77,7 +83,7 @@ void JpegPictureWriter::write(const std::uint8_t* rgba, std::uint32_t count) {
           std::min<JDIMENSION>(rows.size(), first + count - codec.next_scanline);
       for (JDIMENSION i = 0; i < some; ++i) {
         const std::size_t y = codec.next_scanline - first + i;
-        rows[i] = const_cast<JSAMPROW>(rgba + y * codec.image_width * 4);  // libjpeg only reads
+        rows[i] = const_cast<JSAMPROW>(pixels + y * rowSize);  // libjpeg only reads
       }
       jpeg_write_scanlines(&codec, rows.data(), some);
     }
@@ -107,7 +113,9 @@ void insertSegments(std::vector<std::uint8_t>& file, std::span<const MetadataSeg
 std::vector<std::uint8_t> encodeJpeg(const std::uint8_t* rgba, std::uint32_t width,
                                      std::uint32_t height, int quality,
                                      std::span<const MetadataSegment> metadata, Chroma chroma) {
-  JpegPictureWriter writer(width, height, quality, metadata, chroma);
+  const ChromaSampling sampling =
+      chroma == Chroma::whole ? ChromaSampling{1, 1} : ChromaSampling{2, 2};
+  JpegPictureWriter writer(width, height, {.quality = quality, .sampling = sampling}, metadata);
   writer.write(rgba, height);
   return writer.finish();
 }

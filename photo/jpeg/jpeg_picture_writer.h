@@ -9,14 +9,23 @@
 
 namespace pelorin::photo {
 
-/// A JPEG file that is made of rows of RGBA, as `encodeJpeg` makes it.
+/// How a JPEG file is to be made.
+struct JpegMaking {
+  int quality = 90;  ///< 1 ... 100; what lies outside counts as the nearer end.
+  ChromaSampling sampling = {};
+  bool progressive = false;
+  bool grey = false;  ///< Of one channel.
+};
+
+/// A JPEG file that is made of rows, as `encodeJpeg` makes it.
 class JpegPictureWriter {
  public:
-  JpegPictureWriter(std::uint32_t width, std::uint32_t height, int quality,
-                    std::span<const MetadataSegment> metadata, Chroma chroma = Chroma::halved);
+  JpegPictureWriter(std::uint32_t width, std::uint32_t height, const JpegMaking& making,
+                    std::span<const MetadataSegment> metadata);
 
-  /// The next `count` rows, back to back; no more than the picture has.
-  void write(const std::uint8_t* rgba, std::uint32_t count);
+  /// The next `count` rows, back to back; no more than the picture has. RGBA, or of a grey file a
+  /// byte for each pixel.
+  void write(const std::uint8_t* pixels, std::uint32_t count);
 
   /// The file, once, after the last row.
   std::vector<std::uint8_t> finish();

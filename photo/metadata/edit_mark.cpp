@@ -17,9 +17,10 @@ constexpr XmpName history = {"http://ns.adobe.com/xap/1.0/mm/", "History"};
 constexpr std::string_view eventFields = "http://ns.adobe.com/xap/1.0/sType/ResourceEvent#";
 
 std::vector<XmpField> fieldsOf(const EditMark& mark) {
-  std::vector<XmpField> fields = {{"action", "edited"},
-                                  {"softwareAgent", std::string(agent) + mark.version},
-                                  {"parameters", mark.parameters}};
+  std::vector<XmpField> fields = {
+      {"action", "edited"},
+      {"softwareAgent", std::string(agent) + mark.version},
+      {"parameters", mark.params.empty() ? mark.filter : mark.filter + " " + mark.params}};
   if (!mark.when.empty()) fields.push_back({"when", mark.when});
   return fields;
 }
@@ -71,9 +72,9 @@ void addEditMark(std::vector<MetadataSegment>& segments, const EditMark& mark,
                             {reinterpret_cast<const std::uint8_t*>(bytes.data()), bytes.size()}));
 }
 
-std::optional<EditMark> editMarkOf(std::span<const MetadataSegment> segments) {
-  if (std::none_of(segments.begin(), segments.end(), mayTell)) return std::nullopt;
-  std::optional<EditMark> mark;
+std::vector<EditMark> editMarksOf(std::span<const MetadataSegment> segments) {
+  std::vector<EditMark> marks;
+  if (std::none_of(segments.begin(), segments.end(), mayTell)) return marks;
   std::vector<MetadataSegment> unchanged(segments.begin(), segments.end());
   std::vector<Loss> unreadable;
   editXmp(
@@ -86,12 +87,30 @@ std::optional<EditMark> editMarkOf(std::span<const MetadataSegment> segments) {
             };
             const std::string software = text("softwareAgent");
             if (!software.starts_with(agent)) continue;
-            mark = {software.substr(agent.size()), text("parameters"), text("when")};
+            const std::string parameters = text("parameters");
+            const std::size_t space = std::min(parameters.find(' '), parameters.size());
+            marks.push_back({software.substr(agent.size()), parameters.substr(0, space),
+                             parameters.substr(std::min(space + 1, parameters.size())),
+                             text("when")});
           }
         }
       },
       unreadable);
-  return mark;
+  return marks;
+}
+
+std::string textOf(const EditMark& mark) {
+  std::string text = mark.filter;
+  for (std::string_view rest = mark.params; !rest.empty();) {
+    const std::size_t end = std::min(rest.find(';'), rest.size());
+    std::string item(rest.substr(0, end));
+    rest.remove_prefix(std::min(end + 1, rest.size()));
+    if (item.empty()) continue;
+    std::replace(item.begin(), item.end(), '=', ' ');
+    text += ", ";
+    text += item;
+  }
+  return text;
 }
 
 }  // namespace pelorin::photo

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <optional>
 #include <span>
 #include <string>
 #include <vector>
@@ -13,9 +12,10 @@ namespace pelorin::photo {
 /// What Quenby did to a photo, as its XMP tells it: an event of xmpMM:History with the action
 /// "edited". Texts are UTF-8.
 struct EditMark {
-  std::string version;     ///< Of Quenby, as in the software agent "Quenby 1.2".
-  std::string parameters;  ///< "AE0 slider=0.4"
-  std::string when;        ///< ISO 8601; empty where it is not stated.
+  std::string version;  ///< Of Quenby, as in the software agent "Quenby 1.2".
+  std::string filter;  ///< Its name in the registry, "AE0"; it and what follows are the parameters.
+  std::string params;  ///< "slider=0.4;gtmOnly=true"
+  std::string when = {};  ///< ISO 8601; empty where it is not stated.
 
   friend bool operator==(const EditMark&, const EditMark&) = default;
 };
@@ -25,8 +25,10 @@ struct EditMark {
 void addEditMark(std::vector<MetadataSegment>& segments, const EditMark& mark,
                  std::vector<Loss>& lost);
 
-/// The last mark of Quenby's in the history that the segments tell; nothing where there is none.
-/// Any bytes are safe.
-std::optional<EditMark> editMarkOf(std::span<const MetadataSegment> segments);
+/// The marks of Quenby's in the history that the segments tell, in its order. Any bytes are safe.
+std::vector<EditMark> editMarksOf(std::span<const MetadataSegment> segments);
+
+/// For a user: "AE0, slider 0.4".
+std::string textOf(const EditMark& mark);
 
 }  // namespace pelorin::photo

@@ -1,9 +1,11 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <vector>
 
+#include "photo/jpeg/jpeg_coding.h"
 #include "photo/jpeg/metadata_segment.h"
 #include "photo/picture_size.h"
 #include "photo/turn.h"
@@ -29,6 +31,8 @@ struct Metadata {
   PictureSize storedSize = {};
   int orientation = 1;  ///< EXIF, 1 ... 8.
   Turn turn = {};       ///< From the stored picture to the decoded one.
+  /// Of a JPEG file; another one that is made of the photo is coded likewise.
+  std::optional<JpegCoding> coding = {};
 };
 
 }  // namespace pelorin::photo

@@ -9,13 +9,13 @@
 
 namespace pelorin::photo {
 
-/// What its segments say of a photo: orientation, capture time, that it was edited.
+/// What its segments say of a photo: orientation, capture time, how Quenby edited it.
 inline void addStatedFacts(std::span<const MetadataSegment> metadata, PhotoFacts& facts) {
   if (const MetadataSegment* exif = firstExif(metadata)) {
     facts.orientation = exifOrientation(exif->payload);
     facts.captureTime = exifCaptureTime(exif->payload);
   }
-  facts.editMark = editMarkOf(metadata);
+  facts.edits = editMarksOf(metadata);
 }
 
 }  // namespace pelorin::photo

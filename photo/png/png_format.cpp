@@ -347,8 +347,8 @@ constinit const Format pngFormat = {
     .reader = [](std::span<const std::uint8_t> file, const OpenOptions& options)
         -> std::unique_ptr<RowReader> { return std::make_unique<PngRowReader>(file, options); },
     .removeForeign = removeWhatPngLacks,
-    .writer = [](PictureSize size, bool hasAlpha,
-                 const SaveOptions& options) -> std::unique_ptr<RowWriter> {
+    .writer = [](PictureSize size, bool hasAlpha, const SaveOptions& options,
+                 const Metadata&) -> std::unique_ptr<RowWriter> {
       return std::make_unique<PngRowWriter>(size, hasAlpha, options);
     },
 };

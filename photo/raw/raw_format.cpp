@@ -76,9 +76,8 @@ constinit const Format rawFormat = {
     .reader = [](std::span<const std::uint8_t> file, const OpenOptions& options)
         -> std::unique_ptr<RowReader> { return std::make_unique<RawReader>(file, options); },
     .removeForeign = [](KeptMetadata& kept) { kept = {}; },  // nothing but pixels is what they are
-    .writer = [](PictureSize size, bool, const SaveOptions&) -> std::unique_ptr<RowWriter> {
-      return std::make_unique<RawWriter>(size);
-    },
+    .writer = [](PictureSize size, bool, const SaveOptions&, const Metadata&)
+        -> std::unique_ptr<RowWriter> { return std::make_unique<RawWriter>(size); },
 };
 
 }  // namespace pelorin::photo

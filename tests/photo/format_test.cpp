@@ -152,7 +152,7 @@ TEST(FormatTable, ReadsRowsOfAnyNumberAtATimeAsTheWholePicture) {
 TEST(FormatTable, WritesRowsOfAnyNumberAtATimeAsTheWholePicture) {
   const auto picture = test_support::noisePicture(40, 50, 2);
   for (const Format& format : formats()) {
-    const auto writer = format.writer({40, 50}, true, {});
+    const auto writer = format.writer({40, 50}, true, {}, {});
     for (std::uint32_t y = 0; y < 50;) {
       const std::uint32_t count = std::min(1 + y % 7, 50 - y);
       writer->write(picture.row(y), count);

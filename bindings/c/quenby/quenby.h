@@ -212,7 +212,13 @@ enum {
   QUENBY_DROP_METADATA = 1u, /**< All but the colour profile. */
   QUENBY_DROP_LOCATION = 2u,
   QUENBY_DROP_THUMBNAIL = 4u,
-  QUENBY_DROP_GAIN_MAP = 8u
+  QUENBY_DROP_GAIN_MAP = 8u,
+  QUENBY_NO_MARK = 16u,        /**< quenby_filter_file: the file does not tell of the edit. */
+  QUENBY_SOURCE_QUALITY = 32u, /**< Whatever `quality`: what the photo's own file seems to have. */
+  QUENBY_SUBSAMPLING_444 =
+      64u, /**< Of a JPEG file, one of the three; else as in the photo's own, */
+  QUENBY_SUBSAMPLING_422 = 128u, /**< and 4:2:0 where there is none. */
+  QUENBY_SUBSAMPLING_420 = 256u
 };
 
 /** Bits of quenby_save_options.keep. */
@@ -244,6 +250,7 @@ typedef struct quenby_facts {
   double utc;            /**< ... and in UTC; NaN where it is not known. */
   char format[16];       /**< "JPEG" */
   char capture_time[64]; /**< "2024-05-01T12:30:45+02:00", empty where it is not known. */
+  char last_edit[96];    /**< By Quenby, as the file tells: "AE0, slider 0.4"; empty without one. */
 } quenby_facts;
 
 /** A face that a file knows of, in fractions of the upright picture. */
@@ -312,7 +319,8 @@ QUENBY_API int32_t quenby_write(const quenby_pixels* pixels, const char* format,
                                 const quenby_save_options* options, const quenby_cancel* cancel,
                                 quenby_file** file, quenby_error* error);
 
-/** The file that `quenby enhance` makes: opened, turned upright, filtered, saved with its metadata.
+/** The file that `quenby enhance` makes: opened, turned upright, filtered, saved with its metadata
+ * and a mark that tells of the edit. A photo that carries such a mark is edited all the same.
  * @param params        may be null for none.
  * @param faces         beside those that the file knows of; null for none.
  * @param open, save    may be null.

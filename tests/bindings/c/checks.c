@@ -32,7 +32,8 @@ quenby_pixels made_pixels(uint32_t width, uint32_t height, unsigned seed) {
     for (uint32_t x = 0; x < width; ++x) {
       uint8_t* const pixel = rgba + 4 * ((size_t)y * width + x);
       noise = noise * 1664525u + 1013904223u;
-      const unsigned light = 40 + 120 * x / width + (x / 12 % 2) * (y / 12 % 2) * 40 + (noise >> 28);
+      const unsigned light =
+          40 + 120 * x / width + (x / 12 % 2) * (y / 12 % 2) * 40 + (noise >> 28);
       pixel[0] = (uint8_t)light;
       pixel[1] = (uint8_t)(light / 2 + 90 * y / height);
       pixel[2] = (uint8_t)(200 - light / 2);

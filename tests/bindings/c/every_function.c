@@ -105,6 +105,16 @@ static void files(struct bytes photo) {
   same_file(made, by_command("enhance --filter AE08bit", "whole.png"));
   quenby_file_free(made);
 
+  const quenby_save_options like = {.struct_size = sizeof(like),
+                                    .flags = QUENBY_SOURCE_QUALITY | QUENBY_SUBSAMPLING_422};
+  DONE(quenby_filter_file(photo.data, photo.size, "AE0", "slider=0.4;", NULL, 0, NULL, NULL, &like,
+                          NULL, &made, &error));
+  same_file(made, by_command("enhance --quality auto --subsampling 422", "like.jpg"));
+  quenby_facts facts = {.struct_size = sizeof(facts)};
+  DONE(quenby_read_facts(quenby_file_data(made), quenby_file_size(made), &facts, &error));
+  CHECK(strcmp(facts.last_edit, "AE0, slider 0.4") == 0);
+  quenby_file_free(made);
+
   const uint8_t transparent[] = {1, 2, 3, 4};
   const quenby_pixels pixel = {transparent, 1, 1, 4};
   quenby_loss loss = {.struct_size = sizeof(loss)};
@@ -147,8 +157,9 @@ static void photos(struct bytes file) {
   quenby_file *stepwise = NULL, *at_once = NULL;
   const quenby_pixels filtered = {out, pixels.width, pixels.height, pixels.stride};
   DONE(quenby_photo_save(photo, &filtered, NULL, NULL, NULL, &stepwise, &error));
-  DONE(quenby_filter_file(file.data, file.size, "AE0", "slider=0.4;", NULL, 0, NULL, NULL, NULL,
-                          NULL, &at_once, &error));
+  const quenby_save_options unmarked = {.struct_size = sizeof(unmarked), .flags = QUENBY_NO_MARK};
+  DONE(quenby_filter_file(file.data, file.size, "AE0", "slider=0.4;", NULL, 0, NULL, NULL,
+                          &unmarked, NULL, &at_once, &error));
   CHECK(quenby_file_size(stepwise) == quenby_file_size(at_once) &&
         memcmp(quenby_file_data(stepwise), quenby_file_data(at_once), quenby_file_size(at_once)) ==
             0);

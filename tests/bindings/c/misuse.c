@@ -183,13 +183,15 @@ static void files(struct bytes photo) {
 
   DONE(quenby_photo_open(photo.data, photo.size, NULL, NULL, &made, &error));
   const size_t save_size = sizeof(quenby_save_options);
-  const quenby_save_options save[] = {{.struct_size = 0},
-                                      {.struct_size = SIZE_MAX},
-                                      {.struct_size = save_size, .quality = -1},
-                                      {.struct_size = save_size, .quality = 101},
-                                      {.struct_size = save_size, .quality = INT_MIN},
-                                      {.struct_size = save_size, .flags = 16},
-                                      {.struct_size = save_size, .keep = 64}};
+  const quenby_save_options save[] = {
+      {.struct_size = 0},
+      {.struct_size = SIZE_MAX},
+      {.struct_size = save_size, .quality = -1},
+      {.struct_size = save_size, .quality = 101},
+      {.struct_size = save_size, .quality = INT_MIN},
+      {.struct_size = save_size, .flags = 512},
+      {.struct_size = save_size, .flags = QUENBY_SUBSAMPLING_422 | QUENBY_SUBSAMPLING_444},
+      {.struct_size = save_size, .keep = 64}};
   for (size_t i = 0; i < sizeof(save) / sizeof(*save); ++i)
     save_options_of_every_function(photo, made, save[i]);
 

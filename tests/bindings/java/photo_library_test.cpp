@@ -25,7 +25,7 @@ class PhotoLibrary : public testing::Test {
     using Filter = jbyteArray (*)(JNIEnv*, jobject, jbyteArray, jobject, jint, jint, jint, jint,
                                   jfloatArray, jint, jstring, jstring, jlong);
     const auto filter = reinterpret_cast<Filter>(FakeEnvironment::registered().at(
-        "filter([BLjava/nio/ByteBuffer;IIII[FILjava/lang/String;Ljava/lang/String;J)[B"));
+        "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[B)[B"));
     FakeObject array{.bytes = file}, name{.text = "AE0"}, params{.text = "slider=0.4;"};
     const jbyteArray made =
         filter(&env, nullptr, reinterpret_cast<jbyteArray>(&array), nullptr, 0,

@@ -63,6 +63,19 @@ TEST_F(PhotoNativesBesideTheCommand, GiveTheFileThatTheCommandWrites) {
   }
 }
 
+TEST_F(PhotoNativesBesideTheCommand, CodeAndMarkTheFileAsTheyAreTold) {
+  const Finished run =
+      quenby({"enhance", "-", "-o", "-", "--quality", "auto", "--subsampling", "422", "--no-mark"},
+             file.bytes);
+  ASSERT_EQ(run.exitCode, 0) << run.errors;
+  EXPECT_EQ(calls.filter(file, nullptr, 0, static_cast<jint>(file.bytes.size()), -1, 0, nullptr, 1,
+                         ae, slider, 0, 422, JNI_FALSE),
+            Bytes(run.output.begin(), run.output.end()));
+  calls.filter(file, nullptr, 0, static_cast<jint>(file.bytes.size()), 90, 0, nullptr, 1, ae,
+               slider, 0, 411);
+  EXPECT_NE(env.takeException().find("subsampling"), std::string::npos);
+}
+
 TEST_F(PhotoNativesBesideTheCommand, TakeCareOfFacesThatTheFileKnowsOf) {
   const std::string packet = xmpPacket(
       "<rdf:Description><mwg-rs:Regions rdf:parseType='Resource'><mwg-rs:AppliedToDimensions "

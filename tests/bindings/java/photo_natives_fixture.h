@@ -38,6 +38,16 @@ struct FakeFloats : FakeObject {
   operator jfloatArray() { return reinterpret_cast<jfloatArray>(static_cast<FakeObject*>(this)); }
 };
 
+/// An array of one array of bytes.
+struct FakeSlot : FakeObject {
+  FakeSlot() {
+    content.bytes.reserve(1024);
+    elements = {&content};
+  }
+  FakeObject content;
+  operator jobjectArray() { return reinterpret_cast<jobjectArray>(static_cast<FakeObject*>(this)); }
+};
+
 /// The natives as Java calls them, in one environment.
 struct PhotoCalls {
   FakeEnvironment& env;
@@ -59,10 +69,12 @@ struct PhotoCalls {
 
   Bytes filter(jbyteArray array, jobject buffer, jint offset, jint length, jint quality,
                jint rotation, jfloatArray faces, jint scale, jstring name, jstring params,
-               jlong cancel) const {
+               jlong cancel, jint subsampling = 0, jboolean mark = JNI_TRUE,
+               jobjectArray lost = nullptr) const {
     const FakeObject* const made = taken(call<jbyteArray>(
-        "filter([BLjava/nio/ByteBuffer;IIII[FILjava/lang/String;Ljava/lang/String;J)[B", array,
-        buffer, offset, length, quality, rotation, faces, scale, name, params, cancel));
+        "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[B)[B", array,
+        buffer, offset, length, quality, subsampling, rotation, faces, scale, name, params, mark,
+        cancel, lost));
     return made == nullptr ? Bytes() : made->bytes;
   }
 

@@ -211,6 +211,19 @@ TEST_F(PhotoNatives, ServeEightThreadsWithTheSameBytes) {
   for (std::thread& thread : threads) thread.join();
 }
 
+TEST_F(PhotoNatives, TellWhatOfTheMetadataIsLost) {
+  Bytes two = file.bytes;
+  const Bytes second = smallJpeg();
+  two.insert(two.end(), second.begin(), second.end());
+  FakeBytes from(two);
+  FakeSlot lost;
+  calls.filter(from, nullptr, 0, static_cast<jint>(two.size()), 90, 0, nullptr, 1, ae, slider, 0, 0,
+               JNI_TRUE, lost);
+  const Bytes& told = lost.content.bytes;
+  EXPECT_EQ(std::string(told.begin(), told.end()),
+            std::string("second picture\0shows the picture as it was\0", 43));
+}
+
 class PhotoNativesUnderFaults : public PhotoNatives {
  protected:
   using Native = std::function<void()>;
@@ -223,29 +236,32 @@ class PhotoNativesUnderFaults : public PhotoNatives {
             calls.call<jobject>(nameAndSignature, array(), jobject{}, jint{0}, size(), jlong{0}));
       };
     };
-    return {[this] {
-              env.DeleteLocalRef(calls.call<jobject>(
-                  "filter([BLjava/nio/ByteBuffer;IIII[FILjava/lang/String;Ljava/lang/String;J)[B",
-                  array(), jobject{}, jint{0}, size(), jint{90}, jint{90},
-                  static_cast<jfloatArray>(faces), jint{1}, static_cast<jstring>(ae),
-                  static_cast<jstring>(slider), jlong{0}));
-            },
-            [this] {
-              calls.call<jfloat>("niqe([BLjava/nio/ByteBuffer;IIJ)F", array(), jobject{}, jint{0},
-                                 size(), jlong{0});
-            },
-            measured("niqeFeatures([BLjava/nio/ByteBuffer;IIJ)[F"),
-            measured("greenCdf([BLjava/nio/ByteBuffer;IIJ)[F"),
-            [this] {
-              env.DeleteLocalRef(calls.call<jobject>("facts([BLjava/nio/ByteBuffer;II)[D", array(),
-                                                     jobject{}, jint{0}, size()));
-            }};
+    return {
+        [this] {
+          env.DeleteLocalRef(calls.call<jobject>(
+              "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[B)[B",
+              array(), jobject{}, jint{0}, size(), jint{90}, jint{0}, jint{90},
+              static_cast<jfloatArray>(faces), jint{1}, static_cast<jstring>(ae),
+              static_cast<jstring>(slider), jboolean{JNI_TRUE}, jlong{0},
+              static_cast<jobjectArray>(lost)));
+        },
+        [this] {
+          calls.call<jfloat>("niqe([BLjava/nio/ByteBuffer;IIJ)F", array(), jobject{}, jint{0},
+                             size(), jlong{0});
+        },
+        measured("niqeFeatures([BLjava/nio/ByteBuffer;IIJ)[F"),
+        measured("greenCdf([BLjava/nio/ByteBuffer;IIJ)[F"),
+        [this] {
+          env.DeleteLocalRef(calls.call<jobject>("facts([BLjava/nio/ByteBuffer;II)[D", array(),
+                                                 jobject{}, jint{0}, size()));
+        }};
   }
 
   jbyteArray array() { return small; }
   jint size() const { return static_cast<jint>(small.bytes.size()); }
 
   FakeFloats faces{std::vector<float>{0.1f, 0.2f, 0.5f, 0.6f}};
+  FakeSlot lost;
   FakeBytes small{jpegOf(photoLikePicture(100, 98, 2))};
 };
 

@@ -50,7 +50,17 @@ def test_looks_and_png_are_those_of_the_command(quenby_command, photo, png, tmp_
 
 def test_the_steps_give_the_same_file(photo):
     opened = quenby.read(photo)
-    assert quenby.encode(quenby.enhance(opened), like=opened) == quenby.enhance_file(photo, None)[0]
+    made = quenby.enhance_file(photo, None, mark=False)[0]
+    assert quenby.encode(quenby.enhance(opened), like=opened) == made
+
+
+def test_files_are_coded_and_marked_as_they_are_told(quenby_command, photo, tmp_path):
+    coded = ["--quality", "auto", "--subsampling", "422"]
+    quenby_command("enhance", photo, "-o", tmp_path / "wanted.jpg", *coded)
+    made = quenby.enhance_file(photo, None, quality="auto", subsampling=422)[0]
+    assert made == (tmp_path / "wanted.jpg").read_bytes()
+    assert quenby.facts(made).last_edit == "AE0, slider 0.4"
+    assert quenby.facts(photo).last_edit is None
 
 
 def test_read_tells_what_a_file_says(photo):

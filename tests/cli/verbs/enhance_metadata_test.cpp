@@ -43,7 +43,8 @@ TEST(KeptMetadata, IsTheSameByteForByteButForTheOrientation) {
   for (const bool littleEndian : {false, true}) {
     const std::string in =
         folder.write("a.jpg", jpegOf(photoLikePicture(48, 32, 1), cameraSegments(6, littleEndian)));
-    const Finished run = quenby({"enhance", in, "-o", folder / "b.jpg", "--overwrite"});
+    const Finished run =
+        quenby({"enhance", in, "-o", folder / "b.jpg", "--overwrite", "--no-mark"});
     EXPECT_EQ(run.exitCode, 0) << run.errors;
     expectSegments(folder.read("b.jpg"), cameraSegments(1, littleEndian));
   }
@@ -55,7 +56,7 @@ TEST(KeptMetadata, OfACmykFileHasNoColourProfile) {
   const Bytes cmyk = makeJpeg(
       {.width = 40, .height = 30, .samples = JCS_CMYK, .stored = JCS_CMYK, .metadata = segments});
   const std::string in = folder.write("a.jpg", cmyk);
-  const Finished run = quenby({"enhance", in, "-o", folder / "b.jpg"});
+  const Finished run = quenby({"enhance", in, "-o", folder / "b.jpg", "--no-mark"});
   EXPECT_EQ(run.exitCode, 0) << run.errors;
   EXPECT_THAT(run.errors, testing::HasSubstr("is CMYK, converted to sRGB"));
   segments.erase(segments.begin() + 2);
@@ -68,7 +69,7 @@ TEST(KeptMetadata, SurvivesADamagedExifSegment) {
   exif[10] = 0xFF;  // the first directory lies far away
   exif[11] = 0xFF;
   const std::string in = folder.write("a.jpg", jpegOf(photoLikePicture(48, 32, 1), {{0xE1, exif}}));
-  EXPECT_EQ(quenby({"enhance", in, "-o", folder / "b.jpg"}).exitCode, 0);
+  EXPECT_EQ(quenby({"enhance", in, "-o", folder / "b.jpg", "--no-mark"}).exitCode, 0);
   expectSegments(folder.read("b.jpg"), {{0xE1, exif}});
   EXPECT_EQ(decoded(folder.read("b.jpg")).width, 48u);
 }
@@ -92,14 +93,16 @@ TEST(KeptMetadata, GoesWhereItIsStripped) {
   const TemporaryFolder folder;
   const std::string in =
       folder.write("a.jpg", jpegOf(photoLikePicture(48, 32, 1), cameraSegments(6, true)));
-  const Finished all =
-      quenby({"enhance", in, "-o", folder / "b.jpg", "--strip", "all", "--strict-metadata"});
+  const Finished all = quenby(
+      {"enhance", in, "-o", folder / "b.jpg", "--strip", "all", "--strict-metadata", "--no-mark"});
   EXPECT_EQ(all.exitCode, 0) << all.errors;
   const auto left = photo::readJpegHeader(folder.read("b.jpg")).metadata;
   ASSERT_EQ(left.size(), 2u);  // JFIF and the colour profile
   EXPECT_EQ(left[1].payload, colourProfile());
   EXPECT_EQ(quenby({"enhance", in, "-o", folder / "c.jpg", "--strip", "everything"}).exitCode, 2);
-  EXPECT_EQ(quenby({"enhance", in, "-o", folder / "c.jpg", "--keep", "time,iptc"}).exitCode, 0);
+  EXPECT_EQ(
+      quenby({"enhance", in, "-o", folder / "c.jpg", "--keep", "time,iptc", "--no-mark"}).exitCode,
+      0);
   const auto kept = photo::readJpegHeader(folder.read("c.jpg")).metadata;
   ASSERT_EQ(kept.size(), 3u);
   EXPECT_EQ(photo::exifCaptureTime(kept[0].payload)->text,
@@ -116,8 +119,8 @@ TEST(Upright, IsEveryOneOfTheEightOrientations) {
     const std::vector<MetadataSegment> segments = cameraSegments(orientation, true);
     const Bytes file = jpegOf(photoLikePicture(48, 32, 1), segments);
     const std::string in = folder.write("a.jpg", file);
-    const Finished run =
-        quenby({"enhance", in, "-o", folder / "b.jpg", "--overwrite", "--filter", "PassThrough"});
+    const Finished run = quenby({"enhance", in, "-o", folder / "b.jpg", "--overwrite", "--no-mark",
+                                 "--filter", "PassThrough"});
     EXPECT_EQ(run.exitCode, 0) << run.errors;
 
     const Image<RGBA8Pixel> stored = decoded(file);

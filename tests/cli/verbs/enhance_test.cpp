@@ -53,7 +53,8 @@ TEST(Enhance, WritesWhatTheEngineGives) {
       {{"--scale", "2"}, enhancedDirectly(file, "AE0", "slider=0.4;", 90, 2)},
   };
   for (const Case& c : cases) {
-    std::vector<std::string> arguments = {"enhance", in, "-o", folder / "out.jpg", "--overwrite"};
+    std::vector<std::string> arguments = {"enhance",     in,         "-o", folder / "out.jpg",
+                                          "--overwrite", "--no-mark"};
     arguments.insert(arguments.end(), c.options.begin(), c.options.end());
     const Finished run = quenby(arguments);
     EXPECT_EQ(run.exitCode, 0) << run.errors;
@@ -73,7 +74,7 @@ TEST(Enhance, LeavesTheInputAlone) {
 
 TEST(Enhance, ReadsAndWritesStandardStreams) {
   const Bytes file = smallJpeg();
-  const Finished run = quenby({"enhance", "-", "-o", "-"}, file);
+  const Finished run = quenby({"enhance", "-", "-o", "-", "--no-mark"}, file);
   EXPECT_EQ(run.exitCode, 0) << run.errors;
   const Bytes expected = enhancedDirectly(file, "AE0", "slider=0.4;");
   EXPECT_TRUE(run.output == std::string(expected.begin(), expected.end()));
@@ -100,7 +101,7 @@ TEST(Enhance, GivesTheSameFilesHoweverManyAtOnce) {
   for (int jobs = 1; jobs <= 2; ++jobs) {
     runs[jobs - 1] =
         quenby({"enhance", "-r", folder / "in", "-o", folder / (jobs == 1 ? "one" : "two"), "-j",
-                std::to_string(jobs), "--name", "{stem}.jpg"});
+                std::to_string(jobs), "--name", "{stem}.jpg", "--no-mark"});
   }
   EXPECT_EQ(runs[0].exitCode, 1);
   EXPECT_EQ(runs[1].exitCode, 1);
@@ -188,8 +189,8 @@ TEST(Enhance, ReportsAsOneJsonObjectForOneFileAndALineEachWithJsonl) {
 TEST(Enhance, WarnsOfParametersThatReadOtherwiseThanTheyLook) {
   const TemporaryFolder folder;
   const std::string in = folder.write("a.jpg", smallJpeg());
-  const Finished run =
-      quenby({"enhance", in, "-o", folder / "b.jpg", "--params", "slider=0.4;gtmOnly=1;"});
+  const Finished run = quenby(
+      {"enhance", in, "-o", folder / "b.jpg", "--params", "slider=0.4;gtmOnly=1;", "--no-mark"});
   EXPECT_EQ(run.exitCode, 0);
   EXPECT_THAT(run.errors,
               HasSubstr("note: --params: gtmOnly of AE0 wants true or false; '1' counts as false"));

@@ -299,7 +299,7 @@ TEST(Outputs, MayReplaceTheirOwnInputOnlyOnRequest) {
     EXPECT_THAT(run.errors, HasSubstr("is the input itself; add --overwrite"));
   }
   EXPECT_EQ(folder.read("a.jpg"), file);
-  EXPECT_EQ(enhance({in, "-o", in, "--overwrite"}).exitCode, 0);
+  EXPECT_EQ(enhance({in, "-o", in, "--overwrite", "--no-mark"}).exitCode, 0);
   EXPECT_EQ(folder.read("a.jpg"), jpegOf(decoded(file)));
 }
 
@@ -347,7 +347,7 @@ TEST(Outputs, MayReplaceOneOfTwoNamesOfAFile) {
   const Bytes file = smallJpeg();
   const std::string a = folder.write("a.jpg", file);
   std::filesystem::create_hard_link(a, folder / "b.jpg");
-  EXPECT_EQ(enhance({a, "-o", folder / "b.jpg", "--overwrite"}).exitCode, 0);
+  EXPECT_EQ(enhance({a, "-o", folder / "b.jpg", "--overwrite", "--no-mark"}).exitCode, 0);
   EXPECT_EQ(folder.read("a.jpg"), file);
   EXPECT_EQ(folder.read("b.jpg"), jpegOf(decoded(file)));
 }

@@ -99,7 +99,8 @@ TEST(LookVerb, WritesJpegFilesOfAFolderUnderTheNameOfTheLook) {
   folder.write("in/a.jpg", smallJpeg(1));
   folder.write("in/deep/b.jpg", smallJpeg(2));
   const std::string out = folder.makeFolder("out");
-  const Finished run = quenby({"look", "winter", "-r", folder / "in", "-o", out, "-j", "2"});
+  const Finished run =
+      quenby({"look", "winter", "-r", folder / "in", "-o", out, "-j", "2", "--no-mark"});
   EXPECT_EQ(run.exitCode, 0) << run.errors;
   ASSERT_TRUE(folder.has("out/deep/b_WinterRGB.jpg"));
   Image<RGBA8Pixel> source = decoded(smallJpeg(1));

@@ -251,6 +251,16 @@ struct FakeFunctions {
                          "GetObjectArrayElement");
   }
 
+  // Arrays of bytes, which are copied into the element that is there.
+  static void setObjectArrayElement(JNIEnv* env, jobjectArray array, jsize index, jobject value) {
+    FakeEnvironment& fake = of(env);
+    fake.checkNothingPending("SetObjectArrayElement");
+    if (fake.shouldFail("SetObjectArrayElement")) return;
+    FakeObject* const element =
+        fake.resolve(array, "SetObjectArrayElement")->elements.at(static_cast<std::size_t>(index));
+    element->bytes = fake.resolve(value, "SetObjectArrayElement")->bytes;
+  }
+
   static jint throwObject(JNIEnv* env, jthrowable object) {
     FakeEnvironment& fake = of(env);
     fake.checkNothingPending("Throw");
@@ -347,6 +357,7 @@ struct FakeFunctions {
       made.ReleaseStringUTFChars = releaseStringUTFChars;
       made.GetArrayLength = getArrayLength;
       made.GetObjectArrayElement = getObjectArrayElement;
+      made.SetObjectArrayElement = setObjectArrayElement;
       made.Throw = throwObject;
       made.ThrowNew = throwNew;
       made.ExceptionOccurred = exceptionOccurred;

@@ -37,7 +37,7 @@ TEST(EncodeJpeg, IsReadBackAsNearlyTheSamePicture) {
   EXPECT_EQ(header.width, width);
   EXPECT_EQ(header.height, height);
   EXPECT_EQ(header.components, 3);
-  EXPECT_FALSE(header.progressive);
+  EXPECT_FALSE(header.coding.progressive);
   EXPECT_LT(errorOf(file), 8.0);
 }
 

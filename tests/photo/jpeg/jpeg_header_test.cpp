@@ -23,8 +23,9 @@ TEST(JpegHeader, TellsSizeChannelsAndProgression) {
   EXPECT_EQ(colour.width, 33u);
   EXPECT_EQ(colour.height, 17u);
   EXPECT_EQ(colour.components, 3);
-  EXPECT_FALSE(colour.progressive);
-  EXPECT_TRUE(readJpegHeader(makeJpeg({.scans = test_support::progressiveScans(10)})).progressive);
+  EXPECT_FALSE(colour.coding.progressive);
+  EXPECT_TRUE(
+      readJpegHeader(makeJpeg({.scans = test_support::progressiveScans(10)})).coding.progressive);
   EXPECT_EQ(
       readJpegHeader(makeJpeg({.samples = JCS_GRAYSCALE, .stored = JCS_GRAYSCALE})).components, 1);
   EXPECT_EQ(readJpegHeader(makeJpeg({.samples = JCS_CMYK, .stored = JCS_YCCK})).components, 4);

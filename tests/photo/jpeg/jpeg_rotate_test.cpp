@@ -179,8 +179,8 @@ TEST(RotateJpeg, KeepsMetadataByteForByte) {
 
 TEST(RotateJpeg, LeavesAProgressiveFileProgressive) {
   const Bytes file = makeJpeg({.scans = test_support::completeProgressiveScans()});
-  EXPECT_TRUE(readJpegHeader(rotateJpeg(file, 90)).progressive);
-  EXPECT_FALSE(readJpegHeader(rotateJpeg(makeJpeg({}), 90)).progressive);
+  EXPECT_TRUE(readJpegHeader(rotateJpeg(file, 90)).coding.progressive);
+  EXPECT_FALSE(readJpegHeader(rotateJpeg(makeJpeg({}), 90)).coding.progressive);
 }
 
 TEST(RotateJpeg, HonoursTheLimits) {

@@ -13,13 +13,15 @@
 namespace pelorin::photo {
 namespace {
 
+using testing::ElementsAre;
+using testing::IsEmpty;
 using test_support::Bytes;
 using test_support::jpegWith;
 using test_support::photoLikePicture;
 using test_support::xmpPacket;
 using test_support::xmpSegment;
 
-const EditMark auto04 = {"1.2", "AE0 slider=0.4", "2024-05-01T12:30:45Z"};
+const EditMark auto04 = {"1.2", "AE0", "slider=0.4;", "2024-05-01T12:30:45Z"};
 const EditMark sepia = {"1.3", "Sepia", ""};
 constexpr XmpName history = {"http://ns.adobe.com/xap/1.0/mm/", "History"};
 constexpr std::string_view eventFields = "http://ns.adobe.com/xap/1.0/sType/ResourceEvent#";
@@ -41,23 +43,30 @@ Bytes saved(const Bytes& file, std::string_view format, const std::optional<Edit
 TEST(EditMark, IsReadBackFromEveryFormat) {
   for (const std::string_view format : {"JPEG", "PNG"}) {
     const Bytes plain = jpegWith(photoLikePicture(16, 16, 1));
-    EXPECT_FALSE(readFacts(plain).editMark);
-    EXPECT_FALSE(readFacts(saved(plain, format, {})).editMark);
+    EXPECT_THAT(readFacts(plain).edits, IsEmpty());
+    EXPECT_THAT(readFacts(saved(plain, format, {})).edits, IsEmpty());
     const Bytes once = saved(plain, format, auto04);
-    EXPECT_EQ(readFacts(once).editMark, auto04);
+    EXPECT_THAT(readFacts(once).edits, ElementsAre(auto04));
     const Bytes again = saved(once, format, sepia);
-    EXPECT_EQ(readFacts(again).editMark, sepia);
-    EXPECT_EQ(readFacts(saved(again, format, {})).editMark, sepia) << "kept like the rest";
+    EXPECT_THAT(readFacts(again).edits, ElementsAre(auto04, sepia));
+    EXPECT_EQ(readFacts(saved(again, format, {})).edits.size(), 2u) << "kept like the rest";
   }
+}
+
+TEST(EditMark, ReadsAsASentenceForUsers) {
+  EXPECT_EQ(textOf({"1.2", "AE0", "slider=0.4;"}), "AE0, slider 0.4");
+  EXPECT_EQ(textOf({"1.2", "AE0", "slider=0.4;gtmOnly=true"}), "AE0, slider 0.4, gtmOnly true");
+  EXPECT_EQ(textOf(sepia), "Sepia");
+  EXPECT_EQ(textOf({"", "", ";;="}), ",  ");
 }
 
 TEST(EditMark, StandsBehindTheEventsOfOthers) {
   std::vector<MetadataSegment> segments = {xmpSegment(xmpPacket(othersHistory))};
-  EXPECT_FALSE(editMarkOf(segments));
+  EXPECT_THAT(editMarksOf(segments), IsEmpty());
   std::vector<Loss> lost;
   addEditMark(segments, auto04, lost);
   ASSERT_EQ(segments.size(), 1u);
-  EXPECT_EQ(editMarkOf(segments), auto04);
+  EXPECT_THAT(editMarksOf(segments), ElementsAre(auto04));
   editXmp(
       segments,
       [](const XmpPacket& packet) {
@@ -91,7 +100,7 @@ TEST(EditMark, IsAddedWhereTheHistoryIsInTheExtension) {
       lost);
   ASSERT_GE(segments.size(), 3u);
   addEditMark(segments, auto04, lost);
-  EXPECT_EQ(editMarkOf(segments), auto04);
+  EXPECT_THAT(editMarksOf(segments), ElementsAre(auto04));
   int histories = 0;
   editXmp(
       segments,
@@ -109,10 +118,10 @@ TEST(EditMark, InANewPacketComesBehindExif) {
       {0xE2, test_support::bytesOf("ICC_PROFILE")},
   };
   std::vector<Loss> lost;
-  addEditMark(segments, {"1.2", "\"a\" < & > 'b'", ""}, lost);
+  addEditMark(segments, {"1.2", "Mine", "\"a\" < & > 'b'"}, lost);
   ASSERT_EQ(segments.size(), 3u);
   EXPECT_EQ(segments[1].marker, 0xE1);
-  EXPECT_EQ(editMarkOf(segments)->parameters, "\"a\" < & > 'b'");
+  EXPECT_EQ(editMarksOf(segments).at(0).params, "\"a\" < & > 'b'");
 }
 
 TEST(EditMark, IsNoneWhereAHistoryIsNoListOrNotOurs) {
@@ -120,10 +129,10 @@ TEST(EditMark, IsNoneWhereAHistoryIsNoListOrNotOurs) {
        {"<rdf:Description xmlns:m='http://ns.adobe.com/xap/1.0/mm/' m:History='Quenby 1.2'/>",
         "<rdf:Description my:Thing='Quenby 1.2'/>", "<rdf:Description Quenby "}) {
     std::vector<MetadataSegment> segments = {xmpSegment(xmpPacket(text))};
-    EXPECT_FALSE(editMarkOf(segments)) << text;
+    EXPECT_THAT(editMarksOf(segments), IsEmpty()) << text;
     std::vector<Loss> lost;
     addEditMark(segments, auto04, lost);
-    EXPECT_EQ(editMarkOf(segments), auto04) << text;
+    EXPECT_THAT(editMarksOf(segments), ElementsAre(auto04)) << text;
   }
 }
 

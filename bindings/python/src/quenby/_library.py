@@ -122,6 +122,7 @@ class CFacts(Growing):
         ("utc", c_double),
         ("format", c_char * 16),
         ("capture_time", c_char * 64),
+        ("last_edit", c_char * 96),
     ]
 
 

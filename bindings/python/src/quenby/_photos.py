@@ -38,6 +38,7 @@ class Facts:
     capture_time: Optional[str]  #: "2024-05-01T12:30:45+02:00"
     wall_clock: Optional[float]  #: Capture time in seconds since 1970 by the clock of its place.
     utc: Optional[float]  #: The same in UTC, where the offset is known.
+    last_edit: Optional[str]  #: By Quenby, as the file tells: "AE0, slider 0.4".
 
 
 @dataclass(frozen=True)
@@ -74,6 +75,7 @@ def _facts(given: CFacts) -> Facts:
         capture_time=given.capture_time.decode(errors="replace") or None,
         wall_clock=known(given.wall_clock),
         utc=known(given.utc),
+        last_edit=given.last_edit.decode(errors="replace") or None,
     )
 
 
@@ -126,12 +128,28 @@ def _bits(name: str, chosen: Iterable[str], known: dict[str, int]) -> int:
     return bits
 
 
-def _save_options(quality: int, strip: Iterable[str], keep: Iterable[str]) -> CSaveOptions:
-    if not 1 <= quality <= 100:
-        raise ValueError("quality: is not from 1 to 100")
-    return CSaveOptions(
-        quality=quality, flags=_bits("strip", strip, _drop), keep=_bits("keep", keep, _kinds)
-    )
+_no_mark, _source_quality = 16, 32
+_subsampling = {444: 64, 422: 128, 420: 256}
+
+
+def _save_options(
+    quality: Union[int, str],
+    strip: Iterable[str],
+    keep: Iterable[str],
+    subsampling: Optional[int],
+    mark: bool = True,
+) -> CSaveOptions:
+    flags = _bits("strip", strip, _drop) | (0 if mark else _no_mark)
+    if quality == "auto":
+        flags |= _source_quality
+        quality = 90
+    if not isinstance(quality, int) or not 1 <= quality <= 100:
+        raise ValueError('quality: is not from 1 to 100, or "auto"')
+    if subsampling is not None:
+        if subsampling not in _subsampling:
+            raise ValueError("subsampling: is none of 444, 422, 420")
+        flags |= _subsampling[subsampling]
+    return CSaveOptions(quality=quality, flags=flags, keep=_bits("keep", keep, _kinds))
 
 
 class Photo:
@@ -245,12 +263,13 @@ def _encoded(
     pixels: AnyPhoto,
     format: str,
     like: Optional[Photo],
-    quality: int,
+    quality: Union[int, str],
     strip: Iterable[str],
     keep: Iterable[str],
+    subsampling: Optional[int],
     cancel: Optional[Cancel],
 ) -> tuple[bytes, list[Loss]]:
-    save = _save_options(quality, strip, keep)
+    save = _save_options(quality, strip, keep, subsampling)
     rgba = pixels.rgba if isinstance(pixels, Photo) else rgba_of(array_of(pixels))
     given, pointer = pixels_of(rgba), c_void_p()
     rest = (byref(given), utf8(format), byref(save), pointer_of(cancel), byref(pointer))
@@ -266,19 +285,23 @@ def encode(
     format: str = "JPEG",
     *,
     like: Optional[Photo] = None,
-    quality: int = 90,
+    quality: Union[int, str] = 90,
     strip: Iterable[str] = (),
     keep: Iterable[str] = (),
+    subsampling: Optional[int] = None,
     cancel: Optional[Cancel] = None,
 ) -> bytes:
     """The bytes of a file with these pixels.
 
-    like:   a photo of the same size whose metadata goes with them, made to say what the picture is.
-    strip:  of the metadata: "all" but the colour profile, "gps", "thumbnail", "gain map".
-    keep:   these kinds of it and the colour profile alone: "copyright", "time", "exif", "xmp", "iptc",
-            "gain map"; all kinds unless given.
+    like:         a photo of the same size whose metadata goes with them, made to say what the
+                  picture is; JPEG files are coded like its own.
+    quality:      1 to 100, or "auto": what the file of `like` seems to have.
+    strip:        of the metadata: "all" but the colour profile, "gps", "thumbnail", "gain map".
+    keep:         these kinds of it and the colour profile alone: "copyright", "time", "exif", "xmp",
+                  "iptc", "gain map"; all kinds unless given.
+    subsampling:  of a JPEG file: 444, 422 or 420.
     """
-    return _encoded(pixels, format, like, quality, strip, keep, cancel)[0]
+    return _encoded(pixels, format, like, quality, strip, keep, subsampling, cancel)[0]
 
 
 def _format_for(path: Path) -> str:
@@ -318,15 +341,18 @@ def write(
     pixels: AnyPhoto,
     *,
     like: Optional[Photo] = None,
-    quality: int = 90,
+    quality: Union[int, str] = 90,
     strip: Iterable[str] = (),
     keep: Iterable[str] = (),
+    subsampling: Optional[int] = None,
     overwrite: bool = False,
     cancel: Optional[Cancel] = None,
 ) -> list[Loss]:
     """Writes pixels to a file, in the format that its name says; see encode(). Returns what of the
     metadata is not in it. The file appears whole or not at all."""
-    data, losses = _encoded(pixels, _format_for(path), like, quality, strip, keep, cancel)
+    data, losses = _encoded(
+        pixels, _format_for(path), like, quality, strip, keep, subsampling, cancel
+    )
     _put(path, data, overwrite)
     return losses
 
@@ -339,7 +365,9 @@ def filter_file(
     *,
     params: Optional[str] = None,
     format: Optional[str] = None,
-    quality: int = 90,
+    quality: Union[int, str] = 90,
+    subsampling: Optional[int] = None,
+    mark: bool = True,
     rotate: int = 0,
     scale: int = 1,
     known_faces: bool = True,
@@ -357,6 +385,8 @@ def filter_file(
     target:      a path whose extension says the format; None gives the bytes back, in `format` or
                  that of the source.
     params:      a parameter string, "slider=0.4;", in place of keywords.
+    mark:        whether the file tells of the edit. A photo that tells of one is edited all the
+                 same; see Facts.last_edit.
 
     Returns the losses of metadata, a list; without a target the bytes and that list.
     """
@@ -368,7 +398,7 @@ def filter_file(
         format = _format_for(target)
     data = _required_bytes(source)
     open = open_options(scale, rotate, True, known_faces, max_pixels, max_scans)
-    save, pointer = _save_options(quality, strip, keep), c_void_p()
+    save, pointer = _save_options(quality, strip, keep, subsampling, mark), c_void_p()
     call(
         "filter_file",
         data,

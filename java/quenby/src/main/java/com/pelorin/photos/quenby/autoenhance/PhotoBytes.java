@@ -4,6 +4,7 @@ import android.graphics.RectF;
 import java.nio.ByteBuffer;
 import java.util.List;
 import java.util.concurrent.CancellationException;
+import java.util.function.Consumer;
 
 /**
  * A photo's file in memory, of any format that the {@code quenby} command reads, and what can be
@@ -28,9 +29,12 @@ public final class PhotoBytes {
 
     private static final class Settings implements Cloneable {
         int quality = 90;
+        int subsampling;
         int rotation;
         int scale = 1;
         float[] faces;
+        boolean mark = true;
+        Consumer<? super Loss> losses;
         Cancellation cancellation;
 
         Settings copy() {
@@ -112,6 +116,60 @@ public final class PhotoBytes {
         }
         Settings changed = settings.copy();
         changed.quality = quality;
+        return with(changed);
+    }
+
+    /**
+     * Makes JPEG files of the quality that the photo's own one seems to have, 90 where it is none.
+     *
+     * @return a photo that does
+     */
+    public PhotoBytes sourceQuality() {
+        Settings changed = settings.copy();
+        changed.quality = -1;
+        return with(changed);
+    }
+
+    /**
+     * Chooses how much colour JPEG files hold that are made; as much as the photo's own one unless
+     * chosen.
+     *
+     * @param subsampling 444, 422 or 420
+     * @return a photo that does
+     * @throws IllegalArgumentException for another number
+     */
+    public PhotoBytes subsampling(int subsampling) {
+        if (subsampling != 444 && subsampling != 422 && subsampling != 420) {
+            throw new IllegalArgumentException(
+                    "subsampling: is none of 444, 422, 420: " + subsampling);
+        }
+        Settings changed = settings.copy();
+        changed.subsampling = subsampling;
+        return with(changed);
+    }
+
+    /**
+     * Chooses whether files that are made tell of it, by which the command knows them.
+     *
+     * @param mark true unless chosen
+     * @return a photo that does
+     */
+    public PhotoBytes mark(boolean mark) {
+        Settings changed = settings.copy();
+        changed.mark = mark;
+        return with(changed);
+    }
+
+    /**
+     * Asks to be told what of the photo's metadata a file that is made of it has not.
+     *
+     * @param losses is given each, by the thread that makes the file, before that returns; null for
+     *               nobody
+     * @return a photo that tells
+     */
+    public PhotoBytes losses(Consumer<? super Loss> losses) {
+        Settings changed = settings.copy();
+        changed.losses = losses;
         return with(changed);
     }
 
@@ -210,9 +268,14 @@ public final class PhotoBytes {
         if (filter == null) {
             throw new UnknownFilterException(null);
         }
-        return call(cancel -> filter(array, buffer, offset, length, settings.quality,
-                settings.rotation, settings.faces, settings.scale, filter.key(),
-                params == null ? "" : params, cancel));
+        byte[][] lost = settings.losses == null ? null : new byte[1][];
+        byte[] made = call(cancel -> filter(array, buffer, offset, length, settings.quality,
+                settings.subsampling, settings.rotation, settings.faces, settings.scale,
+                filter.key(), params == null ? "" : params, settings.mark, cancel, lost));
+        if (lost != null) {
+            Loss.all(lost[0]).forEach(settings.losses);
+        }
+        return made;
     }
 
     /**
@@ -271,8 +334,8 @@ public final class PhotoBytes {
 
     // libquenby_photo.so registers these.
     static native byte[] filter(byte[] array, ByteBuffer buffer, int offset, int length,
-            int quality, int rotation, float[] faces, int scale, String filter, String params,
-            long cancel) throws PhotoException;
+            int quality, int subsampling, int rotation, float[] faces, int scale, String filter,
+            String params, boolean mark, long cancel, byte[][] lost) throws PhotoException;
 
     private static native float niqe(byte[] array, ByteBuffer buffer, int offset, int length,
             long cancel) throws PhotoException;

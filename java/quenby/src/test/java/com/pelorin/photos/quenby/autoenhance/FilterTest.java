@@ -82,11 +82,11 @@ class FilterTest {
                 String what = filter + " with \"" + params + '"';
                 if (ours.equals("none")) {
                     assertDoesNotThrow(() -> PhotoBytes.filter(photo, null, 0, photo.length, 90, 0,
-                            null, 1, filter.key(), params, 0), what);
+                            0, null, 1, filter.key(), params, true, 0, null), what);
                 } else {
                     assertEquals(ours, assertThrows(IllegalArgumentException.class,
-                            () -> PhotoBytes.filter(photo, null, 0, photo.length, 90, 0, null, 1,
-                                    filter.key(), params, 0), what).getMessage(), what);
+                            () -> PhotoBytes.filter(photo, null, 0, photo.length, 90, 0, 0,
+                                    null, 1, filter.key(), params, true, 0, null), what).getMessage(), what);
                 }
             }
         }

@@ -146,6 +146,40 @@ class PhotoBytesTest {
         assertThrows(UnknownFilterException.class, () -> photo.filter(null, ""));
     }
 
+    /** The file with a second picture behind it, which no result can keep. */
+    @Test
+    void whatIsLostOfTheMetadataIsTold() throws IOException {
+        ByteArrayOutputStream two = new ByteArrayOutputStream();
+        two.write(turned);
+        two.write(plain);
+        List<Loss> losses = new ArrayList<>();
+        byte[] made = PhotoBytes.of(two.toByteArray()).losses(losses::add).enhance(0.4f);
+        assertArrayEquals(PhotoBytes.of(two.toByteArray()).enhance(0.4f), made);
+        assertEquals(1, losses.size());
+        assertEquals("second picture", losses.get(0).what());
+        assertEquals("shows the picture as it was", losses.get(0).why());
+        PhotoBytes.of(turned).losses(losses::add).enhance(0.4f);
+        assertEquals(1, losses.size());
+    }
+
+    @Test
+    void theMarkOfTheEditCanBeLeftOut() throws IOException {
+        String mark = "AE0 slider=0.4";
+        byte[] marked = PhotoBytes.of(plain).enhance(0.4f);
+        assertTrue(new String(marked, StandardCharsets.ISO_8859_1).contains(mark));
+        byte[] bare = PhotoBytes.of(plain).mark(false).enhance(0.4f);
+        assertFalse(new String(bare, StandardCharsets.ISO_8859_1).contains(mark));
+    }
+
+    @Test
+    void filesAreCodedLikeThePhotosOwnUnlessChosen() throws IOException {
+        byte[] small = PhotoBytes.of(plain).quality(40).subsampling(422).enhance(0.4f);
+        byte[] like = PhotoBytes.of(small).sourceQuality().enhance(0.4f);
+        assertArrayEquals(PhotoBytes.of(small).quality(40).subsampling(422).enhance(0.4f), like);
+        assertThrows(IllegalArgumentException.class,
+                () -> PhotoBytes.of(plain).subsampling(411));
+    }
+
     private static PhotoException.Kind kindOf(byte[] file) {
         List<Callable<?>> ways = List.of(() -> PhotoBytes.of(file).enhance(0.4f),
                 () -> PhotoBytes.of(file).niqe(), () -> PhotoBytes.of(file).niqeFeatures(),
