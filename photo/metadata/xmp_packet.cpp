@@ -1,7 +1,7 @@
 #include "photo/metadata/xmp_packet.h"
 
 #include <algorithm>
-#include <sstream>
+#include <new>
 
 namespace pelorin::photo {
 namespace {
@@ -58,9 +58,37 @@ pugi::xml_node rdfChild(pugi::xml_node element, std::string_view local) {
   return element.find_child([&](pugi::xml_node child) { return isRdf(child, local); });
 }
 
+// The parser tells of memory that it does not get by returning what is false.
+template <typename T>
+T allocated(T made) {
+  if (!made) throw std::bad_alloc();
+  return made;
+}
+
+pugi::xml_node addChild(pugi::xml_node parent, const std::string& name) {
+  return allocated(parent.append_child(name.c_str()));
+}
+
+void addAttribute(pugi::xml_node element, const std::string& name, const std::string& value) {
+  allocated(allocated(element.append_attribute(name.c_str())).set_value(value.c_str()));
+}
+
+void setContent(pugi::xml_node element, const std::string& text) {
+  allocated(element.text().set(text.c_str()));
+}
+
+// Not a stream: those keep silent about memory that they do not get.
+class TextWriter : public pugi::xml_writer {
+ public:
+  void write(const void* data, std::size_t size) override {
+    text.append(static_cast<const char*>(data), size);
+  }
+  std::string text;
+};
+
 pugi::xml_node addElement(pugi::xml_node description, XmpName name, const std::string& prefix) {
-  description.append_attribute(("xmlns:" + prefix).c_str()) = std::string(name.space).c_str();
-  return description.append_child((prefix + ":" + std::string(name.local)).c_str());
+  addAttribute(description, "xmlns:" + prefix, std::string(name.space));
+  return addChild(description, prefix + ":" + std::string(name.local));
 }
 
 std::string trimmed(std::string_view text) {
@@ -100,9 +128,9 @@ void XmpProperty::setText(const std::string& text) {
   if (this->text() == text) return;
   *changed_ = true;
   if (attribute_) {
-    attribute_.set_value(text.c_str());
+    allocated(attribute_.set_value(text.c_str()));
   } else {
-    element_.text().set(text.c_str());
+    setContent(element_, text);
   }
 }
 
@@ -146,9 +174,9 @@ std::size_t XmpProperty::size() const {
     return std::string_view(attribute_.name()).size() +
            std::string_view(attribute_.value()).size() + 4;
   }
-  std::ostringstream text;
-  element_.print(text, "", pugi::format_raw);
-  return text.str().size();
+  TextWriter writer;
+  element_.print(writer, "", pugi::format_raw);
+  return writer.text.size();
 }
 
 XmpPacket::XmpPacket(std::string_view bytes) : state_(std::make_unique<State>()) {
@@ -189,11 +217,11 @@ std::string XmpPacket::rdfName(std::string_view local) const {
 
 // One of its own for what is added, so that prefixes collide with no others.
 pugi::xml_node XmpPacket::addDescription() {
-  pugi::xml_node description = state_->rdf.append_child(rdfName("Description").c_str());
+  pugi::xml_node description = addChild(state_->rdf, rdfName("Description"));
   // All descriptions of a packet are about the same.
   const std::string about = rdfName("about");
   const pugi::xml_node first = rdfChild(state_->rdf, "Description");
-  description.append_attribute(about.c_str()) = first.attribute(about.c_str()).value();
+  addAttribute(description, about, first.attribute(about.c_str()).value());
   return description;
 }
 
@@ -246,7 +274,7 @@ void XmpPacket::keepOnly(const std::function<bool(XmpName)>& isKept) {
 }
 
 void XmpPacket::add(XmpName name, const std::string& prefix, const std::string& text) {
-  addElement(addDescription(), name, prefix).text().set(text.c_str());
+  setContent(addElement(addDescription(), name, prefix), text);
   state_->changed = true;
 }
 
@@ -255,12 +283,12 @@ void XmpPacket::append(XmpName list, const std::string& prefix, const XmpStructu
   const bool isList = owner && !property(list).attribute_;
   if (!isList) owner = addElement(addDescription(), list, prefix);
   pugi::xml_node sequence = rdfChild(owner, "Seq");
-  if (!sequence) sequence = owner.append_child(rdfName("Seq").c_str());
-  pugi::xml_node written = sequence.append_child(rdfName("li").c_str());
-  written.append_attribute(("xmlns:" + item.prefix).c_str()) = std::string(item.space).c_str();
-  written.append_attribute(rdfName("parseType").c_str()) = "Resource";
+  if (!sequence) sequence = addChild(owner, rdfName("Seq"));
+  pugi::xml_node written = addChild(sequence, rdfName("li"));
+  addAttribute(written, "xmlns:" + item.prefix, std::string(item.space));
+  addAttribute(written, rdfName("parseType"), "Resource");
   for (const XmpField& field : item.fields)
-    written.append_child((item.prefix + ":" + field.local).c_str()).text().set(field.text.c_str());
+    setContent(addChild(written, item.prefix + ":" + field.local), field.text);
   state_->changed = true;
 }
 
@@ -273,13 +301,13 @@ void XmpPacket::take(XmpProperty property) {
     for (const pugi::xml_attribute attribute : scope.attributes()) {
       const std::string_view name = attribute.name();
       if (name.substr(0, 6) == "xmlns:" && !description.attribute(attribute.name()))
-        description.append_copy(attribute);
+        allocated(description.append_copy(attribute));
     }
   }
   if (property.attribute_) {
-    description.append_copy(property.attribute_);
+    allocated(description.append_copy(property.attribute_));
   } else {
-    description.append_copy(source);
+    allocated(description.append_copy(source));
   }
   state_->changed = true;
   property.remove();
@@ -288,9 +316,9 @@ void XmpPacket::take(XmpProperty property) {
 std::string XmpPacket::bytes(std::size_t longest) const {
   const auto& [document, rdf, changed, original, before, after] = *state_;
   if (!changed && original.size() <= longest) return original;
-  std::ostringstream text;
-  document.save(text, "", pugi::format_raw | pugi::format_no_declaration, pugi::encoding_utf8);
-  const std::string written = text.str();
+  TextWriter writer;
+  document.save(writer, "", pugi::format_raw | pugi::format_no_declaration, pugi::encoding_utf8);
+  const std::string& written = writer.text;
   // Padding is the space before the closing instruction; programs write into it.
   const std::size_t padding = std::min(after.find_first_not_of(whitespace), after.size());
   const std::size_t others = before.size() + after.size() - padding;

@@ -26,6 +26,8 @@ using test_support::photoLikePicture;
 
 /// Decoded as a whole, filtered in a session, and saved.
 Bytes byPicture(const Bytes& file, const FilterRequest& request, const Format& format) {
+  SaveOptions save = request.save;
+  save.mark = markOf(request.filter, request.params);
   Photo photo = open(file, request.open);
   FilteredImage session(photo.image,
                         metadataWithFaces(allFaces(request.faces, photo), photo.image->width,
@@ -33,7 +35,7 @@ Bytes byPicture(const Bytes& file, const FilterRequest& request, const Format& f
                         "", defaultFilterConfigValue, DefaultFilterFactory::filterFactory());
   Image<RGBA8Pixel> output(photo.image->width, photo.image->height);
   session.applyFilterWithParams(request.filter, request.params, defaultFilterConfigValue, output);
-  return save(output, format, photo.metadata, request.save);
+  return photo::save(output, format, photo.metadata, save);
 }
 
 std::string parametersOf(const std::string& filter) {

@@ -29,6 +29,8 @@ using test_support::Random;
 using test_support::slowBuild;
 
 Bytes byPicture(const Bytes& file, const FilterRequest& request) {
+  SaveOptions save = request.save;
+  save.mark = markOf(request.filter, request.params);
   Photo photo = open(file, request.open);
   FilteredImage session(photo.image,
                         metadataWithFaces(allFaces(request.faces, photo), photo.image->width,
@@ -36,7 +38,7 @@ Bytes byPicture(const Bytes& file, const FilterRequest& request) {
                         "", defaultFilterConfigValue, DefaultFilterFactory::filterFactory());
   Image<RGBA8Pixel> output(photo.image->width, photo.image->height);
   session.applyFilterWithParams(request.filter, request.params, defaultFilterConfigValue, output);
-  return save(output, *formatNamed(photo.facts.format), photo.metadata, request.save);
+  return photo::save(output, *formatNamed(photo.facts.format), photo.metadata, save);
 }
 
 Workers& threads(std::size_t count) {

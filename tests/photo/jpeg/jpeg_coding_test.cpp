@@ -86,7 +86,7 @@ TEST(JpegCoding, QualityIsNinetyOrThePhotosOwn) {
 TEST(JpegCoding, GreyStaysGreyUntilAFilterColoursIt) {
   const Bytes grey = makeJpeg(greyPhoto);
   const auto channelsAfter = [&](const std::string& filter, const std::string& params) {
-    const Bytes made = filterPhoto(grey, {.filter = filter, .params = params}, nullptr);
+    const Bytes made = filterPhoto(grey, {.filter = filter, .params = params}).file;
     EXPECT_EQ(codingOf(made).grey, readJpegHeader(made).components == 1);
     return readJpegHeader(made).components;
   };
