@@ -16,6 +16,7 @@
 #include "cli/frame/print_plan.h"
 #include "cli/frame/raw_option.h"
 #include "cli/frame/recycled_memory.h"
+#include "photo/backup.h"
 #include "photo/filter_photo.h"
 #include "photo/thread_workers.h"
 
@@ -93,7 +94,11 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   if (!work.inPlace && work.keepsTimes && !file.input.isStandardInput()) {
     save.replace.timesOf = file.input.path;
   }
-  if (file.skipped) save.backup.clear();  // which has the first one, to which undo leads back
+  if (file.skipped) {  // done again: the backup has the first one, to which undo leads back
+    refuseLosses(filtered.lost, save.strict);
+    photo::recordResult(save.backup, file.output, filtered.file);
+    save.backup.clear();
+  }
   writePhoto(file.output, filtered.file, filtered.lost, save);
   return {.width = filtered.size.width,
           .height = filtered.size.height,
