@@ -13,13 +13,13 @@
 namespace pelorin::photo {
 namespace {
 
-using testing::ElementsAre;
-using testing::IsEmpty;
 using test_support::Bytes;
 using test_support::jpegWith;
 using test_support::photoLikePicture;
 using test_support::xmpPacket;
 using test_support::xmpSegment;
+using testing::ElementsAre;
+using testing::IsEmpty;
 
 const EditMark auto04 = {"1.2", "AE0", "slider=0.4;", "2024-05-01T12:30:45Z"};
 const EditMark sepia = {"1.3", "Sepia", ""};
