@@ -8,6 +8,7 @@
 #include "image_processing/filters/filtered_image.h"
 #include "photo/faces.h"
 #include "photo/file_io.h"
+#include "photo/filter_photo.h"
 #include "photo/photo.h"
 #include "photo/thread_workers.h"
 
@@ -31,10 +32,11 @@ int main(int argc, char** argv) {
     Image<RGBA8Pixel> output(width, height);
     for (const std::string slider :
          {"0.0", "0.1", "0.2", "0.3", "0.4", "0.5", "0.6", "0.7", "0.8", "0.9", "1.0"}) {
-      session.applyFilterWithParams("AE0", "slider=" + slider + ";", defaultFilterConfigValue,
-                                    output);
-      photo::writeFileAtomically(std::string(argv[2]) + "/slider_" + slider + ".jpg",
-                                 photo::save(output, "JPEG", opened.metadata));
+      const std::string params = "slider=" + slider + ";";
+      session.applyFilterWithParams("AE0", params, defaultFilterConfigValue, output);
+      photo::writeFileAtomically(
+          std::string(argv[2]) + "/slider_" + slider + ".jpg",
+          photo::save(output, "JPEG", opened.metadata, {.mark = photo::markOf("AE0", params)}));
     }
   } catch (const std::exception& error) {
     std::fprintf(stderr, "%s: %s\n", argv[1], error.what());
