@@ -16,6 +16,7 @@
 #include "photo/metadata/segments.h"
 #include "photo/metadata/thumbnail.h"
 #include "photo/metadata/xmp_container.h"
+#include "photo/metadata/xmp_depth.h"
 #include "photo/metadata/xmp_facts.h"
 #include "photo/metadata/xmp_regions.h"
 #include "photo/metadata/xmp_segments.h"
@@ -132,7 +133,7 @@ std::vector<TailPart> keptTail(const Metadata& metadata, const PictureChange& ch
         break;
       case Kind::canonVrd:
       case Kind::photoMechanic:
-        if (change.turn != Turn{} || change.before != change.after) {
+        if (!isUnmoved(change)) {
           lose("counts in pixels of the picture as it was");
           continue;
         }
@@ -245,6 +246,7 @@ KeptMetadata keptMetadata(PictureSize picture, ThumbnailMaker& thumbnails, const
       [&](XmpPacket& packet) {
         stateFacts(packet, change, thumbnailsLost);
         turnRegions(packet, change);
+        removeUntrueViews(packet, change, kept.lost);
         stateAppended(packet, appended);
         if (!options.location) removeLocation(packet);
       },

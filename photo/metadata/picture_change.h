@@ -13,6 +13,11 @@ struct PictureChange {
   int orientation = 1;  ///< What the file's EXIF states of it, 1 ... 8.
 };
 
+/// Whether every pixel is where it was, so that places in pixels stay true.
+inline bool isUnmoved(const PictureChange& change) {
+  return change.turn == Turn{} && change.before == change.after;
+}
+
 /// A point in fractions of a picture's width and height, 0,0 its top left corner.
 struct PicturePoint {
   double x, y;

@@ -103,6 +103,10 @@ class PacketOfSegments {
   // @throws XmpError when there is no way to make it fit.
   std::vector<MetadataSegment> written() {
     constexpr std::size_t room = longestPayload - packetMark.size();
+    if (extension_ && extension_->changed() && extension_->properties().empty()) {
+      extension_.reset();
+      forgetExtension();
+    }
     for (std::size_t size; (size = packet_.bytes(room).size()) > room;)
       moveLargestProperties(size - room);
     std::vector<MetadataSegment> segments(1);

@@ -18,7 +18,8 @@ bool isXmpExtension(const MetadataSegment& segment);
 
 /// Calls `edit` for each packet of XMP among the segments of a JPEG file: the packet itself and its
 /// extension, which is spread over several segments under the MD5 sum of all. What `edit` changes is
-/// written back; a packet that outgrows its segment moves its largest properties to the extension.
+/// written back; a packet that outgrows its segment moves its largest properties to the extension,
+/// and an extension of which nothing is left goes.
 /// Removed, and named in `lost`: packets that cannot be read, extensions that are incomplete, over
 /// 64 MiB or of no packet.
 void editXmp(std::vector<MetadataSegment>& segments, const std::function<void(XmpPacket&)>& edit,

@@ -10,6 +10,7 @@
 #include "photo/jpeg/jpeg_codec.h"
 #include "photo/jpeg/jpeg_end.h"
 #include "photo/metadata/exif_orientation.h"
+#include "photo/metadata/md5.h"
 #include "photo/metadata/mpf.h"
 #include "photo/metadata/xmp_regions.h"
 #include "photo/metadata/xmp_segments.h"
@@ -178,6 +179,58 @@ TEST(KeptMetadata, RemovesThumbnailsThatShowThePictureAsItWas) {
   ASSERT_EQ(segments.size(), 2u);
   EXPECT_EQ(segments[0].payload, bytesOf("JFIF\0\1\2\0\0\1\0\1\0\0"s));
   EXPECT_EQ(segments[1].payload, bytesOf("Photoshop 3.0\0"s + "8BIM\x04\x04\0\0\0\0\0\3abc\0"s));
+}
+
+// A photo with a depth map, of which the extension holds the data.
+Bytes depthPhoto(int orientation) {
+  const auto description = [](const std::string& content) {
+    return xmpPacket(
+        "<rdf:Description xmlns:GDepth='http://ns.google.com/photos/1.0/depthmap/' "
+        "xmlns:GFocus='http://ns.google.com/photos/1.0/focus/' " +
+        content);
+  };
+  const std::string extension = description("GDepth:Data='AAAA'/>");
+  const std::string name = md5Hex(extension);
+  std::string part = "http://ns.adobe.com/xmp/extension/\0"s + name + "\0\0"s;
+  part += {static_cast<char>(extension.size() >> 8), static_cast<char>(extension.size())};
+  part += "\0\0\0\0"s + extension;
+  return jpegWith(
+      photoLikePicture(64, 128, 1),
+      {{0xE1, cameraExif({.orientation = orientation, .width = 64, .height = 128})},
+       xmpSegment(description("my:Thing='stays' GDepth:Near='0.3' GFocus:FocalPointX='0.7' "
+                              "xmpNote:HasExtendedXMP='" +
+                              name + "'/>")),
+       {0xE1, bytesOf(part)}});
+}
+
+TEST(KeptMetadata, HasADepthMapAsLongAsNoPixelMoves) {
+  const Written kept = rewritten(depthPhoto(1));
+  EXPECT_TRUE(kept.lost.empty());
+  for (const char* claim :
+       {"GDepth:Near='0.3'", "GFocus:FocalPointX='0.7'", "GDepth:Data='AAAA'", "HasExtendedXMP='"})
+    EXPECT_THAT(kept.text(), testing::HasSubstr(claim));
+
+  for (const bool turned : {false, true}) {
+    const Written moved = rewritten(depthPhoto(turned ? 6 : 1), {.scale = turned ? 1 : 2});
+    EXPECT_EQ(moved.lost, (std::vector<Loss>{{"depth map", "describes the picture as it was"}}));
+    for (const char* claim : {"GDepth:", "GFocus:", "HasExtendedXMP=", "/xmp/extension/"})
+      EXPECT_THAT(moved.text(), testing::Not(testing::HasSubstr(claim)));
+    EXPECT_THAT(moved.text(), testing::HasSubstr("my:Thing=\"stays\""));
+  }
+}
+
+TEST(KeptMetadata, HasNoPicturesWithinXmpAndNoDepthOfThoseBehindThePicture) {
+  const Written written = rewritten(jpegWith(
+      photoLikePicture(64, 128, 1),
+      {xmpSegment(xmpPacket(
+          "<rdf:Description xmlns:GImage='http://ns.google.com/photos/1.0/image/' "
+          "xmlns:Device='http://ns.google.com/photos/dd/1.0/device/' GImage:Data='AAAA'>"
+          "<Device:Cameras><rdf:Seq><rdf:li/></rdf:Seq></Device:Cameras></rdf:Description>"))}));
+  EXPECT_THAT(written.lost,
+              testing::UnorderedElementsAre(Loss{"second picture", "shows the picture as it was"},
+                                            Loss{"depth map", "describes the picture as it was"}));
+  EXPECT_THAT(written.text(), testing::Not(testing::HasSubstr("GImage:Data")));
+  EXPECT_THAT(written.text(), testing::Not(testing::HasSubstr("Device:Cameras")));
 }
 
 TEST(KeptMetadata, OfEveryKindAgreesAboutSizeAndOrientation) {
