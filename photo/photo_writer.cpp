@@ -5,6 +5,8 @@
 #include <string>
 #include <utility>
 
+#include "photo/metadata/segments.h"
+
 namespace pelorin::photo {
 
 using image_processing::RGBA8Pixel;
@@ -44,6 +46,10 @@ std::vector<std::uint8_t> PhotoWriter::finish(std::vector<Loss>* lost) {
   KeptMetadata kept = keptMetadata(size_, thumbnails_, metadata_, options_.keep);
   if (options_.mark) addEditMark(kept.segments, *options_.mark, kept.lost);
   format_.removeForeign(kept);
+  if (!writer_->isGrey() && isGreyProfile(kept.segments)) {
+    removeColourProfile(kept.segments);
+    kept.lost.push_back({"colour profile", "is for grey, and the result is in colour"});
+  }
   std::vector<std::uint8_t> file = writer_->finish(kept);
   if (!opaque_)
     kept.lost.push_back({"transparency", "a " + std::string(format_.name) + " file has none"});

@@ -43,6 +43,9 @@ class RowWriter {
   /// @throws Stopped, and std::bad_alloc.
   virtual void write(const image_processing::RGBA8Pixel* rows, std::uint32_t count) = 0;
 
+  /// After the last row: whether the file has but one channel.
+  virtual bool isGrey() const { return false; }
+
   /// The whole file, once, after the last row.
   /// @param kept  what goes with the picture, as `Format::removeForeign` left it. It comes last,
   ///              since some of it is made of the rows.

@@ -30,13 +30,9 @@ class JpegRowReader : public RowReader {
     facts_.channels = header.components;
     facts_.progressive = header.coding.progressive;
     addStatedFacts(header.metadata, facts_);
-    if (header.components == 4) facts_.notices.push_back("is CMYK, converted to sRGB");
-    // A profile for grey or CMYK does not describe RGB.
-    if (header.components != 3) {
-      const std::size_t before = header.metadata.size();
+    if (header.components == 4) {
+      facts_.notices.push_back("is CMYK, converted to sRGB");
       removeColourProfile(header.metadata);
-      if (header.components == 1 && header.metadata.size() < before)
-        facts_.notices.push_back("has a colour profile for grey, which the result cannot keep");
     }
     const auto tail = file.subspan(jpegEnd(file));
     metadata_ = {.segments = std::move(header.metadata),
@@ -88,7 +84,7 @@ JpegMaking makingFor(const SaveOptions& options, const Metadata& source) {
 }
 
 // Tables and rounding of auto-enhance leave up to 5 levels between the channels of a grey pixel.
-bool isGrey(const RGBA8Pixel* pixels, std::size_t count) {
+bool areGrey(const RGBA8Pixel* pixels, std::size_t count) {
   return std::all_of(pixels, pixels + count, [](const RGBA8Pixel& p) {
     constexpr int rounding = 6;
     return std::max({p.r, p.g, p.b}) - std::min({p.r, p.g, p.b}) <= rounding;
@@ -124,6 +120,8 @@ class JpegRowWriter : public RowWriter {
     }
   }
 
+  bool isGrey() const override { return grey_.has_value(); }
+
   std::vector<std::uint8_t> finish(const KeptMetadata& kept) override {
     std::vector<std::uint8_t> file = grey_ ? grey_->finish() : picture_->finish();
     insertSegments(file, kept.segments);
@@ -134,7 +132,7 @@ class JpegRowWriter : public RowWriter {
  private:
   void writeGrey(const RGBA8Pixel* rows, std::uint32_t count) {
     const std::size_t pixels = std::size_t{count} * width_;
-    if (!isGrey(rows, pixels)) return grey_.reset();
+    if (!areGrey(rows, pixels)) return grey_.reset();
     std::vector<std::uint8_t> grey(pixels);
     std::transform(rows, rows + pixels, grey.begin(), brightness);
     grey_->write(grey.data(), count);

@@ -73,4 +73,12 @@ std::vector<std::uint8_t> colourProfileOf(std::span<const MetadataSegment> segme
   return profile;
 }
 
+bool isGreyProfile(std::span<const MetadataSegment> segments) {
+  constexpr std::string_view grey = "GRAY";
+  constexpr std::size_t spacePlace = 16;
+  const std::vector<std::uint8_t> profile = colourProfileOf(segments);
+  return profile.size() >= spacePlace + grey.size() &&
+         std::equal(grey.begin(), grey.end(), profile.begin() + spacePlace);
+}
+
 }  // namespace pelorin::photo

@@ -34,4 +34,7 @@ void addColourProfile(std::span<const std::uint8_t> profile,
 /// The colour profile in segments, put together; empty when there is none or a part is missing.
 std::vector<std::uint8_t> colourProfileOf(std::span<const MetadataSegment> segments);
 
+/// Whether the colour profile in segments is one for grey.
+bool isGreyProfile(std::span<const MetadataSegment> segments);
+
 }  // namespace pelorin::photo

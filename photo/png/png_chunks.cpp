@@ -89,13 +89,13 @@ std::vector<std::uint8_t> xmpOf(Bytes data) {
   return {packet.begin(), packet.end()};
 }
 
-void addChunk(std::string_view type, Bytes data, bool isColour, Metadata& metadata) {
+void addChunk(std::string_view type, Bytes data, Metadata& metadata) {
   if (type == "eXIf") {
     // Some writers put a segment's mark in front.
     const bool marked = isExif(data);
     metadata.segments.push_back(segmentOf(app1, marked ? std::string_view{} : exifMark, data));
   } else if (type == "iCCP") {
-    if (isColour) addProfile(data, metadata);
+    addProfile(data, metadata);
   } else if (const auto xmp = type == "iTXt" ? xmpOf(data) : std::vector<std::uint8_t>();
              !xmp.empty()) {
     metadata.segments.push_back(segmentOf(app1, xmpMark, xmp));
@@ -112,7 +112,7 @@ PngChunk chunkOf(std::string_view type, std::string_view head, Bytes content) {
 
 }  // namespace
 
-Metadata pngMetadata(Bytes file, bool isColour) {
+Metadata pngMetadata(Bytes file) {
   constexpr std::size_t around = 12;  // length, type and checksum
   Metadata metadata;
   for (std::size_t at = signatureSize;;) {
@@ -131,7 +131,7 @@ Metadata pngMetadata(Bytes file, bool isColour) {
         throw PhotoError(PhotoError::Kind::damaged,
                          "damaged: the checksum of " + std::string(type) + " is wrong");
       }
-      addChunk(type, checked.subspan(4), isColour, metadata);
+      addChunk(type, checked.subspan(4), metadata);
     }
     at += around + length;
   }

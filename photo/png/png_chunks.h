@@ -10,9 +10,8 @@ namespace pelorin::photo {
 
 /// What a PNG file says beside its picture: EXIF, colour profile and XMP as segments, what else
 /// belongs to a photo as chunks.
-/// @param isColour  whether the picture is in colours; a profile of a grey one is left out.
 /// @throws PhotoError when one of them is damaged or the file ends before its end mark.
-Metadata pngMetadata(std::span<const std::uint8_t> file, bool isColour);
+Metadata pngMetadata(std::span<const std::uint8_t> file);
 
 /// Metadata as the chunks of a PNG file.
 std::vector<PngChunk> chunksOf(const KeptMetadata& metadata);

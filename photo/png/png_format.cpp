@@ -143,7 +143,7 @@ class PngRowReader : public RowReader {
     facts_.progressive = interlaced_;
     facts_.hasAlpha = (colourType & PNG_COLOR_MASK_ALPHA) != 0 || keyed;
     if (depth == 16) facts_.notices.push_back("has 16 bits a channel, read as 8");
-    metadata_ = pngMetadata(file, isColour);
+    metadata_ = pngMetadata(file);
     addStatedFacts(metadata_.segments, facts_);
     metadata_.storedSize = size_;
     metadata_.orientation = facts_.orientation;
@@ -276,6 +276,8 @@ class PngRowWriter : public RowWriter {
     }
   }
 
+  bool isGrey() const override { return !greyRow_.empty(); }
+
   std::vector<std::uint8_t> finish(const KeptMetadata& kept) override {
     errors_.run([this] { png_write_end(png_, nullptr); });
     std::vector<std::uint8_t> chunks;
@@ -285,8 +287,6 @@ class PngRowWriter : public RowWriter {
   }
 
  private:
-  bool isGrey() const { return !greyRow_.empty(); }
-
   png_const_bytep greyOf(const RGBA8Pixel* row) {
     std::transform(row, row + width_, greyRow_.begin(), [](const RGBA8Pixel& p) { return p.r; });
     return greyRow_.data();

@@ -12,6 +12,7 @@
 #include "photo/filter_photo.h"
 #include "photo/metadata/segments.h"
 #include "photo/photo.h"
+#include "tests/support/jpeg_files.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::photo {
@@ -37,18 +38,30 @@ const Space spaces[] = {
      {{0.7347, 0.2653, 1}, {0.1596, 0.8404, 1}, {0.0366, 0.0001, 1}},
      1.8}};
 
-Bytes profileOf(const Space& space) {
-  const cmsCIExyY white = {space.whiteX, space.whiteY, 1};
-  cmsToneCurve* const curve = cmsBuildGamma(nullptr, space.gamma);
-  cmsToneCurve* const curves[] = {curve, curve, curve};
-  const cmsHPROFILE profile = cmsCreateRGBProfile(&white, &space.primaries, curves);
-  cmsFreeToneCurve(curve);
+Bytes bytesOf(cmsHPROFILE profile) {
   cmsUInt32Number size = 0;
   cmsSaveProfileToMem(profile, nullptr, &size);
   Bytes bytes(size);
   cmsSaveProfileToMem(profile, bytes.data(), &size);
   cmsCloseProfile(profile);
   return bytes;
+}
+
+Bytes profileOf(const Space& space) {
+  const cmsCIExyY white = {space.whiteX, space.whiteY, 1};
+  cmsToneCurve* const curve = cmsBuildGamma(nullptr, space.gamma);
+  cmsToneCurve* const curves[] = {curve, curve, curve};
+  const cmsHPROFILE profile = cmsCreateRGBProfile(&white, &space.primaries, curves);
+  cmsFreeToneCurve(curve);
+  return bytesOf(profile);
+}
+
+Bytes greyProfile() {
+  const cmsCIExyY white = {0.3457, 0.3585, 1};
+  cmsToneCurve* const curve = cmsBuildGamma(nullptr, 2.2);
+  const cmsHPROFILE profile = cmsCreateGrayProfile(&white, curve);
+  cmsFreeToneCurve(curve);
+  return bytesOf(profile);
 }
 
 // Patches of 8 x 8 pixels, 6 levels of each channel.
@@ -127,6 +140,38 @@ TEST(ColourProfiles, DoNotChangeWhatAFilterMakesOfTheNumbers) {
     const Photo filtered = open(filterPhoto(file, request, formatNamed("PNG")).file);
     EXPECT_TRUE(samePixels(*filtered.image, *expected.image)) << space.name;
     EXPECT_EQ(colourProfileOf(filtered.metadata.segments), profile) << space.name;
+  }
+}
+
+TEST(ColourProfiles, ForGreyStayAsLongAsTheResultIsGrey) {
+  const Bytes profile = greyProfile();
+  const std::vector<Loss> lost = {{"colour profile", "is for grey, and the result is in colour"}};
+  const Bytes jpeg = test_support::makeJpeg(
+      {.samples = JCS_GRAYSCALE, .stored = JCS_GRAYSCALE, .profile = profile});
+  for (const int rotate : {0, 90}) {
+    const FilteredPhoto grey =
+        filterPhoto(jpeg, {.filter = "AE0", .params = "slider=0.4;", .open = {.rotate = rotate}});
+    EXPECT_EQ(colourProfileOf(open(grey.file).metadata.segments), profile);
+    EXPECT_TRUE(grey.lost.empty());
+    EXPECT_TRUE(grey.facts.notices.empty());
+  }
+  const FilteredPhoto coloured = filterPhoto(jpeg, {.filter = "SummerRGB", .params = ""});
+  EXPECT_TRUE(colourProfileOf(open(coloured.file).metadata.segments).empty());
+  EXPECT_EQ(coloured.lost, lost);
+  const FilteredPhoto converted =
+      filterPhoto(jpeg, {.filter = "PassThrough", .params = ""}, formatNamed("PNG"));
+  EXPECT_TRUE(colourProfileOf(open(converted.file).metadata.segments).empty());
+  EXPECT_EQ(converted.lost, lost);
+
+  const Image<RGBA8Pixel> picture = chart();
+  const Photo png =
+      open(save(picture, "PNG", withProfile(profile, picture), {.colour = ColourDetail::none}));
+  EXPECT_EQ(colourProfileOf(png.metadata.segments), profile);
+  for (const std::string_view format : {"PNG", "JPEG"}) {
+    std::vector<Loss> losses;
+    const Bytes file = save(*png.image, format, png.metadata, {}, &losses);
+    EXPECT_TRUE(colourProfileOf(open(file).metadata.segments).empty());
+    EXPECT_EQ(losses, lost);
   }
 }
 
