@@ -1,8 +1,10 @@
 // Bytes as what stands behind the picture in a JPEG file, and as an index of its pictures: reading is
-// safe, parts lie within the bytes and in their order, and an index that is written reads as it was.
+// safe, parts lie within the bytes and in their order, an index that is written reads as it was, and
+// Samsung's trailer holds pictures where one of its blocks is one.
 #include <algorithm>
 #include <cstdint>
 #include <cstdlib>
+#include <string_view>
 #include <vector>
 
 #include "photo/jpeg/jpeg_end.h"
@@ -25,11 +27,49 @@ void readTailOf(const std::vector<std::uint8_t>& bytes) {
   if (jpegEnd(bytes) > bytes.size()) std::abort();
 }
 
+void putLittle(std::vector<std::uint8_t>& bytes, std::size_t value) {
+  for (int shift = 0; shift < 32; shift += 8)
+    bytes.push_back(static_cast<std::uint8_t>(value >> shift));
+}
+
+void put(std::vector<std::uint8_t>& bytes, std::string_view text) {
+  bytes.insert(bytes.end(), text.begin(), text.end());
+}
+
+// The bytes as a block, and as the table of blocks.
+void readSamsung(const std::vector<std::uint8_t>& bytes) {
+  constexpr std::string_view jpeg = "\xFF\xD8\xFF";
+  for (const std::string_view beginning : {std::string_view(), jpeg}) {
+    std::vector<std::uint8_t> trailer = {0, 0, 0x30, 0x0A};
+    putLittle(trailer, 1);
+    put(trailer, "n");
+    put(trailer, beginning);
+    trailer.insert(trailer.end(), bytes.begin(), bytes.end());
+    const std::size_t size = trailer.size();
+    put(trailer, "SEFH");
+    for (const std::size_t number : {106u, 1u, 0x0A300000u}) putLittle(trailer, number);
+    putLittle(trailer, size), putLittle(trailer, size);
+    putLittle(trailer, 24);
+    put(trailer, "SEFT");
+    const bool isPicture = !beginning.empty() || (bytes.size() >= 3 && bytes[0] == 0xFF &&
+                                                  bytes[1] == 0xD8 && bytes[2] == 0xFF);
+    if (samsungHoldsPictures(trailer) != isPicture) std::abort();
+  }
+  std::vector<std::uint8_t> trailer = bytes;
+  put(trailer, "SEFH");
+  trailer.insert(trailer.end(), bytes.begin(), bytes.end());
+  putLittle(trailer, bytes.size() + 4);
+  put(trailer, "SEFT");
+  samsungHoldsPictures(trailer);
+  samsungHoldsPictures(bytes);
+}
+
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
   const std::vector<std::uint8_t> bytes(data, data + size);
   readTailOf(bytes);
+  readSamsung(bytes);
   for (const char* mark : {"\xFF\xD8\xFF\xDA", "SEFT", "cbipcbbl", "\xA1\xB2\xC3\xD4", "ftyp"}) {
     std::vector<std::uint8_t> marked = bytes;
     const std::string_view text = mark;
@@ -51,8 +91,9 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
       std::abort();
   }
 
-  std::vector<std::uint8_t> file = {0xFF, 0xD8};
-  file.insert(file.end(), bytes.begin(), bytes.end());
+  std::vector<std::uint8_t> file(2 + bytes.size());
+  file[0] = 0xFF, file[1] = 0xD8;
+  std::copy(bytes.begin(), bytes.end(), file.begin() + 2);
   const std::size_t before = file.size();
   appendTail(file, {{TailPart::Kind::gainMap, {1, 2, 3}}});
   if (file.size() != before + 3) std::abort();

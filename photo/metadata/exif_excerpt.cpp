@@ -27,7 +27,11 @@ std::vector<Entry> chosenOf(const TiffDirectory& directory, Bytes file,
                             std::span<const std::uint16_t> tags) {
   std::vector<Entry> chosen;
   for (const TiffEntry& entry : directory.entries) {
-    if (entry.type == textType && std::ranges::find(tags, entry.tag) != tags.end())
+    // A directory that repeats a tag could make much of few bytes.
+    const bool isWanted = entry.type == textType &&
+                          std::ranges::find(tags, entry.tag) != tags.end() &&
+                          std::ranges::find(chosen, entry.tag, &Entry::tag) == chosen.end();
+    if (isWanted)
       chosen.push_back({entry.tag, entry.type, file.subspan(entry.valuePlace, entry.valueSize)});
   }
   return chosen;

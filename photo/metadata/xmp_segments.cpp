@@ -93,7 +93,9 @@ class PacketOfSegments {
   // The name that the packet has for its extension; empty without one.
   const std::string& extensionName() const { return extensionName_; }
   void setExtension(const std::string& bytes) { extension_.emplace(bytes); }
-  void forgetExtension() { packet_.property(hasExtension).remove(); }
+  void forgetExtension() {
+    for (XmpProperty& note : packet_.properties(hasExtension)) note.remove();
+  }
 
   void edit(const std::function<void(XmpPacket&)>& edit) {
     edit(packet_);
@@ -125,10 +127,10 @@ class PacketOfSegments {
 
   // As one segment of any length.
   std::vector<MetadataSegment> merged() {
-    forgetExtension();
     if (extension_) {
       for (const XmpProperty& property : extension_->properties()) packet_.take(property);
     }
+    forgetExtension();  // also what the extension itself may say of one
     return {segmentOf({packetMark, packet_.bytes()})};
   }
 

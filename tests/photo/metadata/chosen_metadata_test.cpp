@@ -126,6 +126,18 @@ TEST(ChosenMetadata, AsAnExcerptOfExifHasItsTextsInOrder) {
   EXPECT_EQ(second.entries[1].tag, 0x9003);
 }
 
+TEST(ChosenMetadata, OfADirectoryThatRepeatsATagIsTheFirst) {
+  constexpr std::uint8_t entries = 200;
+  std::string payload = "Exif\0\0II*\0\x08\0\0\0"s + static_cast<char>(entries) + "\0"s;
+  // Each is the copyright, of all the bytes from the file's first.
+  for (int i = 0; i < entries; ++i) payload += "\x98\x82\2\0\x60\x09\0\0\0\0\0\0"s;
+  payload += "\0\0\0\0"s;
+  const Metadata all = {.segments = {{0xE1, bytesOf(payload)}}};
+  const Metadata chosen = chosenMetadata(all, {MetadataKind::copyright});
+  ASSERT_EQ(chosen.segments.size(), 1u);
+  EXPECT_LT(chosen.segments[0].payload.size(), payload.size() + 30);
+}
+
 TEST(ChosenMetadata, OfWhatIsCutAnywhereIsChosenOrNothing) {
   const Kinds kinds = {MetadataKind::copyright, MetadataKind::time};
   for (std::size_t place : {0, 1, 4}) {
