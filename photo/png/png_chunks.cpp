@@ -53,7 +53,7 @@ std::vector<std::uint8_t> inflated(Bytes packed, std::string_view what) {
       throw PhotoError(PhotoError::Kind::damaged,
                        "damaged: its " + std::string(what) + " cannot be unpacked");
     }
-    bytes.resize(bytes.size() * 2);
+    bytes.resize(std::min(bytes.size() * 2, largest));
   }
 }
 

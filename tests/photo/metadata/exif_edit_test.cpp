@@ -143,6 +143,44 @@ TEST(ExifEdit, RemovesAThumbnailThatHasNoRoom) {
   EXPECT_EQ(exifOrientation(result.payload), 1);
 }
 
+TEST(ExifEdit, FitsItsSegmentWhereverTheThumbnailBegins) {
+  constexpr std::size_t longest = 65533;
+  const Image<RGBA8Pixel> picture = test_support::flatPicture(16, 16, {9, 9, 9, 255});
+  const Bytes old = {0xFF, 0xD8, 0xFF, 0xD9};
+  const std::size_t others = cameraExif({.makerNote = {}, .thumbnail = old}).size();
+  int fitted = 0, removed = 0;
+  for (std::size_t free = 0; free < 1200; free += 5) {
+    const Bytes before =
+        cameraExif({.makerNote = Bytes(longest - others - free), .thumbnail = old});
+    ASSERT_EQ(before.size(), longest - free);
+    const Edited result = edited(before, picture, {{16, 16}, {16, 16}, {}, 6});
+    EXPECT_LE(result.payload.size(), longest);
+    EXPECT_EQ(result.lost.empty(), !thumbnailIn(result.payload).empty());
+    (result.lost.empty() ? fitted : removed) += 1;
+  }
+  EXPECT_GT(fitted, 0);
+  EXPECT_GT(removed, 0);
+}
+
+TEST(ExifEdit, FollowsPointersOfTheTypeForDirectories) {
+  constexpr std::uint8_t directoryType = 13;
+  const auto withPointer = [](Bytes payload, const std::uint8_t(&entry)[4]) {
+    const auto place = std::search(payload.begin(), payload.end(), entry, entry + 4);
+    EXPECT_NE(place, payload.end());
+    *(place + (entry[2] == 4 ? 2 : 3)) = directoryType;
+    return payload;
+  };
+  const std::uint8_t little[] = {0x69, 0x87, 4, 0}, big[] = {0x87, 0x69, 0, 4};
+  const Image<RGBA8Pixel> picture = photoLikePicture(300, 400, 1);
+  for (const bool littleEndian : {false, true}) {
+    const Bytes payload =
+        withPointer(cameraExif({.littleEndian = littleEndian}), littleEndian ? little : big);
+    const Edited result = edited(payload, picture, quarterTurn);
+    EXPECT_EQ(numberIn(result.payload, 0xA002), 300u);
+    EXPECT_EQ(numberIn(result.payload, 0xA003), 400u);
+  }
+}
+
 TEST(ExifEdit, SurvivesASegmentCutAnywhere) {
   const Image<RGBA8Pixel> picture = photoLikePicture(30, 40, 1);
   const Bytes whole = cameraExif({.subjectArea = {1, 2, 3},

@@ -181,6 +181,15 @@ TEST(KeptMetadata, RemovesThumbnailsThatShowThePictureAsItWas) {
   EXPECT_EQ(segments[1].payload, bytesOf("Photoshop 3.0\0"s + "8BIM\x04\x04\0\0\0\0\0\3abc\0"s));
 }
 
+TEST(KeptMetadata, HasNoThumbnailOfPhotoshopsThatEndsWithoutItsPadding) {
+  const Bytes resources = bytesOf("Photoshop 3.0\0"s + "8BIM\x04\x04\0\0\0\0\0\3abc\0"s +
+                                  "8BIM\x04\x0C\0\0\0\0\0\3old"s);
+  const Written written = rewritten(jpegWith(photoLikePicture(32, 32, 1), {{0xED, resources}}));
+  EXPECT_EQ(written.lost,
+            (std::vector<Loss>{{"Photoshop thumbnail", "shows the picture as it was"}}));
+  EXPECT_EQ(written.text().find("old"), std::string::npos);
+}
+
 // A photo with a depth map, of which the extension holds the data.
 Bytes depthPhoto(int orientation) {
   const auto description = [](const std::string& content) {

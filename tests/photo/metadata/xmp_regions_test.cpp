@@ -3,7 +3,11 @@
 #include <fmt/format.h>
 #include <gtest/gtest.h>
 
+#include <cstdlib>
+
 #include "tests/photo/metadata/xmp_texts.h"
+#include "tests/support/comma_locale.h"
+#include "tests/support/comma_numbers.h"
 
 namespace pelorin::photo {
 namespace {
@@ -213,6 +217,24 @@ TEST(XmpRegions, InPixelsAreScaledToo) {
   EXPECT_EQ(area.field({areaSpace, "y"}).text(), "120");
   EXPECT_EQ(area.field({areaSpace, "w"}).text(), "15");
   EXPECT_EQ(area.field({areaSpace, "h"}).text(), "40");
+}
+
+TEST(XmpRegions, HaveTheSameNumbersInEveryLocale) {
+  const auto editedPacket = [] {
+    XmpPacket packet(xmpPacket(workingGroup(400, 300) + microsoft("0.5,0.2,0.2,0.1")));
+    expectFace(facesOf(packet, upright(6)), 0.7, 0.5, 0.8, 0.7);
+    turnRegions(packet, upright(6));
+    return packet.bytes();
+  };
+  const std::string expected = editedPacket();
+  {
+    const test_support::CommaLocale locale;
+    EXPECT_EQ(editedPacket(), expected);
+  }
+  const test_support::CommaNumbers numbers;
+  if (std::strtod("0,5", nullptr) != 0.5)
+    GTEST_SKIP() << "this C library takes no locale of a test";
+  EXPECT_EQ(editedPacket(), expected);
 }
 
 TEST(XmpRegions, OfAnotherCropStayAsTheyAreAndAreNoFaces) {
