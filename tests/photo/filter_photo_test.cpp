@@ -2,14 +2,11 @@
 
 #include <gtest/gtest.h>
 
-#include <map>
 #include <memory>
 #include <string>
 #include <vector>
 
-#include "image_processing/filters/default_filter_factory.h"
-#include "image_processing/filters/filtered_image.h"
-#include "photo/thread_workers.h"
+#include "tests/photo/filtered_by_picture.h"
 #include "tests/photo/metadata/phone_photos.h"
 #include "tests/support/jpeg_files.h"
 #include "tests/support/pictures.h"
@@ -18,33 +15,16 @@ namespace pelorin::photo {
 namespace {
 
 using namespace image_processing;
+using test_support::byPicture;
 using test_support::Bytes;
 using test_support::JpegRecipe;
 using test_support::makeJpeg;
 using test_support::phonePhoto;
 using test_support::photoLikePicture;
-
-/// Decoded as a whole, filtered in a session, and saved.
-Bytes byPicture(const Bytes& file, const FilterRequest& request, const Format& format) {
-  SaveOptions save = request.save;
-  save.mark = markOf(request.filter, request.params);
-  Photo photo = open(file, request.open);
-  FilteredImage session(photo.image,
-                        metadataWithFaces(allFaces(request.faces, photo), photo.image->width,
-                                          photo.image->height, request.open.scale),
-                        "", defaultFilterConfigValue, DefaultFilterFactory::filterFactory());
-  Image<RGBA8Pixel> output(photo.image->width, photo.image->height);
-  session.applyFilterWithParams(request.filter, request.params, defaultFilterConfigValue, output);
-  return photo::save(output, format, photo.metadata, save);
-}
+using test_support::threads;
 
 std::string parametersOf(const std::string& filter) {
   return filter.starts_with("AE") ? "slider=0.7;" : "";
-}
-
-Workers& threads(std::size_t count) {
-  static std::map<std::size_t, ThreadWorkers> all;
-  return all.try_emplace(count, count).first->second;
 }
 
 std::vector<FilterResources> ways() {
@@ -64,7 +44,7 @@ void expectSameFiles(const Bytes& file, const std::string& what) {
       request.params = parametersOf(filter);
       request.open.scale = scale;
       for (const Format& format : formats()) {
-        const Bytes expected = byPicture(file, request, format);
+        const Bytes expected = byPicture(file, request, &format);
         for (const FilterResources& resources : ways()) {
           EXPECT_EQ(filterPhoto(file, request, &format, resources).file, expected)
               << what << ", " << filter << " at 1/" << scale << " to " << format.name << ", "

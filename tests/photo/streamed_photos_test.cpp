@@ -2,14 +2,12 @@
 
 #include <array>
 #include <iterator>
-#include <map>
 #include <string>
 #include <vector>
 
 #include "image_processing/filters/default_filter_factory.h"
-#include "image_processing/filters/filtered_image.h"
 #include "photo/filter_photo.h"
-#include "photo/thread_workers.h"
+#include "tests/photo/filtered_by_picture.h"
 #include "tests/support/exif_payload.h"
 #include "tests/support/jpeg_files.h"
 #include "tests/support/pictures.h"
@@ -20,6 +18,7 @@ namespace pelorin::photo {
 namespace {
 
 using namespace image_processing;
+using test_support::byPicture;
 using test_support::Bytes;
 using test_support::JpegRecipe;
 using test_support::makeJpeg;
@@ -27,24 +26,7 @@ using test_support::noisePicture;
 using test_support::photoLikePicture;
 using test_support::Random;
 using test_support::slowBuild;
-
-Bytes byPicture(const Bytes& file, const FilterRequest& request) {
-  SaveOptions save = request.save;
-  save.mark = markOf(request.filter, request.params);
-  Photo photo = open(file, request.open);
-  FilteredImage session(photo.image,
-                        metadataWithFaces(allFaces(request.faces, photo), photo.image->width,
-                                          photo.image->height, request.open.scale),
-                        "", defaultFilterConfigValue, DefaultFilterFactory::filterFactory());
-  Image<RGBA8Pixel> output(photo.image->width, photo.image->height);
-  session.applyFilterWithParams(request.filter, request.params, defaultFilterConfigValue, output);
-  return photo::save(output, *formatNamed(photo.facts.format), photo.metadata, save);
-}
-
-Workers& threads(std::size_t count) {
-  static std::map<std::size_t, ThreadWorkers> all;
-  return all.try_emplace(count, count).first->second;
-}
+using test_support::threads;
 
 bool chance(Random& random, int percent) {
   return static_cast<int>(random.below(100)) < percent;
