@@ -45,7 +45,8 @@ PhotoTally runPhotoLoop(const std::vector<Input>& photos, int jobs, Talk& talk,
                         const PhotoLoop& loop);
 
 /// Works on photos, `jobs` at once, each on one thread: says which failed and why, moves the bar on,
-/// counts. One with a trouble has failed without any work. Ctrl-C starts no further work; what was done by then is reported.
+/// counts. One with a trouble has failed without any work. Ctrl-C starts no further work; what was done
+/// by then is reported.
 template <typename Result>
 PhotoTally eachPhoto(const std::vector<Input>& photos, int jobs, Talk& talk,
                      const PhotoSteps<Result>& steps) {

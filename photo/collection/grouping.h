@@ -13,8 +13,9 @@ struct DupeGroup {
   std::vector<ShotPair> pairs;      ///< The pairs among them, in the given order.
 };
 
-/// The groups that `pairs` make of `photoCount` photos, by their first photo: each photo stays in one, the pairs with the highest
-/// scores come together first, and a pair whose groups cannot be joined whole is in none.
+/// The groups that `pairs` make of `photoCount` photos, by their first photo: each photo stays in one,
+/// the pairs with the highest scores come together first, and a pair whose groups cannot be joined
+/// whole is in none.
 std::vector<DupeGroup> groupWholly(std::size_t photoCount, const std::vector<ShotPair>& pairs);
 
 }  // namespace pelorin::photo

@@ -7,8 +7,9 @@
  * is whatever else a function cannot mean; every function may also end with QUENBY_OUT_OF_MEMORY.
  *
  * Threads. Nothing here keeps state outside of its objects or starts a thread: a call does its work on
- * the thread that calls, and on those that the caller lends it (quenby_workers). Functions that take an object as const, and quenby_session_apply, may be
- * called by any number of threads at once; objects are freed when no call uses them any more.
+ * the thread that calls, and on those that the caller lends it (quenby_workers). Functions that take an
+ * object as const, and quenby_session_apply, may be called by any number of threads at once; objects are
+ * freed when no call uses them any more.
  *
  * Ownership. What a call is given it has done with when it returns, unless it says otherwise. Every
  * kind of object has one function that frees it, which takes null in silence.
