@@ -146,6 +146,10 @@ jdouble window(JNIEnv*, jobject, jfloat threshold, jboolean sameOrientation) {
   return image_processing::longestDupeTimeDifference(threshold, sameOrientation != JNI_FALSE);
 }
 
+jstring version(JNIEnv* env, jobject) {
+  return env->NewStringUTF(PELORIN_VERSION);
+}
+
 jlong newCancel(JNIEnv*, jobject) {
   return cancellations().open();
 }
@@ -171,6 +175,7 @@ void registerPhotoNatives() {
       nativeMethod("distance", "([F[F)F", photoNative<&distance>()),
       nativeMethod("score", "(FDZ)F", photoNative<&score>()),
       nativeMethod("window", "(FZ)D", photoNative<&window>()),
+      nativeMethod("version", "()Ljava/lang/String;", photoNative<&version>()),
       nativeMethod("newCancel", "()J", photoNative<&newCancel>()),
       nativeMethod("cancel", "(J)V", photoNative<&cancel>()),
       nativeMethod("freeCancel", "(J)V", photoNative<&freeCancel>()),

@@ -52,6 +52,9 @@ jfloat score(JNIEnv* env, jobject caller, jfloat distance, jdouble seconds,
 /// The longest time between two photos that may reach `threshold`; see longestDupeTimeDifference.
 jdouble window(JNIEnv* env, jobject caller, jfloat threshold, jboolean sameOrientation);
 
+/// The version of this library.
+jstring version(JNIEnv* env, jobject caller);
+
 jlong newCancel(JNIEnv* env, jobject caller);
 void cancel(JNIEnv* env, jobject caller, jlong handle);
 void freeCancel(JNIEnv* env, jobject caller, jlong handle);

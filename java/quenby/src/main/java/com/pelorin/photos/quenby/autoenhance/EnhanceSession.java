@@ -205,7 +205,7 @@ public final class EnhanceSession implements AutoCloseable {
         if (filter == null) {
             throw new UnknownFilterException(null);
         }
-        filter.keys().check(filter.key(), params);
+        filter.check(params);
         Bitmaps.requireRoomFor(width, height, output);
         Cancellation.checkBefore(cancellation);
         long session = handle.beginCall();

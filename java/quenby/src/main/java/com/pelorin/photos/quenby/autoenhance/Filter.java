@@ -56,6 +56,18 @@ public enum Filter {
     }
 
     /**
+     * Checks a parameter string, in the words that {@link PhotoBytes#filter} would use: where many
+     * photos are to be filtered, before the first one.
+     *
+     * @param params "key=value;" items, every one with its semicolon; null is none
+     * @throws IllegalArgumentException when a parameter is unknown, missing or unreadable; the
+     *                                  message says what the filter wants
+     */
+    public void check(String params) {
+        keys.check(key, params);
+    }
+
+    /**
      * Finds a filter by its key.
      *
      * @param key exactly as {@link #key} gives it

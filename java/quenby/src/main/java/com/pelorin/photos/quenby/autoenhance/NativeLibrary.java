@@ -29,6 +29,17 @@ public final class NativeLibrary {
         }
     }
 
+    /**
+     * Tells which engine is at work, for records of what it made. Loads libquenby_photo.so.
+     *
+     * @return the version, such as "0.1.0"
+     * @throws UnsatisfiedLinkError when it cannot be loaded; the message says why
+     */
+    public static String version() {
+        loadPhoto();
+        return PhotoBytes.version();
+    }
+
     /** Loads libquenby_photo.so in the same way. */
     static void loadPhoto() {
         if (!photoLoaded) {

@@ -355,6 +355,8 @@ public final class PhotoBytes {
 
     static native double window(float threshold, boolean sameOrientation);
 
+    static native String version();
+
     static native long newCancel();
 
     static native void cancel(long handle);

@@ -238,6 +238,13 @@ class PhotoBytesTest {
     }
 
     @Test
+    void theEngineTellsItsVersion() throws IOException {
+        String project = Files.readString(
+                Path.of(System.getProperty("quenby.root"), "CMakeLists.txt"));
+        assertTrue(project.contains("project(Quenby VERSION " + NativeLibrary.version() + " "));
+    }
+
+    @Test
     void qualityNeedsSomeSize() throws IOException {
         assertTrue(Float.isNaN(PhotoBytes.of(plain).niqe()));
         PhotoBytes large = PhotoBytes.of(Files.readAllBytes(
