@@ -12,13 +12,37 @@ set(THREADS_PREFER_PTHREAD_FLAG ON)
 
 # Results are defined to the byte: a fused multiply-add rounds once where the definition rounds
 # twice. No errno and no traps lets the compiler vectorise roots and conversions; values stay.
-add_compile_options(-ffp-contract=off -fno-math-errno -fno-trapping-math -Wall -Wextra)
+add_compile_options(-ffp-contract=off -fno-math-errno -fno-trapping-math)
 
 # Addresses are chosen as a program starts, where the linker can; imports are resolved by then and
 # read-only from there on; no stack is executable.
 include(CheckPIESupported)
 check_pie_supported()
 add_link_options(-Wl,-z,relro -Wl,-z,now -Wl,-z,noexecstack)
+if(NOT PELORIN_SANITIZE) # sanitizers look at every access already, and know no checked memcpy
+  include(Hardening)
+endif()
+
+# For who works on the tree. Signs are left out, which g++ asks of C and clang of everything: sizes are
+# unsigned here and coordinates are not.
+if(PELORIN_WARNINGS)
+  add_compile_options(-Wall -Wextra -Wshadow -Wconversion -Wno-sign-conversion)
+  if(PELORIN_WARNINGS STREQUAL "ERROR")
+    add_compile_options(-Werror)
+  endif()
+endif()
+
+# For folders whose code runs on threads that others made, such as Java's, whose stacks may be small: a
+# function has less than 16 KiB of its own. Sanitizers and missing optimisation need more.
+function(pelorin_limit_stack)
+  if(PELORIN_WARNINGS AND NOT PELORIN_SANITIZE AND NOT CMAKE_BUILD_TYPE STREQUAL "Debug")
+    if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU")
+      add_compile_options(-Wstack-usage=16383)
+    else()
+      add_compile_options(-Wframe-larger-than=16383)
+    endif()
+  endif()
+endfunction()
 
 # A sanitizer that only prints would let a test pass.
 if(PELORIN_SANITIZE)

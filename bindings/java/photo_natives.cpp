@@ -83,12 +83,13 @@ jbyteArray filterBytes(JNIEnv* env, jobject, jbyteArray array, jobject buffer, j
                        jfloatArray faces, jint scale, jstring filter, jstring params, jboolean mark,
                        jlong cancel, jobjectArray lost) {
   const std::stop_token stop = cancellations().token(cancel);
+  const std::optional<photo::ChromaSampling> sampling = samplingOf(subsampling);
   const photo::FilterRequest request{
       .filter = toString(env, filter),
       .params = toString(env, params),
       .faces = facesOf(env, faces),
       .open = {.scale = scale, .rotate = rotation, .stop = stop},
-      .save = {.quality = quality, .stop = stop, .sampling = samplingOf(subsampling)},
+      .save = {.quality = quality, .stop = stop, .sampling = sampling},
       .mark = mark != JNI_FALSE};
   const FileBytes file(env, array, buffer, offset, length);
   const photo::FilteredPhoto made =

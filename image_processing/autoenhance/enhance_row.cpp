@@ -9,14 +9,14 @@
 
 namespace pelorin::image_processing {
 
-TonePass::TonePass(const std::vector<float>& unitCurve, float scale, float vibrance, float ltmBlend,
-                   float detailGain)
+TonePass::TonePass(const std::vector<float>& unitCurve, float labScale, float vibranceGain,
+                   float toneMappedShare, float gainOfDetail)
     : curve(unitCurve),
-      samplesPerUnit(static_cast<float>(unitCurve.size() - 1) / scale),
-      scale(scale),
-      vibrance(vibrance),
-      ltmBlend(ltmBlend),
-      detailGain(detailGain) {
+      samplesPerUnit(static_cast<float>(unitCurve.size() - 1) / labScale),
+      scale(labScale),
+      vibrance(vibranceGain),
+      ltmBlend(toneMappedShare),
+      detailGain(gainOfDetail) {
   for (float& sample : curve) sample *= scale;
   const auto moderate = [](float value) { return std::fabs(value) < 1e6f; };  // false for NaN
   ordinary = scale == labWhite && std::all_of(curve.begin(), curve.end(), moderate) &&

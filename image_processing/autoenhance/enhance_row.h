@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstddef>
+#include <memory>
 #include <vector>
 
 #include "image_processing/autoenhance/colour/companding_steps.h"
@@ -11,8 +12,8 @@ namespace pelorin::image_processing {
 /// What the pass over the pixels needs to know beside the pixels: the same for a whole picture.
 struct TonePass {
   /// Scales a curve over [0, 1] to lightness. @throws std::bad_alloc.
-  TonePass(const std::vector<float>& curve, float scale, float vibrance, float ltmBlend,
-           float detailGain);
+  TonePass(const std::vector<float>& unitCurve, float labScale, float vibranceGain,
+           float toneMappedShare, float gainOfDetail);
 
   std::vector<float> curve;  ///< At least 2 samples, in units of L.
   float samplesPerUnit;
@@ -33,11 +34,11 @@ template <typename Mask>
 void enhanceRow(const TonePass& pass, const RGBA8Pixel* in, const Mask* bilateral, const Mask* ltm,
                 RGBA8Pixel* out, std::size_t count);
 
-/// `enhanceRow` for a picture that comes in pieces: what depends on the pass alone is found once. Some
+/// `enhanceRow` for a picture that comes in pieces: what depends on the pass alone is found once, some
 /// 40 KB. Any thread may use it.
 class PreparedTonePass {
  public:
-  /// Holds on to `pass`. Never throws.
+  /// Holds on to `pass`. @throws std::bad_alloc.
   explicit PreparedTonePass(const TonePass& pass);
 
   /// As `enhanceRow`, for the same masks.
@@ -54,7 +55,7 @@ class PreparedTonePass {
 
  private:
   const TonePass& pass_;
-  Tables tables_;  // written when the pass is ordinary
+  std::unique_ptr<Tables> tables_;  // there when the pass is ordinary; callers' stacks may be small
 };
 
 /// The definition of `enhanceRow`.

@@ -287,7 +287,8 @@ HWY_EXPORT(entries);
 
 PreparedTonePass::PreparedTonePass(const TonePass& pass) : pass_(pass) {
   if (!pass.ordinary) return;
-  std::get<decltype(&HWY_NAMESPACE::fillTables)>(HWY_DYNAMIC_DISPATCH(entries)())(pass, tables_);
+  tables_.reset(new Tables);  // written below
+  std::get<decltype(&HWY_NAMESPACE::fillTables)>(HWY_DYNAMIC_DISPATCH(entries)())(pass, *tables_);
 }
 
 template <typename Mask>
@@ -295,7 +296,7 @@ void PreparedTonePass::enhance(const RGBA8Pixel* in, const Mask* bilateral, cons
                                RGBA8Pixel* out, std::size_t count) const {
   if (!pass_.ordinary) return enhanceRowScalar(pass_, in, bilateral, ltm, out, count);
   std::get<decltype(&HWY_NAMESPACE::enhanceByTables<Mask>)>(HWY_DYNAMIC_DISPATCH(entries)())(
-      pass_, tables_, in, bilateral, ltm, out, count);
+      pass_, *tables_, in, bilateral, ltm, out, count);
 }
 
 template <typename Mask>

@@ -123,7 +123,8 @@ class EnhanceRows : public RowFilter {
     using Masks = MaskRows<Mask, Mask>;
     Workers* const workers = work.workers;
     const std::size_t parts = tasksFor(workers);
-    const auto steps = workers == nullptr ? 1 : std::max<int>(1, work.bandHeight / sumRowsAtOnce);
+    const int steps =
+        workers == nullptr ? 1 : std::max(1, static_cast<int>(work.bandHeight / sumRowsAtOnce));
     // The steps that may be under way from one stage to another, those stages' own included.
     const auto stepsOver = [&](std::size_t stages) {
       return steps * static_cast<int>(bandsUnderWay(stages, workers));
@@ -168,10 +169,10 @@ class EnhanceRows : public RowFilter {
                            masks.sum(step, summing);
                        }};
     const Stage enhance = {parts, [&](std::int64_t band, std::size_t part) {
-                             const std::uint32_t before = rowEnd(band - 1), rows = rowsOf(band);
+                             const std::uint32_t before = rowEnd(band - 1), count = rowsOf(band);
                              Mask* const ltm = finishing[part].ltm.data.get();
-                             auto i = static_cast<std::uint32_t>(partStart(rows, part, parts));
-                             for (; i < partStart(rows, part + 1, parts); ++i) {
+                             auto i = static_cast<std::uint32_t>(partStart(count, part, parts));
+                             for (; i < partStart(count, part + 1, parts); ++i) {
                                const std::uint32_t y = before + i;
                                masks.writeLtm(y, ltm, finishing[part].faces);
                                pass.enhance(photo.row(y), masks.bilateral(y), ltm,

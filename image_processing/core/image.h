@@ -24,12 +24,12 @@ class Image {
   class ImageForwardIterator;
   class ImageForwardIteratorXY;
 
-  /// Shares `pixels`, which must hold width x height elements. Without them allocates that many,
+  /// Shares `pixels`, which must hold columns x rows elements. Without them allocates that many,
   /// uninitialised: whoever makes an image writes every pixel before one is read.
   /// @throws std::bad_alloc when the pixels do not fit into memory or the address space.
-  Image(std::uint32_t width, std::uint32_t height, std::shared_ptr<T> pixels = nullptr)
-      : data(std::move(pixels)), width(width), height(height), bytesPerPixel(sizeof(T)) {
-    const std::size_t bytes = checkedProduct(width, height, sizeof(T));
+  Image(std::uint32_t columns, std::uint32_t rows, std::shared_ptr<T> pixels = nullptr)
+      : data(std::move(pixels)), width(columns), height(rows), bytesPerPixel(sizeof(T)) {
+    const std::size_t bytes = checkedProduct(columns, rows, sizeof(T));
     if (data == nullptr) {
       data = std::shared_ptr<T>(new T[bytes / sizeof(T)], std::default_delete<T[]>());
       preferHugePages(data.get(), bytes);

@@ -14,7 +14,8 @@ namespace pelorin::image_processing {
 /// A filter bound to one editing session: `init` once, then `applyConfig` as often as wanted.
 class AbstractFilter {
  public:
-  explicit AbstractFilter(std::shared_ptr<FilteredImageState> state) : state(std::move(state)) {}
+  explicit AbstractFilter(std::shared_ptr<FilteredImageState> session)
+      : state(std::move(session)) {}
   virtual ~AbstractFilter() = default;
   AbstractFilter(const AbstractFilter&) = delete;
   AbstractFilter& operator=(const AbstractFilter&) = delete;

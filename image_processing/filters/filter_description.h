@@ -14,8 +14,8 @@ namespace pelorin::image_processing {
 /// construction, so any thread may read it.
 class FilterDescription {
  public:
-  FilterDescription(const char* name, const char* displayName, const char* description)
-      : name(name), displayName(displayName), description(description) {}
+  FilterDescription(const char* key, const char* title, const char* sentences)
+      : name(key), displayName(title), description(sentences) {}
   FilterDescription(const FilterDescription&) = delete;
   FilterDescription& operator=(const FilterDescription&) = delete;
 

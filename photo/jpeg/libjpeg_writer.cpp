@@ -32,7 +32,7 @@ LibjpegWriter::Destination& LibjpegWriter::destinationOf(j_compress_ptr codec) {
 
 void LibjpegWriter::append(j_compress_ptr codec, std::size_t count) {
   Destination& destination = destinationOf(codec);
-  const std::uint8_t* const block = destination.block.data();
+  const std::uint8_t* const block = destination.block.get();
   bool done = false;
   try {
     destination.bytes.insert(destination.bytes.end(), block, block + count);
@@ -44,19 +44,18 @@ void LibjpegWriter::append(j_compress_ptr codec, std::size_t count) {
 
 void LibjpegWriter::begin(j_compress_ptr codec) {
   Destination& destination = destinationOf(codec);
-  destination.base.next_output_byte = destination.block.data();
-  destination.base.free_in_buffer = destination.block.size();
+  destination.base.next_output_byte = destination.block.get();
+  destination.base.free_in_buffer = blockSize;
 }
 
 boolean LibjpegWriter::empty(j_compress_ptr codec) {
-  append(codec, destinationOf(codec).block.size());  // whatever the counters say
+  append(codec, blockSize);  // whatever the counters say
   begin(codec);
   return TRUE;
 }
 
 void LibjpegWriter::end(j_compress_ptr codec) {
-  const Destination& destination = destinationOf(codec);
-  append(codec, destination.block.size() - destination.base.free_in_buffer);
+  append(codec, blockSize - destinationOf(codec).base.free_in_buffer);
 }
 
 }  // namespace pelorin::photo

@@ -1,8 +1,8 @@
 #pragma once
 
-#include <array>
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 #include <utility>
 #include <vector>
 
@@ -35,11 +35,14 @@ class LibjpegWriter {
   std::vector<std::uint8_t> takeFile() { return std::move(destination_.bytes); }
 
  private:
+  static constexpr std::size_t blockSize = 65536;
+
   // Filled block by block: a vector made large enough for libjpeg to write into would be cleared.
   struct Destination {
     jpeg_destination_mgr base;  // first, so that libjpeg's pointer to it is one to the whole
     std::vector<std::uint8_t> bytes;
-    std::array<std::uint8_t, 65536> block;
+    // Not within, since the stacks of callers may be small.
+    std::unique_ptr<std::uint8_t[]> block{new std::uint8_t[blockSize]};
   };
 
   static Destination& destinationOf(j_compress_ptr codec);

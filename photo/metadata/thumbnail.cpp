@@ -85,11 +85,11 @@ void removeJfif(std::vector<std::uint8_t>& file) {
 /// The picture at the size of one thumbnail.
 class ThumbnailMaker::Reduction {
  public:
-  Reduction(PictureSize picture, PictureSize size) : size(size) {
-    if (isMuchLarger(picture, size)) {
-      lines_.emplace(picture, size);
+  Reduction(PictureSize picture, PictureSize reduced) : size(reduced) {
+    if (isMuchLarger(picture, reduced)) {
+      lines_.emplace(picture, reduced);
     } else {
-      areas_.emplace(picture, size);
+      areas_.emplace(picture, reduced);
     }
   }
 

@@ -1,8 +1,11 @@
 # What every program and library that we ship is linked with: addresses that are chosen as it starts, all
-# of its imports resolved by then and read-only from there on, nothing that is writable and executable.
-#   cmake -DFILES=<file>,... -DREADELF=<readelf> -P check_hardening.cmake
+# of its imports resolved by then and read-only from there on, nothing that is writable and executable; and
+# what its code calls when an array on the stack or a copy's target was overrun. SMALL names those that hold
+# neither arrays on the stack nor copies.
+#   cmake -DFILES=<file>,... -DSMALL=<file>,... -DREADELF=<readelf> -P check_hardening.cmake
 cmake_minimum_required(VERSION 3.25)
 string(REPLACE "," ";" files "${FILES}")
+string(REPLACE "," ";" small "${SMALL}")
 if(NOT files)
   message(FATAL_ERROR "no files to check")
 endif()
@@ -14,7 +17,7 @@ macro(complain)
 endmacro()
 
 foreach(file IN LISTS files)
-  execute_process(COMMAND ${READELF} --wide --file-header --dynamic --program-headers ${file}
+  execute_process(COMMAND ${READELF} --wide --file-header --dynamic --program-headers --dyn-syms ${file}
                   OUTPUT_VARIABLE facts COMMAND_ERROR_IS_FATAL ANY)
   if(NOT facts MATCHES "Type: +DYN")
     complain("${file}: stands at a fixed address")
@@ -30,6 +33,16 @@ foreach(file IN LISTS files)
   endif()
   if(facts MATCHES "\\(TEXTREL\\)")
     complain("${file}: code that is changed as it is loaded")
+  endif()
+  if(file IN_LIST small)
+    continue()
+  endif()
+  if(NOT facts MATCHES " UND __stack_chk_fail")
+    complain("${file}: no stack protector")
+  endif()
+  string(REPLACE __stack_chk_fail "" facts "${facts}")
+  if(NOT facts MATCHES " UND __[a-z]+_chk[@\n ]")
+    complain("${file}: copies of unchecked size")
   endif()
 endforeach()
 if(failures)

@@ -57,7 +57,8 @@ library() {
   cd "$build" # checks of libjpeg-turbo's leave files where they run
   cmake -S "$folder" -B "$build" -G Ninja -DCMAKE_BUILD_TYPE=Release \
     -DCMAKE_INSTALL_PREFIX="$prefix" -DCMAKE_INSTALL_LIBDIR:PATH=lib \
-    -DCMAKE_POSITION_INDEPENDENT_CODE=ON -DCMAKE_PREFIX_PATH="$prefix" "${options[@]}" "$@"
+    -DCMAKE_POSITION_INDEPENDENT_CODE=ON -DCMAKE_PREFIX_PATH="$prefix" \
+    -DCMAKE_PROJECT_INCLUDE="$root/cmake/Hardening.cmake" "${options[@]}" "$@"
   cmake --build "$build"
   cmake --install "$build"
 }
@@ -78,7 +79,7 @@ fetch
 options=("$@")
 made_from() {
   (cd "$sources" && sha256sum ./*.dsc)
-  cat "$here"/*.* "$here"/*/*
+  cat "$here"/*.* "$here"/*/* "$root/cmake/Hardening.cmake"
   for option in "${options[@]}"; do
     echo "$option"
     case $option in -DCMAKE_TOOLCHAIN_FILE=*) cat "${option#*=}" ;; esac

@@ -32,8 +32,8 @@ struct alignas(64) GridCell : std::array<GridNode, gridBins> {};
 /// pixel position (row, column) times the cell size.
 struct Grid {
   /// All nodes 0. @throws std::bad_alloc, also when a row has 2^32 nodes.
-  Grid(std::int64_t columns, std::int64_t rows)
-      : columns(columns), rows(rows), cells(cellCount(columns, rows)) {}
+  Grid(std::int64_t across, std::int64_t down)
+      : columns(across), rows(down), cells(cellCount(across, down)) {}
 
   GridCell* row(std::int64_t y) { return &cells[y * columns]; }
   const GridCell* row(std::int64_t y) const { return &cells[y * columns]; }
@@ -42,9 +42,9 @@ struct Grid {
   std::vector<GridCell> cells;
 
  private:
-  static std::size_t cellCount(std::int64_t columns, std::int64_t rows) {
-    if (columns > std::numeric_limits<std::uint32_t>::max() / gridBins) throw std::bad_alloc();
-    return checkedProduct(columns, std::uint64_t(rows), sizeof(GridCell)) / sizeof(GridCell);
+  static std::size_t cellCount(std::int64_t across, std::int64_t down) {
+    if (across > std::numeric_limits<std::uint32_t>::max() / gridBins) throw std::bad_alloc();
+    return checkedProduct(across, std::uint64_t(down), sizeof(GridCell)) / sizeof(GridCell);
   }
 };
 

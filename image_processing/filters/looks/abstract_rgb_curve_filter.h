@@ -75,24 +75,24 @@ class AbstractRGBCurveFilter : public AbstractFilter {
   }
 
   /// Replaces the vignette's settings that the parameters name, as `replaceMaskSettings` says.
-  void parseMaskParameters(float& maskRadius, float& maskAlpha, bool& applyMask,
+  void parseMaskParameters(float& radius, float& alpha, bool& applied,
                            const std::string& params) const {
-    replaceMaskSettings(maskRadius, maskAlpha, applyMask, params);
+    replaceMaskSettings(radius, alpha, applied, params);
   }
 
   /// Appends the samples of each curve (at least 2, in 0 ... 255) to an empty vector.
   virtual void getRGBCurves(std::vector<float>& red, std::vector<float>& green,
                             std::vector<float>& blue, const std::string& params) = 0;
 
-  /// The vignette's settings: mask values at the edge and in the centre, and what `maskRadius`,
-  /// `maskAlpha` and `applyMask` are until a parameter string changes them.
-  virtual void getRadialMaskParameters(float& edge, float& centre, float& maskRadius,
-                                       float& maskAlpha, bool& applyMask) {
+  /// The vignette's settings: mask values at the edge and in the centre, and what the parameters
+  /// `maskRadius`, `maskAlpha` and `applyMask` are until a parameter string changes them.
+  virtual void getRadialMaskParameters(float& edge, float& centre, float& radius, float& alpha,
+                                       bool& applied) {
     edge = 0.0f;
     centre = 1.0f;
-    maskRadius = T::maskRadius;
-    maskAlpha = T::maskAlpha;
-    applyMask = T::applyMask;
+    radius = T::maskRadius;
+    alpha = T::maskAlpha;
+    applied = T::applyMask;
   }
 
  private:

@@ -72,7 +72,7 @@ HWY_INLINE Colour vignetted(const Colour& c, F mask, float opacity) {
 
 template <ChannelMix mix>
 HWY_INLINE Colour mixed(const Colour& c) {
-  const auto sum = [](F a, F b, F c) HWY_ATTR { return hn::Add(hn::Add(a, b), c); };
+  const auto sum = [](F r, F g, F b) HWY_ATTR { return hn::Add(hn::Add(r, g), b); };
   if constexpr (mix == ChannelMix::none) {
     return c;
   } else if constexpr (mix == ChannelMix::grey) {

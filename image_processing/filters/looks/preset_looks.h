@@ -23,13 +23,13 @@ class PresetLookFilter : public AbstractRGBCurveFilter<T> {
     blue.assign(T::curves[2].begin(), T::curves[2].end());
   }
 
-  void getRadialMaskParameters(float& edge, float& centre, float& maskRadius, float& maskAlpha,
-                               bool& applyMask) override {
+  void getRadialMaskParameters(float& edge, float& centre, float& radius, float& alpha,
+                               bool& applied) override {
     edge = 22.0f / 255.0f;
     centre = 163.0f / 255.0f;
-    maskRadius = T::maskRadius;
-    maskAlpha = T::maskAlpha;
-    applyMask = T::applyMask;
+    radius = T::maskRadius;
+    alpha = T::maskAlpha;
+    applied = T::applyMask;
   }
 };
 
