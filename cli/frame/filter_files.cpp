@@ -3,12 +3,15 @@
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <filesystem>
 #include <memory>
 #include <optional>
 
+#include "cli/frame/comparison_page.h"
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/file_bytes.h"
+#include "cli/frame/html_page.h"
 #include "cli/frame/interrupt.h"
 #include "cli/frame/jobs_option.h"
 #include "cli/frame/json_output.h"
@@ -31,10 +34,13 @@ struct Work {
   bool inPlace = false, keepsTimes = false;
   std::uint64_t pixels = 0;                            // bytes of them that a file may keep
   bool again = false;                                  // whatever marks a photo carries
+  std::optional<ComparisonSize> shown = {};            // on a page, where there is to be one
   std::unique_ptr<photo::ThreadWorkers> workers = {};  // of all files at once; null for none
 };
 
 struct Done {
+  std::string section = {};  // of the page
+  bool existed = false;      // nothing else is there then
   std::string earlier = {};  // the same edit, which stays the only one; nothing else is there then
   std::uint32_t width = 0, height = 0;
   std::vector<photo::Loss> lost = {};
@@ -68,15 +74,82 @@ Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter)
   return work;
 }
 
+// What is shown of a photo; what goes wrong there is said in its place, for the result stands.
+std::string sectionOf(const Work& work, const PlannedFile& file, const Done& done,
+                      std::span<const std::uint8_t> before, std::span<const std::uint8_t> after) {
+  if (!work.shown) return "";
+  ComparedPhoto photo = {.input = file.input.path, .lost = done.lost};
+  if (!after.empty() && !work.inPlace) photo.output = file.output;
+  if (done.existed) photo.remark = "was there already";
+  if (!done.earlier.empty()) photo.remark = work.filter.doneAlready + " (" + done.earlier + ")";
+  try {
+    const Comparison pictures = compareFiles({.before = before,
+                                              .after = after,
+                                              .open = work.photo,
+                                              .faces = work.faces.of(file.input),
+                                              .filter = work.filter.filter.name,
+                                              .params = work.filter.params},
+                                             *work.shown);
+    photo.pictures = &pictures;
+    return comparisonSection(photo);
+  } catch (const Interrupted&) {
+    throw;
+  } catch (const std::exception& error) {
+    photo.remark += (photo.remark.empty() ? "" : "; ") + ("no picture: " + explain(error));
+    return comparisonSection(photo);
+  }
+}
+
+// A result that an earlier run left beside its photo, or in its place.
+Done existing(const Work& work, const PlannedFile& file) {
+  Done done = {.existed = true};
+  if (!work.shown) return done;
+  try {
+    Input before = file.input;
+    if (work.inPlace) before.path = photo::backupPath(work.save.backup, before.path);
+    done.section = sectionOf(work, file, done, readInput(before), readInput({file.output, {}}));
+  } catch (const Interrupted&) {
+    throw;
+  } catch (const std::exception& error) {
+    done.section = comparisonSection(
+        {.input = file.input.path, .remark = "was there already; no picture: " + explain(error)});
+  }
+  return done;
+}
+
+// The mark of the same edit, as text; empty without one, and where edits are done again.
+std::string earlierEdit(const Work& work, std::span<const std::uint8_t> file) {
+  if (work.again || work.photo.raw) return "";
+  const photo::PhotoFacts facts = photo::readFacts(file);
+  const photo::EditMark* const mark = photo::earlierEdit(facts, work.filter.filter);
+  return mark == nullptr ? "" : textOf(*mark);
+}
+
+// Reads only files, which are the same afterwards. What is wrong with one is said when it is worked on.
+void findMarks(const Work& work, int jobs, std::vector<PlannedFile>& plan) {
+  const auto find = [&](std::size_t index) {
+    PlannedFile& file = plan[index];
+    std::error_code ignored;
+    if (file.skipped || !std::filesystem::is_regular_file(file.input.path, ignored)) return;
+    try {
+      file.earlier = earlierEdit(work, readInput(file.input));
+    } catch (const Interrupted&) {
+      throw;
+    } catch (const std::exception&) {
+    }
+  };
+  if (!runJobs(plan.size(), jobs, find, [](std::size_t) {})) throw Interrupted();
+}
+
 Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   thread_local photo::SparePixels spare;  // each worker's own
   photo::OpenOptions open = work.photo;
   open.stop = interruptToken();
   const std::vector<std::uint8_t> bytes = readInput(file.input);
-  if (!work.again && !open.raw) {
-    const photo::PhotoFacts facts = photo::readFacts(bytes);
-    if (const photo::EditMark* mark = photo::earlierEdit(facts, work.filter.filter))
-      return {.earlier = textOf(*mark)};
+  if (std::string earlier = earlierEdit(work, bytes); !earlier.empty()) {
+    Done done = {.earlier = std::move(earlier)};
+    done.section = sectionOf(work, file, done, bytes, {});
+    return done;
   }
   const photo::FilteredPhoto filtered =
       photo::filterPhoto(bytes,
@@ -100,10 +173,37 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
     save.backup.clear();
   }
   writePhoto(file.output, filtered.file, filtered.lost, save);
-  return {.width = filtered.size.width,
-          .height = filtered.size.height,
-          .lost = filtered.lost,
-          .notices = filtered.facts.notices};
+  Done done = {.width = filtered.size.width,
+               .height = filtered.size.height,
+               .lost = filtered.lost,
+               .notices = filtered.facts.notices};
+  done.section = sectionOf(work, file, done, bytes, filtered.file);
+  return done;
+}
+
+// Before any work. The page must be none of the files that a run reads or writes.
+void checkPageOf(const FilterFilesOptions& options, const std::vector<PlannedFile>& plan) {
+  const bool takesOutput = options.outputs.output == "-" || options.report.json ||
+                           options.report.jsonLines || options.outputs.planOnly;
+  if (options.page == "-" && takesOutput) {
+    throw UsageError("--report -: standard output takes the page and nothing else");
+  }
+  if (plan.size() > mostCompared) {
+    throw UsageError(fmt::format("--report: {} photos are too many for one page, which takes {}",
+                                 plan.size(), mostCompared));
+  }
+  UsedFiles used;
+  for (const PlannedFile& file : plan) {
+    used.add(file.input.path, "an input");
+    used.add(file.output, "a result");
+  }
+  for (const std::string& list : listsOf(options.inputs)) used.add(list, "the list of inputs");
+  used.add(options.faces.source, "the file of faces");
+  checkPage("--report", options.page, options.outputs.overwrite, std::move(used));
+}
+
+std::string photosText(std::size_t photos) {
+  return fmt::format("{} {}", photos, photos == 1 ? "photo" : "photos");
 }
 
 Json jsonOf(const std::vector<photo::Loss>& lost) {
@@ -140,6 +240,11 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
   addOutputOptions(verb, options.outputs, "{stem}_{filter}.{ext}", placeholders);
   addInPlaceOptions(verb, options.outputs);
   addFilteringOptions(verb, options);
+  verb.option("--report", options.page,
+              "Also make a page of all photos that shows each before and after, with a divider, "
+              "its faces, histograms and steps of the slider; one file, for any browser")
+      .type("PAGE.html")
+      .group("Output");
   addRawOption(verb, options.raw);
   verb.named("--raw").help("Read and write packed RGBA bytes of this size instead of photos");
   addReportOptions(verb, options.report);
@@ -162,20 +267,30 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
   }
   std::map<std::string, std::string> values = filter.values;
   values["filter"] = filter.filter.name;
-  const std::vector<PlannedFile> plan = planOutputs(named, options.inputs, options.outputs, values);
+  std::vector<PlannedFile> plan = planOutputs(named, options.inputs, options.outputs, values);
   std::vector<Input> inputs;
   for (const PlannedFile& file : plan) {
     requireFormatOf(file.output, raw);
     inputs.push_back(file.input);
   }
 
+  if (!options.page.empty()) {
+    checkPageOf(options, plan);
+    work.shown = comparisonSize(plan.size());
+  }
+
   JsonOutput json(options.report, isSingleFile(options.inputs, named));
   Talk talk(verb, options.report, options.outputs.planOnly ? 0 : plan.size());
   const bool inPlace = options.outputs.inPlace;
   if (options.outputs.planOnly) {
-    return printPlan(
+    findMarks(work, options.jobs, plan);
+    const ExitCode code = printPlan(
         plan, inPlace ? " (replaced already: skipped)" : " (exists: skipped without --overwrite)",
-        talk, json);
+        filter.doneAlready, talk, json);
+    if (!options.page.empty() && !json.wanted())
+      fmt::print("before and after of {} -> {}\n", photosText(plan.size()),
+                 shownText(options.page));
+    return code;
   }
 
   const std::size_t atOnce =
@@ -187,45 +302,48 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
     // One of the threads is the job's own.
     work.workers = std::make_unique<photo::ThreadWorkers>(atOnce * (threads - 1) + 1);
   }
-  const OutputFolders folders(plan);
+  const OutputFolders folders(plan, options.page);
   std::size_t skipped = 0, marked = 0;
-  const PhotoTally tally = eachPhoto<std::optional<Done>>(
+  std::vector<std::string> sections;
+  const PhotoTally tally = eachPhoto<Done>(
       inputs, options.jobs, talk,
-      {.work = [&](std::size_t index) -> std::optional<Done> {
-         const bool again = inPlace && work.again;
-         return plan[index].skipped && !again ? std::nullopt
-                                              : std::optional(process(work, plan[index], talk));
-       },
+      {.work =
+           [&](std::size_t index) {
+             const bool again = inPlace && work.again;
+             return plan[index].skipped && !again ? existing(work, plan[index])
+                                                  : process(work, plan[index], talk);
+           },
        .done =
-           [&](std::size_t index, const std::optional<Done>& done) {
-             if (!done) {
+           [&](std::size_t index, const Done& done) {
+             sections.push_back(done.section);
+             if (done.existed) {
                ++skipped;
                json.add(planAsJson(plan[index], "exists"));
                if (told) told(plan[index], "exists");
                return;
              }
-             if (!done->earlier.empty()) {
+             if (!done.earlier.empty()) {
                ++marked;
                talk.noteOnce(
-                   done->earlier,
+                   done.earlier,
                    fmt::format("{}: {} ({}); --again does it again{}",
-                               plan[index].input.shownName(), filter.doneAlready, done->earlier,
+                               plan[index].input.shownName(), filter.doneAlready, done.earlier,
                                plan.size() > 1 ? " (others like it are not named)" : ""));
                Json object = planAsJson(plan[index], "edited");
-               object["earlier"] = done->earlier;
+               object["earlier"] = done.earlier;
                json.add(object);
                if (told) told(plan[index], "edited");
                return;
              }
              Json object = planAsJson(plan[index], "done");
-             object["width"] = done->width;
-             object["height"] = done->height;
+             object["width"] = done.width;
+             object["height"] = done.height;
              object["filter"] = filter.filter.name;
              object["params"] = filter.params;
-             object["lost"] = jsonOf(done->lost);
-             object["notices"] = done->notices;
+             object["lost"] = jsonOf(done.lost);
+             object["notices"] = done.notices;
              json.add(object);
-             for (const photo::Loss& loss : done->lost) {
+             for (const photo::Loss& loss : done.lost) {
                talk.note(plan[index].output + ": " + lossText(loss));
              }
              if (told) told(plan[index], "done");
@@ -235,6 +353,10 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
              Json object = planAsJson(plan[index], "failed");
              object["error"] = reason;
              json.add(object);
+             if (work.shown) {
+               sections.push_back(
+                   comparisonSection({.input = plan[index].input.path, .remark = reason}));
+             }
              if (told) told(plan[index], "failed");
            }});
   const std::size_t done = tally.done - skipped - marked;
@@ -250,9 +372,20 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
               (inPlace ? ": was replaced already, as its backup tells; quenby undo puts it back"
                        : ": exists already; add --overwrite to replace it"));
   }
-  if (tally.interrupted) talk.note("interrupted; finished files stand");
+  if (tally.interrupted) {
+    talk.note(work.shown ? "interrupted; finished files stand, no page was made"
+                         : "interrupted; finished files stand");
+  }
+  const bool showing = work.shown && !tally.interrupted && !sections.empty();
+  if (showing) {
+    writePage(options.page,
+              comparisonPage(photosText(plan.size()) + ": " +
+                                 textOf(photo::markOf(filter.filter.name, filter.params)),
+                             sections),
+              options.outputs.overwrite);
+  }
   const ExitCode code = tally.exitCode(talk);
-  return code == ExitCode::allDone && done == 0 ? ExitCode::nothingToDo : code;
+  return code == ExitCode::allDone && done == 0 && !showing ? ExitCode::nothingToDo : code;
 }
 
 }  // namespace pelorin::cli

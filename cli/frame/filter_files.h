@@ -29,6 +29,7 @@ struct FilterFilesOptions {
   MarkChoice mark;
   FaceOptions faces;
   std::string raw;
+  std::string page;  ///< Where before and after are to be shown; empty for nowhere.
   int rotate = 0;
   int scale = 1;
   int jobs = 0;

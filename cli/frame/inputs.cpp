@@ -225,6 +225,14 @@ std::vector<Input> expandInputs(const InputOptions& options) {
   return std::move(expansion.inputs);
 }
 
+std::vector<std::string> listsOf(const InputOptions& options) {
+  std::vector<std::string> lists = options.lists;
+  for (const std::string& name : options.names) {
+    if (name.starts_with('@')) lists.push_back(name.substr(1));
+  }
+  return lists;
+}
+
 bool isSingleFile(const InputOptions& options, const std::vector<Input>& inputs) {
   return options.lists.empty() && options.names.size() == 1 && inputs.size() == 1 &&
          inputs[0].path == options.names[0];

@@ -49,6 +49,9 @@ Input inputNamed(const std::string& name);
 ///         input, and where nothing was named; Interrupted on Ctrl-C.
 std::vector<Input> expandInputs(const InputOptions& options);
 
+/// The files of names among them, of `@list` and `--files-from`.
+std::vector<std::string> listsOf(const InputOptions& options);
+
 /// Whether the user named exactly one file, and no folder or list.
 bool isSingleFile(const InputOptions& options, const std::vector<Input>& inputs);
 

@@ -4,6 +4,7 @@
 #include <sys/time.h>
 #include <unistd.h>
 
+#include <atomic>
 #include <string_view>
 
 #include "cli/frame/exit_code.h"
@@ -13,12 +14,18 @@ namespace pelorin::cli {
 namespace {
 
 std::stop_source source;
+std::atomic<const char*> lastWords = nullptr;
+static_assert(std::atomic<const char*>::is_always_lock_free);
+
+void write(int descriptor, std::string_view text) {
+  [[maybe_unused]] const ssize_t said = ::write(descriptor, text.data(), text.size());
+}
 
 // Nothing is half-written when a process ends anywhere: files take their place in one step.
 void leave(int) {
   photo::removeTemporaries();
-  constexpr std::string_view text = "\ninterrupted; finished files stand\n";
-  [[maybe_unused]] const ssize_t said = ::write(STDERR_FILENO, text.data(), text.size());
+  if (const char* const words = lastWords) write(STDOUT_FILENO, words);
+  write(STDERR_FILENO, "\ninterrupted; finished files stand\n");
   ::_exit(static_cast<int>(ExitCode::interrupted));
 }
 
@@ -45,6 +52,10 @@ void installInterruptHandler() {
   handle(SIGINT, onSignal);
   handle(SIGTERM, onSignal);
   handle(SIGALRM, leave);
+}
+
+void setLastWords(const char* text) {
+  lastWords = text;
 }
 
 std::stop_token interruptToken() {

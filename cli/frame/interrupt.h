@@ -13,6 +13,10 @@ using Interrupted = photo::Stopped;
 /// second later, or on a second one, the process ends wherever it is; no file is left half-written.
 void installInterruptHandler();
 
+/// What a forced end still writes to standard output, such as the end of a list; null for nothing. The
+/// text lives on.
+void setLastWords(const char* text);
+
 /// The mark, for work that is asked to stop by a token.
 std::stop_token interruptToken();
 

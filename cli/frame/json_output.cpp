@@ -7,6 +7,7 @@
 #include <utility>
 
 #include "cli/frame/base64.h"
+#include "cli/frame/interrupt.h"
 #include "cli/frame/shown_text.h"
 
 namespace pelorin::cli {
@@ -54,6 +55,11 @@ std::string textOf(const Json& object) {
   return textOf(object, -1);
 }
 
+JsonOutput::JsonOutput(const ReportOptions& options, bool singleFile)
+    : json_(options.json), lines_(options.jsonLines), single_(singleFile) {
+  if (json_ && !single_) setLastWords("[]\n");
+}
+
 void JsonOutput::add(const Json& members) {
   Json object = {{"schema", jsonSchema}};
   object.update(members);
@@ -63,13 +69,18 @@ void JsonOutput::add(const Json& members) {
   } else if (json_ && single_) {
     std::printf("%s\n", textOf(object, 2).c_str());
   } else if (json_) {
+    setLastWords(nullptr);
     std::printf("%s%s", begun_ ? ",\n" : "[\n", textOf(object, -1).c_str());
+    std::fflush(stdout);
+    setLastWords("\n]\n");
     begun_ = true;
   }
 }
 
 JsonOutput::~JsonOutput() {
-  if (json_ && !single_) std::fputs(begun_ ? "\n]\n" : "[]\n", stdout);
+  if (!json_ || single_) return;
+  setLastWords(nullptr);
+  std::fputs(begun_ ? "\n]\n" : "[]\n", stdout);
 }
 
 }  // namespace pelorin::cli

@@ -65,10 +65,7 @@ void refuseClashes(const std::vector<PlannedFile>& plan, const InputOptions& nam
   UsedFiles inputs, outputs;
   for (const PlannedFile& file : plan) inputs.add(file.input.path, file.input.path);
   UsedFiles lists;
-  for (const std::string& name : named.names) {
-    if (name.starts_with('@')) lists.add(name.substr(1), name);
-  }
-  for (const std::string& list : named.lists) lists.add(list, list);
+  for (const std::string& list : listsOf(named)) lists.add(list, list);
   for (const PlannedFile& file : plan) {
     if (!file.input.trouble.empty()) continue;
     const std::string* const other = outputs.find(file.output);
@@ -221,8 +218,10 @@ std::vector<PlannedFile> planOutputs(const std::vector<Input>& inputs, const Inp
 
 namespace {
 
-std::vector<std::string> outputsToMake(const std::vector<PlannedFile>& plan) {
+std::vector<std::string> outputsToMake(const std::vector<PlannedFile>& plan,
+                                       const std::string& page) {
   std::vector<std::string> outputs;
+  if (!page.empty()) outputs.push_back(page);
   for (const PlannedFile& file : plan) {
     if (!file.skipped && file.input.trouble.empty()) outputs.push_back(file.output);
   }
@@ -231,8 +230,8 @@ std::vector<std::string> outputsToMake(const std::vector<PlannedFile>& plan) {
 
 }  // namespace
 
-OutputFolders::OutputFolders(const std::vector<PlannedFile>& plan)
-    : OutputFolders(outputsToMake(plan)) {}
+OutputFolders::OutputFolders(const std::vector<PlannedFile>& plan, const std::string& page)
+    : OutputFolders(outputsToMake(plan, page)) {}
 
 OutputFolders::OutputFolders(const std::vector<std::string>& outputs) {
   for (const std::string& output : outputs) {

@@ -40,8 +40,9 @@ void checkInPlace(const OutputOptions& options, const std::vector<Input>& inputs
 /// One input and the file it becomes.
 struct PlannedFile {
   Input input;
-  std::string output;  ///< "-" is standard output.
-  bool skipped;        ///< There already, and not to be replaced (again).
+  std::string output;        ///< "-" is standard output.
+  bool skipped;              ///< There already, and not to be replaced (again).
+  std::string earlier = {};  ///< The same edit, where a plan knows that the photo carries its mark.
 };
 
 /// Says for every input which file it becomes, before any work. In a folder a result is called
@@ -64,8 +65,9 @@ std::vector<PlannedFile> planOutputs(const std::vector<Input>& inputs, const Inp
 /// of them that were made and stayed empty removed at the end.
 class OutputFolders {
  public:
+  /// @param page  another file that is written beside the results; may be empty.
   /// @throws std::filesystem::filesystem_error when one cannot be made.
-  explicit OutputFolders(const std::vector<PlannedFile>& plan);
+  explicit OutputFolders(const std::vector<PlannedFile>& plan, const std::string& page = "");
   explicit OutputFolders(const std::vector<std::string>& outputs);
   ~OutputFolders();
   OutputFolders(const OutputFolders&) = delete;

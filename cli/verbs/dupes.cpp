@@ -11,9 +11,11 @@
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/file_bytes.h"
+#include "cli/frame/html_page.h"
 #include "cli/frame/jobs.h"
 #include "cli/frame/jobs_option.h"
 #include "cli/frame/number_text.h"
+#include "cli/frame/outputs.h"
 #include "cli/frame/talk.h"
 #include "cli/frame/used_files.h"
 #include "cli/verbs/dupes/act_on_plan.h"
@@ -47,6 +49,7 @@ struct DupesOptions {
   bool unknownTimes = false;
   bool pairs = false;
   bool overwrite = false;
+  bool planOnly = false;
   int jobs = 0;
 };
 
@@ -149,9 +152,7 @@ bool writeHtml(const DupesOptions& options, DupeReport& report) {
          .failure = "no picture of it: "});
     if (tally.interrupted) return false;
   }
-  const std::string html = htmlReport(report, thumbnails);
-  writeOutput(options.html, {reinterpret_cast<const std::uint8_t*>(html.data()), html.size()},
-              {.mayReplace = options.overwrite});
+  writePage(options.html, htmlReport(report, thumbnails), options.overwrite);
   return true;
 }
 
@@ -194,10 +195,6 @@ void checkOutputs(const DupesOptions& options, const std::vector<Input>& inputs)
   if (html == "-" && (options.report.json || options.report.jsonLines)) {
     throw UsageError("--html -: standard output takes the page or --json, not both");
   }
-  const std::string extension = fs::path(html).extension().string();
-  if (!extension.empty() && extension != ".html" && extension != ".htm") {
-    throw UsageError("--html: " + html + ": the page is no " + extension + " file; name it .html");
-  }
   if (photo::isPictureExtension(fs::path(cache).extension().string())) {
     throw UsageError("--cache: " + cache + " is called like a photo; choose another name");
   }
@@ -207,13 +204,7 @@ void checkOutputs(const DupesOptions& options, const std::vector<Input>& inputs)
     // SQLite keeps its journals beside the file.
     for (const char* end : {"", "-journal", "-wal", "-shm"}) used.add(cache + end, "the cache");
   }
-  if (html.empty() || html == "-") return;
-  refuseSharedFiles({html}, used);
-  std::error_code ignored;
-  if (!options.overwrite && fs::is_regular_file(html, ignored)) {
-    throw UsageError("--html: " + html + " exists; add --overwrite to replace it");
-  }
-  sweepFolders({html});
+  if (!html.empty()) checkPage("--html", html, options.overwrite, std::move(used));
 }
 
 void noteUntimed(const DupesOptions& options, const DupeReport& report, Talk& talk) {
@@ -292,6 +283,9 @@ ExitCode runPlan(const DupesOptions& options) {
 }
 
 ExitCode runDupes(const DupesOptions& options) {
+  if (options.planOnly && options.actions.apply) {
+    throw UsageError("-n does nothing and --apply does it: leave out one of them");
+  }
   if (!options.plan.empty()) return runPlan(options);
   const float threshold = readFiniteNumber("--threshold", options.threshold);
   const std::vector<Input> inputs = withoutRepetitions(expandInputs(options.inputs));
@@ -305,8 +299,12 @@ ExitCode runDupes(const DupesOptions& options) {
     return ExitCode::nothingToDo;
   }
   checkOutputs(options, inputs);
+  std::vector<std::string> pages;
+  if (!options.html.empty() && !options.planOnly) pages.push_back(options.html);
+  const OutputFolders folders(pages);
   std::unique_ptr<photo::PhotoCache> cache;
-  if (!options.cache.empty()) cache = std::make_unique<photo::PhotoCache>(options.cache);
+  if (!options.cache.empty() && !options.planOnly)
+    cache = std::make_unique<photo::PhotoCache>(options.cache);
 
   ScanResult scan;
   {
@@ -328,7 +326,8 @@ ExitCode runDupes(const DupesOptions& options) {
   if (report.rank && !scorePhotos(options, cache.get(), scan.cacheTrouble, report)) {
     return ExitCode::interrupted;
   }
-  if (!options.html.empty() && !writeHtml(options, report)) return ExitCode::interrupted;
+  if (!options.html.empty() && !options.planOnly && !writeHtml(options, report))
+    return ExitCode::interrupted;
   ExitCode acted = ExitCode::allDone;
   if (options.actions.wanted()) {
     acted = actOnPlan(photo::planRemovals(report.groups, report.photos), options.actions,
@@ -340,6 +339,9 @@ ExitCode runDupes(const DupesOptions& options) {
   Talk talk(verbName, options.report.quiet, 0);
   noteUntimed(options, report, talk);
   talk.note(summaryOf(report));
+  if (options.planOnly && !options.html.empty()) {
+    talk.note(shownText(options.html) + ": would be written without -n");
+  }
   if (!scan.cacheTrouble.empty()) {
     fmt::print(stderr, "quenby {}: {}\n", verbName, shownText(scan.cacheTrouble));
   }
@@ -403,6 +405,9 @@ void addDupes(CommandLine& commandLine) {
       .type("FILE")
       .group("Output");
   verb.flag("--overwrite", options->overwrite, "Replace an --html file that exists")
+      .group("Output");
+  verb.flag("-n,--dry-run", options->planOnly,
+            "Say what is found and write nothing, neither the page nor the cache")
       .group("Output");
   addJobsOption(verb, options->jobs);
   addReportOptions(verb, options->report);

@@ -39,6 +39,7 @@ void addEnhance(CommandLine& commandLine) {
       "quenby enhance photo.jpg -o better.jpg --slider 0.8 --face 0.4,0.1,0.6,0.4\n"
       "quenby enhance -r holiday -o better/ -j 4 --name '{stem}_{slider}.jpg'\n"
       "quenby enhance *.jpg -o better/ -n\n"
+      "quenby enhance -r holiday -o better/ --report better.html\n"
       "find . -name '*.jpg' -print0 | quenby enhance @- -o better/\n"
       "quenby enhance - -o - < photo.jpg > better.jpg\n"
       "quenby enhance --raw 640x480 in.rgba -o out.rgba --filter AE08bit",

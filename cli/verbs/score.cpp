@@ -88,7 +88,7 @@ ExitCode runScore(const ScoreOptions& options) {
   Talk talk("score", options.format.report, options.maps.planOnly ? 0 : inputs.size());
   if (options.maps.planOnly) {
     JsonOutput json(options.format.report, singleFile);
-    return printPlan(maps, " (exists: skipped without --overwrite)", talk, json);
+    return printPlan(maps, " (exists: skipped without --overwrite)", "", talk, json);
   }
   const OutputFolders folders(maps);
   ScoreOutput output(options.format, singleFile);

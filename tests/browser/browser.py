@@ -12,6 +12,7 @@ import urllib.request
 SKIPPED = 77
 ELEMENT = "element-6066-11e4-a52e-4f735466cecf"
 TAB, SPACE, ENTER = "\ue004", " ", "\ue007"
+LEFT, HOME = "\ue012", "\ue011"
 
 
 def skip_unless_installed():
@@ -93,6 +94,21 @@ class Browser:
         """Presses keys one after the other, wherever the focus is."""
         actions = [{"type": kind, "value": key} for key in keys for kind in ("keyDown", "keyUp")]
         self._post("/actions", {"actions": [{"type": "key", "id": "keyboard", "actions": actions}]})
+
+    def drag(self, selector, *places, pointer="mouse"):
+        """Presses at the first place over an element and moves through the others; places are
+        fractions of its width and height."""
+        box = self.run(
+            "const e = document.querySelector(arguments[0]); e.scrollIntoView({block: 'nearest'});"
+            "const b = e.getBoundingClientRect(); return [b.left, b.top, b.width, b.height]", selector
+        )
+        steps = [{"type": "pointerMove", "duration": 0, "x": round(box[0] + x * box[2]),
+                  "y": round(box[1] + y * box[3])} for x, y in places]
+        steps[1:1] = [{"type": "pointerDown", "button": 0}]
+        steps += [{"type": "pointerUp", "button": 0}]
+        finger = {"type": "pointer", "id": pointer, "actions": steps}
+        finger["parameters"] = {"pointerType": pointer}
+        self._post("/actions", {"actions": [finger]})
 
     def complaints(self):
         """What the console has been told since it was last asked: errors of scripts, what was refused."""

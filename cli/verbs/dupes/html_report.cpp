@@ -6,7 +6,7 @@
 #include <optional>
 #include <string_view>
 
-#include "cli/frame/base64.h"
+#include "cli/frame/html_page.h"
 #include "cli/frame/shown_text.h"
 #include "cli/verbs/dupes/plan_file.h"
 #include "photo/collection/removal.h"
@@ -14,26 +14,12 @@
 namespace pelorin::cli {
 namespace {
 
-constexpr std::string_view head = R"(<!DOCTYPE html>
-<html lang="en">
-<head>
-<meta charset="utf-8">
-<meta http-equiv="Content-Security-Policy"
- content="default-src 'none'; img-src data:; style-src 'unsafe-inline'; script-src 'unsafe-inline'">
-<meta name="viewport" content="width=device-width, initial-scale=1">
-<title>Near-duplicates</title>
-<style>
-:root { color-scheme: light dark; }
-body { font: 15px/1.45 system-ui, sans-serif; }
-body { margin: 2rem auto; max-width: 75rem; padding: 0 1rem; }
-section { border-top: 1px solid #8886; padding: 1rem 0; }
-.photos { display: flex; flex-wrap: wrap; gap: 1rem; }
-figure { margin: 0; width: 16rem; }
+constexpr std::string_view style = R"(.photos { display: flex; flex-wrap: wrap; gap: 1rem; }
+figure { width: 16rem; }
 figure.keep img, figure.keep .none { outline: 3px solid #2a8a3e; }
 figure.goes img, figure.goes .none { opacity: .35; }
 label { display: block; cursor: pointer; overflow-wrap: anywhere; margin-bottom: .3rem; }
 input { width: 1.1rem; height: 1.1rem; vertical-align: text-bottom; }
-:focus-visible { outline: 3px solid Highlight; outline-offset: 2px; }
 .plan { position: sticky; bottom: 0; padding: .8rem 0; background: Canvas; }
 .plan { border-top: 1px solid #8886; }
 .plan p { margin: .3rem 0; }
@@ -41,37 +27,9 @@ button { font: inherit; padding: .3rem .9rem; }
 img, .none { display: block; max-width: 100%; border-radius: 3px; }
 .none { width: 16rem; line-height: 8rem; text-align: center; background: #8883; }
 figcaption { overflow-wrap: anywhere; }
-small { display: block; opacity: .75; }
 table { border-collapse: collapse; margin-top: 1rem; font-variant-numeric: tabular-nums; }
 th, td { text-align: left; padding: .15rem .8rem .15rem 0; overflow-wrap: anywhere; }
-</style>
-</head>
-<body>
-<h1>Near-duplicates</h1>
 )";
-
-std::string escaped(std::string_view text) {
-  std::string html;
-  for (const char letter : text) {
-    switch (letter) {
-      case '&':
-        html += "&amp;";
-        break;
-      case '<':
-        html += "&lt;";
-        break;
-      case '>':
-        html += "&gt;";
-        break;
-      case '"':
-        html += "&quot;";
-        break;
-      default:
-        html += letter;
-    }
-  }
-  return html;
-}
 
 constexpr std::string_view planBar = R"(<div class="plan" role="region" aria-label="Plan">
 <p id="chosen" role="status">Every photo stays.</p>
@@ -128,23 +86,23 @@ std::string keepBox(const photo::ScannedPhoto& photo, bool keep) {
   const std::optional<photo::KnownFile> file = photo::knownFile(photo);
   if (!file) return "";
   return fmt::format("<input type=\"checkbox\" data-file=\"{}\"{}{}> keep ",
-                     escaped(planEntry(*file)), keep ? " checked" : "",
+                     escapedHtml(planEntry(*file)), keep ? " checked" : "",
                      photo.isReference ? " disabled" : "");
 }
 
 std::string figure(const photo::ScannedPhoto& photo, const std::vector<std::uint8_t>& thumbnail,
                    const photo::Ranked* ranked) {
-  const std::string name = escaped(shownName(photo.path));
+  const std::string name = escapedHtml(shownName(photo.path));
   const bool keep = ranked != nullptr && ranked->keep;
   std::string html = keep ? "<figure class=\"keep\">\n<label>" : "<figure>\n<label>";
-  html += thumbnail.empty() ? std::string("<div class=\"none\">no picture</div>\n")
-                            : fmt::format("<img alt=\"{}\" src=\"data:image/jpeg;base64,{}\">\n",
-                                          name, base64(thumbnail));
+  html += thumbnail.empty()
+              ? std::string("<div class=\"none\">no picture</div>\n")
+              : fmt::format("<img alt=\"{}\" src=\"{}\">\n", name, jpegAddress(thumbnail));
   html += fmt::format("{}{}</label>\n<figcaption><small>{} × {}, {}</small>\n",
                       keepBox(photo, ranked == nullptr || ranked->keep), name, photo.width,
-                      photo.height, escaped(shownText(timeText(photo))));
+                      photo.height, escapedHtml(shownText(timeText(photo))));
   if (ranked != nullptr) {
-    html += fmt::format("<small>{}{}</small>\n", keep ? "keep: " : "", escaped(ranked->reason));
+    html += fmt::format("<small>{}{}</small>\n", keep ? "keep: " : "", escapedHtml(ranked->reason));
   }
   return html + "</figcaption>\n</figure>\n";
 }
@@ -157,8 +115,8 @@ std::string pairTable(const DupeReport& report, const photo::DupeGroup& group) {
   for (const photo::ShotPair& pair : group.pairs) {
     html += fmt::format(
         "<tr><td>{}</td><td>{}</td><td>{:.2f}</td><td>{}</td><td>{:.4f}</td><td>{}</td></tr>\n",
-        escaped(shownName(report.photos[pair.first].path)),
-        escaped(shownName(report.photos[pair.second].path)), pair.score,
+        escapedHtml(shownName(report.photos[pair.first].path)),
+        escapedHtml(shownName(report.photos[pair.second].path)), pair.score,
         pair.timesKnown ? fmt::format("{:.2f}", pair.seconds)
                         : std::string("not known, taken as 0"),
         pair.distance, pair.sameOrientation ? "same" : "different");
@@ -170,7 +128,7 @@ std::string pairTable(const DupeReport& report, const photo::DupeGroup& group) {
 
 std::string htmlReport(const DupeReport& report,
                        const std::vector<std::vector<std::uint8_t>>& thumbnails) {
-  std::string html(head);
+  std::string html = htmlHead("Near-duplicates", style);
   html += fmt::format("<p>{}, threshold {}.</p>\n", summaryOf(report), report.threshold);
   const std::size_t all = report.groups.size() + report.lookAlikes.size();
   for (std::size_t g = 0; g < all; ++g) {
@@ -192,8 +150,8 @@ std::string htmlReport(const DupeReport& report,
   }
   if (!report.failed.empty()) html += "<section>\n<h2>Not read</h2>\n<ul>\n";
   for (const photo::FailedPhoto& failed : report.failed) {
-    html += fmt::format("<li>{}: {}</li>\n", escaped(shownName(failed.path)),
-                        escaped(shownText(failed.reason)));
+    html += fmt::format("<li>{}: {}</li>\n", escapedHtml(shownName(failed.path)),
+                        escapedHtml(shownText(failed.reason)));
   }
   if (!report.failed.empty()) html += "</ul>\n</section>\n";
   if (all > 0) html += planBar;

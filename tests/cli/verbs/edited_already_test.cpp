@@ -31,6 +31,10 @@ TEST(EditedAlready, IsSaidAndSkippedInEveryFormat) {
     EXPECT_EQ(twice.errors,
               folder / name + ": enhanced already (AE0, slider 0.4); --again does it again\n");
     EXPECT_FALSE(folder.has("c.jpg"));
+    const Finished plan = quenby({"enhance", folder / name, "-o", folder / "c.jpg", "-n"});
+    EXPECT_EQ(plan.exitCode, 3);
+    EXPECT_THAT(plan.output,
+                HasSubstr("c.jpg (enhanced already: AE0, slider 0.4; skipped without --again)\n"));
     EXPECT_THAT(quenby({"info", folder / name}).output, HasSubstr("edited       AE0, slider 0.4"));
     const nlohmann::json info = parsedJson(quenby({"info", folder / name, "--json"}).output);
     EXPECT_EQ(info["edits"][0]["filter"], "AE0");

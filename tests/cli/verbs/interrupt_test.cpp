@@ -7,6 +7,7 @@
 #include <chrono>
 #include <thread>
 
+#include "tests/cli/parsed_json.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/support/jpeg_files.h"
 
@@ -43,6 +44,28 @@ TEST(CtrlC, KeepsFinishedFilesAndLeavesNothingHalfWritten) {
       EXPECT_EQ(decoded(folder.read("out/b_AE0.jpg")).width, 48u);
       EXPECT_EQ(std::distance(std::filesystem::directory_iterator(out), {}), 2);
     }
+  }
+}
+
+// Stopped, it finds both signals at once when it goes on: the second ends it where it is.
+TEST(CtrlC, ForcedEndsTheListOfWhatWasDone) {
+  for (const bool something : {true, false}) {
+    const TemporaryFolder folder;
+    std::vector<std::string> command = {quenbyPath(), "enhance", "--json", "-o", folder / "out/"};
+    if (something) command.push_back(folder.write("a.jpg", smallJpeg(1)));
+    command.insert(command.end(), {"-", "-j", "1"});
+    if (!something) command.push_back(folder.write("never-reached.jpg", smallJpeg(1)));
+    int endless[2];
+    ASSERT_EQ(pipe(endless), 0);
+    Process process(command, endless[0]);
+    ASSERT_TRUE(!something || appears(folder, "out/a_AE0.jpg"));
+    std::this_thread::sleep_for(std::chrono::milliseconds(100));  // and tells of it
+    for (const int signal : {SIGSTOP, SIGINT, SIGTERM, SIGCONT}) process.send(signal);
+    const Finished run = process.wait();
+    close(endless[0]);
+    close(endless[1]);
+    EXPECT_EQ(run.exitCode, 130);
+    EXPECT_EQ(parsedJson(run.output).size(), something ? 1u : 0u) << run.output;
   }
 }
 

@@ -523,6 +523,13 @@ TEST(DupesCommand, WritesAPageThatNeedsNothingElse) {
   EXPECT_EQ(elsewhere.read("report.html"), bytes);
   EXPECT_EQ(holiday.dupes({"--html", page, "--overwrite"}).exitCode, 0);
   EXPECT_THAT(holiday.dupes({"--html", "-"}).output, testing::StartsWith("<!DOCTYPE html>"));
+  const std::string other = elsewhere / "new/other.html", cache = elsewhere / "cache";
+  const Finished plan = holiday.dupes({"--html", other, "--cache", cache, "-n"});
+  EXPECT_EQ(plan.exitCode, 0);
+  EXPECT_THAT(plan.errors, HasSubstr("other.html: would be written without -n"));
+  EXPECT_THAT(elsewhere.content(), testing::ElementsAre("report.html"));
+  EXPECT_EQ(holiday.dupes({"--html", other}).exitCode, 0);
+  EXPECT_TRUE(elsewhere.has("new/other.html"));
 }
 
 // The shell puts the first photo where a name for the page is missing: --html *.jpg.
