@@ -64,10 +64,24 @@ public final class Duplicates {
      */
     public static float score(
             GreenCdf a, GreenCdf b, double secondsApart, boolean sameOrientation) {
+        return score(a.distanceTo(b), secondsApart, sameOrientation);
+    }
+
+    /**
+     * Scores two photos whose distance is known, in the same manner.
+     *
+     * @param distance        what {@link GreenCdf#distanceTo} gave
+     * @param secondsApart    between their captures, whichever came first
+     * @param sameOrientation whether their orientations are equal
+     * @return the score
+     * @throws IllegalArgumentException when the time is not finite
+     */
+    public static float score(float distance, double secondsApart, boolean sameOrientation) {
         if (!Double.isFinite(secondsApart)) {
             throw new IllegalArgumentException("the time between is " + secondsApart);
         }
-        return PhotoBytes.score(a.distanceTo(b), secondsApart, sameOrientation);
+        NativeLibrary.loadPhoto();
+        return PhotoBytes.score(distance, secondsApart, sameOrientation);
     }
 
     /**

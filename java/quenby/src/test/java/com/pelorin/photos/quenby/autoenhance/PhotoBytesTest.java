@@ -216,6 +216,8 @@ class PhotoBytesTest {
         assertTrue(cdf.distanceTo(other) > 0.01);
         assertEquals(3.65f, Duplicates.score(cdf, cdf, 0, true), 0.1f);
         assertTrue(Duplicates.score(cdf, other, 86400, false) < 0);
+        assertEquals(Duplicates.score(cdf, other, 7, true),
+                Duplicates.score(cdf.distanceTo(other), 7, true));
         assertThrows(IllegalArgumentException.class,
                 () -> Duplicates.score(cdf, other, Double.NaN, true));
         assertEquals(130.9, Duplicates.window(0, true), 0.1);
