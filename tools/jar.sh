@@ -4,7 +4,7 @@
 #
 #   tools/jar.sh [MAVEN OPTION...]
 #
-# where a goal may follow the options, such as install.
+# where a goal may follow the options, such as install; with -Pspark the jar for Spark as well.
 set -euo pipefail
 root=$(cd "$(dirname "${BASH_SOURCE[0]}")/.." && pwd)
 contents=$root/build/jar/contents
@@ -24,9 +24,11 @@ mkdir -p "$contents/META-INF/licences"
 cp "$root"/build/static/amd64/share/licences/* "$contents/META-INF/licences/"
 
 [ $# -gt 0 ] || set -- package
+projects=.,quenby,quenby-desktop
+[[ " $* " != *" -Pspark "* ]] || projects+=,quenby-spark
 # The same from the same files: dated as a release says.
 [ -z "${SOURCE_DATE_EPOCH-}" ] ||
   set -- -Dproject.build.outputTimestamp="$(date -u -d "@$SOURCE_DATE_EPOCH" +%Y-%m-%dT%H:%M:%SZ)" "$@"
 mvn --batch-mode --no-transfer-progress --quiet -Dstyle.color=never --file "$root/java/pom.xml" -Prelease -DskipTests \
   -Dquenby.jar.contents="$contents" -Dquenby.build.dir="$root/build/jar" \
-  --projects .,quenby,quenby-desktop "$@"
+  --projects $projects "$@"

@@ -16,8 +16,8 @@ import org.apache.spark.sql.SparkSession;
 import org.apache.spark.storage.StorageLevel;
 
 /**
- * The near-duplicates among photos: the pairs and groups that {@code quenby dupes} tells of the same
- * ones, found by all of a cluster. Photos that tell no time are in none.
+ * The near-duplicates among photos: the pairs and groups that {@code quenby dupes} tells of the
+ * same ones, found by all of a cluster. Photos that tell no time are in none.
  *
  * <p>Nothing of a photo or pair comes to the driver. Fingerprints and pairs are kept on the
  * executors, to disk where memory does not suffice, until {@link #close}.
@@ -40,9 +40,8 @@ public final class NearDuplicates implements AutoCloseable {
      * Searches photos. Work begins here, with one pass over the fingerprints; each photo is decoded
      * once.
      *
-     * @param photos    each with a path of its own, by which ties are settled, and either its content or
-     *                  its orientation, wall_clock, utc and green_cdf, as {@link #fingerprints} gives
-     *                  them
+     * @param photos    each with a path of its own, by which ties are settled, and either content or
+     *                  orientation, wall_clock, utc and green_cdf as of {@link #fingerprints}
      * @param threshold the least score of a pair
      * @return what is found
      * @throws IllegalArgumentException when the threshold is not finite
@@ -75,8 +74,8 @@ public final class NearDuplicates implements AutoCloseable {
      * Reduces photos to what the search needs.
      *
      * @param photos with path and content
-     * @return path, width, height, orientation, wall_clock, utc, green_cdf (1 KiB), error; of a photo
-     *         that cannot be read only the path and the error
+     * @return path, width, height, orientation, wall_clock, utc, green_cdf (1 KiB), error; of what
+     *         cannot be read only the path and the error
      */
     public static Dataset<Row> fingerprints(Dataset<Row> photos) {
         Quenby.register(photos.sparkSession());
@@ -117,14 +116,14 @@ public final class NearDuplicates implements AutoCloseable {
     /**
      * Gives the groups: every two photos of a group are a pair, and no photo is in two.
      *
-     * @return photos (their paths, in order), lowest_score, highest_score, seconds (the longest time
-     *         between two)
+     * @return photos (their paths, in order), lowest_score, highest_score, seconds (the longest
+     *         time between two)
      */
     public Dataset<Row> groups() {
         SparkSession spark = pairs.sparkSession();
         // Photos with equal hashes only come together to the task that groups them.
-        Dataset<Row> edges = pairs.selectExpr("xxhash64(first) AS node", "xxhash64(second) AS root");
-        Dataset<Row> roots = edges
+        Dataset<Row> roots = pairs
+                .selectExpr("xxhash64(first) AS node", "xxhash64(second) AS root")
                 .mapPartitions(new Forest(), Encoders.row(Forest.EDGE))
                 .repartition(1)
                 .mapPartitions(new Forest(), Encoders.row(Forest.EDGE));

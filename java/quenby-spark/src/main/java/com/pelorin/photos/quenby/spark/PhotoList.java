@@ -29,8 +29,8 @@ import org.apache.spark.util.SerializableConfiguration;
 
 /**
  * The photos that a job is given: input (a path), name (what it is called below a folder of
- * results), bytes, modified (milliseconds since 1970), trouble. Listed by the executors, empty files
- * too; what cannot be found is a row that says so.
+ * results), bytes, modified (milliseconds since 1970), trouble. Listed by the executors, empty
+ * files too; what cannot be found is a row that says so.
  */
 final class PhotoList {
     static final StructType PHOTO = new StructType()
@@ -47,8 +47,8 @@ final class PhotoList {
     /**
      * Lists photos.
      *
-     * @param in a folder, of which all photos below count; a text file with a path a line; or a table
-     *           in Parquet, called NAME.parquet, with a column path or input
+     * @param in a folder, of which all photos below count; a text file with a path a line; or a
+     *           table in Parquet, called NAME.parquet, with a column path or input
      * @throws IOException when there is none
      */
     static Dataset<Row> of(SparkSession spark, String in) throws IOException {

@@ -27,8 +27,8 @@ import org.apache.spark.sql.types.DataTypes;
  *
  * <p>{@code params} are the filter's, "slider=0.4;"; {@code quality=85;} among them, or
  * {@code quality=auto;} for the photo's own, is the JPEG file's. Every function gives a struct of
- * {@code result} and {@code error}, one of which is null: a photo that fails is a row that says why.
- * Null stays null.
+ * {@code result} and {@code error}, one of which is null: a photo that fails is a row that says
+ * why. Null stays null.
  */
 public final class Quenby {
     private Quenby() {}

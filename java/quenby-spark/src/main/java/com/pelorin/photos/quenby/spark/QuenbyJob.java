@@ -28,7 +28,7 @@ public final class QuenbyJob {
             "  dupes [--threshold 1.5]",
             "--in is a folder, a text file with a path a line, or NAME.parquet with a column path;",
             "enhance and look write files below --out and OUT/_manifest, score writes OUT/scores,",
-            "dupes OUT/fingerprints, OUT/pairs and OUT/groups. Run again, each does what is missing.");
+            "dupes OUT/fingerprints, OUT/pairs, OUT/groups. Run again, each does what is missing.");
 
     private QuenbyJob() {}
 

@@ -33,8 +33,8 @@ final class TimeCells {
      * @param longest seconds apart at which two photos are compared, not negative
      * @param utc     whether photos are to meet by UTC, since there are two with it
      * @param wall    whether they are to meet by the clock on the wall, since there is one without
-     * @return the shots with moment, clock, stretch, low, high, lot, guest: in a cell (clock, stretch,
-     *         low, high) those of lots low and high, in the order of moments
+     * @return the shots with moment, clock, stretch, low, high, lot, guest: those of lots low and
+     *         high of a stretch share a cell (clock, stretch, low, high)
      */
     static Dataset<Row> of(Dataset<Row> shots, double longest, boolean utc, boolean wall) {
         return of(shots, longest, utc, wall, LOT);
@@ -48,7 +48,7 @@ final class TimeCells {
         if (wall) {
             clocks.add("named_struct('clock', " + WALL_CLOCK + ", 'moment', wall_clock)");
         }
-        // Seconds since 1970 are doubles of 2e-7: a millisecond is far above what rounding can hide.
+        // Seconds since 1970 are doubles of 2e-7: a millisecond is far above what rounding hides.
         double width = Math.max(1, STRETCH * longest);
         boolean isCut = width < 1e15;
         String own = isCut ? "CAST(floor(moment / " + width + "D) AS BIGINT)" : "0L";

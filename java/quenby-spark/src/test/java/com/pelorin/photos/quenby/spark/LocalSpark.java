@@ -27,6 +27,10 @@ final class LocalSpark {
         SparkSession spark = SparkSession.builder().master("local[2]")
                 .config("spark.ui.enabled", false)
                 .config("spark.sql.shuffle.partitions", 3)
+                // Tables are small: to compile queries takes longer than to run them.
+                .config("spark.sql.codegen.wholeStage", false)
+                .config("spark.sql.codegen.factoryMode", "NO_CODEGEN")
+                .config("spark.sql.adaptive.enabled", false)
                 .config("spark.sql.warehouse.dir", System.getProperty("java.io.tmpdir"))
                 .getOrCreate();
         return spark;

@@ -24,7 +24,7 @@ class NearDuplicatesTest {
     private final SparkSession spark = LocalSpark.session();
     @TempDir Path folder;
 
-    /** Photos, lowest and highest score, seconds; of a pair its photos, score, distance, seconds. */
+    /** Photos, lowest and highest score, seconds; of pairs photos, score, distance, seconds. */
     private static Set<String> told(Path folder, String list, String threshold) throws Exception {
         JsonNode report = new ObjectMapper().readTree(LocalSpark.command(0, "dupes", "-r",
                 folder.toString(), "--json", "--pairs", "--quiet", "--threshold", threshold));

@@ -122,8 +122,9 @@ public final class TestPhotos {
                     byte[] file = random.nextInt(20) == 0 ? jpeg
                             : withExif(jpeg, random.nextInt(5) == 0 ? 6 : 1,
                                     random.nextInt(15) == 0 ? null : clock, zone);
+                    // The numbers are in no order, and no two are equal.
                     String name = String.format("%s/%s%04d.jpg", folders[random.nextInt(4)],
-                            random.nextBoolean() ? "p" : "\u00fc", random.nextInt(10000));
+                            random.nextBoolean() ? "p" : "\u00fc", made * 7919 % 10007);
                     Files.write(folder.resolve(name), file);
                 }
                 utc = utc.plusSeconds(random.nextInt(3) * 40L);
