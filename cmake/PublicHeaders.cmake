@@ -28,6 +28,7 @@ set(PELORIN_PHOTO_API
     photo/filter_photo.h
     photo/format.h
     photo/photo.h
+    photo/photo_rows.h
     photo/photo_writer.h
     photo/thread_workers.h)
 

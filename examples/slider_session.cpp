@@ -24,7 +24,7 @@ int main(int argc, char** argv) {
     photo::Photo opened = photo::open(photo::readFile(argv[1]));
     const std::uint32_t width = opened.image->width, height = opened.image->height;
     const ImageMetadata faces =
-        photo::metadataWithFaces(photo::allFaces({}, opened), width, height);
+        photo::metadataWithFaces(photo::allFaces({}, opened.faces), width, height);
 
     photo::ThreadWorkers workers;  // every core; they share the work on one picture
     FilteredImage session(opened.image, faces, "", defaultFilterConfigValue,

@@ -5,6 +5,7 @@
 #include <memory>
 
 #include "image_processing/core/face_fractions.h"
+#include "photo/photo_error.h"
 
 namespace pelorin::photo {
 namespace {
@@ -22,8 +23,8 @@ BoundingBox boxOf(const Face& face, std::uint32_t width, std::uint32_t height, i
 
 }  // namespace
 
-std::vector<Face> allFaces(std::vector<Face> faces, const Photo& photo) {
-  for (const KnownFace& face : photo.faces) {
+std::vector<Face> allFaces(std::vector<Face> faces, const std::vector<KnownFace>& known) {
+  for (const KnownFace& face : known) {
     if (face.right <= 0 || face.bottom <= 0 || face.left >= 1 || face.top >= 1) continue;
     faces.push_back({static_cast<float>(face.left), static_cast<float>(face.top),
                      static_cast<float>(face.right), static_cast<float>(face.bottom)});

@@ -4,7 +4,7 @@
 #include <vector>
 
 #include "image_processing/core/image_metadata.h"
-#include "photo/photo.h"
+#include "photo/metadata/known_faces.h"
 
 namespace pelorin::photo {
 
@@ -14,8 +14,8 @@ struct Face {
   bool inPixels = false;  ///< Of the picture at its full size; fractions of it otherwise.
 };
 
-/// The caller's faces, then those that the photo's file knows of and that touch the picture.
-std::vector<Face> allFaces(std::vector<Face> faces, const Photo& photo);
+/// The caller's faces, then those that a photo's file knows of and that touch the picture.
+std::vector<Face> allFaces(std::vector<Face> faces, const std::vector<KnownFace>& known);
 
 /// The boxes in pixels of a picture of this size. Fractions are multiplied by it in float and
 /// truncated, with no clamping, as the Java natives do it.

@@ -10,12 +10,11 @@
 #include <utility>
 
 #include "image_processing/core/parameter_strings.h"
-#include "image_processing/core/picture_rows.h"
 #include "image_processing/core/stages.h"
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/parameter_check.h"
+#include "photo/photo_rows.h"
 #include "photo/photo_writer.h"
-#include "photo/turned_image.h"
 
 namespace pelorin::photo {
 
@@ -44,24 +43,6 @@ void checkRequest(const FilterRequest& request) {
   if (scale != 1 && scale != 2 && scale != 4 && scale != 8) refuse("scale: is not 1, 2, 4 or 8");
   requireFinite(request.faces);
 }
-
-/// The rows of a reader; where there is a picture to keep them, they stand there afterwards.
-class DecodedRows : public RowSource {
- public:
-  DecodedRows(RowReader& reader, const Image<RGBA8Pixel>* kept) : reader_(reader), kept_(kept) {}
-
-  const RGBA8Pixel* next(std::uint32_t count, RGBA8Pixel* room) override {
-    RGBA8Pixel* const rows = kept_ != nullptr ? kept_->row(next_) : room;
-    reader_.read(rows, count);
-    next_ += count;
-    return rows;
-  }
-
- private:
-  RowReader& reader_;
-  const Image<RGBA8Pixel>* kept_;
-  std::uint32_t next_ = 0;
-};
 
 class WrittenRows : public RowSink {
  public:
@@ -94,23 +75,19 @@ void requireFinite(const std::vector<Face>& faces) {
 }
 
 FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const FilterRequest& request,
-                          const Format* format, const FilterResources& resources) {
+                          const Format* format, const RowResources& resources) {
   checkRequest(request);
   const OpenOptions& open = request.open;
-  std::unique_ptr<RowReader> reader = openRows(file, open);
-  Photo photo{nullptr, reader->facts(), reader->metadata(), {}};
-  if (open.upright)
-    photo.metadata.turn = turnedFurther(uprightTurn(photo.facts.orientation), open.rotate);
-  const PictureSize stored = reader->size(), size = turnedSize(stored, photo.metadata.turn);
-  if (open.faces && !open.raw) photo.faces = knownFaces(photo.metadata, size);
-  if (format == nullptr) format = formatNamed(photo.facts.format);
+  PhotoRows photo(file, open, resources);
+  const PictureSize size = photo.size();
+  if (format == nullptr) format = formatNamed(photo.facts().format);
 
-  const std::unique_ptr<RowFilter> rows =
+  const std::unique_ptr<RowFilter> filter =
       filterFor(request.filter, request.params)
           .makeRowFilter({.width = size.width,
                           .height = size.height,
-                          .metadata = metadataWithFaces(allFaces(request.faces, photo), size.width,
-                                                        size.height, open.scale),
+                          .metadata = metadataWithFaces(allFaces(request.faces, photo.faces()),
+                                                        size.width, size.height, open.scale),
                           .params = request.params});
   RowWork work{.stop = [&] { return open.stop.stop_requested(); }};
   if (tasksFor(resources.workers) > 1) {
@@ -121,43 +98,17 @@ FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const FilterReques
     if (!done) throw Stopped();
   };
 
-  SparePixels none;
-  SparePixels& spare = resources.spare != nullptr ? *resources.spare : none;
-  const bool asksAlpha = format->keepsAlpha && photo.facts.hasAlpha;
-  const bool isTurned = photo.metadata.turn != Turn{};
-  const bool fits =
-      std::uint64_t{size.width} * size.height <= resources.pixels / sizeof(RGBA8Pixel);
-  if (isTurned || asksAlpha) {
-    photo.image = readTurned(*reader, photo.metadata.turn, spare, work.workers);
-  } else if (rows->looksFirst() && (fits || photo.facts.progressive)) {
-    photo.image = spare.picture(size.width, size.height);
-  }
-  if (rows->looksFirst()) {
-    if (isTurned || asksAlpha) {
-      PictureSource picture(*photo.image);
-      stopUnless(rows->look(picture, work));
-    } else {
-      DecodedRows decoded(*reader, photo.image.get());
-      stopUnless(rows->look(decoded, work));
-      reader = photo.image == nullptr ? openRows(file, open) : nullptr;
-    }
-  }
+  const bool asksAlpha = format->keepsAlpha && photo.facts().hasAlpha;
+  const bool hasAlpha =
+      asksAlpha && !isOpaque(photo.picture().data.get(), photo.picture().pixelCount());
+  if (filter->looksFirst()) stopUnless(filter->look(photo.sweep(/*again=*/true), work));
 
-  const bool hasAlpha = asksAlpha && !isOpaque(photo.image->data.get(), photo.image->pixelCount());
   SaveOptions save = request.save;
   if (request.mark && !save.mark) save.mark = markOf(request.filter, request.params);
-  PhotoWriter writer(size, *format, hasAlpha, photo.metadata, save);
+  PhotoWriter writer(size, *format, hasAlpha, photo.metadata(), save);
   WrittenRows written(writer);
-  if (photo.image != nullptr) {
-    PictureSource picture(*photo.image);
-    stopUnless(rows->filter(picture, written, work));
-    spare.keep(*photo.image);
-    photo.image = nullptr;
-  } else {
-    DecodedRows decoded(*reader, nullptr);
-    stopUnless(rows->filter(decoded, written, work));
-  }
-  FilteredPhoto filtered{{}, size, std::move(photo.facts)};
+  stopUnless(filter->filter(photo.sweep(/*again=*/false), written, work));
+  FilteredPhoto filtered{{}, size, photo.facts()};
   filtered.file = writer.finish(&filtered.lost);
   return filtered;
 }

@@ -8,6 +8,7 @@
 #include "image_processing/filters/filter_description.h"
 #include "photo/faces.h"
 #include "photo/photo.h"
+#include "photo/photo_rows.h"
 
 namespace pelorin::photo {
 
@@ -47,17 +48,6 @@ struct FilteredPhoto {
   std::vector<Loss> lost = {};  ///< What of the metadata is not in the file.
 };
 
-/// What the filtering of a photo may use; nothing of it changes a byte.
-struct FilterResources {
-  /// Bytes of decoded pixels, 4 each, that are kept for a filter that goes over them twice. A photo
-  /// with more is decoded twice instead. One that is turned, whose rows come in several passes or
-  /// whose transparency must be known first is kept in any case.
-  std::uint64_t pixels = std::uint64_t{128} << 20;
-  SparePixels* spare = nullptr;  ///< Where kept pixels may come from and go; may be null.
-  /// Share the work: decoding, filtering and encoding go on at the same time. Null for none.
-  image_processing::Workers* workers = nullptr;
-};
-
 /// Filters a photo into the file that the command writes for the same options: upright, filtered,
 /// with the metadata kept. It goes by rows, with hardly any memory beside what `resources` allows for
 /// pixels and the bytes of the two files, and has the bytes of the filter on the whole picture.
@@ -66,6 +56,6 @@ struct FilterResources {
 ///         rotation, scale or faces; PhotoError as `open` and `save`, and for a face in pixels that
 ///         lies outside the picture; Stopped when a stop token says so; std::bad_alloc.
 FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const FilterRequest& request,
-                          const Format* format = nullptr, const FilterResources& resources = {});
+                          const Format* format = nullptr, const RowResources& resources = {});
 
 }  // namespace pelorin::photo

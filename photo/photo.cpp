@@ -54,7 +54,9 @@ Photo open(std::span<const std::uint8_t> file, const OpenOptions& options, Spare
   if (options.upright)
     photo.metadata.turn = turnedFurther(uprightTurn(photo.facts.orientation), options.rotate);
   SparePixels none;
-  photo.image = readTurned(*rows, photo.metadata.turn, spare != nullptr ? *spare : none);
+  const PictureSize size = turnedSize(rows->size(), photo.metadata.turn);
+  photo.image = (spare != nullptr ? *spare : none).picture(size.width, size.height);
+  readTurned(*rows, photo.metadata.turn, *photo.image);
   stopIfAsked(options.stop);
   if (options.faces && !options.raw)
     photo.faces = knownFaces(photo.metadata, {photo.image->width, photo.image->height});

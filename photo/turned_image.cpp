@@ -48,14 +48,9 @@ void turnRows(const RGBA8Pixel* rows, std::uint32_t first, std::uint32_t count, 
   }
 }
 
-std::shared_ptr<Image<RGBA8Pixel>> readTurned(RowReader& reader, Turn turn, SparePixels& spare,
-                                              Workers* workers) {
-  const PictureSize size = reader.size(), upright = turnedSize(size, turn);
-  const std::shared_ptr<Image<RGBA8Pixel>> picture = spare.picture(upright.width, upright.height);
-  if (turn == Turn{}) {
-    reader.read(picture->data.get(), size.height);
-    return picture;
-  }
+void readTurned(RowReader& reader, Turn turn, const Image<RGBA8Pixel>& picture, Workers* workers) {
+  const PictureSize size = reader.size();
+  if (turn == Turn{}) return reader.read(picture.data.get(), size.height);
   constexpr std::uint32_t rowsRead = 64;  // what a processor has room for beside its work
   std::vector<Image<RGBA8Pixel>> rooms;
   for (std::int64_t i = bandsUnderWay(2, workers); i > 0; --i)
@@ -73,10 +68,9 @@ std::shared_ptr<Image<RGBA8Pixel>> readTurned(RowReader& reader, Turn turn, Spar
       1, [&](std::int64_t band, std::size_t) { reader.read(roomOf(band), rowsOf(band)); }};
   const Stage turnThem = {1, [&](std::int64_t band, std::size_t) {
                             turnRows(roomOf(band), firstOf(band), rowsOf(band), size, turn,
-                                     *picture);
+                                     picture);
                           }};
   runStages((std::int64_t{size.height} + rowsRead - 1) / rowsRead, {read, turnThem}, workers);
-  return picture;
 }
 
 }  // namespace pelorin::photo

@@ -1,13 +1,11 @@
 #pragma once
 
 #include <cstdint>
-#include <memory>
 
 #include "image_processing/core/image.h"
 #include "image_processing/core/workers.h"
 #include "photo/picture_size.h"
 #include "photo/rows.h"
-#include "photo/spare_pixels.h"
 #include "photo/turn.h"
 
 namespace pelorin::photo {
@@ -26,11 +24,13 @@ void turnRows(const image_processing::RGBA8Pixel* rows, std::uint32_t first, std
               PictureSize size, Turn turn,
               const image_processing::Image<image_processing::RGBA8Pixel>& result);
 
-/// All rows of a reader, turned while they come, so that there is one picture and not two.
-/// @param spare    where its pixels may come from.
+/// Reads all rows of a reader and turns them while they come, so that there is one picture and not
+/// two.
+/// @param picture  of `turnedSize`; all of it is written.
 /// @param workers  let the turning and the reading go on at the same time; null for none.
 /// @throws what the reader throws; std::bad_alloc.
-std::shared_ptr<image_processing::Image<image_processing::RGBA8Pixel>> readTurned(
-    RowReader& reader, Turn turn, SparePixels& spare, image_processing::Workers* workers = nullptr);
+void readTurned(RowReader& reader, Turn turn,
+                const image_processing::Image<image_processing::RGBA8Pixel>& picture,
+                image_processing::Workers* workers = nullptr);
 
 }  // namespace pelorin::photo

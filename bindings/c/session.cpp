@@ -46,7 +46,7 @@ int32_t quenby_session_open_photo(const quenby_photo* photo, const quenby_face* 
   return guarded(error, [&] {
     required(session, "session");
     const photo::Photo& from = required(photo, "photo").photo;
-    const auto boxes = photo::allFaces(facesOf(faces, face_count), from);
+    const auto boxes = photo::allFaces(facesOf(faces, face_count), from.faces);
     *session = new quenby_session(
         from.image,
         photo::metadataWithFaces(boxes, from.image->width, from.image->height, photo->scale));

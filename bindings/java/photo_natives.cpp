@@ -107,8 +107,10 @@ jfloat niqe(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
 jfloatArray niqeMeanFeatures(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
                              jint length, jlong cancel) {
   const FileBytes file(env, array, buffer, offset, length);
-  const photo::Photo photo = photo::open(file.bytes(), {.stop = cancellations().token(cancel)});
-  return javaArray(env, image_processing::analyzeNiqe(*photo.image).meanFeatures);
+  photo::PhotoRows photo(file.bytes(), {.faces = false, .stop = cancellations().token(cancel)});
+  const auto [width, height] = photo.size();
+  image_processing::RowSource& rows = photo.sweep(/*again=*/false);
+  return javaArray(env, image_processing::analyzeNiqe(width, height, rows).meanFeatures);
 }
 
 jfloatArray greenCdf(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,

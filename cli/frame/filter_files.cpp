@@ -32,10 +32,10 @@ struct Work {
   photo::OpenOptions photo;
   SaveChoice save;
   bool inPlace = false, keepsTimes = false;
-  std::uint64_t pixels = 0;                            // bytes of them that a file may keep
   bool again = false;                                  // whatever marks a photo carries
   std::optional<ComparisonSize> shown = {};            // on a page, where there is to be one
-  std::unique_ptr<photo::ThreadWorkers> workers = {};  // of all files at once; null for none
+  std::unique_ptr<KeptPixels> pixels = {};             // of all files at once, as the workers
+  std::unique_ptr<photo::ThreadWorkers> workers = {};  // null for none
 };
 
 struct Done {
@@ -142,9 +142,10 @@ void findMarks(const Work& work, int jobs, std::vector<PlannedFile>& plan) {
 }
 
 Done process(const Work& work, const PlannedFile& file, Talk& talk) {
-  thread_local photo::SparePixels spare;  // each worker's own
   photo::OpenOptions open = work.photo;
   open.stop = interruptToken();
+  photo::RowResources resources = work.pixels->resources();
+  resources.workers = work.workers.get();
   const std::vector<std::uint8_t> bytes = readInput(file.input);
   if (std::string earlier = earlierEdit(work, bytes); !earlier.empty()) {
     Done done = {.earlier = std::move(earlier)};
@@ -160,8 +161,7 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
                           .save = saveOptions(work.save),
                           .mark = false},  // but for the one that is to be saved
                          // A name may lie; what stands in place of a photo is of its kind.
-                         work.inPlace ? nullptr : &outputFormat(file.output, work.save),
-                         {.pixels = work.pixels, .spare = &spare, .workers = work.workers.get()});
+                         work.inPlace ? nullptr : &outputFormat(file.output, work.save), resources);
   tellNotices(file.input, filtered.facts, talk);
   SaveChoice save = work.save;
   if (!work.inPlace && work.keepsTimes && !file.input.isStandardInput()) {
@@ -226,12 +226,7 @@ void addFilteringOptions(Verb verb, FilterFilesOptions& options) {
   addMarkOptions(verb, options.mark);
   addJobsOption(verb, options.jobs);
   addThreadsOption(verb, options.threads);
-  verb.option("--memory", options.memory,
-              "MiB for decoded pixels, 128 unless given, shared by the files at once; photos that "
-              "need more are decoded twice, or kept where that cannot be")
-      .between(0, 1 << 20)
-      .type("MIB")
-      .group("Reporting");
+  addMemoryOption(verb, options.memory);
 }
 
 void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
@@ -295,7 +290,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
 
   const std::size_t atOnce =
       std::clamp<std::size_t>(plan.size(), 1, static_cast<std::size_t>(jobsAtOnce(options.jobs)));
-  work.pixels = (std::uint64_t{static_cast<unsigned>(options.memory)} << 20) / atOnce;
+  work.pixels = std::make_unique<KeptPixels>(options.memory, options.jobs, plan.size());
   if (atOnce == 1 && plan.size() > 1) recycleFreedMemory();
   const std::size_t threads = threadsForEach(options.threads, options.jobs, plan.size());
   if (threads > 1) {

@@ -12,6 +12,7 @@
 #include "cli/frame/jobs.h"
 #include "cli/frame/keep_option.h"
 #include "cli/frame/mark_option.h"
+#include "cli/frame/memory_option.h"
 #include "cli/frame/outputs.h"
 #include "cli/frame/talk.h"
 #include "cli/frame/verb.h"
@@ -34,7 +35,7 @@ struct FilterFilesOptions {
   int scale = 1;
   int jobs = 0;
   int threads = usualThreads;  ///< On each file.
-  int memory = 128;            ///< MiB of pixels kept, by all jobs together.
+  int memory = usualMemory;    ///< MiB of pixels kept, by all jobs together.
 };
 
 /// Adds what a verb may do with a photo beside the filter: faces, turning, quality, metadata, jobs.

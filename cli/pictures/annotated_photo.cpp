@@ -7,7 +7,6 @@
 
 #include "cli/pictures/plot.h"
 #include "cli/pictures/text.h"
-#include "photo/area_average.h"
 
 namespace pelorin::cli {
 
@@ -25,7 +24,8 @@ constexpr TextStyle labelStyle{14, {0.20, 0.21, 0.24}};
 constexpr TextStyle tickStyle{13, {0.33, 0.35, 0.39}};
 constexpr Colour background{0.955, 0.957, 0.962}, frame{0.45, 0.47, 0.50};
 
-photo::PictureSize shownSize(photo::PictureSize photo) {
+// Of a tiny one more than it has.
+photo::PictureSize sizeInPicture(photo::PictureSize photo) {
   const std::uint32_t longer = std::max(photo.width, photo.height);
   const std::uint32_t factor = longer >= enlargedTo ? 1 : (enlargedTo + longer - 1) / longer;
   return photo::fitWithin({photo.width * factor, photo.height * factor},
@@ -52,8 +52,7 @@ Image<RGBA8Pixel> muted(const Image<RGBA8Pixel>& picture) {
 }
 
 void paintPhoto(cairo_t* c, const Image<RGBA8Pixel>& photo, photo::PictureSize shown) {
-  const bool shrunk = shown.width < photo.width || shown.height < photo.height;
-  const Image<RGBA8Pixel> picture = muted(shrunk ? photo::areaAverage(photo, shown) : photo);
+  const Image<RGBA8Pixel> picture = muted(photo);
   Canvas pixels(picture.width, picture.height);
   pixels.paste(picture, 0, 0);
   cairo_save(c);
@@ -67,14 +66,31 @@ void paintPhoto(cairo_t* c, const Image<RGBA8Pixel>& photo, photo::PictureSize s
 
 }  // namespace
 
-AnnotatedPhoto::AnnotatedPhoto(const Photo& photo, const std::string& title,
+photo::PictureSize ShownPhoto::shownSize(photo::PictureSize photo) {
+  return photo::fitWithin(photo, {longestShown, longestShown});
+}
+
+ShownPhoto::ShownPhoto(const Pixels& photo)
+    : ShownPhoto(photo::areaAverage(photo, shownSize({photo.width, photo.height})),
+                 {photo.width, photo.height}) {}
+
+RowsToShow::RowsToShow(image_processing::RowSource& rows, photo::PictureSize size)
+    : rows_(rows), size_(size), average_(size, ShownPhoto::shownSize(size)) {}
+
+const RGBA8Pixel* RowsToShow::next(std::uint32_t count, RGBA8Pixel* room) {
+  const RGBA8Pixel* const rows = rows_.next(count, room);
+  for (std::uint32_t i = 0; i < count; ++i) average_.addRow(rows + std::size_t{size_.width} * i);
+  return rows;
+}
+
+AnnotatedPhoto::AnnotatedPhoto(const ShownPhoto& photo, const std::string& title,
                                const std::string& subtitle)
-    : shownWidth_(shownSize({photo.width, photo.height}).width),
-      shownHeight_(shownSize({photo.width, photo.height}).height),
+    : shownWidth_(sizeInPicture(photo.size).width),
+      shownHeight_(sizeInPicture(photo.size).height),
       left_(margin + std::floor(std::max(0.0, narrowest - shownWidth_) / 2)),
       top_(heading),
-      scaleX_(shownWidth_ / photo.width),
-      scaleY_(shownHeight_ / photo.height),
+      scaleX_(shownWidth_ / photo.size.width),
+      scaleY_(shownHeight_ / photo.size.height),
       canvas_(canvasSide(std::max(narrowest, shownWidth_), 2 * margin),
               canvasSide(shownHeight_, heading + footing)) {
   cairo_t* c = context();
@@ -87,7 +103,7 @@ AnnotatedPhoto::AnnotatedPhoto(const Photo& photo, const std::string& title,
   cairo_translate(c, left_, top_);
   cairo_rectangle(c, 0, 0, shownWidth_, shownHeight_);
   cairo_clip(c);
-  paintPhoto(c, photo, shownSize({photo.width, photo.height}));
+  paintPhoto(c, photo.pixels, sizeInPicture(photo.size));
   cairo_scale(c, scaleX_, scaleY_);
 }
 

@@ -11,9 +11,9 @@ constexpr double radius = 4.5, thickness = 1.8, outline = 3.6;
 
 }  // namespace
 
-AnnotatedPhoto::Photo drawCorners(const AnnotatedPhoto::Photo& photo,
-                                  std::vector<MarkedPixel> pixels, const std::string& title,
-                                  const std::string& subtitle, const std::string& label) {
+AnnotatedPhoto::Photo drawCorners(const ShownPhoto& photo, std::vector<MarkedPixel> pixels,
+                                  const std::string& title, const std::string& subtitle,
+                                  const std::string& label) {
   const AnnotatedPhoto picture(photo, title, subtitle);
   std::vector<float> values;
   for (const MarkedPixel& pixel : pixels) values.push_back(pixel.value);

@@ -16,8 +16,8 @@ struct MarkedPixel {
 /// The photo with a ring around each pixel, coloured by its value; higher ones lie on top.
 /// @param label  what the colours stand for.
 /// @throws std::bad_alloc when the picture does not fit into memory.
-AnnotatedPhoto::Photo drawCorners(const AnnotatedPhoto::Photo& photo,
-                                  std::vector<MarkedPixel> pixels, const std::string& title,
-                                  const std::string& subtitle, const std::string& label);
+AnnotatedPhoto::Photo drawCorners(const ShownPhoto& photo, std::vector<MarkedPixel> pixels,
+                                  const std::string& title, const std::string& subtitle,
+                                  const std::string& label);
 
 }  // namespace pelorin::cli

@@ -11,7 +11,7 @@ constexpr double opacity = 0.55, whiteness = 0.2;
 
 }  // namespace
 
-AnnotatedPhoto::Photo drawHeatMap(const AnnotatedPhoto::Photo& photo, const BlockValues& blocks,
+AnnotatedPhoto::Photo drawHeatMap(const ShownPhoto& photo, const BlockValues& blocks,
                                   const std::string& title, const std::string& subtitle,
                                   const std::string& label) {
   const AnnotatedPhoto picture(photo, title, subtitle);

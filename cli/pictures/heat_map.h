@@ -19,7 +19,7 @@ struct BlockValues {
 /// not finite, keep the photo's muted colours.
 /// @param label  what the colours stand for.
 /// @throws std::bad_alloc when the picture does not fit into memory.
-AnnotatedPhoto::Photo drawHeatMap(const AnnotatedPhoto::Photo& photo, const BlockValues& blocks,
+AnnotatedPhoto::Photo drawHeatMap(const ShownPhoto& photo, const BlockValues& blocks,
                                   const std::string& title, const std::string& subtitle,
                                   const std::string& label);
 

@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "image_processing/core/image.h"
+#include "image_processing/core/rows.h"
 #include "image_processing/features/brief.h"
 
 namespace pelorin::cli {
@@ -27,10 +27,11 @@ struct Corner {
   std::optional<Descriptor> descriptor;  ///< None within 15 pixels of a border.
 };
 
-/// The FAST corners of a grey picture in raster order.
-/// @throws std::bad_alloc
-std::vector<Corner> findCorners(const image_processing::Image<unsigned char>& grey,
-                                const CornerSearch& search);
+/// The FAST corners of a picture in raster order, found in its green channel, of which some hundred
+/// rows are held.
+/// @throws std::bad_alloc, and what the source throws.
+std::vector<Corner> findCorners(std::uint32_t width, std::uint32_t height,
+                                image_processing::RowSource& rows, const CornerSearch& search);
 
 /// 64 hexadecimal digits, bit 255 first.
 std::string hexOf(const Descriptor& descriptor);

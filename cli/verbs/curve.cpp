@@ -102,7 +102,7 @@ ExitCode runCurve(const CurveOptions& options) {
       {.work =
            [&](std::size_t) {
              const photo::Photo photo = loadPhoto(input, photoOptions, talk);
-             const Curve curve = curveOf(photo, slider, allFaces(faces.of(input), photo));
+             const Curve curve = curveOf(photo, slider, allFaces(faces.of(input), photo.faces));
              if (plotted) {
                savePicture(output, drawPlot(plotOf(curve, input, slider)), {},
                            drawing(options.outputs.overwrite));

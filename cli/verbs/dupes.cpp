@@ -14,6 +14,7 @@
 #include "cli/frame/html_page.h"
 #include "cli/frame/jobs.h"
 #include "cli/frame/jobs_option.h"
+#include "cli/frame/memory_option.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/outputs.h"
 #include "cli/frame/talk.h"
@@ -51,6 +52,7 @@ struct DupesOptions {
   bool overwrite = false;
   bool planOnly = false;
   int jobs = 0;
+  int memory = usualMemory;
 };
 
 constexpr const char* verbName = "dupes";
@@ -98,28 +100,29 @@ bool scorePhotos(const DupesOptions& options, photo::PhotoCache* cache, std::str
   std::vector<Input> inputs;
   for (const Unscored& photo : unscored) inputs.push_back({report.photos[photo.photo].path, {}});
   Talk talk(verbName, options.report, inputs.size());
-  const PhotoTally tally =
-      eachPhoto<float>(inputs, options.jobs, talk,
-                       {.work =
-                            [&](std::size_t job) {
-                              return photo::scoreOf(readInput(inputs[job]), interruptToken());
-                            },
-                        .done =
-                            [&](std::size_t job, float score) {
-                              const auto& [i, stamp] = unscored[job];
-                              report.photos[i].niqe = score;
-                              if (cache == nullptr || !stamp || !cacheTrouble.empty()) return;
-                              try {
-                                cache->storeScore(inputs[job].path, *stamp, score);
-                              } catch (const photo::CacheError& error) {
-                                cacheTrouble = error.what();
-                              }
-                            },
-                        .failed =
-                            [&](std::size_t job, const std::string& reason) {
-                              report.failed.push_back({inputs[job].path, reason});
-                            },
-                        .failure = "no score of it: "});
+  KeptPixels pixels(options.memory, options.jobs, inputs.size());
+  const PhotoTally tally = eachPhoto<float>(
+      inputs, options.jobs, talk,
+      {.work =
+           [&](std::size_t job) {
+             return photo::scoreOf(readInput(inputs[job]), interruptToken(), pixels.resources());
+           },
+       .done =
+           [&](std::size_t job, float score) {
+             const auto& [i, stamp] = unscored[job];
+             report.photos[i].niqe = score;
+             if (cache == nullptr || !stamp || !cacheTrouble.empty()) return;
+             try {
+               cache->storeScore(inputs[job].path, *stamp, score);
+             } catch (const photo::CacheError& error) {
+               cacheTrouble = error.what();
+             }
+           },
+       .failed =
+           [&](std::size_t job, const std::string& reason) {
+             report.failed.push_back({inputs[job].path, reason});
+           },
+       .failure = "no score of it: "});
   return !tally.interrupted;
 }
 
@@ -410,6 +413,7 @@ void addDupes(CommandLine& commandLine) {
             "Say what is found and write nothing, neither the page nor the cache")
       .group("Output");
   addJobsOption(verb, options->jobs);
+  addMemoryOption(verb, options->memory);
   addReportOptions(verb, options->report);
 }
 

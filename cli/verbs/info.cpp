@@ -7,9 +7,12 @@
 
 #include "cli/frame/each_photo.h"
 #include "cli/frame/face_choice.h"
+#include "cli/frame/file_bytes.h"
 #include "cli/frame/inputs.h"
+#include "cli/frame/interrupt.h"
 #include "cli/frame/jobs_option.h"
 #include "cli/frame/json_output.h"
+#include "cli/frame/memory_option.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/photo_files.h"
 #include "cli/frame/raw_option.h"
@@ -18,6 +21,7 @@
 #include "cli/verbs/verbs.h"
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
 #include "image_processing/autoenhance/lightness/cdf.h"
+#include "image_processing/autoenhance/photo_analysis.h"
 
 namespace pelorin::cli {
 namespace {
@@ -32,6 +36,7 @@ struct InfoOptions {
   std::string raw;
   std::string slider = "0.4";
   int jobs = 0;
+  int memory = usualMemory;
 };
 
 struct Info {
@@ -42,14 +47,18 @@ struct Info {
   std::vector<float> curve;
 };
 
-Info inspect(const Input& input, const photo::OpenOptions& options, const FaceChoice& faces,
-             float slider, Talk& talk) {
-  const photo::Photo photo = loadPhoto(input, options, talk);
-  Info info = {photo.image->width, photo.image->height, std::nullopt, photo.faces, {}, {}};
-  if (!options.raw) info.facts = photo.facts;
-  image_processing::analyzeImage(
-      *photo.image, metadataWithFaces(allFaces(faces.of(input), photo), info.width, info.height),
-      info.statistics);
+Info inspect(const Input& input, const photo::OpenOptions& options,
+             const photo::RowResources& resources, const FaceChoice& faces, float slider,
+             Talk& talk) {
+  const std::vector<std::uint8_t> file = readInput(input);
+  photo::PhotoRows photo(file, options, resources);
+  Info info = {photo.size().width, photo.size().height, std::nullopt, photo.faces(), {}, {}};
+  if (!options.raw) info.facts = photo.facts();
+  const image_processing::ImageMetadata boxes =
+      metadataWithFaces(allFaces(faces.of(input), photo.faces()), info.width, info.height);
+  const image_processing::AnalysisSubject subject{info.width, info.height, boxes};
+  info.statistics = *analysePhoto(subject, photo.sweep(/*again=*/false), {});
+  tellNotices(input, photo.facts(), talk);
   FilterConfig config = image_processing::defaultFilterConfigValue;
   image_processing::updateFilterConfigForSliderValue(slider, &config);
   info.curve = image_processing::buildToneCurve(info.statistics, config);
@@ -149,16 +158,19 @@ void printText(const Input& input, const Info& info, const std::string& slider) 
 ExitCode runInfo(const InfoOptions& options) {
   const float slider = readSlider("--slider", options.slider);
   const FaceChoice faces(options.faces);
-  photo::OpenOptions photo = {.faces = faces.asksPhoto()};
+  photo::OpenOptions photo = {.faces = faces.asksPhoto(), .stop = interruptToken()};
   photo.raw = readRawSize(options.raw, options.inputs);
   const std::vector<Input> inputs = expandInputs(options.inputs);
 
   JsonOutput json(options.report, isSingleFile(options.inputs, inputs));
   Talk talk("info", options.report, inputs.size());
+  KeptPixels pixels(options.memory, options.jobs, inputs.size());
   const PhotoTally tally = eachPhoto<Info>(
       inputs, options.jobs, talk,
       {.work =
-           [&](std::size_t index) { return inspect(inputs[index], photo, faces, slider, talk); },
+           [&](std::size_t index) {
+             return inspect(inputs[index], photo, pixels.resources(), faces, slider, talk);
+           },
        .done =
            [&](std::size_t index, const Info& info) {
              if (json.wanted()) {
@@ -192,6 +204,7 @@ void addInfo(CommandLine& commandLine) {
   addFaceOptions(verb, options->faces);
   addRawOption(verb, options->raw);
   addJobsOption(verb, options->jobs);
+  addMemoryOption(verb, options->memory);
   addReportOptions(verb, options->report);
 }
 

@@ -8,13 +8,15 @@
 
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
+#include "cli/frame/file_bytes.h"
+#include "cli/frame/interrupt.h"
 #include "cli/frame/lone_files.h"
 #include "cli/frame/photo_files.h"
 #include "cli/frame/raw_option.h"
 #include "cli/pictures/corner_picture.h"
 #include "cli/verbs/corners.h"
 #include "cli/verbs/verbs.h"
-#include "image_processing/dupe/grayscale.h"
+#include "photo/photo_rows.h"
 
 namespace pelorin::cli {
 namespace {
@@ -41,7 +43,7 @@ std::string countText(std::size_t count, const CornerSearch& search) {
                      search.arc, search.threshold, search.suppressed ? "" : ", not suppressed");
 }
 
-Image<RGBA8Pixel> drawingOf(const photo::Photo& photo, const Input& input,
+Image<RGBA8Pixel> drawingOf(const ShownPhoto& photo, const Input& input,
                             const std::vector<Corner>& corners, const CornerSearch& search) {
   std::vector<MarkedPixel> marks;
   for (const Corner& corner : corners) {
@@ -50,9 +52,9 @@ Image<RGBA8Pixel> drawingOf(const photo::Photo& photo, const Input& input,
   const std::string name = input.isStandardInput()
                                ? input.shownName()
                                : std::filesystem::path(input.path).filename().string();
-  const std::string about = fmt::format("{} \xC3\x97 {} pixels, {}", photo.image->width,
-                                        photo.image->height, countText(corners.size(), search));
-  return drawCorners(*photo.image, std::move(marks), "Corners of " + name, about,
+  const std::string about = fmt::format("{} \xC3\x97 {} pixels, {}", photo.size.width,
+                                        photo.size.height, countText(corners.size(), search));
+  return drawCorners(photo, std::move(marks), "Corners of " + name, about,
                      "Score: the largest threshold at which it is still a corner");
 }
 
@@ -99,7 +101,7 @@ void printSummary(const Input& input, const Keypoints& keypoints, const CornerSe
 }
 
 ExitCode runKeypoints(const KeypointsOptions& options) {
-  photo::OpenOptions photoOptions;
+  photo::OpenOptions photoOptions = {.faces = false, .stop = interruptToken()};
   photoOptions.raw = readRawSize(options.raw);
   CornerSearch search = options.search;
   search.suppressed = !options.unsuppressed;
@@ -118,14 +120,20 @@ ExitCode runKeypoints(const KeypointsOptions& options) {
       {input}, /*jobs=*/1, talk,
       {.work =
            [&](std::size_t) {
-             const photo::Photo photo = loadPhoto(input, photoOptions, talk);
-             Keypoints keypoints = {
-                 photo.image->width, photo.image->height,
-                 findCorners(image_processing::imageMakeGrayscale(*photo.image), search)};
-             if (!path.empty()) {
-               const auto picture = drawingOf(photo, input, keypoints.corners, search);
+             const std::vector<std::uint8_t> file = readInput(input);
+             photo::PhotoRows photo(file, photoOptions);
+             const auto [width, height] = photo.size();
+             image_processing::RowSource& rows = photo.sweep(/*again=*/false);
+             Keypoints keypoints = {width, height, {}};
+             if (path.empty()) {
+               keypoints.corners = findCorners(width, height, rows, search);
+             } else {
+               RowsToShow shown(rows, photo.size());
+               keypoints.corners = findCorners(width, height, shown, search);
+               const auto picture = drawingOf(shown.shown(), input, keypoints.corners, search);
                savePicture(path, picture, {}, drawing(options.drawing.overwrite));
              }
+             tellNotices(input, photo.facts(), talk);
              return keypoints;
            },
        .done =

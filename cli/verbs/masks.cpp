@@ -98,7 +98,7 @@ ExitCode runMasks(const MasksOptions& options) {
       {.work =
            [&](std::size_t) {
              photo::Photo photo = loadPhoto(input, photoOptions, talk);
-             const std::vector<Face> known = allFaces(faces.of(input), photo);
+             const std::vector<Face> known = allFaces(faces.of(input), photo.faces);
              const Masks masks = masksOf(std::move(photo), options.filter, known, options.exact);
              const OutputFolders folders(paths);
              writeMasks(masks, bilateralPath, ltmPath, raw,

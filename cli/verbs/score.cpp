@@ -8,8 +8,10 @@
 
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
+#include "cli/frame/file_bytes.h"
 #include "cli/frame/interrupt.h"
 #include "cli/frame/jobs_option.h"
+#include "cli/frame/memory_option.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/outputs.h"
 #include "cli/frame/photo_files.h"
@@ -35,9 +37,10 @@ struct ScoreOptions {
   std::optional<std::string> failAbove;
   std::string raw;
   int jobs = 0;
+  int memory = usualMemory;
 };
 
-Image<RGBA8Pixel> heatMapOf(const photo::Photo& photo, const Input& input,
+Image<RGBA8Pixel> heatMapOf(const ShownPhoto& photo, const Input& input,
                             const ScoredPhoto& scored) {
   const std::string name = input.isStandardInput()
                                ? input.shownName()
@@ -46,23 +49,29 @@ Image<RGBA8Pixel> heatMapOf(const photo::Photo& photo, const Input& input,
   const std::string about =
       fmt::format("NIQE {:.2f}, {} \xC3\x97 {} pixels, {} \xC3\x97 {} blocks", niqe.score,
                   scored.width, scored.height, niqe.blockColumns, niqe.blockRows);
-  return drawHeatMap(
-      *photo.image, {niqeBlockSize, niqe.blockColumns, niqe.blockRows, niqe.blockDistances},
-      "Quality of " + name, about, "Distance of each block from natural photos; lower is better");
+  return drawHeatMap(photo, {niqeBlockSize, niqe.blockColumns, niqe.blockRows, niqe.blockDistances},
+                     "Quality of " + name, about,
+                     "Distance of each block from natural photos; lower is better");
 }
 
 /// @param map        where the heat map goes; null for none.
 /// @param overwrite  whether it may replace a file.
-ScoredPhoto score(const Input& input, const photo::OpenOptions& options, const PlannedFile* map,
-                  bool overwrite, Talk& talk) {
-  const photo::Photo photo = loadPhoto(input, options, talk);
+ScoredPhoto score(const Input& input, const photo::OpenOptions& options,
+                  const photo::RowResources& resources, const PlannedFile* map, bool overwrite,
+                  Talk& talk) {
+  const std::vector<std::uint8_t> file = readInput(input);
+  photo::PhotoRows photo(file, options, resources);
+  const auto [width, height] = photo.size();
+  image_processing::RowSource& rows = photo.sweep(/*again=*/false);
+  const bool mapped = map != nullptr && !map->skipped;
+  std::optional<RowsToShow> shown;
+  if (mapped) shown.emplace(rows, photo.size());
+  ScoredPhoto scored = {width, height,
+                        image_processing::analyzeNiqe(width, height, mapped ? *shown : rows)};
   stopIfInterrupted();
-  ScoredPhoto scored = {photo.image->width, photo.image->height,
-                        image_processing::analyzeNiqe(*photo.image)};
-  stopIfInterrupted();
-  if (map != nullptr && !map->skipped && !scored.isTooSmall()) {
-    savePicture(map->output, heatMapOf(photo, input, scored), {}, drawing(overwrite));
-  }
+  if (mapped && !scored.isTooSmall())
+    savePicture(map->output, heatMapOf(shown->shown(), input, scored), {}, drawing(overwrite));
+  tellNotices(input, photo.facts(), talk);
   return scored;
 }
 
@@ -80,7 +89,7 @@ std::vector<PlannedFile> planMaps(const ScoreOptions& options, const std::vector
 ExitCode runScore(const ScoreOptions& options) {
   std::optional<float> limit;
   if (options.failAbove) limit = readFiniteNumber("--fail-above", *options.failAbove);
-  photo::OpenOptions photoOptions;
+  photo::OpenOptions photoOptions = {.faces = false, .stop = interruptToken()};
   photoOptions.raw = readRawSize(options.raw, options.inputs);
   const std::vector<Input> inputs = expandInputs(options.inputs);
   const std::vector<PlannedFile> maps = planMaps(options, inputs);
@@ -92,6 +101,7 @@ ExitCode runScore(const ScoreOptions& options) {
   }
   const OutputFolders folders(maps);
   ScoreOutput output(options.format, singleFile);
+  KeptPixels pixels(options.memory, options.jobs, inputs.size());
   std::size_t scored = 0, above = 0, mapsKept = 0;
   const auto report = [&](std::size_t index, const ScoredPhoto& photo) {
     const Input& input = inputs[index];
@@ -116,8 +126,8 @@ ExitCode runScore(const ScoreOptions& options) {
       inputs, options.jobs, talk,
       {.work =
            [&](std::size_t index) {
-             return score(inputs[index], photoOptions, maps.empty() ? nullptr : &maps[index],
-                          options.maps.overwrite, talk);
+             return score(inputs[index], photoOptions, pixels.resources(),
+                          maps.empty() ? nullptr : &maps[index], options.maps.overwrite, talk);
            },
        .done = report,
        .failed = [&](std::size_t index,
@@ -183,6 +193,7 @@ void addScore(CommandLine& commandLine) {
       .group("Output");
   addRawOption(verb, options->raw);
   addJobsOption(verb, options->jobs);
+  addMemoryOption(verb, options->memory);
   addReportOptions(verb, options->format.report);
   csv.excludes(verb.named("--json")).excludes(verb.named("--jsonl"));
 }

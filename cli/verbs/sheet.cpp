@@ -14,6 +14,7 @@
 #include "cli/frame/jobs_option.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/lone_files.h"
+#include "cli/frame/memory_option.h"
 #include "cli/frame/photo_files.h"
 #include "cli/frame/raw_option.h"
 #include "cli/pictures/canvas.h"
@@ -21,8 +22,7 @@
 #include "cli/pictures/sheet_painter.h"
 #include "cli/verbs/sheet_columns.h"
 #include "cli/verbs/verbs.h"
-#include "image_processing/filters/default_filter_factory.h"
-#include "image_processing/filters/filtered_image.h"
+#include "image_processing/filters/pass_through.h"
 #include "photo/area_average.h"
 #include "photo/turn.h"
 
@@ -33,7 +33,8 @@ using image_processing::RGBA8Pixel;
 
 namespace {
 
-using image_processing::defaultFilterConfigValue;
+using image_processing::ImageMetadata;
+using image_processing::PassThrough;
 
 struct SheetOptions {
   InputOptions inputs;
@@ -46,6 +47,7 @@ struct SheetOptions {
   std::uint32_t cell = 320;
   int quality = 90;
   int jobs = 0;
+  int memory = usualMemory;
 };
 
 /// What one photo contributes.
@@ -81,34 +83,57 @@ photo::PictureSize roomFor(const Input& input, const photo::OpenOptions& options
   }
 }
 
-SheetRow makeRow(const SheetWork& work, const Input& input, photo::PictureSize room, Talk& talk) {
-  photo::Photo photo = loadPhoto(input, work.photo, talk);
-  const photo::PictureSize size{photo.image->width, photo.image->height};
+/// A small picture of rows.
+class Thumbnail : public image_processing::RowSink {
+ public:
+  Thumbnail(photo::PictureSize picture, photo::PictureSize size)
+      : width_(picture.width), average_(picture, size) {}
+
+  void write(const RGBA8Pixel* rows, std::uint32_t count) override {
+    for (std::uint32_t i = 0; i < count; ++i) average_.addRow(rows + std::size_t{width_} * i);
+  }
+  const Image<RGBA8Pixel>& picture() const { return average_.result(); }
+
+ private:
+  std::uint32_t width_;
+  photo::AreaAverage average_;
+};
+
+Image<RGBA8Pixel> filteredThumbnail(photo::PhotoRows& photo, image_processing::RowFilter& filter,
+                                    photo::PictureSize size) {
+  const image_processing::RowWork work{.stop = interruptRequested};
+  if (filter.looksFirst()) filter.look(photo.sweep(/*again=*/true), work);
+  stopIfInterrupted();
+  Thumbnail thumbnail(photo.size(), size);
+  filter.filter(photo.sweep(/*again=*/true), thumbnail, work);
+  stopIfInterrupted();
+  return thumbnail.picture();
+}
+
+SheetRow makeRow(const SheetWork& work, const Input& input, const photo::RowResources& resources,
+                 photo::PictureSize room, Talk& talk) {
+  const std::vector<std::uint8_t> file = readInput(input);
+  photo::PhotoRows photo(file, work.photo, resources);
+  const photo::PictureSize size = photo.size();
   const photo::PictureSize small = photo::fitWithin(size, room);
   const std::string name = input.isStandardInput()
                                ? input.shownName()
                                : std::filesystem::path(input.path).filename().string();
   SheetRow row{fmt::format("{}  \xC2\xB7  {} \xC3\x97 {}", name, size.width, size.height), {}};
-  row.thumbnails.push_back(photo::areaAverage(*photo.image, small));
-  const image_processing::ImageMetadata faces =
-      metadataWithFaces(allFaces(work.faces.of(input), photo), size.width, size.height);
+  const ImageMetadata faces =
+      metadataWithFaces(allFaces(work.faces.of(input), photo.faces()), size.width, size.height);
+  const auto unfiltered = PassThrough::forRows({size.width, size.height});
+  row.thumbnails.push_back(filteredThumbnail(photo, *unfiltered, small));
   frameFaces(row.thumbnails.front(), faces, size);
-  const auto sessionWith = [&](const image_processing::ImageMetadata& metadata) {
-    return std::make_unique<image_processing::FilteredImage>(
-        photo.image, metadata, "", defaultFilterConfigValue,
-        image_processing::DefaultFilterFactory::filterFactory());
-  };
-  const auto session = sessionWith(faces);
-  std::unique_ptr<image_processing::FilteredImage> withoutFaces;  // made where it is wanted
-  Image<RGBA8Pixel> filtered(size.width, size.height);
   for (const SheetColumn& column : work.columns) {
-    stopIfInterrupted();
-    if (!column.faces && !withoutFaces) withoutFaces = sessionWith({});
-    (column.faces ? session : withoutFaces)
-        ->applyFilterWithParams(column.filter->name, column.params, defaultFilterConfigValue,
-                                filtered);
-    row.thumbnails.push_back(photo::areaAverage(filtered, small));
+    const auto filter =
+        column.filter->makeRowFilter({.width = size.width,
+                                      .height = size.height,
+                                      .metadata = column.faces ? faces : ImageMetadata{},
+                                      .params = column.params});
+    row.thumbnails.push_back(filteredThumbnail(photo, *filter, small));
   }
+  tellNotices(input, photo.facts(), talk);
   return row;
 }
 
@@ -131,6 +156,7 @@ ExitCode runSheet(const SheetOptions& options) {
   if (work.faces.areNamed() && !facesMatter)
     throw UsageError("--face: has no effect on these looks");
   work.photo.faces = work.faces.asksPhoto();
+  work.photo.stop = interruptToken();
   work.photo.raw = readRawSize(options.raw, options.inputs);
   const std::string& output = options.outputs.output;
   requireFormatOf(output, /*raw=*/false);
@@ -165,11 +191,13 @@ ExitCode runSheet(const SheetOptions& options) {
   };
   add(painter.heading());
   Json rows = Json::array();
+  KeptPixels pixels(options.memory, options.jobs, inputs.size());
   const PhotoTally tally = eachPhoto<SheetRow>(
       inputs, options.jobs, talk,
       {.work =
            [&](std::size_t index) {
-             return makeRow(work, inputs[index], painter.thumbnailSize(index), talk);
+             return makeRow(work, inputs[index], pixels.resources(), painter.thumbnailSize(index),
+                            talk);
            },
        .done =
            [&](std::size_t index, const SheetRow& row) {
@@ -224,6 +252,7 @@ void addSheet(CommandLine& commandLine) {
   addQualityOption(verb, options->quality);
   addRawOption(verb, options->raw);
   addJobsOption(verb, options->jobs);
+  addMemoryOption(verb, options->memory);
   addReportOptions(verb, options->report);
 }
 

@@ -54,23 +54,6 @@ class RecentRows {
   std::uint32_t read_ = 0;
 };
 
-/// Looks at rows while the next ones come.
-std::optional<ImageStatistics> analyseAsTheyCome(const AnalysisSubject& subject, RowSource& rows,
-                                                 const RowWork& work) {
-  PhotoAnalysis found(subject);
-  RowBands bands(subject.width, subject.height, work, 2);
-  const Stage read = {1, [&](std::int64_t band, std::size_t) { bands.read(band, rows); }};
-  const Stage look = {1, [&](std::int64_t band, std::size_t) {
-                        const RGBA8Pixel* row = bands.pixels(band);
-                        const std::uint32_t first = bands.first(band);
-                        const std::uint32_t end = first + bands.rows(band);
-                        for (std::uint32_t y = first; y < end; ++y, row += subject.width)
-                          found.addRow(y, row);
-                      }};
-  if (!runStages(bands.count(), {read, look}, work.workers, work.stop)) return std::nullopt;
-  return found.statistics();
-}
-
 template <typename Mask>
 class EnhanceRows : public RowFilter {
  public:
@@ -93,10 +76,7 @@ class EnhanceRows : public RowFilter {
       subject.cellSize = cellSize_ = gridCellSize(spatialExtent(width_, height_, config_));
       subject.grid = &grid_.emplace(makeGrid(width_, height_, cellSize_));
     }
-    const RGBA8Pixel* const photo = rows.standing();
-    const std::optional<ImageStatistics> statistics =
-        photo != nullptr ? analysePhoto(subject, photo, work.workers, work.bandHeight, work.stop)
-                         : analyseAsTheyCome(subject, rows, work);
+    const std::optional<ImageStatistics> statistics = analysePhoto(subject, rows, work);
     if (!statistics) return false;
     statistics_ = *statistics;
     if (grid_) blur(*grid_, config_.bilateralRange, work.workers);

@@ -3,6 +3,8 @@
 #include <atomic>
 #include <vector>
 
+#include "image_processing/filters/row_bands.h"
+
 namespace pelorin::image_processing {
 namespace {
 
@@ -70,6 +72,24 @@ std::optional<ImageStatistics> analysePhoto(const AnalysisSubject& subject,
   if (stopped) return std::nullopt;
   for (std::size_t i = 1; i < parts; ++i) found[0]->add(*found[i]);
   return found[0]->statistics();
+}
+
+std::optional<ImageStatistics> analysePhoto(const AnalysisSubject& subject, RowSource& rows,
+                                            const RowWork& work) {
+  if (const RGBA8Pixel* const pixels = rows.standing())
+    return analysePhoto(subject, pixels, work.workers, work.bandHeight, work.stop);
+  PhotoAnalysis found(subject);
+  RowBands bands(subject.width, subject.height, work, 2);
+  const Stage read = {1, [&](std::int64_t band, std::size_t) { bands.read(band, rows); }};
+  const Stage look = {1, [&](std::int64_t band, std::size_t) {
+                        const RGBA8Pixel* row = bands.pixels(band);
+                        const std::uint32_t first = bands.first(band);
+                        const std::uint32_t end = first + bands.rows(band);
+                        for (std::uint32_t y = first; y < end; ++y, row += subject.width)
+                          found.addRow(y, row);
+                      }};
+  if (!runStages(bands.count(), {read, look}, work.workers, work.stop)) return std::nullopt;
+  return found.statistics();
 }
 
 ImageStatistics analysePhoto(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,

@@ -13,7 +13,9 @@
 #include "image_processing/core/image.h"
 #include "image_processing/core/image_metadata.h"
 #include "image_processing/core/pixel_types.h"
+#include "image_processing/core/rows.h"
 #include "image_processing/core/workers.h"
+#include "image_processing/filters/row_filter.h"
 
 namespace pelorin::image_processing {
 
@@ -58,6 +60,12 @@ std::optional<ImageStatistics> analysePhoto(const AnalysisSubject& subject,
                                             const RGBA8Pixel* pixels, Workers* workers,
                                             std::uint32_t bandHeight = 16,
                                             const std::function<bool()>& stop = {});
+
+/// Looks at all rows of a photo, at those that come one by one while the next ones do.
+/// @returns nothing when it gave up as `work.stop` said; the grid is then useless.
+/// @throws what the source throws; std::bad_alloc.
+std::optional<ImageStatistics> analysePhoto(const AnalysisSubject& subject, RowSource& rows,
+                                            const RowWork& work);
 
 /// The statistics of a photo in memory. @throws std::bad_alloc.
 ImageStatistics analysePhoto(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,

@@ -31,19 +31,29 @@ void count(const RGBA8Pixel* pixels, std::size_t pixelCount, Counts& counts) {
 
 }  // namespace
 
-void computeGreenCDF(const Image<RGBA8Pixel>& image, GreenCDF& cdf) {
-  std::array<std::uint64_t, 256> total{};
-  const std::size_t pixelCount = image.pixelCount();
+void GreenCounter::add(const RGBA8Pixel* pixels, std::size_t pixelCount) {
   for (std::size_t first = 0; first < pixelCount; first += pixelsPerBlock) {
     Counts counts{};
-    count(image.data.get() + first, std::min(pixelsPerBlock, pixelCount - first), counts);
+    count(pixels + first, std::min(pixelsPerBlock, pixelCount - first), counts);
     for (const Histogram& way : counts) {
-      for (std::size_t i = 0; i < total.size(); ++i) total[i] += way[i];
+      for (std::size_t i = 0; i < counts_.size(); ++i) counts_[i] += way[i];
     }
   }
+  pixels_ += pixelCount;
+}
+
+GreenCDF GreenCounter::cdf() const {
   std::array<float, 256> histogram;
-  std::transform(total.begin(), total.end(), histogram.begin(), asFloatCounter);
-  computeCDFFromCounts(histogram, asFloatCounter(pixelCount), cdf);
+  std::transform(counts_.begin(), counts_.end(), histogram.begin(), asFloatCounter);
+  GreenCDF cdf;
+  computeCDFFromCounts(histogram, asFloatCounter(pixels_), cdf);
+  return cdf;
+}
+
+void computeGreenCDF(const Image<RGBA8Pixel>& image, GreenCDF& cdf) {
+  GreenCounter counter;
+  counter.add(image.data.get(), image.pixelCount());
+  cdf = counter.cdf();
 }
 
 }  // namespace pelorin::image_processing

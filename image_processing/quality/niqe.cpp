@@ -2,6 +2,7 @@
 
 #include <limits>
 
+#include "image_processing/core/picture_rows.h"
 #include "image_processing/quality/niqe_features.h"
 #include "image_processing/quality/quality_score.h"
 
@@ -32,9 +33,22 @@ float niqeMetric(Image<RGBA8Pixel>& image) {
 }
 
 NiqeAnalysis analyzeNiqe(const Image<RGBA8Pixel>& image) {
-  if (!isScorable(image)) return {nan, 0, 0, {}, Image<float>(0, 0), {}};
-  NiqeAnalysis analysis = {nan, image.width / niqeBlockSize, image.height / niqeBlockSize,
-                           {},  niqeFeatures(image),         {}};
+  PictureSource rows(image);
+  return analyzeNiqe(image.width, image.height, rows);
+}
+
+NiqeAnalysis analyzeNiqe(std::uint32_t width, std::uint32_t height, RowSource& rows) {
+  if (!isScorable(width, height)) {
+    const Image<RGBA8Pixel> room(width, 1);
+    for (std::uint32_t y = 0; y < height; ++y) rows.next(1, room.data.get());
+    return {nan, 0, 0, {}, Image<float>(0, 0), {}};
+  }
+  NiqeAnalysis analysis = {nan,
+                           width / niqeBlockSize,
+                           height / niqeBlockSize,
+                           {},
+                           niqeFeaturesOfRows(width, height, rows),
+                           {}};
   mean(analysis.blockFeatures, analysis.meanFeatures);
   analysis.score = computeQuality(analysis.meanFeatures);
   analysis.blockDistances = scoreBlocks(analysis.blockFeatures);

@@ -5,6 +5,7 @@
 
 #include "image_processing/core/export.h"
 #include "image_processing/core/image.h"
+#include "image_processing/core/rows.h"
 
 namespace pelorin::image_processing {
 
@@ -37,5 +38,10 @@ struct NiqeAnalysis {
 
 /// @throws std::bad_alloc.
 NiqeAnalysis analyzeNiqe(const Image<RGBA8Pixel>& image);
+
+/// The same of a picture that comes as rows, of which about a hundred are held. All are read, even
+/// if it is too small.
+/// @throws what the source throws as well.
+NiqeAnalysis analyzeNiqe(std::uint32_t width, std::uint32_t height, RowSource& rows);
 
 }  // namespace pelorin::image_processing

@@ -2,12 +2,23 @@
 
 #include <sys/stat.h>
 
+#include <algorithm>
 #include <ctime>
 #include <utility>
 
 #include "photo/photo.h"
 
 namespace pelorin::photo {
+
+using image_processing::GreenCounter;
+using image_processing::Image;
+using image_processing::RGBA8Pixel;
+
+namespace {
+
+constexpr std::uint32_t rowsAtOnce = 64;
+
+}  // namespace
 
 int scaleFor(std::uint32_t width, std::uint32_t height) {
   // One of so many pixels moves the distribution by less than a fiftieth of what a photo's
@@ -22,11 +33,18 @@ PhotoRecord readPhotoRecord(std::span<const std::uint8_t> file, int scale, std::
                             const DecodeLimits& limits) {
   const PhotoFacts facts = readFacts(file);
   if (scale == automaticScale) scale = scaleFor(facts.width, facts.height);
-  PhotoRecord record{facts.width, facts.height, facts.orientation, facts.captureTime, {}};
-  const Photo photo =
-      open(file, {.scale = scale, .upright = false, .limits = limits, .stop = std::move(stop)});
-  computeGreenCDF(*photo.image, record.cdf);
-  return record;
+  const std::unique_ptr<RowReader> rows =
+      openRows(file, {.scale = scale, .limits = limits, .stop = std::move(stop)});
+  const auto [width, height] = rows->size();
+  const Image<RGBA8Pixel> band(width, std::min(height, rowsAtOnce));
+  GreenCounter counter;
+  for (std::uint32_t y = 0; y < height;) {
+    const std::uint32_t count = std::min(height - y, rowsAtOnce);
+    rows->read(band.data.get(), count);
+    counter.add(band.data.get(), std::size_t{width} * count);
+    y += count;
+  }
+  return {facts.width, facts.height, facts.orientation, facts.captureTime, counter.cdf()};
 }
 
 std::optional<FileStamp> stampOf(const std::string& path) {

@@ -5,7 +5,6 @@
 #include <utility>
 
 #include "image_processing/quality/niqe.h"
-#include "photo/photo.h"
 
 namespace pelorin::photo {
 
@@ -22,8 +21,11 @@ std::vector<std::size_t> photosToScore(const std::vector<DupeGroup>& groups,
   return needed;
 }
 
-float scoreOf(std::span<const std::uint8_t> file, std::stop_token stop) {
-  return image_processing::niqeMetric(*open(file, {.stop = std::move(stop)}).image);
+float scoreOf(std::span<const std::uint8_t> file, std::stop_token stop,
+              const RowResources& resources) {
+  PhotoRows photo(file, {.faces = false, .stop = std::move(stop)}, resources);
+  const auto [width, height] = photo.size();
+  return image_processing::analyzeNiqe(width, height, photo.sweep(/*again=*/false)).score;
 }
 
 }  // namespace pelorin::photo

@@ -37,6 +37,14 @@ TEST(GreenCDF, HoldsTheShareOfPixelsAtOrBelowEachGreen) {
   EXPECT_EQ(cdf[255], 1.0f);
 }
 
+TEST(GreenCounter, CountsPiecesAsTheWhole) {
+  const Image<RGBA8Pixel> image = photoLikePicture(131, 57, 4);
+  GreenCounter counter;
+  for (std::uint32_t y = 0; y < image.height; ++y) counter.add(image.row(y), image.width);
+  EXPECT_EQ(counter.cdf(), cdfOf(image));
+  EXPECT_EQ(GreenCounter().cdf(), GreenCDF{});
+}
+
 TEST(GreenCDF, IsAllZeroForAnEmptyImage) {
   const GreenCDF zeros{};
   for (const auto& [width, height] : {std::pair{0u, 5u}, {5u, 0u}, {0u, 0u}}) {

@@ -27,7 +27,7 @@ std::string parametersOf(const std::string& filter) {
   return filter.starts_with("AE") ? "slider=0.7;" : "";
 }
 
-std::vector<FilterResources> ways() {
+std::vector<RowResources> ways() {
   constexpr std::uint64_t all = std::uint64_t{1} << 30;
   return {{.pixels = 0},
           {.pixels = all},
@@ -45,7 +45,7 @@ void expectSameFiles(const Bytes& file, const std::string& what) {
       request.open.scale = scale;
       for (const Format& format : formats()) {
         const Bytes expected = byPicture(file, request, &format);
-        for (const FilterResources& resources : ways()) {
+        for (const RowResources& resources : ways()) {
           EXPECT_EQ(filterPhoto(file, request, &format, resources).file, expected)
               << what << ", " << filter << " at 1/" << scale << " to " << format.name << ", "
               << resources.pixels << " bytes kept, " << tasksFor(resources.workers) << " threads";
@@ -82,7 +82,7 @@ TEST(FilterPhoto, HasNoFileOfADamagedPhoto) {
   file.resize(file.size() * 2 / 3);
   for (const char* filter : {"AE0", "WinterRGB"}) {
     const FilterRequest request{.filter = filter, .params = parametersOf(filter)};
-    for (const FilterResources& resources : ways())
+    for (const RowResources& resources : ways())
       EXPECT_THROW(filterPhoto(file, request, nullptr, resources), PhotoError);
   }
 }

@@ -23,7 +23,7 @@ inline Bytes byPicture(const Bytes& file, const photo::FilterRequest& request,
   if (format == nullptr) format = photo::formatNamed(photo.facts.format);
   FilteredImage session(
       photo.image,
-      photo::metadataWithFaces(photo::allFaces(request.faces, photo), photo.image->width,
+      photo::metadataWithFaces(photo::allFaces(request.faces, photo.faces), photo.image->width,
                                photo.image->height, request.open.scale),
       "", defaultFilterConfigValue, DefaultFilterFactory::filterFactory());
   Image<RGBA8Pixel> output(photo.image->width, photo.image->height);

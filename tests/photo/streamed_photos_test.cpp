@@ -99,8 +99,8 @@ TEST(StreamedPhotos, AreTheFilesOfWholePictures) {
     const RandomPhoto photo(seed);
     const Bytes expected = byPicture(photo.file, photo.request);
     for (const std::size_t i : {seed % 4, (seed / 4 + 1) % 4}) {
-      const FilterResources resources{.pixels = (seed + i) % 3 == 0 ? 0 : std::uint64_t{1} << 30,
-                                      .workers = counts[i] == 1 ? nullptr : &threads(counts[i])};
+      const RowResources resources{.pixels = (seed + i) % 3 == 0 ? 0 : std::uint64_t{1} << 30,
+                                   .workers = counts[i] == 1 ? nullptr : &threads(counts[i])};
       ASSERT_EQ(filterPhoto(photo.file, photo.request, nullptr, resources).file, expected)
           << photo.what << ", " << counts[i] << " threads";
     }

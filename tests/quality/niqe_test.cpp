@@ -134,6 +134,32 @@ TEST(Niqe, FeaturesMatchTheirDefinitionByteForByteOnEveryInstructionSet) {
   }
 }
 
+/// Rows that stand nowhere before they are asked for.
+class ComingRows : public RowSource {
+ public:
+  explicit ComingRows(const Image<RGBA8Pixel>& picture) : picture_(picture) {}
+  const RGBA8Pixel* next(std::uint32_t count, RGBA8Pixel* room) override {
+    std::copy_n(picture_.row(read_), std::size_t{picture_.width} * count, room);
+    read_ += count;
+    return room;
+  }
+  bool allRead() const { return read_ == picture_.height; }
+
+ private:
+  const Image<RGBA8Pixel>& picture_;
+  std::uint32_t read_ = 0;
+};
+
+TEST(NiqeAnalysis, IsTheSameOfRowsThatComeAndReadsThemAll) {
+  for (const std::uint32_t height : {95u, 96u, 101u, 102u, 103u, 191u, 192u, 198u, 300u, 389u}) {
+    const Image<RGBA8Pixel> picture = photoLikePicture(113, height, height);
+    ComingRows rows(picture);
+    const NiqeAnalysis analysis = analyzeNiqe(picture.width, height, rows);
+    EXPECT_TRUE(rows.allRead()) << height;
+    EXPECT_TRUE(sameFeatures(analysis.blockFeatures, analyzeNiqe(picture).blockFeatures)) << height;
+  }
+}
+
 TEST(NiqeAnalysis, TellsWhatTheScoreIsMadeOf) {
   Image<RGBA8Pixel> picture = photoLikePicture(310, 205, 5);
   const NiqeAnalysis analysis = analyzeNiqe(picture);

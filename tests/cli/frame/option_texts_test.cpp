@@ -10,6 +10,7 @@
 #include "cli/frame/nearest_name.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/raw_option.h"
+#include "photo/photo_error.h"
 
 namespace pelorin::cli {
 namespace {

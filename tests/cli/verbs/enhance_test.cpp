@@ -153,6 +153,17 @@ TEST(Enhance, DecodesAgainWhatDoesNotFitIntoMemory) {
   const Finished again = shell(command + "0");
   EXPECT_EQ(again.exitCode, 0) << again.errors;
   EXPECT_EQ(folder.read("out.jpg"), expected);
+
+  // Nor do verbs hold it that look at photos.
+  for (const std::string verb :
+       {"info", "score", "keypoints", "sheet --memory 0 --sliders 0.4 -o sheet.jpg"}) {
+    const std::string call = "\"$QUENBY\" " + verb + " in.jpg; ";
+    const Finished unlimited = shell("cd '" + (folder / "") + "'; " + call);
+    const Finished limited =
+        shell("cd '" + (folder / "") + "'; rm -f sheet.jpg; ulimit -v 73728; " + call);
+    EXPECT_EQ(limited.exitCode, 0) << verb << limited.errors;
+    EXPECT_EQ(limited.output, unlimited.output) << verb;
+  }
 }
 
 TEST(Enhance, ReportsAsJson) {
