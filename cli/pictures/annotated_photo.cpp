@@ -117,8 +117,11 @@ AnnotatedPhoto::Photo AnnotatedPhoto::withScale(const ColourScale& scale,
   constexpr double width = narrowest;
   const double baseline = top_ + shownHeight_ + 26, barTop = baseline + 10, barHeight = 14;
   drawText(c, label, margin, baseline, labelStyle);
-  const std::unique_ptr<cairo_pattern_t, decltype(&cairo_pattern_destroy)> colours(
-      cairo_pattern_create_linear(margin, 0, margin + width, 0), cairo_pattern_destroy);
+  struct Destroy {
+    void operator()(cairo_pattern_t* pattern) const { cairo_pattern_destroy(pattern); }
+  };
+  const std::unique_ptr<cairo_pattern_t, Destroy> colours(
+      cairo_pattern_create_linear(margin, 0, margin + width, 0));
   constexpr int steps = 64;
   for (int i = 0; i <= steps; ++i) {
     const double share = static_cast<double>(i) / steps;

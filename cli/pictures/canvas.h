@@ -1,10 +1,9 @@
 #pragma once
 
-#include <cairo.h>
-
 #include <cstdint>
 #include <memory>
 
+#include "cli/pictures/cairo.h"
 #include "image_processing/core/image.h"
 
 namespace pelorin::cli {

@@ -1,7 +1,5 @@
 #pragma once
 
-#include <cairo.h>
-
 #include <string>
 #include <string_view>
 
