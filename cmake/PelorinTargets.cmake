@@ -44,12 +44,35 @@ function(pelorin_limit_stack)
   endif()
 endfunction()
 
+# pelorin_runtime(<variable> <library>): where the compiler has a library of its own.
+function(pelorin_runtime variable library)
+  execute_process(COMMAND ${CMAKE_CXX_COMPILER} -print-file-name=${library}
+                  OUTPUT_VARIABLE path OUTPUT_STRIP_TRAILING_WHITESPACE)
+  set(${variable} ${path} PARENT_SCOPE)
+endfunction()
+
 # A sanitizer that only prints would let a test pass.
 if(PELORIN_SANITIZE)
   add_compile_options(-fsanitize=${PELORIN_SANITIZE} -fno-omit-frame-pointer
                       -fno-sanitize-recover=all)
   add_link_options(-fsanitize=${PELORIN_SANITIZE})
+  set(PELORIN_ASAN_RUNTIME libasan.so)
+  if(CMAKE_CXX_COMPILER_ID MATCHES Clang AND PELORIN_SANITIZE MATCHES address)
+    # As a library, since a virtual machine must load it before ours.
+    set(PELORIN_ASAN_RUNTIME libclang_rt.asan-${CMAKE_SYSTEM_PROCESSOR}.so)
+    pelorin_runtime(runtime ${PELORIN_ASAN_RUNTIME})
+    cmake_path(GET runtime PARENT_PATH runtime)
+    add_link_options(-shared-libasan -Wl,-rpath,${runtime})
+  endif()
 endif()
+
+# Kernels that are one expression over many vectors, each of which sanitizers make clang's optimiser
+# follow through memory: it takes minutes for them.
+function(pelorin_compile_plainly)
+  if(PELORIN_SANITIZE AND CMAKE_CXX_COMPILER_ID MATCHES Clang)
+    set_source_files_properties(${ARGN} PROPERTIES COMPILE_OPTIONS -O0 SKIP_PRECOMPILE_HEADERS ON)
+  endif()
+endfunction()
 
 # pelorin_library(<name> SOURCES ... [DEPENDS ...] [PRIVATE ...]): the library pelorin_<name> of one
 # folder; PRIVATE is what only its sources include. Folders that set PELORIN_INSTALLED_LIBRARIES have
@@ -71,6 +94,9 @@ function(pelorin_library name)
                      $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}/quenby>)
   target_compile_features(${target} PUBLIC cxx_std_20)
   target_link_libraries(${target} PUBLIC ${arg_DEPENDS} PRIVATE ${arg_PRIVATE})
+  if(TARGET pelorin_library_headers)
+    target_precompile_headers(${target} REUSE_FROM pelorin_library_headers)
+  endif()
 endfunction()
 
 # For code that is compiled far more often than it runs. Sanitizers triple what an optimiser costs on
@@ -81,7 +107,27 @@ function(pelorin_compile_quickly target)
     set(level -O0)
   endif()
   target_compile_options(${target} PRIVATE $<$<CONFIG:Release>:${level}>)
+  get_target_property(headers ${target} PRECOMPILE_HEADERS_REUSE_FROM)
+  if(headers) # which were compiled with the optimiser
+    set_target_properties(${target} PROPERTIES PRECOMPILE_HEADERS_REUSE_FROM
+                                               pelorin_quick_library_headers)
+  endif()
 endfunction()
+
+# What the libraries' files begin with, compiled once: reading the C++ library is half of what most of
+# them cost. Not in other projects, where every file shows that it includes what it uses, nor in shared
+# libraries, which see symbols otherwise.
+if(PROJECT_IS_TOP_LEVEL AND NOT BUILD_SHARED_LIBS)
+  file(CONFIGURE OUTPUT library_headers.cpp CONTENT "")
+  foreach(headers pelorin_library_headers pelorin_quick_library_headers)
+    add_library(${headers} OBJECT EXCLUDE_FROM_ALL ${PROJECT_BINARY_DIR}/library_headers.cpp)
+    target_compile_features(${headers} PRIVATE cxx_std_20)
+    target_precompile_headers(
+      ${headers} PRIVATE <algorithm> <array> <cmath> <cstdint> <cstring> <filesystem> <functional>
+      <map> <memory> <optional> <span> <stdexcept> <string> <string_view> <vector>)
+  endforeach()
+  pelorin_compile_quickly(pelorin_quick_library_headers)
+endif()
 
 function(pelorin_compile_as_test target)
   pelorin_compile_quickly(${target})
@@ -96,15 +142,50 @@ function(pelorin_place_beside_each_other target)
                          INSTALL_RPATH $ORIGIN BUILD_WITH_INSTALL_RPATH ON)
   target_link_options(${target} PRIVATE -Wl,-z,max-page-size=16384)
   if(PELORIN_SELF_CONTAINED)
-    # What is linked in is nobody else's: two copies in one process must not mix. The C++ library is
-    # not among it, since exceptions cross from one of the libraries into another.
-    if(NOT ANDROID)
-      target_sources(${target} PRIVATE $<TARGET_OBJECTS:pelorin_older_glibc>)
-    endif()
-    target_link_options(
-      ${target} PRIVATE -Wl,--gc-sections -Wl,--strip-all
-                        -Wl,--exclude-libs,libfmt.a:libhwy.a:libjpeg.a:liblcms2.a:libpng16.a:libpugixml.a:libz.a)
+    pelorin_hold_everything(${target})
+  elseif(PELORIN_STATIC_LIBRARIES)
+    pelorin_link_self_contained(${target})
   endif()
+endfunction()
+
+# What is linked in is nobody else's: two copies in one process must not mix. The C++ library is not
+# among it, since exceptions cross from one of the libraries into another.
+set(PELORIN_LINKED_IN fmt hwy jpeg lcms2 png16 pugixml z)
+function(pelorin_hold_everything target)
+  if(NOT ANDROID)
+    target_sources(${target} PRIVATE $<TARGET_OBJECTS:pelorin_older_glibc>)
+  endif()
+  list(TRANSFORM PELORIN_LINKED_IN REPLACE "(.+)" "lib\\1.a" OUTPUT_VARIABLE archives)
+  list(JOIN archives ":" archives)
+  target_link_options(${target} PRIVATE -Wl,--gc-sections -Wl,--strip-all -Wl,--exclude-libs,${archives})
+endfunction()
+
+# The same objects once more, with static libraries in place of the machine's: for jars and wheels.
+function(pelorin_link_self_contained target)
+  set(twin ${target}_self_contained)
+  add_library(${twin} SHARED EXCLUDE_FROM_ALL $<TARGET_OBJECTS:${target}>)
+  foreach(property OUTPUT_NAME VERSION SOVERSION LINK_LIBRARIES LINK_OPTIONS LINK_LIBRARY_OVERRIDE
+                   LINK_DEPENDS INSTALL_RPATH BUILD_WITH_INSTALL_RPATH)
+    get_target_property(value ${target} ${property})
+    if(NOT value STREQUAL "value-NOTFOUND")
+      set_property(TARGET ${twin} PROPERTY ${property} ${value})
+    endif()
+  endforeach()
+  get_target_property(name ${twin} OUTPUT_NAME)
+  if(NOT name)
+    set_property(TARGET ${twin} PROPERTY OUTPUT_NAME ${target})
+  endif()
+  set_target_properties(${twin} PROPERTIES LINKER_LANGUAGE CXX
+                                           LIBRARY_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/self_contained)
+  # Before everything else, so that the machine's libraries are not needed.
+  set(archives ${PELORIN_LINKED_IN})
+  list(TRANSFORM archives REPLACE "(.+)" "${PELORIN_STATIC_LIBRARIES}/lib/lib\\1.a")
+  set_property(TARGET ${twin} APPEND PROPERTY LINK_DEPENDS ${archives})
+  list(JOIN archives "," archives)
+  target_link_options(${twin} BEFORE PRIVATE LINKER:--as-needed
+                      LINKER:--whole-archive,${archives},--no-whole-archive)
+  pelorin_hold_everything(${twin})
+  add_dependencies(self_contained ${twin})
 endfunction()
 
 # The longest tests start first: begun last, one of them would run alone.

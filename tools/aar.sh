@@ -12,28 +12,28 @@ contents=$root/build/aar/contents
 
 rm -rf "$root/build/aar"
 mkdir -p "$contents/META-INF/licences"
-add_natives() { # ABI PRESET
+add_natives() { # ABI LIBRARIES STATIC LIBRARIES
   mkdir -p "$contents/jni/$1"
   local name
   # The bitmaps are the platform's.
   for name in libpn libpnjni libpn_imgproc libpn_quenby libquenby_photo; do
-    cp "$root/build/$2/lib/$name.so" "$contents/jni/$1/"
+    cp "$root/build/$2/$name.so" "$contents/jni/$1/"
   done
-  cp "$root/build/static/$2/share/licences"/* "$contents/META-INF/licences/"
+  cp "$root/build/static/$3/share/licences"/* "$contents/META-INF/licences/"
 }
 if [ -n "${ANDROID_NDK-}" ]; then
   aar=$root/build/aar/quenby-$version.aar
   for abi in arm64-v8a armeabi-v7a x86_64; do
-    add_natives $abi android-$abi
+    add_natives $abi android-$abi/lib android-$abi
     shared=$(sed -n 's/^CMAKE_CXX_COMPILER_TARGET:.*=//p' "$root/build/android-$abi/CMakeCache.txt")
     cp "$ANDROID_NDK"/toolchains/llvm/prebuilt/*/sysroot/usr/lib/"$shared"/libc++_shared.so \
       "$contents/jni/$abi/"
   done
 else
   aar=$root/build/aar/quenby-$version-glibc.aar
-  add_natives arm64-v8a arm64
-  add_natives armeabi-v7a armhf
-  add_natives x86_64 amd64
+  add_natives arm64-v8a arm64/lib arm64
+  add_natives armeabi-v7a armhf/lib armhf
+  add_natives x86_64 release/self_contained amd64
 fi
 
 cat >"$contents/AndroidManifest.xml" <<XML

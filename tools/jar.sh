@@ -10,16 +10,16 @@ root=$(cd "$(dirname "${BASH_SOURCE[0]}")/.." && pwd)
 contents=$root/build/jar/contents
 
 rm -rf "$contents"
-add_natives() { # FOLDER PRESET
+add_natives() { # FOLDER LIBRARIES
   mkdir -p "$contents/native/$1"
   local name
   for name in libpn libpnjni libpn_imgproc libjnigraphics libpn_quenby libquenby_photo; do
-    cp "$root/build/$2/lib/$name.so" "$contents/native/$1/"
+    cp "$root/build/$2/$name.so" "$contents/native/$1/"
   done
 }
-add_natives linux-amd64 amd64
-add_natives linux-aarch64 arm64
-add_natives linux-arm armhf
+add_natives linux-amd64 release/self_contained
+add_natives linux-aarch64 arm64/lib
+add_natives linux-arm armhf/lib
 mkdir -p "$contents/META-INF/licences"
 cp "$root"/build/static/amd64/share/licences/* "$contents/META-INF/licences/"
 

@@ -70,7 +70,13 @@ repository=$scratch/repository
 mkdir -p "$repository"
 cp -rs "$HOME/.m2/repository/." "$repository"
 rm -rf "$repository/com/pelorin"
-"$root/tools/jar.sh" -Dmaven.repo.local="$repository" install
+installed=$repository/com/pelorin/photos
+for name in quenby-parent quenby quenby-desktop; do
+  folder=$installed/$name/$version
+  mkdir -p "$folder"
+  [ $name = quenby-parent ] || cp "$root/build/jar/$name/$name-$version.jar" "$folder"
+  cp "$root/java/${name#quenby-parent}/pom.xml" "$folder/$name-$version.pom"
+done
 mkdir "$scratch/sources"
 cp "$root/java/example/src/main/java/SlideAndSave.java" "$here/project/PhotosAndBytes.java" \
   "$scratch/sources"
@@ -90,7 +96,6 @@ same() {
   [ "$(find "$scratch/made/$1" -size +0 | wc -l)" -eq 7 ] || fail "files are missing of $1"
   diff -r "$scratch/made/$1" "$scratch/made/$2"
 }
-installed=$repository/com/pelorin/photos
 classpath=$scratch/project/classes:$installed/quenby/$version/quenby-$version.jar
 classpath=$classpath:$installed/quenby-desktop/$version/quenby-desktop-$version.jar
 make jar "$classpath"

@@ -6,6 +6,8 @@
 #include <cstdlib>
 #include <new>
 
+#include "tests/support/slow_build.h"
+
 namespace pelorin::test_support {
 namespace {
 
@@ -58,7 +60,7 @@ using pelorin::test_support::counted;
 using pelorin::test_support::mayAllocate;
 using pelorin::test_support::uncount;
 
-#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
+#if defined(PELORIN_SANITIZED)
 
 void* operator new(std::size_t size) {
   void* const block = mayAllocate() ? counted(std::malloc(size)) : nullptr;
