@@ -4,6 +4,13 @@
 #include <exception>
 #include <mutex>
 
+#include "photo/thread_workers.h"
+
+struct quenby_threads {
+  explicit quenby_threads(std::size_t count) : workers(count) {}
+  pelorin::photo::ThreadWorkers workers;
+};
+
 namespace pelorin::c_api {
 namespace {
 
@@ -27,6 +34,15 @@ extern "C" void runOne(void* state, std::size_t index) {
   }
 }
 
+extern "C" void runOnThreads(void* context, std::size_t tasks,
+                             void (*task)(void* state, std::size_t index), void* state) {
+  try {
+    static_cast<quenby_threads*>(context)->workers.run(
+        tasks, [task, state](std::size_t index) { task(state, index); });
+  } catch (...) {  // no memory to begin with; that tasks were left out, the caller will see
+  }
+}
+
 }  // namespace
 
 CallersWorkers::CallersWorkers(const quenby_workers& workers)
@@ -44,3 +60,28 @@ void CallersWorkers::run(std::size_t count, const Task& task) {
 }
 
 }  // namespace pelorin::c_api
+
+using namespace pelorin::c_api;
+
+int32_t quenby_threads_new(size_t count, quenby_threads** threads, quenby_error* error) {
+  return guarded(error, [&] {
+    required(threads, "threads") = nullptr;
+    if (count > 1024) refuse("count", "is not 0 to 1024");
+    *threads = new quenby_threads(count);
+  });
+}
+
+int32_t quenby_threads_lend(quenby_threads* threads, quenby_workers* workers, quenby_error* error) {
+  return guarded(error, [&] {
+    required(threads, "threads");
+    quenby_workers lent{};
+    lent.count = threads->workers.count();
+    lent.context = threads;
+    lent.run = runOnThreads;
+    give(workers, lent, "workers");
+  });
+}
+
+void quenby_threads_free(quenby_threads* threads) {
+  delete threads;
+}

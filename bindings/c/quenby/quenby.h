@@ -6,8 +6,8 @@
  * objects are null and counts 0. Null where nothing says that it may be is QUENBY_INVALID_ARGUMENT, as
  * is whatever else a function cannot mean; every function may also end with QUENBY_OUT_OF_MEMORY.
  *
- * Threads. Nothing here keeps state outside of its objects or starts a thread: a call does its work on
- * the thread that calls, and on those that the caller lends it (quenby_workers). Functions that take an
+ * Threads. Nothing here keeps state outside of its objects or starts a thread, but for quenby_threads_new:
+ * a call does its work on the thread that calls, and on those that the caller lends it (quenby_workers). Functions that take an
  * object as const, and quenby_session_apply, may be called by any number of threads at once; objects are
  * freed when no call uses them any more.
  *
@@ -98,6 +98,23 @@ typedef struct quenby_workers {
    * once as well; tasks do not. */
   void (*run)(void* context, size_t tasks, void (*task)(void* state, size_t index), void* state);
 } quenby_workers;
+
+/** Threads that sleep until they are lent work. */
+typedef struct quenby_threads quenby_threads;
+
+/** Starts threads to lend.
+ * @param count    0 ... 1024: how many tasks they do at the same time with the thread that calls, so that
+ *                 one fewer is started; 0 for as many as the process has cores.
+ * @param threads  receives the object; it outlives what is lent it. */
+QUENBY_API int32_t quenby_threads_new(size_t count, quenby_threads** threads, quenby_error* error);
+
+/** Workers that are these threads, for any number of calls at once.
+ * @param workers  its struct_size set; the rest is written. */
+QUENBY_API int32_t quenby_threads_lend(quenby_threads* threads, quenby_workers* workers,
+                                       quenby_error* error);
+
+/** Ends them; while no call uses them. */
+QUENBY_API void quenby_threads_free(quenby_threads* threads);
 
 /* ---- Pixels and faces ---- */
 

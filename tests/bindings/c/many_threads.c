@@ -111,6 +111,22 @@ static void with_workers(void) {
   quenby_file_free(alone);
 }
 
+static void with_the_librarys_threads(void) {
+  for (size_t count = 0; count <= 3; ++count) {
+    quenby_threads* threads = NULL;
+    quenby_workers lent = {sizeof(lent), 0, NULL, NULL};
+    CHECK(quenby_threads_new(count, &threads, NULL) == QUENBY_OK);
+    CHECK(quenby_threads_lend(threads, &lent, NULL) == QUENBY_OK);
+    CHECK(count == 0 ? lent.count >= 1 : lent.count == count);
+    quenby_session* session = NULL;
+    CHECK(quenby_session_open(&pixels, NULL, 0, 0, &session, NULL) == QUENBY_OK);
+    CHECK(quenby_session_share(session, &lent, NULL) == QUENBY_OK);
+    CHECK(apply_all(session));
+    quenby_session_free(session);
+    quenby_threads_free(threads);
+  }
+}
+
 /* Works until it is cancelled. */
 static void* until_cancelled(void* cancel) {
   int32_t kind = QUENBY_OK;
@@ -183,6 +199,7 @@ int main(void) {
   same_bytes(0);
   same_bytes(1);
   with_workers();
+  with_the_librarys_threads();
   cancelled_before();
   cancelled_by_another_thread();
   quenby_session_free(shared);

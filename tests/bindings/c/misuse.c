@@ -306,6 +306,18 @@ static void workers(void) {
   quenby_session_free(session);
   free(out);
   free_pixels(&pixels);
+
+  quenby_threads* threads = NULL;
+  INVALID(quenby_threads_new(1, NULL, e));
+  INVALID(quenby_threads_new(1025, &threads, e));
+  CHECK(threads == NULL);
+  CHECK(quenby_threads_new(1, &threads, &error) == QUENBY_OK);
+  INVALID(quenby_threads_lend(NULL, &some, e));
+  INVALID(quenby_threads_lend(threads, NULL, e));
+  some.struct_size = 3;
+  INVALID(quenby_threads_lend(threads, &some, e));
+  quenby_threads_free(threads);
+  quenby_threads_free(NULL);
 }
 
 static void sessions(void) {

@@ -82,6 +82,19 @@ def test_a_session_applies_to_the_photo_as_it_was_given(pixels):
         session.enhance()
 
 
+def test_shared_work_gives_the_same(pixels, photo):
+    wanted = quenby.enhance(pixels)
+    for threads in (0, 1, 3):
+        assert np.array_equal(quenby.enhance(pixels, threads=threads), wanted)
+        with quenby.Session(pixels, threads=threads) as session:
+            assert np.array_equal(session.enhance(), wanted)
+            assert np.array_equal(session.look("winter"), quenby.look(pixels, "winter"))
+        assert quenby.enhance_file(photo, None, threads=threads) == quenby.enhance_file(photo, None)
+    for threads in (-1, 1025):
+        with pytest.raises(ValueError, match="threads"):
+            quenby.enhance(pixels, threads=threads)
+
+
 def test_faces_change_the_result(pixels, photo):
     fractions, inside = (0.25, 0.25, 0.75, 0.75), (60, 40, 180, 120)
     assert np.array_equal(

@@ -89,6 +89,15 @@ class CFault(ctypes.Structure):
     _fields_ = [("kind", c_int32), ("key", c_char * 60), ("message", c_char * 448)]
 
 
+class CWorkers(Growing):
+    _fields_ = [
+        ("struct_size", c_size_t),
+        ("count", c_size_t),
+        ("context", c_void_p),
+        ("run", c_void_p),
+    ]
+
+
 class COpenOptions(Growing):
     _fields_ = [
         ("struct_size", c_size_t),
@@ -97,6 +106,7 @@ class COpenOptions(Growing):
         ("max_pixels", c_uint64),
         ("max_scans", c_int32),
         ("flags", c_uint32),
+        ("workers", POINTER(CWorkers)),
     ]
 
 
@@ -219,6 +229,9 @@ _fallible: dict[str, tuple[Any, ...]] = {
     "file_loss": (c_void_p, c_size_t, POINTER(CLoss)),
     "session_open": (_pixels, *_faces, c_uint32, _object),
     "session_open_photo": (c_void_p, *_faces, _object),
+    "session_share": (c_void_p, POINTER(CWorkers)),
+    "threads_new": (c_size_t, _object),
+    "threads_lend": (c_void_p, POINTER(CWorkers)),
     "session_apply": (c_void_p, c_char_p, c_char_p, c_void_p, c_size_t, c_void_p),
     "green_cdf": (_pixels, _floats),
     "read_shot": (*_file, _open, c_void_p, POINTER(CShot)),
@@ -246,6 +259,7 @@ _plain: dict[str, tuple[Any, ...]] = {
     "file_loss_count": (c_size_t, c_void_p),
     "file_free": (None, c_void_p),
     "session_free": (None, c_void_p),
+    "threads_free": (None, c_void_p),
     "pairs_free": (None, POINTER(CPairs)),
     "corners_free": (None, POINTER(CCorners)),
     "descriptors_free": (None, POINTER(CDescriptors)),
@@ -329,6 +343,25 @@ class Cancel:
     def request(self) -> None:
         """Asks every call with this object to end; nothing takes it back."""
         plain("cancel_request", self._handle.pointer)
+
+
+class Threads:
+    """Threads that share the work on one photo, until they are closed.
+
+    count: with the one that calls; 0 for as many as there are cores.
+    """
+
+    def __init__(self, count: int) -> None:
+        if not 0 <= count <= 1024:
+            raise ValueError("threads: is not 0 to 1024")
+        pointer = c_void_p()
+        call("threads_new", count, byref(pointer))
+        self._handle = Handle("threads_free", pointer)
+        self.workers = CWorkers()
+        call("threads_lend", pointer, byref(self.workers))
+
+    def close(self) -> None:
+        self._handle.close()
 
 
 def pointer_of(cancel: Optional[Cancel]) -> Optional[c_void_p]:

@@ -15,7 +15,7 @@ import numpy as np
 
 from ._filters import look_named, parameter_string
 from ._library import Cancel, CFacts, CKnownFace, CLoss, COpenOptions, CPixels, CSaveOptions
-from ._library import Handle, call, plain, pointer_of, utf8
+from ._library import Handle, Threads, call, plain, pointer_of, utf8
 from ._pixels import AnyPhoto, Bytes, Face, Path, array_of, faces_of, file_bytes, pixels_of, rgba_of
 
 _as_stored, _ignore_known_faces = 1, 2
@@ -377,6 +377,7 @@ def filter_file(
     max_scans: Optional[int] = None,
     overwrite: bool = False,
     cancel: Optional[Cancel] = None,
+    threads: int = 1,
     **parameters: Any,
 ) -> Any:
     """The file that `quenby enhance` makes of a file with these options: upright, filtered, with its
@@ -385,6 +386,7 @@ def filter_file(
     target:      a path whose extension says the format; None gives the bytes back, in `format` or
                  that of the source.
     params:      a parameter string, "slider=0.4;", in place of keywords.
+    threads:     how many share the work, 0 for as many as there are cores; the file is the same.
     mark:        whether the file tells of the edit. A photo that tells of one is edited all the
                  same; see Facts.last_edit.
 
@@ -399,19 +401,15 @@ def filter_file(
     data = _required_bytes(source)
     open = open_options(scale, rotate, True, known_faces, max_pixels, max_scans)
     save, pointer = _save_options(quality, strip, keep, subsampling, mark), c_void_p()
-    call(
-        "filter_file",
-        data,
-        len(data),
-        utf8(filter),
-        utf8(params),
-        *faces_of(faces),
-        byref(open),
-        None if format is None else utf8(format),
-        byref(save),
-        pointer_of(cancel),
-        byref(pointer),
-    )
+    arguments = (data, len(data), utf8(filter), utf8(params), *faces_of(faces), byref(open))
+    rest = (None if format is None else utf8(format), byref(save), pointer_of(cancel))
+    sharing = Threads(threads)
+    try:
+        if sharing.workers.count > 1:
+            open.workers = ctypes.pointer(sharing.workers)
+        call("filter_file", *arguments, *rest, byref(pointer))
+    finally:
+        sharing.close()
     made, losses = _taken(pointer)
     if target is None:
         return made, losses

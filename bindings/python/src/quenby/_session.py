@@ -10,7 +10,7 @@ from typing import Any, Optional
 import numpy as np
 
 from ._filters import look_named, parameter_string
-from ._library import Cancel, Handle, call, pointer_of, utf8
+from ._library import Cancel, Handle, Threads, call, pointer_of, utf8
 from ._photos import Photo, opened
 from ._pixels import AnyPhoto, Bytes, Face, as_channels, faces_of, pixels_of, rgba_of
 from ._pixels import rows_are_whole, stride_of
@@ -23,15 +23,19 @@ class Session:
     so that moving a slider costs a fraction of the first application. Any number of threads may apply at
     once. The photo is copied, or shared with a Photo.
 
+    threads: how many share the work of an application, 0 for as many as there are cores; the pixels are
+             the same.
+
     with quenby.Session(photo) as session:
         for slider in (0.2, 0.4, 0.8):
             show(session.enhance(slider))
     """
 
-    def __init__(self, photo: AnyPhoto, faces: Iterable[Face] = ()) -> None:
-        self._open(opened(photo), faces, copies=True)
+    def __init__(self, photo: AnyPhoto, faces: Iterable[Face] = (), *, threads: int = 1) -> None:
+        self._open(opened(photo), faces, threads, copies=True)
 
-    def _open(self, photo: Any, faces: Iterable[Face], copies: bool) -> "Session":
+    def _open(self, photo: Any, faces: Iterable[Face], threads: int, copies: bool) -> "Session":
+        self._threads = Threads(threads)
         boxes, pointer = faces_of(faces), c_void_p()
         if isinstance(photo, Photo):
             call("session_open_photo", photo._handle.pointer, *boxes, byref(pointer))
@@ -45,6 +49,8 @@ class Session:
             call("session_open", byref(given), *boxes, flags, byref(pointer))
             self._shape, self._channels = rgba.shape[:2], photo.shape[2]
         self._handle = Handle("session_free", pointer)
+        if self._threads.workers.count > 1:
+            call("session_share", pointer, byref(self._threads.workers))
         self._closed = False
         return self
 
@@ -104,6 +110,7 @@ class Session:
         """Frees what the session holds; not while another thread applies."""
         self._closed = True
         self._handle.close()
+        self._threads.close()
 
     def __enter__(self) -> "Session":
         return self
@@ -117,10 +124,12 @@ class Session:
         self.close()
 
 
-def apply(photo: AnyPhoto, filter: str, faces: Iterable[Face] = (), **options: Any) -> Bytes:
+def apply(
+    photo: AnyPhoto, filter: str, faces: Iterable[Face] = (), *, threads: int = 1, **options: Any
+) -> Bytes:
     """A photo with a filter applied: (height, width, channels) bytes, upright, with as many channels as
-    the photo has. Options are those of Session.apply."""
-    session = Session.__new__(Session)._open(opened(photo), faces, copies=False)
+    the photo has. threads as for Session; other options are those of Session.apply."""
+    session = Session.__new__(Session)._open(opened(photo), faces, threads, copies=False)
     try:
         return session.apply(filter, **options)
     finally:
