@@ -41,9 +41,54 @@ std::uint32_t arc4random() {
 // 2.34, where the threads moved into the C library.
 int old_pthread_once(pthread_once_t* control, void (*routine)());
 FIRST(pthread_once);
+int old_pthread_create(pthread_t* thread, const pthread_attr_t* attributes, void* (*routine)(void*),
+                       void* argument);
+int old_pthread_join(pthread_t thread, void** result);
+int old_pthread_detach(pthread_t thread);
+int old_pthread_key_create(pthread_key_t* key, void (*destroy)(void*));
+int old_pthread_key_delete(pthread_key_t key);
+void* old_pthread_getspecific(pthread_key_t key);
+int old_pthread_setspecific(pthread_key_t key, const void* value);
+FIRST(pthread_create);
+FIRST(pthread_join);
+FIRST(pthread_detach);
+FIRST(pthread_key_create);
+FIRST(pthread_key_delete);
+FIRST(pthread_getspecific);
+FIRST(pthread_setspecific);
 INSIDE(pthread_once);
+INSIDE(pthread_create);
+INSIDE(pthread_join);
+INSIDE(pthread_detach);
+INSIDE(pthread_key_create);
+INSIDE(pthread_key_delete);
+INSIDE(pthread_getspecific);
+INSIDE(pthread_setspecific);
 int pthread_once(pthread_once_t* control, void (*routine)()) {
   return old_pthread_once(control, routine);
+}
+int pthread_create(pthread_t* thread, const pthread_attr_t* attributes, void* (*routine)(void*),
+                   void* argument) {
+  return old_pthread_create(thread, attributes, routine, argument);
+}
+int pthread_join(pthread_t thread, void** result) {
+  return old_pthread_join(thread, result);
+}
+int pthread_detach(pthread_t thread) {
+  return old_pthread_detach(thread);
+}
+int pthread_key_create(pthread_key_t* key, void (*destroy)(void*)) {
+  return old_pthread_key_create(key, destroy);
+}
+int pthread_key_delete(pthread_key_t key) {
+  return old_pthread_key_delete(key);
+}
+void* pthread_getspecific(pthread_key_t key) {
+  return old_pthread_getspecific(key);
+}
+int pthread_setspecific(pthread_key_t key, const void* value) {
+  asm("" : "+r"(value));  // g++ takes it to point at something that may not be initialised
+  return old_pthread_setspecific(key, value);
 }
 
 // 2.33, before which the struct's version was told in every call. The functions for large files are
