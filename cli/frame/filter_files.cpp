@@ -246,7 +246,7 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
 }
 
 ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
-                     const FilterToApply& filter, const ToldFile& told) {
+                     const FilterToApply& filter, const FileListener& listener) {
   Work work = readOptions(options, filter);
   const bool raw = work.photo.raw.has_value();
   if (options.outputs.inPlace && (raw || work.photo.scale != 1)) {
@@ -298,6 +298,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
     work.workers = std::make_unique<photo::ThreadWorkers>(atOnce * (threads - 1) + 1);
   }
   const OutputFolders folders(plan, options.page);
+  if (listener.planned) listener.planned(plan);
   std::size_t skipped = 0, marked = 0;
   std::vector<std::string> sections;
   const PhotoTally tally = eachPhoto<Done>(
@@ -314,7 +315,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
              if (done.existed) {
                ++skipped;
                json.add(planAsJson(plan[index], "exists"));
-               if (told) told(plan[index], "exists");
+               if (listener.told) listener.told(plan[index], "exists");
                return;
              }
              if (!done.earlier.empty()) {
@@ -327,7 +328,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
                Json object = planAsJson(plan[index], "edited");
                object["earlier"] = done.earlier;
                json.add(object);
-               if (told) told(plan[index], "edited");
+               if (listener.told) listener.told(plan[index], "edited");
                return;
              }
              Json object = planAsJson(plan[index], "done");
@@ -341,7 +342,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
              for (const photo::Loss& loss : done.lost) {
                talk.note(plan[index].output + ": " + lossText(loss));
              }
-             if (told) told(plan[index], "done");
+             if (listener.told) listener.told(plan[index], "done");
            },
        .failed =
            [&](std::size_t index, const std::string& reason) {
@@ -352,7 +353,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
                sections.push_back(
                    comparisonSection({.input = plan[index].input.path, .remark = reason}));
              }
-             if (told) told(plan[index], "failed");
+             if (listener.told) listener.told(plan[index], "failed");
            }});
   const std::size_t done = tally.done - skipped - marked;
   const char* const whatToDo =

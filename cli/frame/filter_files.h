@@ -54,13 +54,17 @@ struct FilterToApply {
   std::string doneAlready;                    ///< What is said of a photo that carries its mark.
 };
 
-/// What became of a file of a plan: "done", "exists" or "failed".
-using ToldFile = std::function<void(const PlannedFile& file, const std::string& status)>;
+/// For who wants to know of each file, on the calling thread; both may be empty.
+struct FileListener {
+  /// Called once, before any work.
+  std::function<void(const std::vector<PlannedFile>& plan)> planned = {};
+  /// Called for each file in order, with what became of it: "done", "exists", "edited" or "failed".
+  std::function<void(const PlannedFile& file, const std::string& status)> told = {};
+};
 
 /// Plans, then loads, filters and saves every file, reports, and says how it went.
-/// @param told  called for each file in order, on the calling thread; may be empty.
 /// @throws UsageError before any work.
 ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
-                     const FilterToApply& filter, const ToldFile& told = {});
+                     const FilterToApply& filter, const FileListener& listener = {});
 
 }  // namespace pelorin::cli

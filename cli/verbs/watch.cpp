@@ -18,6 +18,7 @@
 #include "cli/verbs/watch/settling.h"
 #include "photo/collection/ledger.h"
 #include "photo/file_io.h"
+#include "photo/photo.h"
 
 namespace fs = std::filesystem;
 
@@ -151,7 +152,18 @@ class Watch {
   bool isOurs(const photo::LedgerEntry* entry) const {
     if (options_.files.outputs.overwrite) return true;
     if (entry == nullptr) return false;
-    return entry->begun || (entry->stamp && entry->stamp == photo::stampOf(entry->result));
+    if (entry->begun)
+      return !fs::exists(entry->result) || options_.files.mark.without || isMarked(entry->result);
+    return entry->stamp && entry->stamp == photo::stampOf(entry->result);
+  }
+
+  // Whoever put another file there since has not had it made by Quenby, as far as one can see.
+  static bool isMarked(const std::string& result) {
+    try {
+      return !photo::readFacts(photo::readFile(result)).edits.empty();
+    } catch (const std::exception&) {
+      return false;
+    }
   }
 
   void work(const Photos& photos) {
@@ -162,9 +174,6 @@ class Watch {
       batches[{photo.first.subfolder, ours}].push_back(photo);
     }
     for (const auto& [kind, batch] : batches) {
-      for (const auto& [input, stamp] : batch) {
-        if (kind.second) ledger_.put(input.path, {stamp, {}, {}, /*begun=*/true});
-      }
       try {
         filterBatch(batch, kind.first, kind.second);
       } catch (const UsageError&) {
@@ -198,9 +207,22 @@ class Watch {
     options.outputs.overwrite = mayReplace;
     options.report.quiet = true;  // this says of each photo what became of it
     filterFiles(verbName, options, filter_,
-                [&](const PlannedFile& file, const std::string& status) {
-                  tell(file, status, stamps.at(file.input.path));
-                });
+                {.planned = [&](const std::vector<PlannedFile>& plan) { begin(plan, stamps); },
+                 .told =
+                     [&](const PlannedFile& file, const std::string& status) {
+                       tell(file, status, stamps.at(file.input.path));
+                     }});
+  }
+
+  // From here on results are ours, even where this is killed before it can say so.
+  void begin(const std::vector<PlannedFile>& plan,
+             const std::map<std::string, photo::FileStamp>& stamps) {
+    std::map<std::string, photo::LedgerEntry> begun;
+    for (const PlannedFile& file : plan) {
+      if (file.skipped) continue;
+      begun[file.input.path] = {stamps.at(file.input.path), file.output, {}, /*begun=*/true};
+    }
+    ledger_.put(begun);
   }
 
   void tell(const PlannedFile& file, const std::string& status, const photo::FileStamp& stamp) {

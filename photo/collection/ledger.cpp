@@ -135,24 +135,33 @@ const LedgerEntry* Ledger::find(const std::string& photo) const {
 }
 
 void Ledger::put(const std::string& photo, const LedgerEntry& entry) {
-  entries_.insert_or_assign(photo, entry);
-  if (!database_) return;
+  put(std::map<std::string, LedgerEntry>{{photo, entry}});
+}
+
+void Ledger::put(const std::map<std::string, LedgerEntry>& entries) {
+  for (const auto& [photo, entry] : entries) entries_.insert_or_assign(photo, entry);
+  if (!database_ || entries.empty()) return;
   try {
-    const StatementUse use(put_.get());
-    bind(put_.get(), 1, photo);
-    sqlite3_bind_int64(put_.get(), 2, static_cast<std::int64_t>(entry.photo.bytes));
-    sqlite3_bind_int64(put_.get(), 3, entry.photo.modified);
-    bind(put_.get(), 4, entry.result);
-    if (entry.stamp) {
-      sqlite3_bind_int64(put_.get(), 5, static_cast<std::int64_t>(entry.stamp->bytes));
-      sqlite3_bind_int64(put_.get(), 6, entry.stamp->modified);
-    }
-    sqlite3_bind_int(put_.get(), 7, entry.begun ? 1 : 0);
-    database_->step(put_.get());
-    return;
+    database_->execute("BEGIN");
+    for (const auto& [photo, entry] : entries) write(photo, entry);
+    database_->execute("COMMIT");
   } catch (const Unusable& reason) {
     trouble(sqlite3_errstr(reason.code));
   }
+}
+
+void Ledger::write(const std::string& photo, const LedgerEntry& entry) {
+  const StatementUse use(put_.get());
+  bind(put_.get(), 1, photo);
+  sqlite3_bind_int64(put_.get(), 2, static_cast<std::int64_t>(entry.photo.bytes));
+  sqlite3_bind_int64(put_.get(), 3, entry.photo.modified);
+  bind(put_.get(), 4, entry.result);
+  if (entry.stamp) {
+    sqlite3_bind_int64(put_.get(), 5, static_cast<std::int64_t>(entry.stamp->bytes));
+    sqlite3_bind_int64(put_.get(), 6, entry.stamp->modified);
+  }
+  sqlite3_bind_int(put_.get(), 7, entry.begun ? 1 : 0);
+  database_->step(put_.get());
 }
 
 }  // namespace pelorin::photo

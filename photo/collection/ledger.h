@@ -46,12 +46,15 @@ class Ledger {
 
   /// Replaces what is known of a photo.
   void put(const std::string& photo, const LedgerEntry& entry);
+  /// The same for many, in the time of one.
+  void put(const std::map<std::string, LedgerEntry>& entries);
 
  private:
   void open();
   void read();
   void setAside();
   void trouble(const std::string& what);
+  void write(const std::string& photo, const LedgerEntry& entry);
 
   std::string file_, trouble_;
   std::map<std::string, LedgerEntry> entries_;

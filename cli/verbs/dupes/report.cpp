@@ -159,15 +159,20 @@ std::span<const photo::ShotPair> toldPairs(const DupeReport& report,
 std::string summaryOf(const DupeReport& report) {
   std::size_t grouped = 0;
   for (const photo::DupeGroup& group : report.groups) grouped += group.photos.size();
+  const std::size_t alike = report.lookAlikes.size();
+  const std::string besides = alike == 0 ? ""
+                                         : fmt::format("; {} {} alike, times unknown", alike,
+                                                       alike == 1 ? "group looks" : "groups look");
   if (grouped == 0) {
-    return fmt::format("no near-duplicates among {} photos", report.photos.size());
+    return fmt::format("no near-duplicates among {} photos{}", report.photos.size(), besides);
   }
   const auto large = std::count_if(report.groups.begin(), report.groups.end(), isLarge);
-  return fmt::format("{} {} with {} of {} photos{}", report.groups.size(),
+  return fmt::format("{} {} with {} of {} photos{}{}", report.groups.size(),
                      report.groups.size() == 1 ? "group" : "groups", grouped, report.photos.size(),
                      large == 0
                          ? std::string()
-                         : fmt::format(", {} of them of more than {}", large, largestPlainGroup));
+                         : fmt::format(", {} of them of more than {}", large, largestPlainGroup),
+                     besides);
 }
 
 }  // namespace pelorin::cli

@@ -106,6 +106,32 @@ TEST(Watch, ReplacesNoFileOfOthersAndGoesOnAfterFailures) {
   EXPECT_GT(folder.read("out/z_AE0.jpg").size(), 6u);
 }
 
+// Killed when the result had its place and the ledger did not know of it.
+TEST(Watch, KnowsItsResultsAfterAKill) {
+  if (std::getenv("QUENBY_COMMAND") != nullptr) {
+    GTEST_SKIP() << "another command, such as one with sanitizers, makes calls of its own";
+  }
+  const Incoming incoming;
+  const TemporaryFolder& folder = incoming.folder;
+  folder.write("in/a.jpg", smallJpeg(1));
+  const std::string killed = "strace -f -o " + folder / "trace" +
+                             " -e inject=fsync:signal=KILL:when=2 $QUENBY watch " + folder / "in" +
+                             " -o " + folder / "out" + " --once --settle 0";
+  EXPECT_NE(shell(killed).exitCode, 0);
+  if (!folder.has("trace")) GTEST_SKIP() << "strace cannot trace here";
+  const Bytes first = folder.read("out/a_AE0.jpg");
+  folder.write("in/a.jpg", smallJpeg(2));
+  EXPECT_THAT(incoming.once().errors, HasSubstr("1 photos done"));
+  EXPECT_NE(folder.read("out/a_AE0.jpg"), first);
+
+  // What another put there meanwhile is theirs.
+  folder.write("in/b.jpg", smallJpeg(1));
+  EXPECT_NE(shell(killed).exitCode, 0);
+  ASSERT_TRUE(folder.has("out/b_AE0.jpg"));
+  folder.write("out/b_AE0.jpg", "another's");
+  EXPECT_THAT(incoming.once().output, HasSubstr("b_AE0.jpg (exists: left without --overwrite)"));
+}
+
 TEST(Watch, GivesAResultToTheFirstOfTwoPhotosOfOneName) {
   const Incoming incoming;
   incoming.folder.write("in/a.jpeg", smallJpeg(1));

@@ -242,6 +242,21 @@ TEST(KeptMetadata, HasNoPicturesWithinXmpAndNoDepthOfThoseBehindThePicture) {
   EXPECT_THAT(written.text(), testing::Not(testing::HasSubstr("Device:Cameras")));
 }
 
+TEST(KeptMetadata, HasNoClaimOfPhonesToDepthThatWent) {
+  const Written written = rewritten(jpegWith(
+      photoLikePicture(64, 128, 1),
+      {xmpSegment(xmpPacket("<rdf:Description "
+                            "xmlns:blur='http://ns.apple.com/depthBlurEffect/1.0/' "
+                            "xmlns:Mi='http://ns.xiaomi.com/photos/1.0/camera/' "
+                            "blur:SimulatedAperture='4.5' Mi:XMPMeta='&lt;depthmap offset=\"9\"/>' "
+                            "Mi:Model='stays'/>"))}));
+  EXPECT_THAT(written.lost,
+              testing::ElementsAre(Loss{"depth map", "describes the picture as it was"}));
+  EXPECT_THAT(written.text(), testing::Not(testing::HasSubstr("SimulatedAperture")));
+  EXPECT_THAT(written.text(), testing::Not(testing::HasSubstr("XMPMeta")));
+  EXPECT_THAT(written.text(), testing::HasSubstr("stays"));
+}
+
 TEST(KeptMetadata, OfEveryKindAgreesAboutSizeAndOrientation) {
   const std::string xmp = xmpPacket(
       "<rdf:Description tiff:Orientation='6' exif:PixelXDimension='64' exif:PixelYDimension='128'>"

@@ -58,6 +58,7 @@ TEST(HtmlReport, RanksNothingWhereATimeIsNotKnown) {
   report.groups.clear();
   report.lookAlikes[0].pairs[0].timesKnown = false;
   const std::string html = htmlReport(report, {{}, {}, {}});
+  EXPECT_THAT(html, HasSubstr("no near-duplicates among 3 photos; 1 group looks alike"));
   EXPECT_THAT(html, HasSubstr("Group 1: look alike, time unknown"));
   EXPECT_THAT(html, HasSubstr("not known, taken as 0"));
   EXPECT_THAT(html, Not(HasSubstr("<small>keep: ")));
