@@ -51,6 +51,20 @@ std::string recordOf(const std::string& path, std::span<const std::uint8_t> file
   return nul + md5Hex({reinterpret_cast<const char*>(file.data()), file.size()}) + " " + path + nul;
 }
 
+bool wasRecorded(const std::vector<std::uint8_t>& list, const std::string& path) {
+  const std::string end = " " + path + '\0';
+  return std::search(list.begin(), list.end(), end.begin(), end.end()) != list.end();
+}
+
+// Kept by a run that was killed before it noted what would become of the file.
+bool isUnreplaced(const fs::path& backup, const std::string& path) {
+  std::error_code failed;
+  if (fs::equivalent(backup, path, failed)) return true;
+  const std::uintmax_t size = fs::file_size(path, failed);
+  return !failed && size == fs::file_size(backup, failed) && !failed &&
+         readFile(backup.string()) == readFile(path);
+}
+
 void markFolder(const fs::path& folder, const Mark& mark) {
   if (hasMark(folder, mark)) return;
   const Mark& other = &mark == &movedMark ? replacedMark : movedMark;
@@ -108,7 +122,10 @@ void keepBackup(const std::string& folder, const std::string& path) {
   if (::link(original.c_str(), backup.c_str()) == 0) {
     syncFolder(backup.parent_path().string());
   } else if (errno == EEXIST) {
-    if (isReplaced(folder, path)) throwError(EEXIST, backup);
+    if (isReplaced(folder, path)) {
+      throw std::runtime_error(backup.string() +
+                               " keeps another content of it already; name another folder");
+    }
   } else {
     copyWhole(original.string(), backup.string(), /*mayReplace=*/true);
   }
@@ -167,10 +184,16 @@ bool isBackupFolder(const std::string& folder) {
 std::vector<std::string> keptFiles(const std::string& folder) {
   std::vector<std::string> paths;
   sweepLeftovers(folder);
+  std::vector<std::uint8_t> list;
+  const std::string results = (fs::path(folder) / resultsName).string();
+  if (fs::exists(results)) list = readFile(results);
+  const bool isOfMoved = hasMark(folder, movedMark);
   for (const fs::directory_entry& entry : fs::recursive_directory_iterator(folder)) {
     if (entry.is_directory()) sweepLeftovers(entry.path().string());
     if (!entry.is_regular_file() || isMarkName(entry.path().filename())) continue;
-    paths.push_back((fs::path("/") / entry.path().lexically_relative(folder)).string());
+    std::string path = (fs::path("/") / entry.path().lexically_relative(folder)).string();
+    if (isOfMoved || list.empty() || wasRecorded(list, path) || isUnreplaced(entry.path(), path))
+      paths.push_back(std::move(path));
   }
   std::sort(paths.begin(), paths.end());
   return paths;

@@ -22,7 +22,8 @@ bool isReplaced(const std::string& folder, const std::string& path);
 /// Keeps the file at `path` in `folder`, on the disk before this returns: as a second name of it or,
 /// on another disk, as a copy with its times, permissions and attributes. Meant for files that are
 /// replaced next, not written into. Nothing is done where it is kept already.
-/// @throws std::system_error; nothing is then left behind but empty folders.
+/// @throws std::system_error, std::runtime_error where it keeps another content of it; nothing is then
+///         left behind but empty folders.
 void keepBackup(const std::string& folder, const std::string& path);
 
 /// Moves the file at `path`, itself and no link to it, into `folder`, on the disk before this
@@ -46,7 +47,8 @@ bool isChangedSince(const std::string& folder, const std::string& path);
 /// @throws std::filesystem::filesystem_error.
 bool isBackupFolder(const std::string& folder);
 
-/// The paths of the files that `folder` keeps, sorted; what killed processes left in it goes.
+/// The paths of the files that `folder` keeps, sorted; what killed processes left in it goes. Files that
+/// somebody else put into one of replaced photos are none.
 /// @throws std::filesystem::filesystem_error.
 std::vector<std::string> keptFiles(const std::string& folder);
 

@@ -315,7 +315,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
              if (done.existed) {
                ++skipped;
                json.add(planAsJson(plan[index], "exists"));
-               if (listener.told) listener.told(plan[index], "exists");
+               if (listener.told) listener.told(plan[index], "exists", done.lost);
                return;
              }
              if (!done.earlier.empty()) {
@@ -328,7 +328,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
                Json object = planAsJson(plan[index], "edited");
                object["earlier"] = done.earlier;
                json.add(object);
-               if (listener.told) listener.told(plan[index], "edited");
+               if (listener.told) listener.told(plan[index], "edited", done.lost);
                return;
              }
              Json object = planAsJson(plan[index], "done");
@@ -342,7 +342,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
              for (const photo::Loss& loss : done.lost) {
                talk.note(plan[index].output + ": " + lossText(loss));
              }
-             if (listener.told) listener.told(plan[index], "done");
+             if (listener.told) listener.told(plan[index], "done", done.lost);
            },
        .failed =
            [&](std::size_t index, const std::string& reason) {
@@ -353,7 +353,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
                sections.push_back(
                    comparisonSection({.input = plan[index].input.path, .remark = reason}));
              }
-             if (listener.told) listener.told(plan[index], "failed");
+             if (listener.told) listener.told(plan[index], "failed", {});
            }});
   const std::size_t done = tally.done - skipped - marked;
   const char* const whatToDo =

@@ -58,8 +58,11 @@ struct FilterToApply {
 struct FileListener {
   /// Called once, before any work.
   std::function<void(const std::vector<PlannedFile>& plan)> planned = {};
-  /// Called for each file in order, with what became of it: "done", "exists", "edited" or "failed".
-  std::function<void(const PlannedFile& file, const std::string& status)> told = {};
+  /// Called for each file in order, with what became of it ("done", "exists", "edited" or "failed") and
+  /// what of its metadata was lost.
+  std::function<void(const PlannedFile& file, const std::string& status,
+                     const std::vector<photo::Loss>& lost)>
+      told = {};
 };
 
 /// Plans, then loads, filters and saves every file, reports, and says how it went.

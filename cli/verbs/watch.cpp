@@ -209,8 +209,11 @@ class Watch {
     filterFiles(verbName, options, filter_,
                 {.planned = [&](const std::vector<PlannedFile>& plan) { begin(plan, stamps); },
                  .told =
-                     [&](const PlannedFile& file, const std::string& status) {
+                     [&](const PlannedFile& file, const std::string& status,
+                         const std::vector<photo::Loss>& lost) {
                        tell(file, status, stamps.at(file.input.path));
+                       for (const photo::Loss& loss : lost)
+                         talk_.note(file.output + ": " + lossText(loss));
                      }});
   }
 

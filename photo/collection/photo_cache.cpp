@@ -50,7 +50,12 @@ struct Key {
 };
 
 Key keyOf(const std::string& photo, const FileStamp& stamp) {
-  return {std::filesystem::absolute(photo).lexically_normal().string(), stamp};
+  // Not as text: "link/.." is where the link leads.
+  const std::filesystem::path path = std::filesystem::absolute(photo);
+  std::error_code failed;
+  const std::filesystem::path folder =
+      std::filesystem::weakly_canonical(path.parent_path(), failed);
+  return {(failed ? path : folder / path.filename()).string(), stamp};
 }
 
 // SQLite notices damage to its own structure but not to what is kept in it, nor that a row is found

@@ -84,7 +84,10 @@ bool linkTo(const KnownFile& kept, const KnownFile& file, const std::string& bac
     throw std::system_error(errno, std::generic_category(), file.path);
   }
   try {
-    if (!backup.empty()) keepBackup(backup, file.path);
+    if (!backup.empty()) {
+      keepBackup(backup, file.path);
+      recordResult(backup, file.path, readFile(link));
+    }
     if (!isUnchanged(file)) throw RemovalError("has changed since it was compared");
     if (::rename(link.c_str(), file.path.c_str()) != 0) {
       throw std::system_error(errno, std::generic_category(), file.path);

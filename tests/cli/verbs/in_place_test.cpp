@@ -95,6 +95,20 @@ TEST(InPlace, UndoDestroysNothingThatAnotherProgramMade) {
   EXPECT_TRUE(fs::is_empty(kept));
 }
 
+TEST(InPlace, UndoLeavesFilesOfOthersAmongTheBackups) {
+  const Photos photos;
+  ASSERT_EQ(photos.enhance({"--backup", photos.folder / "kept"}).exitCode, 0);
+  const std::string foreign = "kept" + (photos.folder / "in/theirs.jpg");
+  photos.folder.write(foreign, smallJpeg(9));
+  photos.folder.write("kept/notes.txt", std::string("mine"));
+  const Finished undone = quenby({"undo", photos.folder / "kept"});
+  EXPECT_EQ(undone.exitCode, 0) << undone.errors;
+  EXPECT_EQ(photos.folder.read("in/a.jpg"), photos.old);
+  EXPECT_FALSE(photos.folder.has("in/theirs.jpg"));
+  EXPECT_TRUE(photos.folder.has(foreign));
+  EXPECT_TRUE(photos.folder.has("kept/notes.txt"));
+}
+
 TEST(InPlace, UndoTakesWhatWentMissing) {
   const Photos photos;
   ASSERT_EQ(photos.enhance({"--backup", photos.folder / "kept"}).exitCode, 0);

@@ -81,6 +81,15 @@ TEST(Watch, DoesEveryPhotoOnceAndAgainWhenItChanges) {
   EXPECT_THAT(incoming.once().errors, HasSubstr("0 photos done"));
 }
 
+TEST(Watch, TellsWhatIsLost) {
+  const Incoming incoming;
+  Bytes photo = smallJpeg(1);
+  const Bytes jumbf = {0xFF, 0xEB, 0, 12, 'J', 'P', 0, 1, 0, 0, 0, 1, 0, 0};
+  photo.insert(photo.begin() + 2, jumbf.begin(), jumbf.end());
+  incoming.folder.write("in/a.jpg", photo);
+  EXPECT_THAT(incoming.once().errors, HasSubstr("out/a_AE0.jpg: JUMBF boxes lost: "));
+}
+
 TEST(Watch, ReplacesNoFileOfOthersAndGoesOnAfterFailures) {
   const Incoming incoming;
   const TemporaryFolder& folder = incoming.folder;
