@@ -1,6 +1,7 @@
 #!/usr/bin/env bash
-# all.sh QUENBY NATIVES: the tests of the jar for Spark, in one process (JUnit) and in a cluster of
-# processes (run.sh). Maven's registry has Spark's classes, Python's has Spark itself.
+# all.sh QUENBY NATIVES [--only-build]: the tests of the jar for Spark, in one process (JUnit) and in a
+# cluster of processes (run.sh). Maven's registry has Spark's classes, Python's has Spark itself. Where
+# nothing is to be tested, it tells where they are: the jar, the tests' classes, Spark.
 #
 # Leaves with 77, and says why, where they cannot be had.
 set -euo pipefail
@@ -14,22 +15,23 @@ maven=(mvn --batch-mode --no-transfer-progress --quiet -Dstyle.color=never --fil
   --projects quenby-spark --also-make)
 
 skipped() {
-  echo "spark: skipped: $*"
+  echo "spark: skipped: $*" >&2
   exit 77
 }
 unreachable() { grep -qiE 'unknown host|could not transfer|connection (refused|reset|timed out)|network is unreachable|temporary failure|NewConnectionError' "$1"; }
 
 mkdir -p "$scratch"
 log=$scratch/maven.log
-echo "spark: functions, near-duplicates and jobs in one process"
+tests=(-Dtest='com.pelorin.photos.quenby.spark.*Test' -Dsurefire.failIfNoSpecifiedTests=false)
+[ "${3-}" != --only-build ] || tests=(-DskipTests)
+[ "${3-}" = --only-build ] || echo "spark: functions, near-duplicates and jobs in one process"
 if ! "${maven[@]}" test-compile >"$log" 2>&1; then
-  cat "$log"
+  cat "$log" >&2
   unreachable "$log" || exit 1
   skipped "Maven's registry cannot be reached"
 fi
-if ! "${maven[@]}" -Dquenby.command="$command" -Dtest='com.pelorin.photos.quenby.spark.*Test' \
-  -Dsurefire.failIfNoSpecifiedTests=false package >"$log" 2>&1; then
-  cat "$log"
+if ! "${maven[@]}" -Dquenby.command="$command" "${tests[@]}" package >"$log" 2>&1; then
+  cat "$log" >&2
   exit 1
 fi
 
@@ -37,11 +39,16 @@ environment=$scratch/environment
 if [ "$("$environment/bin/python" -c 'import pyspark; print(pyspark.__version__)' 2>&1)" != "$spark" ]; then
   python3 -m venv --clear "$environment"
   if ! "$environment/bin/pip" install --quiet "pyspark==$spark" >"$scratch/pip.log" 2>&1; then
-    cat "$scratch/pip.log"
+    cat "$scratch/pip.log" >&2
     unreachable "$scratch/pip.log" || exit 1
     skipped "the cluster of processes: Python's registry cannot be reached"
   fi
 fi
 home=$("$environment/bin/python" -c 'import os, pyspark; print(os.path.dirname(pyspark.__file__))')
-"$root/tests/spark/run.sh" "$scratch/java/quenby-spark/quenby-spark-$version.jar" \
-  "$scratch/java/quenby-spark/test-classes" "$home" "$environment/bin/python" "$command"
+made=("$scratch/java/quenby-spark/quenby-spark-$version.jar"
+  "$scratch/java/quenby-spark/test-classes" "$home")
+if [ "${3-}" = --only-build ]; then
+  echo "${made[@]}"
+else
+  "$root/tests/spark/run.sh" "${made[@]}" "$environment/bin/python" "$command"
+fi
