@@ -33,7 +33,7 @@ struct JpegHeader {
 /// RGBA pixels, rows back to back, alpha 255; released with `free`.
 struct DecodedPicture {
   struct Free {
-    void operator()(std::uint8_t* pixels) const { std::free(pixels); }
+    void operator()(std::uint8_t* bytes) const { std::free(bytes); }
   };
   std::unique_ptr<std::uint8_t, Free> pixels;
   std::uint32_t width, height;

@@ -13,11 +13,11 @@
 namespace pelorin::photo {
 namespace {
 
-constexpr std::uint16_t imageWidth = 0x0100, imageLength = 0x0101, compression = 0x0103,
-                        stripOffsets = 0x0111, orientation = 0x0112, stripByteCounts = 0x0117,
-                        thumbnailOffset = 0x0201, thumbnailLength = 0x0202, exifDirectory = 0x8769,
-                        gpsDirectory = 0x8825, subjectArea = 0x9214, pixelXDimension = 0xA002,
-                        pixelYDimension = 0xA003, subjectLocation = 0xA214;
+constexpr std::uint16_t imageWidth = 0x0100, imageLength = 0x0101, stripOffsets = 0x0111,
+                        orientation = 0x0112, stripByteCounts = 0x0117, thumbnailOffset = 0x0201,
+                        thumbnailLength = 0x0202, exifDirectory = 0x8769, gpsDirectory = 0x8825,
+                        subjectArea = 0x9214, pixelXDimension = 0xA002, pixelYDimension = 0xA003,
+                        subjectLocation = 0xA214;
 constexpr std::size_t markSize = 6, longestPayload = 65533;
 constexpr std::uint32_t usualLongerSide = 160, longestSide = 1024;
 

@@ -232,7 +232,7 @@ bool samsungHoldsPictures(Bytes trailer) {
 }
 
 std::vector<TailPart> readTail(Bytes tail) {
-  std::vector<TailPart> endings = takeEndings(tail);
+  std::vector<TailPart> last = takeEndings(tail);
   std::vector<TailPart> parts;
   while (tail = tail.subspan(zerosBefore(tail)), !tail.empty()) {
     std::size_t length = tail.size();
@@ -248,7 +248,7 @@ std::vector<TailPart> readTail(Bytes tail) {
     }
     tail = tail.subspan(length);
   }
-  std::move(endings.begin(), endings.end(), std::back_inserter(parts));
+  std::move(last.begin(), last.end(), std::back_inserter(parts));
   return parts;
 }
 
