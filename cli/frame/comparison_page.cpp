@@ -53,7 +53,8 @@ input:focus-visible ~ .line::after { outline: 3px solid var(--mark); outline-off
   width: 100%; }
 .steps figure { max-width: 16rem; }
 figure { max-width: 100%; }
-.steps img { display: block; max-width: 100%; height: auto; border: 2px solid transparent; }
+.steps img { display: block; max-width: 100%; height: auto; margin: 0 auto;
+  border: 2px solid transparent; }
 .steps .chosen img { border-color: var(--mark); }
 .steps figcaption { text-align: center; }
 figcaption { font-size: .8rem; }

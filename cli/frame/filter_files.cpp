@@ -238,7 +238,7 @@ void addFilterFilesOptions(Verb verb, FilterFilesOptions& options,
   verb.option("--report", options.page,
               "Also make a page of all photos that shows each before and after, with a divider, "
               "its faces, histograms and steps of the slider; one file, for any browser")
-      .type("PAGE.html")
+      .type("FILE")
       .group("Output");
   addRawOption(verb, options.raw);
   verb.named("--raw").help("Read and write packed RGBA bytes of this size instead of photos");
