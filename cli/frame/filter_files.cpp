@@ -93,7 +93,7 @@ std::string sectionOf(const Work& work, const PlannedFile& file, const Done& don
     photo.pictures = &pictures;
     return comparisonSection(photo);
   } catch (const Interrupted&) {
-    throw;
+    return "";  // the photo is done, and no page is made
   } catch (const std::exception& error) {
     photo.remark += (photo.remark.empty() ? "" : "; ") + ("no picture: " + explain(error));
     return comparisonSection(photo);
@@ -368,11 +368,12 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
               (inPlace ? ": was replaced already, as its backup tells; quenby undo puts it back"
                        : ": exists already; add --overwrite to replace it"));
   }
-  if (tally.interrupted) {
+  const bool interrupted = tally.interrupted || (work.shown && interruptRequested());
+  if (interrupted) {
     talk.note(work.shown ? "interrupted; finished files stand, no page was made"
                          : "interrupted; finished files stand");
   }
-  const bool showing = work.shown && !tally.interrupted && !sections.empty();
+  const bool showing = work.shown && !interrupted && !sections.empty();
   if (showing) {
     writePage(options.page,
               comparisonPage(photosText(plan.size()) + ": " +
@@ -380,7 +381,7 @@ ExitCode filterFiles(const std::string& verb, FilterFilesOptions options,
                              sections),
               options.outputs.overwrite);
   }
-  const ExitCode code = tally.exitCode(talk);
+  const ExitCode code = interrupted ? ExitCode::interrupted : tally.exitCode(talk);
   return code == ExitCode::allDone && done == 0 && !showing ? ExitCode::nothingToDo : code;
 }
 
