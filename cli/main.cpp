@@ -13,8 +13,8 @@ int main(int argc, char** argv) {
       {"enhance", addEnhance}, {"look", addLook},           {"looks", addLooks},
       {"sheet", addSheet},     {"info", addInfo},           {"curve", addCurve},
       {"masks", addMasks},     {"dupes", addDupes},         {"compare", addCompare},
-      {"score", addScore},     {"keypoints", addKeypoints}, {"undo", addUndo},
-      {"watch", addWatch},     {"pages", addPages}};
+      {"score", addScore},     {"keypoints", addKeypoints}, {"selftest", addSelftest},
+      {"undo", addUndo},       {"watch", addWatch},         {"pages", addPages}};
   const std::string_view asked = argc > 1 ? argv[1] : "";
   // Making the options of all takes longer than what many a run is for.
   const bool one =

@@ -3,6 +3,9 @@
 # this tree.
 cmake_policy(VERSION 3.25)
 include(CheckCompilerFlag)
+if(EMSCRIPTEN) # whose memory holds no addresses of code, and is nobody else's
+  return()
+endif()
 
 get_property(languages GLOBAL PROPERTY ENABLED_LANGUAGES)
 foreach(language C CXX)

@@ -4,7 +4,9 @@ include(GNUInstallDirs)
 set(CMAKE_CXX_STANDARD 20)
 set(CMAKE_CXX_STANDARD_REQUIRED ON)
 set(CMAKE_CXX_EXTENSIONS OFF)
-set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+if(NOT EMSCRIPTEN) # where code is independent of its position without being asked
+  set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+endif()
 set(CMAKE_CXX_VISIBILITY_PRESET hidden)
 set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
 set(CMAKE_EXPORT_COMPILE_COMMANDS ON)
@@ -15,10 +17,12 @@ set(THREADS_PREFER_PTHREAD_FLAG ON)
 add_compile_options(-ffp-contract=off -fno-math-errno -fno-trapping-math)
 
 # Addresses are chosen as a program starts, where the linker can; imports are resolved by then and
-# read-only from there on; no stack is executable.
-include(CheckPIESupported)
-check_pie_supported()
-add_link_options(-Wl,-z,relro -Wl,-z,now -Wl,-z,noexecstack)
+# read-only from there on; no stack is executable. WebAssembly is all that without being asked.
+if(NOT EMSCRIPTEN)
+  include(CheckPIESupported)
+  check_pie_supported()
+  add_link_options(-Wl,-z,relro -Wl,-z,now -Wl,-z,noexecstack)
+endif()
 if(NOT PELORIN_SANITIZE) # sanitizers look at every access already, and know no checked memcpy
   include(Hardening)
 endif()
@@ -128,6 +132,13 @@ if(PROJECT_IS_TOP_LEVEL AND NOT BUILD_SHARED_LIBS)
   endforeach()
   pelorin_compile_quickly(pelorin_quick_library_headers)
 endif()
+
+# For the folders below that have no loops that count, where code is loaded over a network.
+macro(pelorin_compile_small)
+  if(EMSCRIPTEN)
+    add_compile_options($<$<CONFIG:Release>:-Oz>)
+  endif()
+endmacro()
 
 function(pelorin_compile_as_test target)
   pelorin_compile_quickly(${target})

@@ -17,7 +17,7 @@ using image_processing::Workers;
 
 void turnRows(const RGBA8Pixel* rows, std::uint32_t first, std::uint32_t count, PictureSize size,
               Turn turn, const Image<RGBA8Pixel>& result) {
-  const std::ptrdiff_t width = size.width, bottomRow = std::ptrdiff_t{first} + count;
+  const std::ptrdiff_t width = size.width, bottomRow = static_cast<std::ptrdiff_t>(first) + count;
 
   // Where the source's first pixel goes, and how far apart its neighbours to the right and below
   // come to stand.

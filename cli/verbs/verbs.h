@@ -16,6 +16,7 @@ void addKeypoints(CommandLine& commandLine);
 void addMasks(CommandLine& commandLine);
 void addPages(CommandLine& commandLine);  // for the build
 void addScore(CommandLine& commandLine);
+void addSelftest(CommandLine& commandLine);
 void addSheet(CommandLine& commandLine);
 void addUndo(CommandLine& commandLine);
 void addWatch(CommandLine& commandLine);

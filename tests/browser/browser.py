@@ -12,7 +12,7 @@ import urllib.request
 SKIPPED = 77
 ELEMENT = "element-6066-11e4-a52e-4f735466cecf"
 TAB, SPACE, ENTER = "\ue004", " ", "\ue007"
-LEFT, HOME = "\ue012", "\ue011"
+CONTROL, SHIFT, LEFT, RIGHT, HOME = "\ue009", "\ue008", "\ue012", "\ue014", "\ue011"
 
 
 def skip_unless_installed():
@@ -26,7 +26,7 @@ def skip_unless_installed():
 class Browser:
     """A browser with one window; gone at the end of its `with`."""
 
-    def __init__(self, downloads, width=1000, height=900):
+    def __init__(self, downloads, width=1000, height=900, arguments=()):
         self.driver = subprocess.Popen(
             ["chromedriver", "--port=0"], stdout=subprocess.PIPE, stderr=subprocess.DEVNULL, text=True
         )
@@ -39,7 +39,7 @@ class Browser:
             raise RuntimeError("chromedriver does not start")
         self.url = f"http://127.0.0.1:{port}/session"
         arguments = ["--headless=new", "--no-sandbox", "--disable-gpu", "--disable-dev-shm-usage",
-                     f"--window-size={width},{height}"]
+                     f"--window-size={width},{height}", *arguments]
         options = {
             "args": arguments,
             "prefs": {"download.default_directory": str(downloads)},
@@ -80,6 +80,25 @@ class Browser:
         """Shows a file."""
         self._post("/url", {"url": path.as_uri()})
 
+    def visit(self, url):
+        """Shows a page."""
+        self._post("/url", {"url": url})
+
+    def emulate(self, width, height, dark=False):
+        """Makes the page as large as this, which may be less than a window can be."""
+        self._command("Emulation.setDeviceMetricsOverride",
+                      {"width": width, "height": height, "deviceScaleFactor": 1, "mobile": False})
+        scheme = {"name": "prefers-color-scheme", "value": "dark" if dark else "light"}
+        self._command("Emulation.setEmulatedMedia", {"features": [scheme]})
+
+    def _command(self, name, parameters):
+        self._post("/goog/cdp/execute", {"cmd": name, "params": parameters})
+
+    def choose(self, selector, *paths):
+        """Gives files to an input of files."""
+        text = "\n".join(map(str, paths))
+        self._post(f"/element/{self.find(selector)}/value", {"text": text})
+
     def run(self, script, *arguments):
         """What a script returns."""
         return self._post("/execute/sync", {"script": script, "args": list(arguments)})
@@ -109,6 +128,23 @@ class Browser:
         finger = {"type": "pointer", "id": pointer, "actions": steps}
         finger["parameters"] = {"pointerType": pointer}
         self._post("/actions", {"actions": [finger]})
+
+    def chord(self, *keys):
+        """Presses keys together."""
+        actions = [{"type": "keyDown", "value": key} for key in keys]
+        actions += [{"type": "keyUp", "value": key} for key in reversed(keys)]
+        self._post("/actions", {"actions": [{"type": "key", "id": "keyboard", "actions": actions}]})
+
+    def wait_until(self, script, *arguments, seconds=30):
+        """Waits until a script returns something true, and returns that."""
+        end = time.monotonic() + seconds
+        while True:
+            value = self.run(script, *arguments)
+            if value:
+                return value
+            if time.monotonic() > end:
+                raise RuntimeError(f"it does not come: {script}")
+            time.sleep(0.02)
 
     def complaints(self):
         """What the console has been told since it was last asked: errors of scripts, what was refused."""

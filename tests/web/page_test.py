@@ -1,0 +1,341 @@
+"""page_test.py DIST: the page in a real browser, as a person uses it. PHOTOS names the photos of
+tests/web/photos.cpp, QUENBY the command whose files must come out, AXE the script of axe-core. Where
+QUENBY_SCREENSHOTS names a folder, pictures of the page are left there."""
+
+import base64
+import hashlib
+import json
+import os
+import pathlib
+import subprocess
+import sys
+import tempfile
+import time
+import zipfile
+
+root = pathlib.Path(__file__).resolve().parents[2]
+sys.path.insert(0, str(root / "tests/browser"))
+import browser  # noqa: E402
+
+QUENBY = os.environ["QUENBY"]
+PHOTOS = pathlib.Path(os.environ["PHOTOS"])
+SHOWN = "return document.querySelector('#seen').textContent !== '' && !document.body.classList.contains('busy')"
+LOOKS = "return document.body.classList.contains('looks-shown')"
+
+
+class Page:
+    """The window, and what is asked of the page again and again."""
+
+    def __init__(self, window, downloads):
+        self.window, self.downloads = window, downloads
+
+    def __getattr__(self, name):
+        return getattr(self.window, name)
+
+    def open_photos(self, *paths):
+        self.choose("#files", *paths)
+        self.wait_until("return document.title.startsWith(arguments[0])", paths[0].name)
+        self.wait_until(SHOWN)
+        self.wait_until(LOOKS)
+
+    def shown(self):
+        self.wait_until(SHOWN)
+
+    def text(self, selector):
+        return self.run("return document.querySelector(arguments[0]).textContent", selector)
+
+    def saved(self, name):
+        """The bytes of a download, which goes."""
+        path = self.downloads / name
+        browser.wait_for(path)
+        data = path.read_bytes()
+        path.unlink()
+        return data
+
+    def picture_hash(self, selector):
+        """Of a canvas that the worker draws on, as it is seen."""
+        return hashlib.sha256(base64.b64decode(self.window._send(
+            "GET", f"/element/{self.find(selector)}/screenshot"))).hexdigest()
+
+    def until(self, condition, otherwise, seconds=20):
+        end = time.monotonic() + seconds
+        while not condition():
+            assert time.monotonic() < end, otherwise
+
+    def problems(self):
+        return self.run("return [...document.querySelectorAll('#problems span')].map(p => p.textContent)")
+
+    def forget_problems(self):
+        self.run("document.querySelectorAll('#problems button').forEach(b => b.click())")
+
+
+def command(*arguments, place):
+    out = place / "command_out"
+    subprocess.run([QUENBY, *map(str, arguments), "-o", out, "--overwrite", "--quiet"], check=True)
+    return out.read_bytes()
+
+
+def slide(page, value):
+    """Moves the first slider as keys do: input, then change."""
+    page.run(
+        "const s = document.querySelector('#settings input[type=range]'); s.value = arguments[0];"
+        "s.dispatchEvent(new Event('input')); s.dispatchEvent(new Event('change'))", value)
+
+
+def test_saves_the_commands_bytes(page, place):
+    photo = PHOTOS / "large.jpg"
+    page.open_photos(photo)
+    before = page.picture_hash("#stage")
+    slide(page, 0.85)
+    page.until(lambda: page.picture_hash("#stage") != before, "the slider changes nothing")
+    page.chord(browser.CONTROL, "s")
+    assert page.saved("large_AE0.jpg") == command("enhance", photo, "--slider", "0.85", place=place)
+    page.click("#undo")
+    page.click("#save")
+    first = command("enhance", photo, "--slider", page.run("return document.querySelector('#setting-slider').value"), place=place)
+    assert page.saved("large_AE0.jpg") == first
+    page.click("#redo")
+    page.click("#save")
+    assert page.saved("large_AE0.jpg") != first
+    page.run("document.querySelector('#looks input[value=ZebraBW]').click()")
+    page.click("#save")
+    assert page.saved("large_ZebraBW.jpg") == command("look", "ZebraBW", photo, place=place)
+    # Another format loses what it cannot hold, and says so.
+    page.run("document.querySelector('#file-panel').open = true; document.querySelector('#format').value = 'PNG'")
+    page.click("#save")
+    page.saved("large_ZebraBW.png")
+    page.run("document.querySelector('#format').value = ''")
+
+
+def test_fits_narrow_pages(page):
+    page.emulate(360, 740)
+    assert page.run("return document.documentElement.scrollWidth") <= 360
+    page.emulate(1280, 900)
+
+
+def test_shows_one_to_one(page):
+    page.press("1")
+    page.wait_until("return document.querySelector('#seen').textContent === 'Full size, 100 %'")
+    assert page.run("return !document.querySelector('#detail-after').hidden")
+    page.press("0")
+    assert page.text("#seen").startswith("Preview, "), page.text("#seen")
+
+
+def test_compares(page):
+    page.run("document.querySelector('#divider').focus()")
+    page.press(browser.RIGHT, browser.RIGHT)
+    assert page.run("return document.querySelector('#divider').getAttribute('aria-valuenow')") == "54"
+    page.drag("#divider", (0.5, 0.5), (-1.5, 0.5))
+    assert int(page.run("return document.querySelector('#divider').getAttribute('aria-valuenow')")) < 54
+    page.click("#compare")
+    assert page.run("return getComputedStyle(document.querySelector('#divider')).display") == "none"
+    page.click("#compare")
+
+
+def test_faces(page, place):
+    photo = PHOTOS / "twenty/faces.jpg"
+    page.open_photos(photo)
+    page.run("document.querySelector('#face-panel').open = true")
+    page.wait_until("return document.querySelectorAll('.face').length === 1")
+    assert page.text(".face span") == "Ada"
+    page.click("#save")
+    slider = page.run("return document.querySelector('#setting-slider').value")
+    assert page.saved("faces_AE0.jpg") == command("enhance", photo, "--slider", slider, place=place)
+    page.run("document.querySelector('.face').focus()")
+    page.press(browser.RIGHT)
+    page.click("#save")
+    moved = page.saved("faces_AE0.jpg")
+    sides = page.run("const s = document.querySelector('.face').style;"
+                     "return [s.left, s.top, s.width, s.height].map(parseFloat)")
+    assert abs(sides[0] - 31) < 1e-6, sides
+    face = "0.31000000000000005,0.2,0.51,0.5"
+    assert moved == command("enhance", photo, "--slider", slider, "--faces", "none", "--face", face, place=place)
+    page.click("#add-face")
+    assert page.text("#face-count") == "2"
+    page.press("\ue017")
+    assert page.text("#face-count") == "1"
+
+
+def test_measures(page):
+    page.run("document.querySelector('#file-panel').open = true")
+    page.click("#score")
+    page.wait_until("return document.querySelector('#scores').value.includes('after')")
+    blank = "const c = document.querySelector(arguments[0]); return c.getContext('2d').getImageData(0, 0, c.width, c.height).data.some(x => x !== 0)"
+    page.wait_until(blank, "#histogram")
+    page.wait_until(blank, "#curve")
+    assert page.run("return [...document.querySelectorAll('.look canvas')].every(c => c.width > 50)")
+
+
+def test_many(page, place):
+    page.open_photos(*(PHOTOS / "similar" / f"{name}.jpg" for name in "abc"))
+    group = ", near-duplicate, group 1"
+    page.wait_until("return [...document.querySelectorAll('.shot')].map(s => s.title).join() === arguments[0]",
+                    f"large.jpg,faces.jpg,a.jpg{group},b.jpg{group},c.jpg")
+    page.click("#save-all")
+    archive = place / "photos.zip"
+    archive.write_bytes(page.saved("photos.zip"))
+    with zipfile.ZipFile(archive) as files:
+        assert files.testzip() is None
+        for name in "abc":
+            expected = command("enhance", PHOTOS / "similar" / f"{name}.jpg", "--slider", "0.4", place=place)
+            assert files.read(f"{name}_AE0.jpg") == expected, name
+
+
+def test_drops_and_pastes(page):
+    data = base64.b64encode((PHOTOS / "twenty/plain.jpg").read_bytes()).decode()
+    give = """const bytes = Uint8Array.from(atob(arguments[0]), c => c.charCodeAt(0));
+      const data = new DataTransfer(); data.items.add(new File([bytes], arguments[1], { type: 'image/jpeg' }));
+      document.body.dispatchEvent(arguments[2] === 'drop'
+        ? new DragEvent('drop', { dataTransfer: data, bubbles: true, cancelable: true })
+        : new ClipboardEvent('paste', { clipboardData: data, bubbles: true }))"""
+    for how in ("drop", "paste"):
+        page.run(give, data, f"{how}.jpg", how)
+        page.wait_until("return document.title.startsWith(arguments[0])", how)
+        page.shown()
+
+
+def test_hostile_files(page):
+    for name, words in (("empty.jpg", "empty"), ("cut.jpg", "truncated"), ("bomb.jpg", "pixels"),
+                        ("text.jpg", "not a JPEG or PNG"), ("page.png", "not a JPEG or PNG")):
+        page.choose("#files", PHOTOS / "hostile" / name)
+        said = page.wait_until("return [...document.querySelectorAll('#problems span')].map(p => p.textContent).join()")
+        assert said.startswith(name) and words in said, said
+        page.forget_problems()
+    page.open_photos(PHOTOS / "twenty/cmyk.jpg")
+
+
+def test_keyboard_alone(page, url):
+    """From the empty page to a saved photo; only the file dialog is not the page's."""
+    page.visit(url)
+    page.wait_until("return document.body.classList.contains('ready')")
+    page.press(browser.TAB)
+    assert page.run("return document.activeElement.id") == "open"
+    page.open_photos(PHOTOS / "twenty/orientation6.jpg")
+    seen = set()
+    page.run("document.body.focus(); document.activeElement.blur()")
+    for _ in range(40):
+        page.press(browser.TAB)
+        here = page.run("const e = document.activeElement; return e.id || e.name || e.className || e.tagName")
+        if here in seen and here == "open":
+            break
+        seen.add(here)
+    for wanted in ("open", "save", "stage", "divider", "compare", "look", "setting-slider"):
+        assert wanted in seen, (wanted, seen)
+    page.run("document.querySelector('#setting-slider').focus()")
+    before = page.run("return document.activeElement.value")
+    page.press(browser.RIGHT)
+    after = page.run("return document.activeElement.value")
+    assert float(after) > float(before)
+    page.press("c")
+    assert page.run("return document.querySelector('#compare').getAttribute('aria-pressed')") == "false"
+    page.press("c")
+    page.chord(browser.CONTROL, "z")
+    assert page.run("return document.querySelector('#setting-slider').value") == before
+    page.chord(browser.CONTROL, "s")
+    page.saved("orientation6_AE0.jpg")
+
+
+def test_selftest(page):
+    page.press("?")
+    page.wait_until("return document.querySelectorAll('#licences details').length > 7")
+    page.click("#selftest")
+    page.wait_until("return !document.querySelector('#table').hidden")
+    native = subprocess.run([QUENBY, "selftest", "--quiet"], capture_output=True, text=True, check=True).stdout
+    assert page.text("#table") == native
+    assert page.text("#digest").endswith(hashlib.sha256(native.encode()).hexdigest())
+    page.run("document.querySelector('#about-box').close()")
+
+
+def test_accessible(page):
+    script = pathlib.Path(os.environ["AXE"]).read_text()
+    page.run(script + "\nwindow.axe = axe;")
+    for about in (False, True):
+        if about:
+            page.press("?")
+        found = page.window._post("/execute/async", {
+            "script": "const done = arguments[0]; axe.run().then(r => done(r.violations.map("
+                      "v => [v.impact, v.id, v.nodes.map(n => n.html.slice(0, 120))])), e => done(String(e)))",
+            "args": []})
+        serious = [one for one in found if one[0] in ("serious", "critical")]
+        assert not serious, json.dumps(serious, indent=1)
+    page.run("document.querySelector('#about-box').close()")
+
+
+def test_offline(page, server, url):
+    page.wait_until("return navigator.serviceWorker.controller !== null")
+    server.terminate()
+    server.wait()
+    page.visit(url)
+    page.wait_until("return document.body.classList.contains('ready')")
+    page.open_photos(PHOTOS / "twenty/plain.jpg")
+    page.click("#save")
+    page.saved("plain_AE0.jpg")
+
+
+def screenshots(page):
+    folder = os.environ.get("QUENBY_SCREENSHOTS")
+    if folder is None:
+        return
+    folder = pathlib.Path(folder)
+    for width, height, dark in ((1440, 900, True), (820, 1180, False), (360, 740, True)):
+        page.emulate(width, height, dark)
+        time.sleep(0.5)
+        page.screenshot(folder / f"page_{width}.png")
+    page.emulate(1280, 900)
+
+
+def requests_of(origin, log):
+    """Every address that the page, its workers and its service worker asked any host for. What Chromium
+    asks on its own account has no initiator."""
+    urls = set()
+    for line in log.read_text().splitlines():  # an event each, within a frame
+        try:
+            told = json.loads(line.rstrip(",")).get("params", {})
+        except json.JSONDecodeError:
+            continue
+        if told.get("initiator") == origin:
+            urls.add(told["url"])
+    assert f"{origin}/app.js" in urls, "the log does not tell what the page asks for"
+    return urls
+
+
+def main(dist):
+    server = subprocess.Popen(["node", str(root / "web/serve.mjs"), dist, "0"], stdout=subprocess.PIPE, text=True)
+    try:
+        url = server.stdout.readline().strip()
+        with tempfile.TemporaryDirectory() as place:
+            place = pathlib.Path(place).resolve()
+            downloads, log = place / "downloads", place / "network.json"
+            downloads.mkdir()
+            arguments = [f"--log-net-log={log}"]
+            with browser.Browser(downloads, 1280, 900, arguments) as window:
+                page = Page(window, downloads)
+                page.visit(url)
+                page.wait_until("return document.body.classList.contains('ready')")
+                if "QUENBY_SCREENSHOTS" in os.environ:
+                    page.screenshot(pathlib.Path(os.environ["QUENBY_SCREENSHOTS"]) / "page_empty.png")
+                test_saves_the_commands_bytes(page, place)
+                screenshots(page)
+                test_fits_narrow_pages(page)
+                test_shows_one_to_one(page)
+                test_compares(page)
+                test_faces(page, place)
+                test_measures(page)
+                test_many(page, place)
+                test_drops_and_pastes(page)
+                test_hostile_files(page)
+                test_accessible(page)
+                test_selftest(page)
+                test_keyboard_alone(page, url)
+                assert page.complaints() == [], page.complaints()
+                test_offline(page, server, url)
+            strangers = {found for found in requests_of(url.rstrip("/"), log) if not found.startswith(url)}
+            assert not strangers, strangers
+    finally:
+        server.terminate()
+        server.wait()
+    print("the page: all well")
+
+
+if __name__ == "__main__":
+    main(*sys.argv[1:])
