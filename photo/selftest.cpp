@@ -14,6 +14,7 @@
 #include "image_processing/filters/filtered_image.h"
 #include "image_processing/quality/niqe.h"
 #include "photo/faces.h"
+#include "photo/photo.h"
 
 namespace pelorin::photo {
 namespace {

@@ -49,7 +49,7 @@ void addSelftest(CommandLine& commandLine) {
                                   "Print hashes of every filter's results, which every machine and "
                                   "every front end has the same",
                                   "quenby selftest\n"
-                                  "quenby selftest | diff - selftest-of-another-machine.txt",
+                                  "quenby selftest > this_machine.txt",
                                   [options] { return runSelftest(*options); });
   verb.flag("-q,--quiet", options->quiet, "Do not tell which instruction sets were compared");
 }
