@@ -48,7 +48,8 @@ int old_pthread_detach(pthread_t thread);
 int old_pthread_key_create(pthread_key_t* key, void (*destroy)(void*));
 int old_pthread_key_delete(pthread_key_t key);
 void* old_pthread_getspecific(pthread_key_t key);
-int old_pthread_setspecific(pthread_key_t key, const void* value);
+int old_pthread_setspecific(pthread_key_t key,
+                            std::uintptr_t value);  // no pointer, for g++'s peace
 FIRST(pthread_create);
 FIRST(pthread_join);
 FIRST(pthread_detach);
@@ -87,8 +88,7 @@ void* pthread_getspecific(pthread_key_t key) {
   return old_pthread_getspecific(key);
 }
 int pthread_setspecific(pthread_key_t key, const void* value) {
-  asm("" : "+r"(value));  // g++ takes it to point at something that may not be initialised
-  return old_pthread_setspecific(key, value);
+  return old_pthread_setspecific(key, reinterpret_cast<std::uintptr_t>(value));
 }
 
 // 2.33, before which the struct's version was told in every call. The functions for large files are
