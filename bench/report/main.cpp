@@ -1,6 +1,6 @@
 // performance_report FOLDER [PART...]: measures, and writes what it finds into FOLDER's
 // performance.md, each part between its two marks, and the plots beside it. Parts: machine,
-// stages, files, scale; all of them unless some are named.
+// stages, files, threads, memory, scale; all of them unless some are named.
 #include <fmt/chrono.h>
 #include <fmt/format.h>
 
@@ -12,6 +12,7 @@
 #include <map>
 #include <stdexcept>
 
+#include "bench/report/memory.h"
 #include "bench/report/scale.h"
 #include "bench/report/stages.h"
 #include "bench/report/threads.h"
@@ -71,6 +72,7 @@ void report(const std::string& folder, const std::vector<std::string>& wanted) {
       {"stages", stagesTable},
       {"files", [] { return wholeFileTable(QUENBY_COMMAND, AVX2_COMMAND); }},
       {"threads", threadsTable},
+      {"memory", [] { return memoryTable(QUENBY_COMMAND); }},
       {"scale", [&] { return scale(folder); }},
   };
   const std::string path = folder + "/performance.md";
@@ -90,7 +92,8 @@ void report(const std::string& folder, const std::vector<std::string>& wanted) {
 
 int main(int argc, char** argv) {
   if (argc < 2) {
-    std::fputs("performance_report FOLDER [machine|stages|files|threads|scale ...]\n", stderr);
+    std::fputs("performance_report FOLDER [machine|stages|files|threads|memory|scale ...]\n",
+               stderr);
     return 2;
   }
   try {

@@ -17,7 +17,7 @@ struct ShownPhoto {
 
   /// @throws std::bad_alloc.
   ShownPhoto(const Pixels& photo);
-  ShownPhoto(Pixels pixels, photo::PictureSize size) : pixels(std::move(pixels)), size(size) {}
+  ShownPhoto(Pixels shown, photo::PictureSize whole) : pixels(std::move(shown)), size(whole) {}
 
   /// Of its pixels.
   static photo::PictureSize shownSize(photo::PictureSize photo);
