@@ -30,7 +30,8 @@ set(PELORIN_PHOTO_API
     photo/photo.h
     photo/photo_rows.h
     photo/photo_writer.h
-    photo/thread_workers.h)
+    photo/thread_workers.h
+    photo/time_limit.h)
 
 # pelorin_headers_of(<variable> <root> <header>...): the headers, and what they include below the root.
 function(pelorin_headers_of variable root)

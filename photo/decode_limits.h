@@ -11,6 +11,11 @@ struct DecodeLimits {
   /// Pixels times scans of a file of several scans, beside 4096 for each of its bytes: no photo comes
   /// near, while a file of 71 kB may ask for 99 scans over 33 megapixels.
   std::uint64_t scannedPixels = 536'870'912;
+  /// Before a JPEG file's picture data; profiles of 16 MB and extended XMP of 64 MB take 1300 together.
+  int segments = 4096;
+  /// Pixels of a PNG or an arithmetic coded JPEG file, beside 128 for each of its bytes: 64 kB may else
+  /// ask for all of `pixels`.
+  std::uint64_t compressedPixels = 40'000'000;
 };
 
 }  // namespace pelorin::photo

@@ -141,9 +141,13 @@ bool isTemporaryName(std::string_view name) {
 }  // namespace
 
 void refuseSize(const ReadOptions& options) {
-  throw PhotoError(PhotoError::Kind::tooLarge, "is larger than " +
-                                                   std::to_string(options.largest >> 20) +
-                                                   " MiB, the most that is read of a file");
+  constexpr int bitsOfMiB = 20;
+  const bool wholeMiB = options.largest % (std::uint64_t{1} << bitsOfMiB) == 0;
+  throw PhotoError(PhotoError::Kind::tooLarge,
+                   "is larger than " +
+                       (wholeMiB ? std::to_string(options.largest >> bitsOfMiB) + " MiB"
+                                 : std::to_string(options.largest) + " bytes") +
+                       ", the most that is read of a file");
 }
 
 std::vector<std::uint8_t> readFile(const std::string& path, const ReadOptions& options) {

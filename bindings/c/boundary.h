@@ -4,15 +4,18 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
+#include <optional>
 #include <stdexcept>
 #include <stop_token>
 #include <string>
 #include <utility>
 
 #include "bindings/c/quenby/quenby.h"
+#include "photo/time_limit.h"
 
 struct quenby_cancel {
-  std::stop_source source;
+  std::stop_source source = {};
+  std::optional<pelorin::photo::TimeLimit> limit = {};  ///< Follows the source, where it is there.
 };
 
 namespace pelorin::c_api {
@@ -111,7 +114,8 @@ void give(T* to, T value, const char* name) {
 }
 
 inline std::stop_token tokenOf(const quenby_cancel* cancel) {
-  return cancel == nullptr ? std::stop_token() : cancel->source.get_token();
+  if (cancel == nullptr) return {};
+  return cancel->limit ? cancel->limit->token() : cancel->source.get_token();
 }
 
 }  // namespace pelorin::c_api

@@ -1,3 +1,6 @@
+#include <chrono>
+#include <memory>
+
 #include "bindings/c/boundary.h"
 #include "image_processing/quality/niqe.h"
 
@@ -20,6 +23,17 @@ int32_t quenby_cancel_new(quenby_cancel** cancel, quenby_error* error) {
   return guarded(error, [&] {
     required(cancel, "cancel");
     *cancel = new quenby_cancel;
+  });
+}
+
+int32_t quenby_cancel_new_after(uint32_t milliseconds, quenby_cancel** cancel,
+                                quenby_error* error) {
+  if (cancel != nullptr) *cancel = nullptr;
+  return guarded(error, [&] {
+    required(cancel, "cancel");
+    auto made = std::make_unique<quenby_cancel>();
+    made->limit.emplace(std::chrono::milliseconds(milliseconds), made->source.get_token());
+    *cancel = made.release();
   });
 }
 

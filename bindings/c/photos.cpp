@@ -37,6 +37,11 @@ photo::OpenOptions openOptions(const quenby_open_options* given, const quenby_ca
   if (options.max_pixels != 0) open.limits.pixels = options.max_pixels;
   if (options.max_scans < 0) refuse("max_scans", "is negative");
   if (options.max_scans != 0) open.limits.scans = options.max_scans;
+  if (options.max_scanned_pixels != 0) open.limits.scannedPixels = options.max_scanned_pixels;
+  if (options.max_compressed_pixels != 0)
+    open.limits.compressedPixels = options.max_compressed_pixels;
+  if (options.max_segments < 0) refuse("max_segments", "is negative");
+  if (options.max_segments != 0) open.limits.segments = options.max_segments;
   return open;
 }
 

@@ -68,6 +68,17 @@ void tellLosses(JNIEnv* env, const std::vector<photo::Loss>& losses, jobjectArra
   jni::throwCppExceptionIf(env->ExceptionCheck() != JNI_FALSE);
 }
 
+photo::DecodeLimits limitsOf(jlong maxPixels, jint maxScans, jint maxSegments) {
+  if (maxPixels < 0 || maxScans < 0 || maxSegments < 0) {
+    throw std::invalid_argument("limits: are negative");
+  }
+  photo::DecodeLimits limits;
+  if (maxPixels != 0) limits.pixels = static_cast<std::uint64_t>(maxPixels);
+  if (maxScans != 0) limits.scans = maxScans;
+  if (maxSegments != 0) limits.segments = maxSegments;
+  return limits;
+}
+
 GreenCDF cdfOf(JNIEnv* env, jfloatArray array) {
   const std::vector<float> values = floatsOf(env, array);
   GreenCDF cdf;
@@ -81,14 +92,16 @@ GreenCDF cdfOf(JNIEnv* env, jfloatArray array) {
 jbyteArray filterBytes(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
                        jint length, jint quality, jint subsampling, jint rotation,
                        jfloatArray faces, jint scale, jstring filter, jstring params, jboolean mark,
-                       jlong cancel, jobjectArray lost) {
+                       jlong cancel, jobjectArray lost, jlong maxPixels, jint maxScans,
+                       jint maxSegments) {
   const std::stop_token stop = cancellations().token(cancel);
   const std::optional<photo::ChromaSampling> sampling = samplingOf(subsampling);
+  const photo::DecodeLimits limits = limitsOf(maxPixels, maxScans, maxSegments);
   const photo::FilterRequest request{
       .filter = toString(env, filter),
       .params = toString(env, params),
       .faces = facesOf(env, faces),
-      .open = {.scale = scale, .rotate = rotation, .stop = stop},
+      .open = {.scale = scale, .rotate = rotation, .limits = limits, .stop = stop},
       .save = {.quality = quality, .stop = stop, .sampling = sampling},
       .mark = mark != JNI_FALSE};
   const FileBytes file(env, array, buffer, offset, length);
@@ -99,25 +112,30 @@ jbyteArray filterBytes(JNIEnv* env, jobject, jbyteArray array, jobject buffer, j
 }
 
 jfloat niqe(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset, jint length,
-            jlong cancel) {
+            jlong cancel, jlong maxPixels, jint maxScans, jint maxSegments) {
+  const photo::DecodeLimits limits = limitsOf(maxPixels, maxScans, maxSegments);
   const FileBytes file(env, array, buffer, offset, length);
-  return photo::scoreOf(file.bytes(), cancellations().token(cancel));
+  return photo::scoreOf(file.bytes(), cancellations().token(cancel), {}, limits);
 }
 
 jfloatArray niqeMeanFeatures(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
-                             jint length, jlong cancel) {
+                             jint length, jlong cancel, jlong maxPixels, jint maxScans,
+                             jint maxSegments) {
+  const photo::DecodeLimits limits = limitsOf(maxPixels, maxScans, maxSegments);
   const FileBytes file(env, array, buffer, offset, length);
-  photo::PhotoRows photo(file.bytes(), {.faces = false, .stop = cancellations().token(cancel)});
+  photo::PhotoRows photo(file.bytes(),
+                         {.faces = false, .limits = limits, .stop = cancellations().token(cancel)});
   const auto [width, height] = photo.size();
   image_processing::RowSource& rows = photo.sweep(/*again=*/false);
   return javaArray(env, image_processing::analyzeNiqe(width, height, rows).meanFeatures);
 }
 
 jfloatArray greenCdf(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
-                     jint length, jlong cancel) {
+                     jint length, jlong cancel, jlong maxPixels, jint maxScans, jint maxSegments) {
+  const photo::DecodeLimits limits = limitsOf(maxPixels, maxScans, maxSegments);
   const FileBytes file(env, array, buffer, offset, length);
   return javaArray(env, photo::readPhotoRecord(file.bytes(), photo::automaticScale,
-                                               cancellations().token(cancel))
+                                               cancellations().token(cancel), limits)
                             .cdf);
 }
 
@@ -167,13 +185,14 @@ void freeCancel(JNIEnv*, jobject, jlong handle) {
 
 void registerPhotoNatives() {
   const JNINativeMethod methods[] = {
-      nativeMethod("filter",
-                   "([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[B)[B",
-                   photoNative<&filterBytes>()),
-      nativeMethod("niqe", "([BLjava/nio/ByteBuffer;IIJ)F", photoNative<&niqe>()),
-      nativeMethod("niqeFeatures", "([BLjava/nio/ByteBuffer;IIJ)[F",
+      nativeMethod(
+          "filter",
+          "([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[BJII)[B",
+          photoNative<&filterBytes>()),
+      nativeMethod("niqe", "([BLjava/nio/ByteBuffer;IIJJII)F", photoNative<&niqe>()),
+      nativeMethod("niqeFeatures", "([BLjava/nio/ByteBuffer;IIJJII)[F",
                    photoNative<&niqeMeanFeatures>()),
-      nativeMethod("greenCdf", "([BLjava/nio/ByteBuffer;IIJ)[F", photoNative<&greenCdf>()),
+      nativeMethod("greenCdf", "([BLjava/nio/ByteBuffer;IIJJII)[F", photoNative<&greenCdf>()),
       nativeMethod("facts", "([BLjava/nio/ByteBuffer;II)[D", photoNative<&facts>()),
       nativeMethod("distance", "([F[F)F", photoNative<&distance>()),
       nativeMethod("score", "(FDZ)F", photoNative<&score>()),

@@ -8,6 +8,7 @@
 #include <utility>
 
 #include "cli/frame/interrupt.h"
+#include "cli/frame/photo_files.h"
 #include "cli/frame/small_picture.h"
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
 #include "image_processing/autoenhance/lightness/cdf.h"
@@ -29,7 +30,7 @@ using Picture = std::shared_ptr<Image<RGBA8Pixel>>;
 // Reads it at a scale of its own, beside the one that `options` have.
 photo::Photo openFor(std::uint32_t side, std::span<const std::uint8_t> file,
                      photo::OpenOptions options) {
-  options.stop = interruptToken();
+  options = limited(std::move(options));
   if (!options.raw) {
     const photo::PhotoFacts facts = photo::readFacts(file);
     options.scale = std::max(options.scale, scaleForSide({facts.width, facts.height}, side));
@@ -120,7 +121,7 @@ Comparison compareFiles(const ComparedFiles& files, const ComparisonSize& size) 
   photo::PictureSize whole{before.image->width, before.image->height};
   photo::Photo after;
   if (changed) {
-    photo::OpenOptions plain = {.faces = false, .limits = files.open.limits};
+    photo::OpenOptions plain = {.faces = false};
     if (files.open.raw) plain.raw = whole;
     after = openFor(size.side, files.after, plain);
     whole = {after.image->width, after.image->height};

@@ -5,6 +5,7 @@
 #include "cli/frame/errors.h"
 #include "cli/frame/interrupt.h"
 #include "cli/frame/jobs.h"
+#include "cli/frame/limits.h"
 
 namespace pelorin::cli {
 
@@ -26,11 +27,14 @@ PhotoTally runPhotoLoop(const std::vector<Input>& photos, int jobs, Talk& talk,
       reasons[index] = photos[index].trouble;
       return;
     }
+    const TimeLimited limited(limits().seconds);
     try {
       stopIfInterrupted();
       loop.work(index);
     } catch (const Interrupted&) {
-      throw;
+      if (!limited.passed()) throw;
+      reasons[index] = loop.failure + "takes longer than " + std::to_string(limits().seconds) +
+                       " s; raise --timeout";
     } catch (const std::exception& error) {
       reasons[index] = loop.failure + explain(error);
     }

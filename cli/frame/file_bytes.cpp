@@ -8,6 +8,7 @@
 
 #include "cli/frame/errors.h"
 #include "cli/frame/interrupt.h"
+#include "cli/frame/limits.h"
 #include "photo/backup.h"
 
 namespace pelorin::cli {
@@ -25,7 +26,8 @@ void writeStream(std::FILE* stream, std::span<const std::uint8_t> bytes) {
 }  // namespace
 
 std::vector<std::uint8_t> readInput(const Input& input) {
-  const photo::ReadOptions options = {.wait = {.stop = interruptToken()}};
+  const photo::ReadOptions options = {.largest = limits().bytes,
+                                      .wait = {.stop = interruptToken()}};
   return input.isStandardInput() ? photo::readDescriptor(STDIN_FILENO, input.path, options)
                                  : photo::readFile(input.path, options);
 }

@@ -11,7 +11,7 @@
 namespace pelorin::cli {
 
 /// All bytes of a file or of standard input, the one place where inputs are read: no more of them than
-/// `photo::ReadOptions` allows.
+/// `limits` allow.
 /// @throws as `photo::readFile`; Interrupted on Ctrl-C while waiting.
 std::vector<std::uint8_t> readInput(const Input& input);
 

@@ -142,8 +142,7 @@ void findMarks(const Work& work, int jobs, std::vector<PlannedFile>& plan) {
 }
 
 Done process(const Work& work, const PlannedFile& file, Talk& talk) {
-  photo::OpenOptions open = work.photo;
-  open.stop = interruptToken();
+  const photo::OpenOptions open = limited(work.photo);
   photo::RowResources resources = work.pixels->resources();
   resources.workers = work.workers.get();
   const std::vector<std::uint8_t> bytes = readInput(file.input);

@@ -13,6 +13,7 @@
 #include "cli/frame/errors.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/interrupt.h"
+#include "cli/frame/limits.h"
 #include "photo/format.h"
 
 namespace fs = std::filesystem;
@@ -201,6 +202,7 @@ void addInputOptions(Verb verb, InputOptions& options) {
       .oneValueEach()
       .type("GLOB")
       .group("Input");
+  addLimitOptions(verb);
 }
 
 std::string aPhotoFile() {

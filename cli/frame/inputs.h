@@ -18,7 +18,7 @@ struct InputOptions {
   std::vector<std::string> excluded = {};  ///< Globs.
 };
 
-/// Adds the positional IN..., `--files-from`, `-r`, `--hidden` and `--exclude` to a verb.
+/// Adds the positional IN..., `--files-from`, `-r`, `--hidden`, `--exclude` and the limits to a verb.
 void addInputOptions(Verb verb, InputOptions& options);
 
 /// "a JPEG or PNG file, or - (standard input)", for the help.

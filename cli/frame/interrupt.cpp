@@ -14,6 +14,7 @@ namespace pelorin::cli {
 namespace {
 
 std::stop_source source;
+thread_local const photo::TimeLimit* timeOfThisThread = nullptr;
 std::atomic<const char*> lastWords = nullptr;
 static_assert(std::atomic<const char*>::is_always_lock_free);
 
@@ -58,8 +59,18 @@ void setLastWords(const char* text) {
   lastWords = text;
 }
 
+TimeLimited::TimeLimited(std::uint32_t seconds) {
+  if (seconds == 0) return;
+  limit_.emplace(std::chrono::seconds(seconds), source.get_token());
+  timeOfThisThread = &*limit_;
+}
+
+TimeLimited::~TimeLimited() {
+  timeOfThisThread = nullptr;
+}
+
 std::stop_token interruptToken() {
-  return source.get_token();
+  return timeOfThisThread != nullptr ? timeOfThisThread->token() : source.get_token();
 }
 
 bool interruptRequested() {
@@ -67,7 +78,7 @@ bool interruptRequested() {
 }
 
 void stopIfInterrupted() {
-  if (interruptRequested()) throw Interrupted();
+  if (interruptToken().stop_requested()) throw Interrupted();
 }
 
 }  // namespace pelorin::cli

@@ -1,8 +1,11 @@
 #pragma once
 
+#include <cstdint>
+#include <optional>
 #include <stop_token>
 
 #include "photo/photo_error.h"
+#include "photo/time_limit.h"
 
 namespace pelorin::cli {
 
@@ -17,14 +20,30 @@ void installInterruptHandler();
 /// text lives on.
 void setLastWords(const char* text);
 
-/// The mark, for work that is asked to stop by a token.
+/// While it lives, what its thread does has so much time: `interruptToken` then says stop.
+class TimeLimited {
+ public:
+  /// @param seconds  0 for as long as it takes.
+  explicit TimeLimited(std::uint32_t seconds);
+  ~TimeLimited();
+  TimeLimited(const TimeLimited&) = delete;
+  TimeLimited& operator=(const TimeLimited&) = delete;
+
+  bool passed() const { return limit_ && limit_->passed(); }
+
+ private:
+  std::optional<photo::TimeLimit> limit_;
+};
+
+/// The mark, for work that is asked to stop by a token. Threads whose time is limited have their own,
+/// which follows it.
 std::stop_token interruptToken();
 
-/// Whether the command was asked to stop. Any thread may ask.
+/// Whether the command was asked to stop, whatever the time. Any thread may ask.
 bool interruptRequested();
 
 /// To be called between the steps of a job.
-/// @throws Interrupted when the command was asked to stop.
+/// @throws Interrupted when the command was asked to stop, or this thread's time is over.
 void stopIfInterrupted();
 
 }  // namespace pelorin::cli

@@ -5,6 +5,7 @@
 #include <filesystem>
 
 #include "cli/frame/errors.h"
+#include "cli/frame/limits.h"
 #include "cli/frame/used_files.h"
 
 namespace fs = std::filesystem;
@@ -45,6 +46,7 @@ void addLoneOutputOptions(Verb verb, LoneOutputOptions& options, const std::stri
 
 void addLoneInput(Verb verb, std::string& name) {
   verb.option("IN", name, "A photo: " + aPhotoFile()).required();
+  addLimitOptions(verb);
 }
 
 Input loneInput(const std::string& name) {

@@ -1,20 +1,27 @@
 #include "cli/frame/photo_files.h"
 
 #include <filesystem>
+#include <utility>
 
 #include "cli/frame/errors.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/interrupt.h"
 #include "cli/frame/keep_option.h"
+#include "cli/frame/limits.h"
 
 namespace fs = std::filesystem;
 
 namespace pelorin::cli {
 
+photo::OpenOptions limited(photo::OpenOptions options) {
+  options.limits = limits().decode;
+  options.stop = interruptToken();
+  return options;
+}
+
 photo::Photo loadPhoto(const Input& input, photo::OpenOptions options, Talk& talk,
                        photo::SparePixels* spare) {
-  options.stop = interruptToken();
-  photo::Photo photo = photo::open(readInput(input), options, spare);
+  photo::Photo photo = photo::open(readInput(input), limited(std::move(options)), spare);
   tellNotices(input, photo.facts, talk);
   return photo;
 }

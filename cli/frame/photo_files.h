@@ -14,12 +14,15 @@
 
 namespace pelorin::cli {
 
-/// Reads a photo, decodes it and turns it upright, unless Ctrl-C comes between. What a user should
-/// know of the photo is said, each thing once in a run.
+/// Reads a photo, decodes it and turns it upright, within this run's limits and unless Ctrl-C comes
+/// between. What a user should know of the photo is said, each thing once in a run.
 /// @param spare  where the pixels of a decoded one may come from; may be null.
 /// @throws what reading and decoding throw, for `explain`; Interrupted on Ctrl-C.
 photo::Photo loadPhoto(const Input& input, photo::OpenOptions options, Talk& talk,
                        photo::SparePixels* spare = nullptr);
+
+/// The options with this run's limits, and with what stops this thread: for reading a photo now.
+photo::OpenOptions limited(photo::OpenOptions options);
 
 /// Adds `--quality` to a verb.
 void addQualityOption(Verb verb, int& quality);

@@ -29,6 +29,14 @@ Option Option::between(int lowest, int highest) {
   return type(std::to_string(lowest) + "-" + std::to_string(highest));
 }
 
+Option Option::inThousands() {
+  const std::map<std::string, std::uint64_t> units = {
+      {"k", 1'000}, {"M", 1'000'000}, {"G", 1'000'000'000}};
+  option_->transform(CLI::AsNumberWithUnit(units, CLI::AsNumberWithUnit::CASE_SENSITIVE));
+  option_->check(CLI::PositiveNumber);
+  return type("N");
+}
+
 Option Option::oneOf(std::initializer_list<const char*> values) {
   option_->check(
       CLI::IsMember(std::vector<std::string>(values.begin(), values.end())).description(""));
@@ -88,6 +96,10 @@ Option Verb::option(const std::string& names, int& value, const std::string& hel
 }
 
 Option Verb::option(const std::string& names, std::uint32_t& value, const std::string& help) {
+  return Option(app_->add_option(names, value, help));
+}
+
+Option Verb::option(const std::string& names, std::uint64_t& value, const std::string& help) {
   return Option(app_->add_option(names, value, help));
 }
 

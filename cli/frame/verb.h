@@ -32,6 +32,8 @@ class Option {
   Option help(const std::string& text);
   /// Takes whole numbers from `lowest` to `highest` only; that is also its type.
   Option between(int lowest, int highest);
+  /// Takes whole numbers above 0, which may end in k, M or G: thousands, millions, thousand millions.
+  Option inThousands();
   /// Takes these values only; they are also its type.
   Option oneOf(std::initializer_list<const char*> values);
   /// A list takes one value each time the option is given, not all words that follow.
@@ -70,6 +72,7 @@ class Verb {
                 const std::string& help);
   Option option(const std::string& names, int& value, const std::string& help);
   Option option(const std::string& names, std::uint32_t& value, const std::string& help);
+  Option option(const std::string& names, std::uint64_t& value, const std::string& help);
   /// Adds one whose value is asked for later, with `Option::text`.
   Option option(const std::string& names, const std::string& help);
   /// Adds an option without a value.

@@ -9,6 +9,7 @@
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/json_output.h"
+#include "cli/frame/limits.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/photo_files.h"
 #include "cli/frame/raw_option.h"
@@ -131,6 +132,7 @@ void addCompare(CommandLine& commandLine) {
       .type("WxH")
       .group("Raw pixels");
   addReportOptions(verb, options->report);
+  addLimitOptions(verb);
 }
 
 }  // namespace pelorin::cli

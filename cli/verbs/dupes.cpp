@@ -14,6 +14,7 @@
 #include "cli/frame/html_page.h"
 #include "cli/frame/jobs.h"
 #include "cli/frame/jobs_option.h"
+#include "cli/frame/limits.h"
 #include "cli/frame/memory_option.h"
 #include "cli/frame/number_text.h"
 #include "cli/frame/outputs.h"
@@ -101,28 +102,29 @@ bool scorePhotos(const DupesOptions& options, photo::PhotoCache* cache, std::str
   for (const Unscored& photo : unscored) inputs.push_back({report.photos[photo.photo].path, {}});
   Talk talk(verbName, options.report, inputs.size());
   KeptPixels pixels(options.memory, options.jobs, inputs.size());
-  const PhotoTally tally = eachPhoto<float>(
-      inputs, options.jobs, talk,
-      {.work =
-           [&](std::size_t job) {
-             return photo::scoreOf(readInput(inputs[job]), interruptToken(), pixels.resources());
-           },
-       .done =
-           [&](std::size_t job, float score) {
-             const auto& [i, stamp] = unscored[job];
-             report.photos[i].niqe = score;
-             if (cache == nullptr || !stamp || !cacheTrouble.empty()) return;
-             try {
-               cache->storeScore(inputs[job].path, *stamp, score);
-             } catch (const photo::CacheError& error) {
-               cacheTrouble = error.what();
-             }
-           },
-       .failed =
-           [&](std::size_t job, const std::string& reason) {
-             report.failed.push_back({inputs[job].path, reason});
-           },
-       .failure = "no score of it: "});
+  const PhotoTally tally =
+      eachPhoto<float>(inputs, options.jobs, talk,
+                       {.work =
+                            [&](std::size_t job) {
+                              return photo::scoreOf(readInput(inputs[job]), interruptToken(),
+                                                    pixels.resources(), limits().decode);
+                            },
+                        .done =
+                            [&](std::size_t job, float score) {
+                              const auto& [i, stamp] = unscored[job];
+                              report.photos[i].niqe = score;
+                              if (cache == nullptr || !stamp || !cacheTrouble.empty()) return;
+                              try {
+                                cache->storeScore(inputs[job].path, *stamp, score);
+                              } catch (const photo::CacheError& error) {
+                                cacheTrouble = error.what();
+                              }
+                            },
+                        .failed =
+                            [&](std::size_t job, const std::string& reason) {
+                              report.failed.push_back({inputs[job].path, reason});
+                            },
+                        .failure = "no score of it: "});
   return !tally.interrupted;
 }
 

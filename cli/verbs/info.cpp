@@ -9,7 +9,6 @@
 #include "cli/frame/face_choice.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/inputs.h"
-#include "cli/frame/interrupt.h"
 #include "cli/frame/jobs_option.h"
 #include "cli/frame/json_output.h"
 #include "cli/frame/memory_option.h"
@@ -51,7 +50,7 @@ Info inspect(const Input& input, const photo::OpenOptions& options,
              const photo::RowResources& resources, const FaceChoice& faces, float slider,
              Talk& talk) {
   const std::vector<std::uint8_t> file = readInput(input);
-  photo::PhotoRows photo(file, options, resources);
+  photo::PhotoRows photo(file, limited(options), resources);
   Info info = {photo.size().width, photo.size().height, std::nullopt, photo.faces(), {}, {}};
   if (!options.raw) info.facts = photo.facts();
   const image_processing::ImageMetadata boxes =
@@ -158,7 +157,7 @@ void printText(const Input& input, const Info& info, const std::string& slider) 
 ExitCode runInfo(const InfoOptions& options) {
   const float slider = readSlider("--slider", options.slider);
   const FaceChoice faces(options.faces);
-  photo::OpenOptions photo = {.faces = faces.asksPhoto(), .stop = interruptToken()};
+  photo::OpenOptions photo = {.faces = faces.asksPhoto()};
   photo.raw = readRawSize(options.raw, options.inputs);
   const std::vector<Input> inputs = expandInputs(options.inputs);
 

@@ -9,7 +9,6 @@
 #include "cli/frame/each_photo.h"
 #include "cli/frame/errors.h"
 #include "cli/frame/file_bytes.h"
-#include "cli/frame/interrupt.h"
 #include "cli/frame/lone_files.h"
 #include "cli/frame/photo_files.h"
 #include "cli/frame/raw_option.h"
@@ -101,7 +100,7 @@ void printSummary(const Input& input, const Keypoints& keypoints, const CornerSe
 }
 
 ExitCode runKeypoints(const KeypointsOptions& options) {
-  photo::OpenOptions photoOptions = {.faces = false, .stop = interruptToken()};
+  photo::OpenOptions photoOptions = {.faces = false};
   photoOptions.raw = readRawSize(options.raw);
   CornerSearch search = options.search;
   search.suppressed = !options.unsuppressed;
@@ -121,7 +120,7 @@ ExitCode runKeypoints(const KeypointsOptions& options) {
       {.work =
            [&](std::size_t) {
              const std::vector<std::uint8_t> file = readInput(input);
-             photo::PhotoRows photo(file, photoOptions);
+             photo::PhotoRows photo(file, limited(photoOptions));
              const auto [width, height] = photo.size();
              image_processing::RowSource& rows = photo.sweep(/*again=*/false);
              Keypoints keypoints = {width, height, {}};

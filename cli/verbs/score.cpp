@@ -60,7 +60,7 @@ ScoredPhoto score(const Input& input, const photo::OpenOptions& options,
                   const photo::RowResources& resources, const PlannedFile* map, bool overwrite,
                   Talk& talk) {
   const std::vector<std::uint8_t> file = readInput(input);
-  photo::PhotoRows photo(file, options, resources);
+  photo::PhotoRows photo(file, limited(options), resources);
   const auto [width, height] = photo.size();
   image_processing::RowSource& rows = photo.sweep(/*again=*/false);
   const bool mapped = map != nullptr && !map->skipped;
@@ -89,7 +89,7 @@ std::vector<PlannedFile> planMaps(const ScoreOptions& options, const std::vector
 ExitCode runScore(const ScoreOptions& options) {
   std::optional<float> limit;
   if (options.failAbove) limit = readFiniteNumber("--fail-above", *options.failAbove);
-  photo::OpenOptions photoOptions = {.faces = false, .stop = interruptToken()};
+  photo::OpenOptions photoOptions = {.faces = false};
   photoOptions.raw = readRawSize(options.raw, options.inputs);
   const std::vector<Input> inputs = expandInputs(options.inputs);
   const std::vector<PlannedFile> maps = planMaps(options, inputs);

@@ -101,7 +101,8 @@ class Thumbnail : public image_processing::RowSink {
 
 Image<RGBA8Pixel> filteredThumbnail(photo::PhotoRows& photo, image_processing::RowFilter& filter,
                                     photo::PictureSize size) {
-  const image_processing::RowWork work{.stop = interruptRequested};
+  const image_processing::RowWork work{
+      .stop = [stop = interruptToken()] { return stop.stop_requested(); }};
   if (filter.looksFirst()) filter.look(photo.sweep(/*again=*/true), work);
   stopIfInterrupted();
   Thumbnail thumbnail(photo.size(), size);
@@ -113,7 +114,7 @@ Image<RGBA8Pixel> filteredThumbnail(photo::PhotoRows& photo, image_processing::R
 SheetRow makeRow(const SheetWork& work, const Input& input, const photo::RowResources& resources,
                  photo::PictureSize room, Talk& talk) {
   const std::vector<std::uint8_t> file = readInput(input);
-  photo::PhotoRows photo(file, work.photo, resources);
+  photo::PhotoRows photo(file, limited(work.photo), resources);
   const photo::PictureSize size = photo.size();
   const photo::PictureSize small = photo::fitWithin(size, room);
   const std::string name = input.isStandardInput()
@@ -156,7 +157,6 @@ ExitCode runSheet(const SheetOptions& options) {
   if (work.faces.areNamed() && !facesMatter)
     throw UsageError("--face: has no effect on these looks");
   work.photo.faces = work.faces.asksPhoto();
-  work.photo.stop = interruptToken();
   work.photo.raw = readRawSize(options.raw, options.inputs);
   const std::string& output = options.outputs.output;
   requireFormatOf(output, /*raw=*/false);

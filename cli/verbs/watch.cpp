@@ -12,6 +12,7 @@
 #include "cli/frame/filter_files.h"
 #include "cli/frame/filter_options.h"
 #include "cli/frame/interrupt.h"
+#include "cli/frame/limits.h"
 #include "cli/frame/look_name.h"
 #include "cli/verbs/verbs.h"
 #include "cli/verbs/watch/folder_events.h"
@@ -333,6 +334,7 @@ void addWatch(CommandLine& commandLine) {
   options->parameters =
       FilterOptions(verb, {&filterNamed(options->filter)}, "slider=0.4;gtmOnly=true;");
   addFilteringOptions(verb, options->files);
+  addLimitOptions(verb);
   verb.flag("--jsonl", options->files.report.jsonLines,
             "Print data as JSON, one object a line and photo")
       .group("Reporting");

@@ -22,8 +22,8 @@ std::vector<std::size_t> photosToScore(const std::vector<DupeGroup>& groups,
 }
 
 float scoreOf(std::span<const std::uint8_t> file, std::stop_token stop,
-              const RowResources& resources) {
-  PhotoRows photo(file, {.faces = false, .stop = std::move(stop)}, resources);
+              const RowResources& resources, const DecodeLimits& limits) {
+  PhotoRows photo(file, {.faces = false, .limits = limits, .stop = std::move(stop)}, resources);
   const auto [width, height] = photo.size();
   return image_processing::analyzeNiqe(width, height, photo.sweep(/*again=*/false)).score;
 }

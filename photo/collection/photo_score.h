@@ -8,6 +8,7 @@
 
 #include "photo/collection/grouping.h"
 #include "photo/collection/scanned_photo.h"
+#include "photo/decode_limits.h"
 #include "photo/photo_rows.h"
 
 namespace pelorin::photo {
@@ -20,6 +21,6 @@ std::vector<std::size_t> photosToScore(const std::vector<DupeGroup>& groups,
 /// The NIQE score of the full-size upright picture of a file; NaN when it is too small.
 /// @throws PhotoError as `open`, Stopped when `stop` says so.
 float scoreOf(std::span<const std::uint8_t> file, std::stop_token stop = {},
-              const RowResources& resources = {});
+              const RowResources& resources = {}, const DecodeLimits& limits = {});
 
 }  // namespace pelorin::photo

@@ -3,6 +3,8 @@
 #include <cstring>
 #include <string>
 
+#include "photo/checked_pixels.h"
+
 namespace pelorin::photo {
 namespace {
 
@@ -39,7 +41,6 @@ int countScans(std::span<const std::uint8_t> bytes, int enough) {
 // A Huffman code is a bit or more, and every block of 8 x 8 has one: what asks for more blocks than the
 // file has bits would end early, after memory was taken for all of them.
 void checkBlocks(const jpeg_decompress_struct& codec, std::size_t bytes) {
-  if (codec.arith_code) return;  // whose symbols take less than a bit
   std::uint64_t blocks = 0;
   for (const jpeg_component_info& component :
        std::span(codec.comp_info, static_cast<std::size_t>(codec.num_components))) {
@@ -54,16 +55,15 @@ void checkBlocks(const jpeg_decompress_struct& codec, std::size_t bytes) {
 
 void checkLimits(LibjpegReader& reader, const DecodeLimits& limits) {
   jpeg_decompress_struct& codec = reader.codec();
-  const std::uint64_t pixels = std::uint64_t{codec.image_width} * codec.image_height;
-  if (pixels > limits.pixels) {
-    throw PhotoError(PhotoError::Kind::tooLarge,
-                     "too large: " + std::to_string(codec.image_width) + " x " +
-                         std::to_string(codec.image_height) + " pixels, at most " +
-                         std::to_string(limits.pixels) + " can be read");
-  }
+  const PictureSize size{codec.image_width, codec.image_height};
+  const std::uint64_t pixels = checkPixels(size, limits);
   // readHeader has consumed the first scan's start.
   const std::span rest(codec.src->next_input_byte, codec.src->bytes_in_buffer);
-  checkBlocks(codec, rest.size());
+  if (codec.arith_code) {  // whose symbols take less than a bit
+    checkCompressedPixels(size, rest.size(), limits);
+  } else {
+    checkBlocks(codec, rest.size());
+  }
   if (!jpeg_has_multiple_scans(&codec)) return;
   const int scans = 1 + countScans(rest, limits.scans);
   if (scans > limits.scans) {

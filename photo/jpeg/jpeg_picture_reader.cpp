@@ -53,7 +53,7 @@ JpegPictureReader::JpegPictureReader(std::span<const std::uint8_t> file, int sca
   } else {
     reader_.keepSegments(profileMarker);
   }
-  reader_.readHeader();
+  reader_.readHeader(limits.segments);
   reader_.keepNoMoreSegments();
   checkLimits(reader_, limits);
   chooseOutput(reader_.codec(), scale);

@@ -123,7 +123,7 @@ std::vector<std::uint8_t> rotateJpeg(std::span<const std::uint8_t> file, int deg
   const Turn turn = turnBy(degrees);
   LibjpegReader reader(file);
   reader.keepAllSegments();
-  reader.readHeader();
+  reader.readHeader(limits.segments);
   checkLimits(reader, limits);
   jpeg_decompress_struct& source = reader.codec();
   jvirt_barray_ptr* before = nullptr;

@@ -1,5 +1,6 @@
 #include "photo/jpeg/libjpeg_reader.h"
 
+#include <algorithm>
 #include <string>
 
 #include "photo/jpeg/jpeg_codec.h"
@@ -34,11 +35,9 @@ void LibjpegReader::keepAllSegments() {
   for (int n = 0; n < 16; ++n) keepSegments(JPEG_APP0 + n);
 }
 
-void LibjpegReader::readHeader() {
-  // libjpeg goes through those it has for each that it keeps. Profiles of 16 MB and extended XMP of
-  // 64 MB take 1300 together.
-  constexpr std::size_t mostSegments = 4096;
-  if (hasMoreSegments(file_, mostSegments)) {
+void LibjpegReader::readHeader(int mostSegments) {
+  // libjpeg goes through those it has for each that it keeps.
+  if (hasMoreSegments(file_, static_cast<std::size_t>(std::max(mostSegments, 0)))) {
     throw PhotoError(PhotoError::Kind::tooLarge,
                      "too many segments: at most " + std::to_string(mostSegments) + " can be read");
   }

@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <span>
 
+#include "photo/decode_limits.h"
 #include "photo/jpeg/libjpeg_errors.h"
 
 namespace pelorin::photo {
@@ -35,9 +36,9 @@ class LibjpegReader {
   void keepNoMoreSegments();
 
   /// Reads up to the picture data.
-  /// @throws PhotoError also for more segments than any camera writes, which cost libjpeg the square
-  ///         of their number.
-  void readHeader();
+  /// @throws PhotoError also for more segments than that, which cost libjpeg the square of
+  ///         their number.
+  void readHeader(int mostSegments = DecodeLimits{}.segments);
 
   /// After the picture data. A file of several scans may end, without a warning, before each
   /// channel had one.

@@ -11,6 +11,7 @@
 #include <utility>
 
 #include "image_processing/core/checked_size.h"
+#include "photo/checked_pixels.h"
 #include "photo/metadata/kept_metadata.h"
 #include "photo/metadata/stated_facts.h"
 #include "photo/photo_error.h"
@@ -129,7 +130,7 @@ class PngRowReader : public RowReader {
     png_structp png = source_.png();
     png_infop info = source_.info();
     size_ = {png_get_image_width(png, info), png_get_image_height(png, info)};
-    checkSize(options.limits);
+    checkSize(options.limits, file.size());
     const int colourType = png_get_color_type(png, info);
     const int depth = png_get_bit_depth(png, info);
     const bool isColour = (colourType & PNG_COLOR_MASK_COLOR) != 0;
@@ -173,13 +174,16 @@ class PngRowReader : public RowReader {
   }
 
  private:
-  void checkSize(const DecodeLimits& limits) const {
-    const std::uint64_t pixels = std::uint64_t{size_.width} * size_.height;
-    if (pixels <= limits.pixels) return;
-    throw PhotoError(PhotoError::Kind::tooLarge,
-                     "too large: " + std::to_string(size_.width) + " x " +
-                         std::to_string(size_.height) + " pixels, at most " +
-                         std::to_string(limits.pixels) + " can be read");
+  void checkSize(const DecodeLimits& limits, std::size_t bytes) {
+    checkPixels(size_, limits);
+    // What asks for more than its bytes can become ends early, after memory was taken for all of it.
+    constexpr std::uint64_t mostOfAByte = 1032;  // deflate's longest match, 258 bytes, takes 2 bits
+    if (png_get_rowbytes(source_.png(), source_.info()) * std::uint64_t{size_.height} /
+            mostOfAByte >
+        bytes) {
+      throw PhotoError(PhotoError::Kind::truncated, "truncated: the picture data ends early");
+    }
+    checkCompressedPixels(size_, bytes, limits);
   }
 
   void decode(RGBA8Pixel* rows, std::uint32_t count) {

@@ -156,10 +156,9 @@ Bytes withSize(Bytes file, std::uint32_t width, std::uint32_t height) {
 }
 
 Bytes withFrameByte(Bytes file, std::size_t offset, std::uint8_t value) {
-  constexpr std::uint8_t prefix = 0xFF, baseline = 0xC0, progressive = 0xC2;
+  const Bytes frames = {0xC0, 0xC2, 0xC9};  // baseline, progressive, arithmetic
   std::size_t frame = 2;
-  while (file.at(frame) != prefix ||
-         (file.at(frame + 1) != baseline && file.at(frame + 1) != progressive)) {
+  while (file.at(frame) != 0xFF || std::ranges::find(frames, file.at(frame + 1)) == frames.end()) {
     ++frame;
   }
   file[frame + 2 + offset] = value;

@@ -6,10 +6,10 @@
  * objects are null and counts 0. Null where nothing says that it may be is QUENBY_INVALID_ARGUMENT, as
  * is whatever else a function cannot mean; every function may also end with QUENBY_OUT_OF_MEMORY.
  *
- * Threads. Nothing here keeps state outside of its objects or starts a thread, but for quenby_threads_new:
- * a call does its work on the thread that calls, and on those that the caller lends it (quenby_workers). Functions that take an
- * object as const, and quenby_session_apply, may be called by any number of threads at once; objects are
- * freed when no call uses them any more.
+ * Threads. Nothing here keeps state outside of its objects or starts a thread, but for quenby_threads_new
+ * and quenby_cancel_new_after: a call does its work on the thread that calls, and on those that the
+ * caller lends it (quenby_workers). Functions that take an object as const, and quenby_session_apply, may
+ * be called by any number of threads at once; objects are freed when no call uses them any more.
  *
  * Ownership. What a call is given it has done with when it returns, unless it says otherwise. Every
  * kind of object has one function that frees it, which takes null in silence.
@@ -78,6 +78,11 @@ typedef struct quenby_cancel quenby_cancel;
 
 /** @param cancel  receives an object that asks for nothing yet. */
 QUENBY_API int32_t quenby_cancel_new(quenby_cancel** cancel, quenby_error* error);
+
+/** One that asks by itself when so many milliseconds have gone by since this call, whatever is at work then;
+ * it has a thread of its own. */
+QUENBY_API int32_t quenby_cancel_new_after(uint32_t milliseconds, quenby_cancel** cancel,
+                                           quenby_error* error);
 
 /** Asks every call with this object to end with QUENBY_CANCELLED, also those that only begin. From any
  * thread, as often as wanted; nothing takes it back. Null is nothing. */
@@ -222,7 +227,12 @@ typedef struct quenby_open_options {
   uint64_t max_pixels; /**< Of the picture as stored: 268435456 unless given. */
   int32_t max_scans;   /**< Of a progressive file: 100 unless given. */
   uint32_t flags;
-  const quenby_workers* workers; /**< Of quenby_filter_file alone; null for none. */
+  const quenby_workers* workers;  /**< Of quenby_filter_file alone; null for none. */
+  uint64_t max_scanned_pixels;    /**< Pixels times scans, beside 4096 for each byte of a file of
+                                      several scans: 536870912 unless given. */
+  uint64_t max_compressed_pixels; /**< Pixels, beside 128 for each byte of a PNG or arithmetic coded
+                                       JPEG file: 40000000 unless given. */
+  int32_t max_segments;           /**< Before a JPEG file's picture data: 4096 unless given. */
 } quenby_open_options;
 
 /** Bits of quenby_save_options.flags. */

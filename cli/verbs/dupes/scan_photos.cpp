@@ -7,6 +7,7 @@
 #include "cli/frame/each_photo.h"
 #include "cli/frame/file_bytes.h"
 #include "cli/frame/interrupt.h"
+#include "cli/frame/limits.h"
 #include "cli/frame/photo_files.h"
 #include "photo/photo.h"
 
@@ -46,7 +47,8 @@ class Scan {
              [&](std::size_t job) {
                const std::vector<std::uint8_t> file = readInput(unread[job]);
                tellNotices(unread[job], photo::readFacts(file), talk);
-               return photo::readPhotoRecord(file, options_.scale, interruptToken());
+               return photo::readPhotoRecord(file, options_.scale, interruptToken(),
+                                             limits().decode);
              },
          .done =
              [&](std::size_t job, const photo::PhotoRecord& record) {

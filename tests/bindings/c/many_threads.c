@@ -86,7 +86,7 @@ static void with_workers(void) {
   quenby_session_free(session);
 
   quenby_file *alone = NULL, *shared_file = NULL;
-  quenby_open_options options = {sizeof(options), 1, 0, 0, 0, 0, &workers};
+  quenby_open_options options = {.struct_size = sizeof(options), .scale = 1, .workers = &workers};
   CHECK(quenby_filter_file(photo.data, photo.size, "AE0", "slider=0.4;", NULL, 0, NULL, NULL, NULL,
                            NULL, &alone, NULL) == QUENBY_OK);
   used = 0;
@@ -156,6 +156,30 @@ static void cancelled_by_another_thread(void) {
   quenby_cancel_free(cancel);
 }
 
+static void cancelled_by_the_time(void) {
+  quenby_cancel *at_once = NULL, *in_weeks = NULL, *asked = NULL;
+  DONE(quenby_cancel_new_after(0, &at_once, &error));
+  DONE(quenby_cancel_new_after(UINT32_MAX, &in_weeks, &error));
+  DONE(quenby_cancel_new_after(UINT32_MAX, &asked, &error));
+  quenby_cancel_request(asked);
+  quenby_photo* made = NULL;
+  DONE(quenby_photo_open(photo.data, photo.size, NULL, in_weeks, &made, &error));
+  quenby_photo_free(made);
+  quenby_cancel* const over[] = {at_once, asked};
+  for (size_t i = 0; i < 2; ++i) {
+    int32_t kind = QUENBY_OK;
+    while (kind == QUENBY_OK) { /* once its thread has run */
+      kind = quenby_photo_open(photo.data, photo.size, NULL, over[i], &made, &error);
+      quenby_photo_free(made);
+      made = NULL;
+    }
+    CHECK(kind == QUENBY_CANCELLED);
+  }
+  quenby_cancel_free(at_once);
+  quenby_cancel_free(in_weeks);
+  quenby_cancel_free(asked);
+}
+
 /* Every function that looks at one. */
 static void cancelled_before(void) {
   quenby_cancel *cancel = NULL, *other = NULL;
@@ -201,6 +225,7 @@ int main(void) {
   with_workers();
   with_the_librarys_threads();
   cancelled_before();
+  cancelled_by_the_time();
   cancelled_by_another_thread();
   quenby_session_free(shared);
   free_pixels(&pixels);

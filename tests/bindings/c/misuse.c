@@ -176,6 +176,7 @@ static void files(struct bytes photo) {
                                       {.struct_size = size, .rotate = 45},
                                       {.struct_size = size, .rotate = INT_MIN},
                                       {.struct_size = size, .max_scans = -1},
+                                      {.struct_size = size, .max_segments = -1},
                                       {.struct_size = size, .flags = 4},
                                       {.struct_size = size, .flags = UINT32_MAX}};
   for (size_t i = 0; i < sizeof(open) / sizeof(*open); ++i)
@@ -261,12 +262,16 @@ static void bad_files(struct bytes photo) {
   }
   free(huge);
   const quenby_open_options few_pixels = {.struct_size = sizeof(few_pixels), .max_pixels = 29999};
-  quenby_photo* made = NULL;
-  quenby_shot shot;
-  REFUSED(QUENBY_TOO_LARGE,
-          quenby_photo_open(photo.data, photo.size, &few_pixels, NULL, &made, &error));
-  REFUSED(QUENBY_TOO_LARGE,
-          quenby_read_shot(photo.data, photo.size, &few_pixels, NULL, &shot, &error));
+  const quenby_open_options few_segments = {.struct_size = sizeof(few_segments), .max_segments = 1};
+  const quenby_open_options* const limits[] = {&few_pixels, &few_segments};
+  for (size_t i = 0; i < sizeof(limits) / sizeof(*limits); ++i) {
+    quenby_photo* made = NULL;
+    quenby_shot shot;
+    REFUSED(QUENBY_TOO_LARGE,
+            quenby_photo_open(photo.data, photo.size, limits[i], NULL, &made, &error));
+    REFUSED(QUENBY_TOO_LARGE,
+            quenby_read_shot(photo.data, photo.size, limits[i], NULL, &shot, &error));
+  }
 }
 
 static void leave_a_task_out(void* context, size_t tasks, void (*task)(void* state, size_t index),
@@ -400,6 +405,7 @@ static void the_rest(void) {
   const quenby_grey grey = {few, 4, 4, 4};
   quenby_niqe_result niqe = {.struct_size = sizeof(niqe)};
   INVALID(quenby_cancel_new(NULL, e));
+  INVALID(quenby_cancel_new_after(0, NULL, e));
   INVALID(quenby_niqe(&two, NULL, NULL, 0, e));
   niqe.struct_size = 4;
   INVALID(quenby_niqe(&two, &niqe, NULL, 0, e));

@@ -48,6 +48,12 @@ struct FakeSlot : FakeObject {
   operator jobjectArray() { return reinterpret_cast<jobjectArray>(static_cast<FakeObject*>(this)); }
 };
 
+/// Limits, 0 for what the natives have.
+struct MaxOf {
+  jlong pixels = 0;
+  jint scans = 0, segments = 0;
+};
+
 /// The natives as Java calls them, in one environment.
 struct PhotoCalls {
   FakeEnvironment& env;
@@ -70,26 +76,28 @@ struct PhotoCalls {
   Bytes filter(jbyteArray array, jobject buffer, jint offset, jint length, jint quality,
                jint rotation, jfloatArray faces, jint scale, jstring name, jstring params,
                jlong cancel, jint subsampling = 0, jboolean mark = JNI_TRUE,
-               jobjectArray lost = nullptr) const {
+               jobjectArray lost = nullptr, const MaxOf& most = {}) const {
     const FakeObject* const made = taken(call<jbyteArray>(
-        "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[B)[B", array,
-        buffer, offset, length, quality, subsampling, rotation, faces, scale, name, params, mark,
-        cancel, lost));
+        "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[BJII)[B",
+        array, buffer, offset, length, quality, subsampling, rotation, faces, scale, name, params,
+        mark, cancel, lost, most.pixels, most.scans, most.segments));
     return made == nullptr ? Bytes() : made->bytes;
   }
 
-  std::vector<float> floats(const char* name, FakeBytes& file, jlong cancel = 0) const {
-    const FakeObject* const made =
-        taken(call<jfloatArray>((std::string(name) + "([BLjava/nio/ByteBuffer;IIJ)[F").c_str(),
-                                static_cast<jbyteArray>(file), static_cast<jobject>(nullptr),
-                                jint{0}, static_cast<jint>(file.bytes.size()), cancel));
+  std::vector<float> floats(const char* name, FakeBytes& file, jlong cancel = 0,
+                            const MaxOf& most = {}) const {
+    const FakeObject* const made = taken(call<jfloatArray>(
+        (std::string(name) + "([BLjava/nio/ByteBuffer;IIJJII)[F").c_str(),
+        static_cast<jbyteArray>(file), static_cast<jobject>(nullptr), jint{0},
+        static_cast<jint>(file.bytes.size()), cancel, most.pixels, most.scans, most.segments));
     return made == nullptr ? std::vector<float>() : made->floatElements;
   }
 
-  float niqe(FakeBytes& file, jlong cancel = 0) const {
-    return call<jfloat>("niqe([BLjava/nio/ByteBuffer;IIJ)F", static_cast<jbyteArray>(file),
+  float niqe(FakeBytes& file, jlong cancel = 0, const MaxOf& most = {}) const {
+    return call<jfloat>("niqe([BLjava/nio/ByteBuffer;IIJJII)F", static_cast<jbyteArray>(file),
                         static_cast<jobject>(nullptr), jint{0},
-                        static_cast<jint>(file.bytes.size()), cancel);
+                        static_cast<jint>(file.bytes.size()), cancel, most.pixels, most.scans,
+                        most.segments);
   }
 
   std::vector<double> facts(FakeBytes& file) const {

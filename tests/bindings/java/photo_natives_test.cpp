@@ -142,6 +142,29 @@ TEST_F(PhotoNatives, NameTheArgumentThatIsWrong) {
   EXPECT_THAT(env.takeException(), HasSubstr("256"));
 }
 
+TEST_F(PhotoNatives, RefuseWhatAsksForMoreThanTheLimits) {
+  const photo::JpegHeader header = photo::readJpegHeader(file.bytes);
+  const jlong pixels = jlong{header.width} * header.height;
+  const auto errorOf = [&](const MaxOf& most) {
+    calls.niqe(file, 0, most);
+    const std::string error = env.takeException();
+    for (const char* const native : {"niqeFeatures", "greenCdf"}) {
+      calls.floats(native, file, 0, most);
+      EXPECT_EQ(env.takeException(), error) << native;
+    }
+    FakeString name{"AE0"}, params{"slider=0.4;"};
+    calls.filter(file, nullptr, 0, static_cast<jint>(file.bytes.size()), 90, 0, nullptr, 1, name,
+                 params, 0, 0, JNI_TRUE, nullptr, most);
+    EXPECT_EQ(env.takeException(), error);
+    return error;
+  };
+  EXPECT_EQ(errorOf({.pixels = pixels}), "");
+  EXPECT_THAT(errorOf({.pixels = pixels - 1}), HasSubstr("too large: "));
+  EXPECT_THAT(errorOf({.segments = 1}), HasSubstr("too many segments: at most 1"));
+  for (const MaxOf& negative : {MaxOf{.pixels = -1}, MaxOf{.scans = -1}, MaxOf{.segments = -1}})
+    EXPECT_EQ(errorOf(negative), "java/lang/IllegalArgumentException: limits: are negative");
+}
+
 TEST_F(PhotoNatives, EndACallThatIsCancelled) {
   const std::string cancelled = "java/util/concurrent/CancellationException: interrupted";
   const jlong handle = calls.newCancel(), other = calls.newCancel();
@@ -232,29 +255,29 @@ class PhotoNativesUnderFaults : public PhotoNatives {
   std::vector<Native> natives() {
     const auto measured = [this](const char* nameAndSignature) {
       return [this, nameAndSignature] {
-        env.DeleteLocalRef(
-            calls.call<jobject>(nameAndSignature, array(), jobject{}, jint{0}, size(), jlong{0}));
+        env.DeleteLocalRef(calls.call<jobject>(nameAndSignature, array(), jobject{}, jint{0},
+                                               size(), jlong{0}, jlong{0}, jint{0}, jint{0}));
       };
     };
-    return {
-        [this] {
-          env.DeleteLocalRef(calls.call<jobject>(
-              "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[B)[B",
-              array(), jobject{}, jint{0}, size(), jint{90}, jint{0}, jint{90},
-              static_cast<jfloatArray>(faces), jint{1}, static_cast<jstring>(ae),
-              static_cast<jstring>(slider), jboolean{JNI_TRUE}, jlong{0},
-              static_cast<jobjectArray>(lost)));
-        },
-        [this] {
-          calls.call<jfloat>("niqe([BLjava/nio/ByteBuffer;IIJ)F", array(), jobject{}, jint{0},
-                             size(), jlong{0});
-        },
-        measured("niqeFeatures([BLjava/nio/ByteBuffer;IIJ)[F"),
-        measured("greenCdf([BLjava/nio/ByteBuffer;IIJ)[F"),
-        [this] {
-          env.DeleteLocalRef(calls.call<jobject>("facts([BLjava/nio/ByteBuffer;II)[D", array(),
-                                                 jobject{}, jint{0}, size()));
-        }};
+    return {[this] {
+              env.DeleteLocalRef(calls.call<jobject>(
+                  "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/"
+                  "String;ZJ[[BJII)[B",
+                  array(), jobject{}, jint{0}, size(), jint{90}, jint{0}, jint{90},
+                  static_cast<jfloatArray>(faces), jint{1}, static_cast<jstring>(ae),
+                  static_cast<jstring>(slider), jboolean{JNI_TRUE}, jlong{0},
+                  static_cast<jobjectArray>(lost), jlong{0}, jint{0}, jint{0}));
+            },
+            [this] {
+              calls.call<jfloat>("niqe([BLjava/nio/ByteBuffer;IIJJII)F", array(), jobject{},
+                                 jint{0}, size(), jlong{0}, jlong{0}, jint{0}, jint{0});
+            },
+            measured("niqeFeatures([BLjava/nio/ByteBuffer;IIJJII)[F"),
+            measured("greenCdf([BLjava/nio/ByteBuffer;IIJJII)[F"),
+            [this] {
+              env.DeleteLocalRef(calls.call<jobject>("facts([BLjava/nio/ByteBuffer;II)[D", array(),
+                                                     jobject{}, jint{0}, size()));
+            }};
   }
 
   jbyteArray array() { return small; }

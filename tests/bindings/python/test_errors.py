@@ -58,6 +58,8 @@ def test_kinds_of_bad_files():
     with pytest.raises(quenby.PhotoError, match="pixels"):
         quenby.read(whole, max_pixels=599)
     quenby.read(whole, max_pixels=600)
+    with pytest.raises(quenby.PhotoError, match="segments"):
+        quenby.read(whole, max_segments=1)
 
 
 @pytest.mark.parametrize(
@@ -76,6 +78,9 @@ def test_kinds_of_bad_files():
         (lambda: quenby.read(jpeg(SMALL), scale=3), "scale"),
         (lambda: quenby.read(jpeg(SMALL), rotate=45), "rotate"),
         (lambda: quenby.read(jpeg(SMALL), max_pixels=0), "max_pixels"),
+        (lambda: quenby.read(jpeg(SMALL), max_segments=0), "max_segments"),
+        (lambda: quenby.Cancel(after=-1), "after"),
+        (lambda: quenby.Cancel(after=float("nan")), "after"),
         (lambda: quenby.encode(SMALL, "GIF"), "GIF"),
         (lambda: quenby.encode(SMALL, quality=0), "quality"),
         (lambda: quenby.encode(SMALL, strip=["mood"]), "mood"),

@@ -99,6 +99,21 @@ TEST(DamagedJpeg, IsTruncatedWhereItHasMoreBlocksThanBits) {
   EXPECT_EQ(jpegErrorOf([&] { rotateJpeg(wide, 90); }), "truncated: the picture data ends early");
 }
 
+TEST(DamagedJpeg, IsRefusedForManyPixelsOfFewBytesWhereSymbolsTakeLessThanABit) {
+  const Bytes wide = test_support::withSize(makeJpeg({.arithmetic = true}), 16000, 16000);
+  EXPECT_EQ(jpegErrorOf([&] { decodeJpeg(wide); }),
+            "too large: 16000 x 16000 pixels in a file of this size");
+}
+
+TEST(DamagedJpeg, IsRefusedForMoreSegmentsThanTheLimit) {
+  const Bytes file = makeJpeg({});  // with JFIF's
+  DecodeLimits limits = {.segments = 0};
+  EXPECT_EQ(jpegErrorOf([&] { decodeJpeg(file, 1, limits); }),
+            "too many segments: at most 0 can be read");
+  EXPECT_EQ(jpegErrorOf([&] { rotateJpeg(file, 90, limits); }),
+            "too many segments: at most 0 can be read");
+}
+
 TEST(DamagedJpeg, IsRefusedForTheWorkOfItsScansWhateverItsSize) {
   const Bytes file = makeJpeg({.scans = test_support::progressiveScans(60)});
   DecodeLimits limits;

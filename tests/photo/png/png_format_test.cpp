@@ -4,6 +4,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <png.h>
+#include <zlib.h>
 
 #include <cstring>
 #include <string>
@@ -282,6 +283,57 @@ TEST(PngFormat, ChecksTheSizeBeforeItAllocates) {
     EXPECT_THAT(error.what(), HasSubstr("too large: 13 x 11 pixels"));
   }
   EXPECT_EQ(kind, PhotoError::Kind::tooLarge);
+}
+
+// A file of almost no picture data, whatever its header says.
+Bytes headerOf(std::uint32_t width, std::uint32_t height, int colourType, int depth) {
+  const Recipe recipe = {.colourType = colourType, .depth = depth, .width = 1, .height = 1};
+  Bytes file = makePng(recipe);
+  const std::size_t sides = 16, typeAndData = 12, length = 17, checksum = 29;
+  for (int i = 0; i < 4; ++i) {
+    file[sides + i] = static_cast<std::uint8_t>(width >> (24 - 8 * i));
+    file[sides + 4 + i] = static_cast<std::uint8_t>(height >> (24 - 8 * i));
+  }
+  const uLong sum = crc32(0, file.data() + typeAndData, length);
+  for (int i = 0; i < 4; ++i) file[checksum + i] = static_cast<std::uint8_t>(sum >> (24 - 8 * i));
+  return file;
+}
+
+TEST(PngFormat, IsTruncatedWhereItsBytesCannotBecomeThePicture) {
+  const Bytes file = headerOf(16000, 16000, PNG_COLOR_TYPE_RGB, 8);
+  try {
+    pngFormat.reader(file, {});  // reads no row
+    FAIL();
+  } catch (const PhotoError& error) {
+    EXPECT_EQ(error.kind(), PhotoError::Kind::truncated);
+  }
+  // As many bytes as the best compression leaves of it.
+  Bytes longer = headerOf(16000, 16000, PNG_COLOR_TYPE_RGB, 8);
+  longer.resize(std::size_t{16000} * 16000 * 3 / 1032);
+  EXPECT_NO_THROW(pngFormat.reader(longer, {.limits = {.compressedPixels = 256'000'000}}));
+}
+
+TEST(PngFormat, OfFewBytesIsRefusedForManyPixels) {
+  const Bytes file =
+      makePng({.colourType = PNG_COLOR_TYPE_GRAY, .depth = 1, .width = 2000, .height = 2000});
+  const std::uint64_t beyond = 2000 * 2000 - 128 * file.size();
+  ASSERT_LT(beyond, 2000 * 2000);
+  EXPECT_NO_THROW(pngFormat.reader(file, {.limits = {.compressedPixels = beyond}}));
+  try {
+    pngFormat.reader(file, {.limits = {.compressedPixels = beyond - 1}});
+    FAIL();
+  } catch (const PhotoError& error) {
+    EXPECT_EQ(error.kind(), PhotoError::Kind::tooLarge);
+    EXPECT_THAT(error.what(), HasSubstr("too large: 2000 x 2000 pixels in a file of this size"));
+  }
+}
+
+TEST(PngFormat, Of64KilobytesTakesLessThan256MebibytesForItsPixels) {
+  constexpr std::uint64_t most = 65536 * 128 + DecodeLimits{}.compressedPixels;
+  EXPECT_LT(most * sizeof(RGBA8Pixel), std::uint64_t{256} << 20);
+  Bytes file = headerOf(most / 4096 + 1, 4096, PNG_COLOR_TYPE_GRAY, 1);
+  file.resize(65536);
+  EXPECT_THROW(pngFormat.reader(file, {}), PhotoError);
 }
 
 TEST(PngFormat, IsScaledByAveragesOfBlocks) {

@@ -107,6 +107,9 @@ class COpenOptions(Growing):
         ("max_scans", c_int32),
         ("flags", c_uint32),
         ("workers", POINTER(CWorkers)),
+        ("max_scanned_pixels", c_uint64),
+        ("max_compressed_pixels", c_uint64),
+        ("max_segments", c_int32),
     ]
 
 
@@ -213,6 +216,7 @@ _save = POINTER(CSaveOptions)
 # What each function takes before the error.
 _fallible: dict[str, tuple[Any, ...]] = {
     "cancel_new": (_object,),
+    "cancel_new_after": (c_uint32, _object),
     "filter_count": (POINTER(c_size_t),),
     "filter_at": (c_size_t, POINTER(CFilter)),
     "filter_named": (c_char_p, POINTER(CFilter)),
@@ -333,11 +337,18 @@ class Cancel:
     """A wish that work ends: pass it to calls, and call request() from any thread.
 
     Calls with it then raise Cancelled, between two of their steps; also those that only begin.
+
+    after:  seconds from now on after which it asks by itself; None never does.
     """
 
-    def __init__(self) -> None:
+    def __init__(self, after: Optional[float] = None) -> None:
         pointer = c_void_p()
-        call("cancel_new", byref(pointer))
+        if after is None:
+            call("cancel_new", byref(pointer))
+        else:
+            if not 0 <= after <= 4_000_000:
+                raise ValueError("after: is not from 0 to 4000000 seconds")
+            call("cancel_new_after", round(after * 1000), byref(pointer))
         self._handle = Handle("cancel_free", pointer)
 
     def request(self) -> None:

@@ -101,8 +101,13 @@ def open_options(
     known_faces: bool = True,
     max_pixels: Optional[int] = None,
     max_scans: Optional[int] = None,
+    max_segments: Optional[int] = None,
 ) -> COpenOptions:
-    for name, value in (("max_pixels", max_pixels), ("max_scans", max_scans)):
+    for name, value in (
+        ("max_pixels", max_pixels),
+        ("max_scans", max_scans),
+        ("max_segments", max_segments),
+    ):
         if value is not None and value < 1:
             raise ValueError(f"{name}: is below 1")
     if scale not in (1, 2, 4, 8):
@@ -116,6 +121,7 @@ def open_options(
         max_pixels=min(max_pixels or 0, 2**64 - 1),
         max_scans=min(max_scans or 0, 2**31 - 1),
         flags=flags,
+        max_segments=min(max_segments or 0, 2**31 - 1),
     )
 
 
@@ -219,6 +225,7 @@ def read(
     known_faces: bool = True,
     max_pixels: Optional[int] = None,
     max_scans: Optional[int] = None,
+    max_segments: Optional[int] = None,
     cancel: Optional[Cancel] = None,
 ) -> Photo:
     """Decodes a JPEG or PNG file, all of it or PhotoError.
@@ -226,7 +233,8 @@ def read(
     scale:       1, 2, 4 or 8: what the sides are divided by, rounded up.
     rotate:      degrees clockwise beyond upright, a multiple of 90.
     upright:     else the picture is as it is stored.
-    max_pixels:  the largest picture to decode, 268435456 unless given.
+    max_pixels:  the largest picture to decode, 268435456 unless given; likewise max_scans, 100, and
+                 max_segments, 4096, of a JPEG file.
     """
     options = dict(
         scale=scale,
@@ -235,6 +243,7 @@ def read(
         known_faces=known_faces,
         max_pixels=max_pixels,
         max_scans=max_scans,
+        max_segments=max_segments,
     )
     return Photo(_required_bytes(photo), options, cancel)
 
@@ -375,6 +384,7 @@ def filter_file(
     keep: Iterable[str] = (),
     max_pixels: Optional[int] = None,
     max_scans: Optional[int] = None,
+    max_segments: Optional[int] = None,
     overwrite: bool = False,
     cancel: Optional[Cancel] = None,
     threads: int = 1,
@@ -399,7 +409,7 @@ def filter_file(
     if target is not None:
         format = _format_for(target)
     data = _required_bytes(source)
-    open = open_options(scale, rotate, True, known_faces, max_pixels, max_scans)
+    open = open_options(scale, rotate, True, known_faces, max_pixels, max_scans, max_segments)
     save, pointer = _save_options(quality, strip, keep, subsampling, mark), c_void_p()
     arguments = (data, len(data), utf8(filter), utf8(params), *faces_of(faces), byref(open))
     rest = (None if format is None else utf8(format), byref(save), pointer_of(cancel))

@@ -36,6 +36,9 @@ public final class PhotoBytes {
         boolean mark = true;
         Consumer<? super Loss> losses;
         Cancellation cancellation;
+        long maxPixels;
+        int maxScans;
+        int maxSegments;
 
         Settings copy() {
             try {
@@ -226,6 +229,52 @@ public final class PhotoBytes {
     }
 
     /**
+     * Refuses larger pictures, as too large.
+     *
+     * @param pixels at least 1, of the picture as stored; 268435456 unless given
+     * @return a photo that does
+     * @throws IllegalArgumentException for less
+     */
+    public PhotoBytes maxPixels(long pixels) {
+        Settings changed = settings.copy();
+        changed.maxPixels = atLeastOne("maxPixels", pixels);
+        return with(changed);
+    }
+
+    /**
+     * Refuses JPEG files of more scans, as too large.
+     *
+     * @param scans at least 1; 100 unless given
+     * @return a photo that does
+     * @throws IllegalArgumentException for less
+     */
+    public PhotoBytes maxScans(int scans) {
+        Settings changed = settings.copy();
+        changed.maxScans = (int) atLeastOne("maxScans", scans);
+        return with(changed);
+    }
+
+    /**
+     * Refuses JPEG files of more segments before the picture data, as too large.
+     *
+     * @param segments at least 1; 4096 unless given
+     * @return a photo that does
+     * @throws IllegalArgumentException for less
+     */
+    public PhotoBytes maxSegments(int segments) {
+        Settings changed = settings.copy();
+        changed.maxSegments = (int) atLeastOne("maxSegments", segments);
+        return with(changed);
+    }
+
+    private static long atLeastOne(String name, long number) {
+        if (number < 1) {
+            throw new IllegalArgumentException(name + ": is below 1: " + number);
+        }
+        return number;
+    }
+
+    /**
      * Lets another thread give up what is asked of the photo.
      *
      * @param cancellation by which it does; null for nobody
@@ -271,7 +320,8 @@ public final class PhotoBytes {
         byte[][] lost = settings.losses == null ? null : new byte[1][];
         byte[] made = call(cancel -> filter(array, buffer, offset, length, settings.quality,
                 settings.subsampling, settings.rotation, settings.faces, settings.scale,
-                filter.key(), params == null ? "" : params, settings.mark, cancel, lost));
+                filter.key(), params == null ? "" : params, settings.mark, cancel, lost,
+                settings.maxPixels, settings.maxScans, settings.maxSegments));
         if (lost != null) {
             Loss.all(lost[0]).forEach(settings.losses);
         }
@@ -295,7 +345,8 @@ public final class PhotoBytes {
      * @throws PhotoException when the bytes are no photo or damaged; the kind says which
      */
     public float niqe() throws PhotoException {
-        return call(cancel -> niqe(array, buffer, offset, length, cancel));
+        return call(cancel -> niqe(array, buffer, offset, length, cancel,
+                settings.maxPixels, settings.maxScans, settings.maxSegments));
     }
 
     /**
@@ -305,7 +356,8 @@ public final class PhotoBytes {
      * @throws PhotoException when the bytes are no photo or damaged; the kind says which
      */
     public float[] niqeFeatures() throws PhotoException {
-        return call(cancel -> niqeFeatures(array, buffer, offset, length, cancel));
+        return call(cancel -> niqeFeatures(array, buffer, offset, length, cancel,
+                settings.maxPixels, settings.maxScans, settings.maxSegments));
     }
 
     /**
@@ -315,7 +367,8 @@ public final class PhotoBytes {
      * @throws PhotoException when the bytes are no photo or damaged; the kind says which
      */
     public GreenCdf greenCdf() throws PhotoException {
-        return call(cancel -> new GreenCdf(greenCdf(array, buffer, offset, length, cancel)));
+        return call(cancel -> new GreenCdf(greenCdf(array, buffer, offset, length, cancel,
+                settings.maxPixels, settings.maxScans, settings.maxSegments)));
     }
 
     private interface Work<T> {
@@ -335,16 +388,18 @@ public final class PhotoBytes {
     // libquenby_photo.so registers these.
     static native byte[] filter(byte[] array, ByteBuffer buffer, int offset, int length,
             int quality, int subsampling, int rotation, float[] faces, int scale, String filter,
-            String params, boolean mark, long cancel, byte[][] lost) throws PhotoException;
+            String params, boolean mark, long cancel, byte[][] lost, long maxPixels, int maxScans,
+            int maxSegments) throws PhotoException;
 
     private static native float niqe(byte[] array, ByteBuffer buffer, int offset, int length,
-            long cancel) throws PhotoException;
+            long cancel, long maxPixels, int maxScans, int maxSegments) throws PhotoException;
 
     private static native float[] niqeFeatures(byte[] array, ByteBuffer buffer, int offset,
-            int length, long cancel) throws PhotoException;
+            int length, long cancel, long maxPixels, int maxScans, int maxSegments)
+            throws PhotoException;
 
     private static native float[] greenCdf(byte[] array, ByteBuffer buffer, int offset, int length,
-            long cancel) throws PhotoException;
+            long cancel, long maxPixels, int maxScans, int maxSegments) throws PhotoException;
 
     private static native double[] facts(byte[] array, ByteBuffer buffer, int offset, int length)
             throws PhotoException;

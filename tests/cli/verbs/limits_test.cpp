@@ -1,0 +1,83 @@
+#include <gmock/gmock.h>
+#include <sys/stat.h>
+
+#include <string>
+#include <vector>
+
+#include "photo/photo.h"
+#include "tests/cli/quenby_process.h"
+#include "tests/support/jpeg_files.h"
+#include "tests/support/pictures.h"
+
+namespace pelorin::test_support {
+namespace {
+
+using testing::HasSubstr;
+using testing::IsEmpty;
+using testing::StartsWith;
+
+// Every verb that reads photos, on one of 100 x 96 pixels.
+class LimitsOf : public testing::TestWithParam<const char*> {};
+
+INSTANTIATE_TEST_SUITE_P(Verbs, LimitsOf,
+                         testing::Values("enhance in/a.jpg -o out.jpg",
+                                         "look spring in/a.jpg -o out.jpg",
+                                         "sheet in/a.jpg -o out.png", "info in/a.jpg",
+                                         "score in/a.jpg", "keypoints in/a.jpg --json",
+                                         "curve in/a.jpg --text", "masks in/a.jpg -o out",
+                                         "compare in/a.jpg in/a.jpg", "dupes -r in",
+                                         "watch in -o out --once --settle 0"),
+                         [](const auto& verb) {
+                           const std::string words = verb.param;
+                           return words.substr(0, words.find(' '));
+                         });
+
+TEST_P(LimitsOf, RefusesWhatAsksForMore) {
+  const TemporaryFolder folder;
+  folder.makeFolder("in");
+  const std::string photo = folder.write("in/a.jpg", jpegOf(photoLikePicture(100, 96, 1)));
+  const std::string run = "cd '" + (folder / "") + "' && $QUENBY " + GetParam();
+
+  const Finished pixels = shell(run + " --max-pixels 9599");
+  EXPECT_EQ(pixels.exitCode, 1);
+  EXPECT_THAT(pixels.errors, HasSubstr("a.jpg: too large: 100 x 96 pixels, at most 9599"));
+  const Finished bytes = shell(run + " --max-bytes 100");
+  EXPECT_EQ(bytes.exitCode, 1);
+  EXPECT_THAT(bytes.errors, HasSubstr("a.jpg: is larger than 100 bytes"));
+
+  const Finished enough = shell(run + " --max-pixels 9600 --max-bytes 1G --timeout 3600");
+  EXPECT_EQ(enough.exitCode, 0) << enough.errors;
+}
+
+TEST(Limits, CountPixelsOfEveryFormat) {
+  const TemporaryFolder folder;
+  const auto picture = photoLikePicture(40, 30, 1);
+  const std::string png = folder.write("a.png", photo::save(picture, *photo::formatNamed("PNG")));
+  EXPECT_THAT(quenby({"info", png, "--max-pixels", "1199"}).errors, HasSubstr("at most 1199"));
+  EXPECT_EQ(quenby({"info", png, "--max-pixels", "2k"}).exitCode, 0);
+}
+
+TEST(Limits, AreNumbersAboveNought) {
+  for (const std::string number : {"0", "-1", "x", "1.5", "5T", "30000000000G"}) {
+    SCOPED_TRACE(number);
+    const Finished run = quenby({"info", "a.jpg", "--max-pixels=" + number});
+    EXPECT_EQ(run.exitCode, 2);
+    EXPECT_THAT(run.errors, StartsWith("quenby info: --max-pixels: "));
+  }
+  EXPECT_EQ(quenby({"info", "a.jpg", "--timeout=-1"}).exitCode, 2);
+}
+
+// Takes the second that it is about: nobody writes into the pipe.
+TEST(Limits, GiveUpAPhotoThatTakesTooLong) {
+  const TemporaryFolder folder;
+  const std::string pipe = folder / "pipe.jpg";
+  ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
+  const std::string after = folder.write("b.jpg", smallJpeg());
+  const Finished run = quenby({"info", pipe, after, "--timeout", "1"});
+  EXPECT_EQ(run.exitCode, 1);
+  EXPECT_THAT(run.errors, HasSubstr("pipe.jpg: takes longer than 1 s; raise --timeout"));
+  EXPECT_THAT(run.output, HasSubstr("b.jpg"));
+}
+
+}  // namespace
+}  // namespace pelorin::test_support
