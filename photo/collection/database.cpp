@@ -1,6 +1,8 @@
 #include "photo/collection/database.h"
 
+#include <fcntl.h>
 #include <sqlite3.h>
+#include <unistd.h>
 
 #include <utility>
 
@@ -15,6 +17,9 @@ void Database::Close::operator()(sqlite3_stmt* statement) const {
 
 Database::Database(const std::string& file, int millisecondsToWait, Fail fail)
     : fail_(std::move(fail)) {
+  // A new one is its user's alone, and so is what SQLite puts beside it.
+  const int made = ::open(file.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, 0600);
+  if (made >= 0) ::close(made);
   sqlite3* database = nullptr;
   const int code =
       sqlite3_open_v2(file.c_str(), &database, SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE, nullptr);

@@ -2,6 +2,9 @@
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <sys/stat.h>
+
+#include <filesystem>
 
 #include "tests/support/temporary_folder.h"
 
@@ -29,6 +32,18 @@ TEST(Ledger, KnowsWhatAnEarlierProcessPutThere) {
   EXPECT_EQ(*again.find(name), done);
   EXPECT_EQ(*again.find("b"), begun);
   EXPECT_EQ(again.takeTrouble(), "");
+}
+
+TEST(Ledger, IsItsUsersAlone) {
+  const TemporaryFolder folder;
+  const mode_t before = ::umask(0);
+  const Ledger ledger(folder / "ledger");
+  ::umask(before);
+  for (const auto& entry : std::filesystem::directory_iterator(folder / "")) {
+    struct stat status = {};
+    ASSERT_EQ(::stat(entry.path().c_str(), &status), 0);
+    EXPECT_EQ(status.st_mode & 07777, 0600u) << entry.path();
+  }
 }
 
 TEST(Ledger, IsOneProcessesAtATime) {

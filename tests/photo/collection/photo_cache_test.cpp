@@ -3,6 +3,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <sqlite3.h>
+#include <sys/stat.h>
 
 #include <cmath>
 #include <filesystem>
@@ -75,6 +76,19 @@ TEST(PhotoCache, GivesBackWhatWasStored) {
   expectSame(cache.find("b.jpg", stamp, 8), withoutTime);
   expectSame(cache.find("odd \xFF\n'name.jpg", stamp, 8), withoutZone);
   expectSame(cache.find("./folder/../a.jpg", stamp, 8), recordOf(1));
+}
+
+TEST(PhotoCache, IsItsUsersAlone) {
+  const TemporaryFolder folder;
+  const mode_t before = ::umask(0);
+  PhotoCache cache(folder / "cache");
+  cache.storeScore("a.jpg", {1, 2}, 3.0f);
+  ::umask(before);
+  for (const auto& entry : std::filesystem::directory_iterator(folder / "")) {
+    struct stat status = {};
+    ASSERT_EQ(::stat(entry.path().c_str(), &status), 0);
+    EXPECT_EQ(status.st_mode & 07777, 0600u) << entry.path();
+  }
 }
 
 TEST(PhotoCache, ForgetsAPhotoThatChangedOrIsReadAtAnotherScale) {
