@@ -6,16 +6,21 @@ namespace pelorin::cli {
 namespace {
 
 Limits limitsOfThisRun;
+std::uint64_t askedPixels = 0;  // 0: not given
 
 }  // namespace
 
-const Limits& limits() {
-  return limitsOfThisRun;
+Limits limits() {
+  Limits limits = limitsOfThisRun;
+  // Who names a number of pixels gets as many, also from a file that is small for them.
+  if (askedPixels > 0) limits.decode.pixels = limits.decode.compressedPixels = askedPixels;
+  return limits;
 }
 
 void addLimitOptions(Verb verb) {
-  verb.option("--max-pixels", limitsOfThisRun.decode.pixels,
-              "Refuse photos of more pixels; 268M unless given")
+  verb.option("--max-pixels", askedPixels,
+              "Refuse photos of more pixels; unless given 268M, or 40M for a file of a few kB that "
+              "only says to have them")
       .inThousands()
       .group("Limits");
   verb.option("--max-bytes", limitsOfThisRun.bytes,

@@ -17,7 +17,7 @@ struct Limits {
 };
 
 /// Those of this run.
-const Limits& limits();
+Limits limits();
 
 /// Adds `--max-pixels`, `--max-bytes` and `--timeout` to a verb that reads photos.
 void addLimitOptions(Verb verb);

@@ -12,7 +12,8 @@ namespace pelorin::cli {
 /// side at `longestSide` pixels or more; 1 where it has fewer.
 int scaleForSide(photo::PictureSize photo, std::uint32_t longestSide);
 
-/// A picture as a JPEG file, with the colour profile of the photo that it is of and nothing else.
+/// A picture as a JPEG file, with the colour profile of the photo that it is of and nothing else. What
+/// is transparent shows white.
 /// @throws as `photo::save`.
 std::vector<std::uint8_t> smallJpeg(
     const image_processing::Image<image_processing::RGBA8Pixel>& picture,

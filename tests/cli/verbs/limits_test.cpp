@@ -1,6 +1,8 @@
 #include <gmock/gmock.h>
 #include <sys/stat.h>
 
+#include <boost/crc.hpp>
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -13,7 +15,7 @@ namespace pelorin::test_support {
 namespace {
 
 using testing::HasSubstr;
-using testing::IsEmpty;
+using testing::Not;
 using testing::StartsWith;
 
 // Every verb that reads photos, on one of 100 x 96 pixels.
@@ -55,6 +57,32 @@ TEST(Limits, CountPixelsOfEveryFormat) {
   const std::string png = folder.write("a.png", photo::save(picture, *photo::formatNamed("PNG")));
   EXPECT_THAT(quenby({"info", png, "--max-pixels", "1199"}).errors, HasSubstr("at most 1199"));
   EXPECT_EQ(quenby({"info", png, "--max-pixels", "2k"}).exitCode, 0);
+}
+
+// The header of a grey PNG file of so many pixels in 70 kB, as a blank page has them, and no picture.
+std::vector<std::uint8_t> headerOfBlankPage(std::uint32_t width, std::uint32_t height) {
+  auto file = photo::save(photoLikePicture(4, 4, 1), *photo::formatNamed("PNG"));
+  const auto store = [&](std::size_t at, std::uint32_t value) {
+    for (int i = 0; i < 4; ++i) file[at + i] = static_cast<std::uint8_t>(value >> (24 - 8 * i));
+  };
+  store(16, width);
+  store(20, height);
+  file[25] = 0;  // grey
+  boost::crc_32_type sum;
+  sum.process_bytes(&file[12], 17);
+  store(29, sum.checksum());
+  file.resize(70'000);
+  return file;
+}
+
+TEST(Limits, OfPixelsThatAreNamedHoldForSmallFilesAsWell) {
+  const TemporaryFolder folder;
+  const std::string page = folder.write("page.png", headerOfBlankPage(8000, 8000));
+  const std::vector<std::string> run = {"score", page};
+  EXPECT_THAT(quenby(run).errors, HasSubstr("too large: 8000 x 8000 pixels in a file of this"));
+  const Finished allowed = quenby({"score", page, "--max-pixels", "64M"});
+  EXPECT_EQ(allowed.exitCode, 1);
+  EXPECT_THAT(allowed.errors, Not(HasSubstr("too large")));
 }
 
 TEST(Limits, AreNumbersAboveNought) {
