@@ -245,7 +245,8 @@ function render(complete) {
   viewer.hideDetail();
   const start = performance.now();
   ask("render", [photo.id, forWorker(edit())], { topic: "render" }).then((took) => {
-    if (took) frames.push({ ...took, whole: performance.now() - start });
+    if (took) frames.push({ ...took, at: performance.now(), whole: performance.now() - start });
+    if (frames.length > 1000) frames.length = 0;
   }).catch(failed);
   seen();
   clearTimeout(settles);
@@ -494,9 +495,10 @@ async function save() {
   document.body.classList.add("busy");
   const start = performance.now();
   try {
-    const { bytes, losses, name } = await made(photo, ask);
+    const { bytes, losses, name, memory } = await made(photo, ask);
     download(new Blob([bytes], { type: bytes[0] === 0xff ? "image/jpeg" : "image/png" }), name);
     document.body.dataset.saved = Math.round(performance.now() - start);
+    document.body.dataset.memory = memory;
     tell(losses.length > 0 ? `Saved ${name}. Not in it:` : `Saved ${name} with all its metadata.`,
       losses.map(lossText));
   } catch (error) {
@@ -674,6 +676,7 @@ $("selftest").addEventListener("click", async () => {
 
 // ---- From here on ----
 
+matchMedia("(prefers-color-scheme: dark)").addEventListener("change", () => void settle());
 window.quenbyFrames = frames; // for measuring
 if ("serviceWorker" in navigator) navigator.serviceWorker.register("sw.js").catch(() => {});
 startWorker().then(

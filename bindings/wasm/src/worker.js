@@ -246,7 +246,7 @@ const calls = {
     const open = faces ? { ...options.open, ignoreKnownFaces: true } : options.open;
     const made = quenby.filterFile(new Uint8Array(bytes), filter, parameters,
       { ...options, open, faces: faces ?? [] });
-    return made;
+    return { ...made, memory: quenby.bytes.length };
   },
 
   /** What near-duplicates are found by, and a small picture for a strip. */

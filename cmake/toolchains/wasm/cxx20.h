@@ -20,23 +20,49 @@ constexpr To bit_cast(const From& from) noexcept {
 }
 #endif
 
+// Of the algorithms, those that a range and a condition or value are all there is to.
 namespace ranges {
 
-template <typename Range, typename Value, typename Projection = identity>
-constexpr auto find(Range&& range, const Value& value, Projection projection = {}) {
-  return std::find_if(std::begin(range), std::end(range), [&](const auto& element) {
-    return std::invoke(projection, element) == value;
+template <typename Range, typename Condition, typename Projection = identity>
+constexpr auto find_if(Range&& range, Condition condition, Projection projection = {}) {
+  return std::find_if(std::begin(range), std::end(range), [&](auto&& element) {
+    return std::invoke(condition, std::invoke(projection, element));
   });
 }
 
-template <typename Range, typename Condition>
-constexpr bool all_of(Range&& range, Condition condition) {
-  return std::all_of(std::begin(range), std::end(range), condition);
+template <typename Range, typename Value, typename Projection = identity>
+constexpr auto find(Range&& range, const Value& value, Projection projection = {}) {
+  return ranges::find_if(
+      range, [&](const auto& found) { return found == value; }, projection);
 }
 
-template <typename Range, typename Condition>
-constexpr bool none_of(Range&& range, Condition condition) {
-  return std::none_of(std::begin(range), std::end(range), condition);
+template <typename Range, typename Condition, typename Projection = identity>
+constexpr bool any_of(Range&& range, Condition condition, Projection projection = {}) {
+  return ranges::find_if(range, condition, projection) != std::end(range);
+}
+
+template <typename Range, typename Condition, typename Projection = identity>
+constexpr bool none_of(Range&& range, Condition condition, Projection projection = {}) {
+  return !ranges::any_of(range, condition, projection);
+}
+
+template <typename Range, typename Condition, typename Projection = identity>
+constexpr bool all_of(Range&& range, Condition condition, Projection projection = {}) {
+  return !ranges::any_of(range, std::not_fn(condition), projection);
+}
+
+template <typename Range, typename Condition, typename Projection = identity>
+constexpr auto count_if(Range&& range, Condition condition, Projection projection = {}) {
+  return std::count_if(std::begin(range), std::end(range), [&](auto&& element) {
+    return std::invoke(condition, std::invoke(projection, element));
+  });
+}
+
+template <typename Range, typename Order = std::less<>, typename Projection = identity>
+constexpr void sort(Range&& range, Order order = {}, Projection projection = {}) {
+  std::sort(std::begin(range), std::end(range), [&](const auto& a, const auto& b) {
+    return std::invoke(order, std::invoke(projection, a), std::invoke(projection, b));
+  });
 }
 
 }  // namespace ranges
