@@ -1,6 +1,7 @@
 #!/usr/bin/env bash
 # Photos through Spark on two cores beside the command with -j 2 and beside what one would write with
-# javax.imageio, in turn; then the search for near-duplicates among generated fingerprints.
+# javax.imageio, in turn; memory beside the heap; the search for near-duplicates among generated
+# fingerprints.
 #
 #   bench/cluster/run.sh QUENBY NATIVES [PHOTOS [ROUNDS [FINGERPRINTS]]]
 #
@@ -49,6 +50,26 @@ done | awk '
   { rate = ($2 - 1) / ($6 - $3); cost = 1000 * ($7 + $8 - $4 - $5) / ($2 - 1) }
   $1 == "quenby" { own = rate }
   { printf "%-9s %5.1fs %15.1f %15.1f %15.2f\n", $1, $3, rate, cost, rate / own }'
+
+# The heap is taken at once, so that what comes on top is the natives' and the machine's own.
+resident() { # FOLDER CORES: MiB at most
+  rm -rf "$scratch/out"
+  "$home/bin/spark-submit" --master "local[$2]" --driver-memory 512m \
+    --driver-java-options '-Xms512m -XX:+AlwaysPreTouch' "$jar" enhance --in "$1" \
+    --out "$scratch/out" >"$scratch/log" 2>&1 &
+  local job=$! peak=0
+  while kill -0 $job 2>/dev/null; do
+    peak=$(awk '/^VmHWM/ { print int($2 / 1024) }' /proc/$job/status 2>/dev/null || true)
+    [ -z "$peak" ] || local most=$peak
+    sleep 0.1
+  done
+  wait $job || { cat "$scratch/log" >&2 && exit 1; }
+  echo "$most"
+}
+java -cp "$classes:$jar" com.pelorin.photos.quenby.spark.TestPhotos "$scratch/large/0" 3 6000 4000
+for ((copy = 1; copy < 20; ++copy)); do cp -r "$scratch/large/0" "$scratch/large/$copy"; done
+echo "resident beside a heap of 512 MiB: $(($(resident "$scratch/one" 1) - 512)) MiB for a photo of 2 MP," \
+  "$(($(resident "$scratch/large" 1) - 512)) for 60 of 24 MP, $(($(resident "$scratch/large" 2) - 512)) on two cores"
 
 spark --class com.pelorin.photos.quenby.spark.GeneratedFingerprints --jars "$jar" --driver-memory 4g \
   "$scratch/bench.jar" "$fingerprints" "$scratch/fingerprints"
