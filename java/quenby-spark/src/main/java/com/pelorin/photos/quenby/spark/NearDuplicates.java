@@ -37,11 +37,11 @@ public final class NearDuplicates implements AutoCloseable {
     }
 
     /**
-     * Searches photos. Work begins here, with one pass over the fingerprints; each photo is decoded
-     * once.
+     * Searches photos. Each is decoded once. A table of fingerprints is read three times, so one
+     * that is not stored had better be cached.
      *
-     * @param photos    each with a path of its own, by which ties are settled, and either content or
-     *                  orientation, wall_clock, utc and green_cdf as of {@link #fingerprints}
+     * @param photos    each with a path of its own, by which ties are settled, and either content
+     *                  or orientation, wall_clock, utc, green_cdf as of {@link #fingerprints}
      * @param threshold the least score of a pair
      * @return what is found
      * @throws IllegalArgumentException when the threshold is not finite

@@ -1,5 +1,6 @@
 package com.pelorin.photos.quenby.spark;
 
+import java.io.FileNotFoundException;
 import java.io.IOException;
 import java.io.InputStream;
 import java.io.OutputStream;
@@ -44,11 +45,14 @@ final class ResultFile {
     static void write(Path target, byte[] content, Path parts, boolean overwrite,
             Configuration hadoop) throws IOException {
         FileSystem files = plain(target.getFileSystem(hadoop));
-        if (isThere(files, target, content)) {
-            return;
-        }
-        if (files.exists(target) && !overwrite) {
-            throw another();
+        if (files.exists(target)) {
+            if (isThere(files, target, content)) {
+                return;
+            }
+            if (!overwrite) {
+                throw new IOException(
+                        "the output is there and is another file; --overwrite replaces it");
+            }
         }
         if (OBJECT_STORES.contains(files.getUri().getScheme())) {
             put(files, target, content, true);
@@ -58,20 +62,19 @@ final class ResultFile {
         try {
             put(files, part, content, false);
             files.mkdirs(target.getParent());
+            // Another attempt may have been faster, and a file system refuses or replaces.
+            if (isThere(files, target, content)) {
+                return;
+            }
             if (overwrite) {
                 files.delete(target, false);
             }
-            // Another attempt may have been faster, and a file system refuses or replaces.
             if (!files.rename(part, target) && !isThere(files, target, content)) {
                 throw new IOException("cannot be renamed to " + target);
             }
         } finally {
             files.delete(part, false);
         }
-    }
-
-    private static IOException another() {
-        return new IOException("the output is there and is another file; --overwrite replaces it");
     }
 
     private static void put(FileSystem files, Path path, byte[] content, boolean overwrite)
@@ -83,11 +86,13 @@ final class ResultFile {
 
     private static boolean isThere(FileSystem files, Path target, byte[] content)
             throws IOException {
-        if (!files.exists(target) || files.getFileStatus(target).getLen() != content.length) {
+        if (!files.exists(target)) {
             return false;
         }
         try (InputStream in = files.open(target)) {
-            return Arrays.equals(in.readNBytes(content.length), content);
+            return Arrays.equals(in.readNBytes(content.length), content) && in.read() < 0;
+        } catch (FileNotFoundException gone) { // another attempt is replacing it
+            return false;
         }
     }
 
