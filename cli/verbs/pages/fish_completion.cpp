@@ -6,7 +6,7 @@
 namespace pelorin::cli {
 namespace {
 
-std::string quoted(const std::string& text) {
+std::string inQuotes(const std::string& text) {
   std::string result = "'";
   for (const char c : text) {
     if (c == '\'' || c == '\\') result += '\\';
@@ -23,7 +23,7 @@ std::string joined(const std::vector<std::string>& words) {
 
 std::string line(const CommandText& command, const std::string& condition,
                  const OptionText& option) {
-  std::string text = "complete -c " + command.name + " -n " + quoted(condition);
+  std::string text = "complete -c " + command.name + " -n " + inQuotes(condition);
   for (const std::string& name : option.names) {
     text += name.starts_with("--") ? " -l " + name.substr(2) : " -s " + name.substr(1);
   }
@@ -32,8 +32,8 @@ std::string line(const CommandText& command, const std::string& condition,
   if (option.names.empty()) text += value.files ? " -F" : " -f";
   std::string offered = joined(value.words);
   if (value.folders && !value.files) offered += " (__fish_complete_directories)";
-  if (!offered.empty()) text += " -a " + quoted(offered);
-  if (!option.names.empty()) text += " -d " + quoted(option.help);
+  if (!offered.empty()) text += " -a " + inQuotes(offered);
+  if (!option.names.empty()) text += " -d " + inQuotes(option.help);
   return text + "\n";
 }
 
@@ -46,7 +46,7 @@ std::string fishCompletion(const CommandText& command) {
   }
   for (const VerbText& verb : command.verbs) {
     text += "\ncomplete -c " + command.name + " -n __fish_use_subcommand -f -a " + verb.name +
-            " -d " + quoted(verb.summary) + "\n";
+            " -d " + inQuotes(verb.summary) + "\n";
     for (const OptionText& option : verb.options) {
       text += line(command, "__fish_seen_subcommand_from " + verb.name, option);
     }

@@ -6,7 +6,7 @@
 namespace pelorin::cli {
 namespace {
 
-std::string quoted(const std::string& text) {
+std::string inQuotes(const std::string& text) {
   std::string result = "'";
   for (const char c : text) {
     if (c == '\'') {
@@ -40,13 +40,13 @@ std::string action(const OptionText& option, const CommandText& command) {
 std::string argument(const OptionText& option, const CommandText& command) {
   const std::string what =
       option.value.empty() ? "" : ":" + field(option.value) + ":" + action(option, command);
-  if (option.names.empty()) return quoted((option.repeated ? "*" : "") + what);
+  if (option.names.empty()) return inQuotes((option.repeated ? "*" : "") + what);
   const std::string help = "[" + field(option.help) + "]";
   std::string all, text;
   for (const std::string& name : option.names) all += (all.empty() ? "" : " ") + name;
   for (const std::string& name : option.names) {
     const std::string again = option.repeated ? "*" : "(" + all + ")";
-    text += (text.empty() ? "" : " \\\n        ") + quoted(again + name + help + what);
+    text += (text.empty() ? "" : " \\\n        ") + inQuotes(again + name + help + what);
   }
   return text;
 }
@@ -66,7 +66,7 @@ _quenby() {
   local -a verbs=(
 )zsh";
   for (const VerbText& verb : command.verbs) {
-    text += "    " + quoted(verb.name + ":" + field(verb.summary)) + "\n";
+    text += "    " + inQuotes(verb.name + ":" + field(verb.summary)) + "\n";
   }
   text += "  )\n  _arguments -C \\\n";
   for (const OptionText& option : command.options) {
