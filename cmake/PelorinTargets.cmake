@@ -211,6 +211,9 @@ function(pelorin_link_self_contained target)
   target_link_options(${twin} BEFORE PRIVATE LINKER:--as-needed
                       LINKER:--whole-archive,${archives},--no-whole-archive)
   pelorin_hold_everything(${twin})
+  if(NOT TARGET self_contained)
+    add_custom_target(self_contained COMMENT "What needs nothing but the C library")
+  endif()
   add_dependencies(self_contained ${twin})
 endfunction()
 

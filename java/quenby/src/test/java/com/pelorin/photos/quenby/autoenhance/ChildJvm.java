@@ -67,7 +67,7 @@ final class ChildJvm {
         command.addAll(List.of("bash", "-c", shell + " exec \"$@\"", "bash"));
         command.add(Path.of(System.getProperty("java.home"), "bin", "java").toString());
         command.addAll(List.of("-Xmx512m", "-XX:-UsePerfData", "-Djava.awt.headless=true"));
-        for (String name : List.of("quenby.engine", "quenby.command", "quenby.library",
+        for (String name : List.of("quenby.root", "quenby.engine", "quenby.command", "quenby.library",
                 "java.io.tmpdir")) {
             if (System.getProperty(name) != null) {
                 command.add("-D" + name + "=" + System.getProperty(name));
