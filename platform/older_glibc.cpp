@@ -1,11 +1,14 @@
-// Lets libraries that are linked here load where the C library is older, down to glibc 2.28. What was
-// given a new name or a new version since then is asked for by the old one, or done without.
+// Lets libraries that are linked here load where the C library is older, down to glibc 2.28, or the C++
+// library, down to that of GCC 11. What was given a new name or a new version since then is asked for by
+// the old one, or done without.
 // A library's own definition comes before the C library's, and stays inside.
 #include <pthread.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <condition_variable>
 #include <cstdint>
+#include <mutex>
 
 #if defined(__x86_64__)
 #define OLDEST "GLIBC_2.2.5"
@@ -149,4 +152,10 @@ double log(double x) {
 double pow(double x, double y) {
   return old_pow(x, y);
 }
+}
+
+// A new version of GCC 12, the same function. Weak, for where the C++ library is linked in and has it.
+asm(".hidden _ZNSt18condition_variable4waitERSt11unique_lockISt5mutexE");
+__attribute__((weak)) void std::condition_variable::wait(std::unique_lock<std::mutex>& lock) {
+  pthread_cond_wait(native_handle(), lock.mutex()->native_handle());
 }
