@@ -61,12 +61,17 @@ class Watch {
         filter_(filter),
         folder_(folder),
         results_(results),
-        settling_(options.settle),
-        ledger_((results / ledgerName).string()),
+        settling_(isPlan() ? 0 : options.settle),
+        ledger_((results / ledgerName).string(),
+                isPlan() ? photo::LedgerUse::look : photo::LedgerUse::keep),
         talk_(verbName, options.files.report.quiet, 0) {}
 
   ExitCode run() {
     tellTrouble();
+    if (isPlan()) {
+      work(completePhotos());
+      return planned_ ? ExitCode::allDone : ExitCode::nothingToDo;
+    }
     try {
       goOn();
     } catch (const Interrupted&) {
@@ -78,6 +83,8 @@ class Watch {
 
  private:
   using Photos = std::vector<std::pair<Input, photo::FileStamp>>;
+
+  bool isPlan() const { return options_.files.outputs.planOnly; }
 
   void goOn() {
     while (!interruptRequested()) {
@@ -207,15 +214,17 @@ class Watch {
     options.outputs.output = (results_ / subfolder / "").string();
     options.outputs.overwrite = mayReplace;
     options.report.quiet = true;  // this says of each photo what became of it
-    filterFiles(verbName, options, filter_,
-                {.planned = [&](const std::vector<PlannedFile>& plan) { begin(plan, stamps); },
-                 .told =
-                     [&](const PlannedFile& file, const std::string& status,
-                         const std::vector<photo::Loss>& lost) {
-                       tell(file, status, stamps.at(file.input.path));
-                       for (const photo::Loss& loss : lost)
-                         talk_.note(file.output + ": " + lossText(loss));
-                     }});
+    const ExitCode code =
+        filterFiles(verbName, options, filter_,
+                    {.planned = [&](const std::vector<PlannedFile>& plan) { begin(plan, stamps); },
+                     .told =
+                         [&](const PlannedFile& file, const std::string& status,
+                             const std::vector<photo::Loss>& lost) {
+                           tell(file, status, stamps.at(file.input.path));
+                           for (const photo::Loss& loss : lost)
+                             talk_.note(file.output + ": " + lossText(loss));
+                         }});
+    if (isPlan() && code == ExitCode::allDone) planned_ = true;
   }
 
   // From here on results are ours, even where this is killed before it can say so.
@@ -265,6 +274,7 @@ class Watch {
   Talk talk_;
   std::map<std::string, photo::FileStamp> failures_;  // tried again when they change, or next time
   std::size_t done_ = 0, failed_ = 0;
+  bool planned_ = false;
 };
 
 ExitCode runWatch(const WatchOptions& options) {
@@ -276,14 +286,15 @@ ExitCode runWatch(const WatchOptions& options) {
   if (failed || !fs::is_directory(folder)) {
     throw UsageError(options.folder + ": is no folder that can be watched");
   }
-  fs::create_directories(options.files.outputs.output);
-  const fs::path results = fs::canonical(options.files.outputs.output);
+  const bool isPlan = options.files.outputs.planOnly;
+  if (!isPlan) fs::create_directories(options.files.outputs.output);
+  const fs::path results = fs::weakly_canonical(options.files.outputs.output);
   if (results == folder) {
     throw UsageError(
         "-o: results among the photos would be watched themselves; name another "
         "folder");
   }
-  photo::sweepLeftovers(results.string());
+  if (!isPlan) photo::sweepLeftovers(results.string());
   try {
     return Watch(options, {filter, params, {}, "enhanced already"}, folder, results).run();
   } catch (const photo::LedgerInUse& error) {
@@ -318,6 +329,9 @@ void addWatch(CommandLine& commandLine) {
   verb.flag("--overwrite", options->files.outputs.overwrite,
             "Replace files that others left there; results of photos that change are replaced "
             "without")
+      .group("Output");
+  verb.flag("-n,--dry-run", options->files.outputs.planOnly,
+            "Print what would become what of the photos that are there, and do nothing")
       .group("Output");
   verb.option("--settle", options->settle,
               "Milliseconds for which size and time of a file must stay the same before it counts "

@@ -42,10 +42,11 @@ void bind(sqlite3_stmt* statement, int column, const std::string& bytes) {
 
 }  // namespace
 
-Ledger::Ledger(const std::string& file) : file_(file) {
+Ledger::Ledger(const std::string& file, LedgerUse use) : file_(file) {
+  const bool looks = use == LedgerUse::look;
   for (const bool again : {false, true}) {
     try {
-      open();
+      looks ? look() : open();
       return;
     } catch (const Unusable& reason) {
       put_.reset();
@@ -56,7 +57,7 @@ Ledger::Ledger(const std::string& file) : file_(file) {
       }
       const bool isDamaged = reason.code == SQLITE_CORRUPT || reason.code == SQLITE_NOTADB ||
                              reason.code == SQLITE_ERROR;
-      if (!isDamaged || again) {
+      if (!isDamaged || again || looks) {
         trouble(sqlite3_errstr(reason.code));
         return;
       }
@@ -76,6 +77,21 @@ void Ledger::open() {
     database_->execute(fmt::format("PRAGMA user_version = {}", layoutVersion).c_str());
   }
   database_->execute("COMMIT");
+  check();
+  read();
+  put_ = database_->prepare(putPhoto);
+}
+
+void Ledger::look() {
+  std::error_code ignored;
+  if (!fs::exists(file_, ignored)) return;
+  database_.emplace(file_, /*millisecondsToWait=*/0, [](int code) { throw Unusable{code}; });
+  check();
+  read();
+  database_.reset();
+}
+
+void Ledger::check() {
   if (database_->number("PRAGMA application_id") != applicationId ||
       database_->number("PRAGMA user_version") != layoutVersion) {
     throw Unusable{SQLITE_NOTADB};
@@ -84,8 +100,6 @@ void Ledger::open() {
   if (!database_->step(check.get()) || blob(check.get(), 0) != "ok") {
     throw Unusable{SQLITE_CORRUPT};
   }
-  read();
-  put_ = database_->prepare(putPhoto);
 }
 
 void Ledger::read() {

@@ -27,6 +27,12 @@ struct LedgerEntry {
   friend bool operator==(const LedgerEntry&, const LedgerEntry&) = default;
 };
 
+/// What a ledger is opened for.
+enum class LedgerUse {
+  keep,  ///< To be kept, by one process at a time.
+  look,  ///< To be read once: nothing is made, locked or set aside.
+};
+
 /// Which photos were done, in a SQLite file, by one process at a time: the file is locked until this
 /// ends, however it ends. Each entry is on the disk before `put` returns, where the disk takes it.
 ///
@@ -34,9 +40,9 @@ struct LedgerEntry {
 /// name, and what cannot be written counts until the end of this process.
 class Ledger {
  public:
-  /// Opens the ledger or makes a new one.
+  /// Opens the ledger or makes a new one; where one only looks, what is put counts until this ends.
   /// @throws LedgerInUse.
-  explicit Ledger(const std::string& file);
+  explicit Ledger(const std::string& file, LedgerUse use = LedgerUse::keep);
 
   /// What went wrong since it was last asked; mostly empty.
   std::string takeTrouble();
@@ -51,6 +57,8 @@ class Ledger {
 
  private:
   void open();
+  void look();
+  void check();
   void read();
   void setAside();
   void trouble(const std::string& what);

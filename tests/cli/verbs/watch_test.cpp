@@ -12,7 +12,9 @@
 namespace pelorin::test_support {
 namespace {
 
+using testing::AllOf;
 using testing::HasSubstr;
+using testing::Not;
 namespace fs = std::filesystem;
 
 TEST(Settling, TakesAFileForCompleteWhenItStaysTheSame) {
@@ -79,6 +81,28 @@ TEST(Watch, DoesEveryPhotoOnceAndAgainWhenItChanges) {
   EXPECT_THAT(changed.output, HasSubstr("\"status\":\"done\""));
   EXPECT_NE(folder.read("out/a_AE0.jpg"), folder.read("wanted.jpg"));
   EXPECT_THAT(incoming.once().errors, HasSubstr("0 photos done"));
+}
+
+TEST(Watch, OnlySaysWhatItWouldDoWhereThatIsAsked) {
+  const Incoming at;
+  at.folder.write("in/a.jpg", smallJpeg());
+  const Finished all = at.once({"-n"});
+  EXPECT_EQ(all.exitCode, 0) << all.errors;
+  EXPECT_THAT(all.output, HasSubstr("out/a_AE0.jpg"));
+  EXPECT_FALSE(at.folder.has("out"));
+
+  EXPECT_EQ(at.once().exitCode, 0);
+  at.folder.write("in/b.jpg", smallJpeg());
+  const Finished rest = at.once({"--dry-run"});
+  EXPECT_THAT(rest.output, AllOf(HasSubstr("b_AE0.jpg"), Not(HasSubstr("a_AE0.jpg"))));
+  EXPECT_FALSE(at.folder.has("out/b_AE0.jpg"));
+  EXPECT_EQ(at.once().exitCode, 0);
+  EXPECT_EQ(at.once({"-n"}).exitCode, 3);
+
+  at.folder.write("out/.quenby-ledger", std::string("no ledger"));
+  const Finished damaged = at.once({"-n"});
+  EXPECT_THAT(damaged.errors, HasSubstr("cannot be used"));
+  EXPECT_FALSE(at.folder.has("out/.quenby-ledger.damaged-1"));
 }
 
 TEST(Watch, TellsWhatIsLost) {
