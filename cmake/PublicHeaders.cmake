@@ -1,10 +1,8 @@
-# The API in C++, told from what is inside: docs/cpp.md says what each of these headers is for. They are
-# installed with what they include, and nothing else is.
+# The API in C++, told from what is inside: what programs include, and docs/cpp.md says what for. These
+# headers are installed with what they include, and nothing else is.
 cmake_policy(VERSION 3.25)
 set(PELORIN_ENGINE_API
     image_processing/core/image.h
-    image_processing/core/image_metadata.h
-    image_processing/core/workers.h
     image_processing/dupe/cdf_distance.h
     image_processing/dupe/dupe_score.h
     image_processing/dupe/grayscale.h
@@ -18,17 +16,11 @@ set(PELORIN_ENGINE_API
     image_processing/quality/niqe.h)
 set(PELORIN_PHOTO_API
     photo/collection/best_photo.h
-    photo/collection/grouping.h
-    photo/collection/pair_search.h
     photo/collection/photo_library.h
-    photo/collection/photo_record.h
     photo/collection/photo_score.h
-    photo/faces.h
     photo/file_io.h
     photo/filter_photo.h
-    photo/format.h
     photo/photo.h
-    photo/photo_rows.h
     photo/photo_writer.h
     photo/thread_workers.h
     photo/time_limit.h)

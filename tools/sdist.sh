@@ -19,5 +19,5 @@ sed -e 's#\.\./\.\./##g; s#"src/quenby"#"bindings/python/src/quenby"#' \
 rm bindings/python/pyproject.toml
 printf 'Metadata-Version: 2.1\nName: quenby\nVersion: %s\n' "$version" >PKG-INFO
 tar --create --sort=name --owner=0 --group=0 --numeric-owner --format=ustar \
-  --mtime="@$(git -C "$root" log -1 --format=%ct)" --directory "$scratch" "$name" |
+  --mode=u=rwX,go=rX --mtime="@$(git -C "$root" log -1 --format=%ct)" --directory "$scratch" "$name" |
   gzip -9 -n >"$out/$name.tar.gz"

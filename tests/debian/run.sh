@@ -5,7 +5,7 @@
 #
 # Leaves with 77, and says why, where something for that is missing.
 set -euo pipefail
-build=$(readlink -f "$1") scratch=$2 mode=${3-}
+build=$(readlink -f "$1") scratch=$(readlink -f "$2") mode=${3-}
 here=$(dirname "$(readlink -f "${BASH_SOURCE[0]}")")
 export SOURCE_DATE_EPOCH=${SOURCE_DATE_EPOCH-1700000000} LC_ALL=C
 
@@ -91,17 +91,31 @@ files | diff "$scratch/before" - || fail "files stayed, or went that were not th
 [ "$mode" = clean ] || exit 0
 command -v mmdebstrap >/dev/null || skipped "mmdebstrap is not installed: no new system was tried"
 say "in a new system, with what programs need"
-mmdebstrap --quiet --variant=apt --include=gcc,libc6-dev,pkg-config,default-jdk-headless \
-  --customize-hook='mkdir -p "$1/debs"' --customize-hook="copy-in $(printf '%s ' "$PWD"/*.deb) /debs" \
+photo=/usr/share/matplotlib/mpl-data/sample_data/grace_hopper.jpg
+[ -f "$photo" ] || skipped "python-matplotlib-data is not installed: there is no photo"
+mmdebstrap --variant=apt --include=g++,pkg-config,default-jdk-headless \
+  --customize-hook="touch $scratch/begun" --customize-hook='mkdir -p "$1/debs"' \
+  --customize-hook="copy-in $(printf '%s ' "$PWD"/*.deb) /debs" \
   --customize-hook="copy-in $here/../package/uses_c/uses_quenby.c $here/UsesQuenby.java /debs" \
+  --customize-hook="copy-in $here/../../examples/enhance_file.cpp $photo /debs" \
   --customize-hook='chroot "$1" sh -ec "
     cd /debs
-    apt-get install -y --no-install-recommends ./*.deb
+    apt-get install -y --no-install-recommends ./quenby_*.deb
     quenby --version
+    env -u SOURCE_DATE_EPOCH quenby enhance grace_hopper.jpg -o by_command.jpg --slider 0.4
+    apt-get install -y --no-install-recommends ./*.deb
     cc -o /uses_c uses_quenby.c \$(pkg-config --cflags --libs quenby)
     /uses_c
+    c++ -std=c++20 -o /uses_cpp enhance_file.cpp \$(pkg-config --cflags --libs quenby-photo)
+    /uses_cpp grace_hopper.jpg by_program.jpg 0.4
+    cmp by_command.jpg by_program.jpg
     java -cp \"/usr/share/java/*\" UsesQuenby.java
     apt-get purge -y quenby \"libquenby*\"
-    ! find / -xdev -name \"*quenby*\" -not -path \"/debs/*\" -not -path \"/uses*\" | grep .
-  "' "$(. /etc/os-release && echo "$VERSION_CODENAME")" "$scratch/system.tar"
+    ! find / -xdev -name \"*quenby*\" -not -path \"/debs/*\" | grep .
+  "' "$(. /etc/os-release && echo "$VERSION_CODENAME")" "$scratch/system.tar" >"$scratch/system.log" 2>&1 || {
+  tail -n 30 "$scratch/system.log"
+  [ -f "$scratch/begun" ] && fail "in a new system"
+  skipped "mmdebstrap could make no new system here"
+}
 rm -f "$scratch/system.tar"
+say "passed"

@@ -44,7 +44,12 @@ def photo(tmp_path_factory, pixels):
     exif[0x0112] = 6
     exif[0x0132] = "2024:05:01 12:30:45"
     path = tmp_path_factory.mktemp("photos") / "photo.jpg"
-    Image.fromarray(pixels).save(path, quality=92, exif=exif, xmp=XMP.encode())
+    Image.fromarray(pixels).save(path, quality=92, exif=exif)
+    file = path.read_bytes()
+    packet = b"http://ns.adobe.com/xap/1.0/\0" + XMP.encode()  # which older versions of Pillow leave out
+    end = 2 + 2 + int.from_bytes(file[4:6], "big")
+    segment = b"\xff\xe1" + (len(packet) + 2).to_bytes(2, "big") + packet
+    path.write_bytes(file[:end] + segment + file[end:])
     return path
 
 
