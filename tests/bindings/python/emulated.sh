@@ -21,7 +21,7 @@ done
 rm -rf "$unpacked"
 unzip -q "$wheel" -d "$unpacked"
 readelf -h "$unpacked/quenby/libquenby.so" | grep -q AArch64
-grep -q '^Tag: py3-none-manylinux_2_\(17\|2[0-8]\)_aarch64$' "$unpacked"/quenby-*.dist-info/WHEEL
+grep -q '^Tag: py3-none-manylinux_.*_aarch64$' "$unpacked"/quenby-*.dist-info/WHEEL
 [ -s "$unpacked/quenby/licences/libpng.txt" ]
 [ ! -e "$unpacked/quenby.libs" ] # all of it is inside the one library
 
