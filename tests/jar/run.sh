@@ -50,6 +50,20 @@ for file in "$jar" "$desktop"; do
 done
 java --module-path "$jar:$desktop" --describe-module com.pelorin.photos.quenby >/dev/null
 
+# Made where Maven's profile for Spark was asked for: one file with all of the other two inside.
+spark=$root/build/jar/quenby-spark/quenby-spark-$version.jar
+if [ -f "$spark" ]; then
+  step "the jar for Spark"
+  unzip -qq -o "$spark" -d "$scratch/spark"
+  diff -r "$scratch/unpacked/native" "$scratch/spark/native"
+  diff -r "$scratch/unpacked/META-INF/licences" "$scratch/spark/META-INF/licences"
+  grep -q '^Main-Class: com.pelorin.photos.quenby.spark.QuenbyJob' "$scratch/spark/META-INF/MANIFEST.MF" ||
+    fail "$spark has no main class"
+  for kind in sources javadoc; do
+    [ -s "${spark%.jar}-$kind.jar" ] || fail "no $kind of $spark"
+  done
+fi
+
 step "bytecode of Java 11"
 classes=0
 while read -r class; do
