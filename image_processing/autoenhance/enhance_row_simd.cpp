@@ -56,25 +56,12 @@ struct Block {
 
 /// The steps of Lab's companding that a pixel's X, Y and Z fall on.
 HWY_NOINLINE void findSteps(const RGBA8Pixel* in, std::size_t count, Block& block) {
-  const float* const linear = sRGBToLinearTable.data();
-  const auto byte = hn::Set(Words(), 0xFFu);
   for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
     prefetchAhead(in + i);
-    // Red in the low byte: every target is little-endian.
-    const auto pixels = hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(in + i));
-    const auto channel = [&](auto word) HWY_ATTR {
-      return lookUp(linear, hn::BitCast(Ints(), hn::And(word, byte)));
-    };
-    const F r = channel(pixels);
-    const F g = channel(hn::ShiftRight<8>(pixels));
-    const F b = channel(hn::ShiftRight<16>(pixels));
-    // No colour goes beyond white, which takes the last step.
-    const auto step = [](F value) HWY_ATTR {
-      return simd::truncate(hn::Mul(value, set(compandingStepCount - 1)));
-    };
-    hn::Store(step(product(xOfRgb, r, g, b)), Ints(), block.xStep + i);
-    hn::Store(step(product(yOfRgb, r, g, b)), Ints(), block.yStep + i);
-    hn::Store(step(product(zOfRgb, r, g, b)), Ints(), block.zStep + i);
+    const lab::Steps steps = lab::stepsOf(in + i);
+    hn::Store(steps.x, Ints(), block.xStep + i);
+    hn::Store(steps.y, Ints(), block.yStep + i);
+    hn::Store(steps.z, Ints(), block.zStep + i);
   }
 }
 

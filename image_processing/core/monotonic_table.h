@@ -31,6 +31,10 @@ class MonotonicTable<float> {
 
   const std::vector<float>& samples() const { return *samples_; }
 
+  // What vectors find an index by.
+  float lo() const { return lo_; }
+  float scale() const { return scale_; }
+
  protected:
   /// Domain and sample count (at least 2). Leaves the table empty: the most derived constructor
   /// calls `initTable` when the function's own fields are set. May throw std::bad_alloc.
@@ -52,7 +56,6 @@ class MonotonicTable<float> {
     }
   }
 
-  float lo() const { return lo_; }
   float hi() const { return hi_; }
 
  private:

@@ -13,11 +13,13 @@
 #include "image_processing/autoenhance/lightness/build_tone_curve.h"
 #include "image_processing/autoenhance/lightness/cdf.h"
 #include "image_processing/autoenhance/lightness/lightness_histogram.h"
+#include "image_processing/autoenhance/masks/face_blend_row.h"
 #include "image_processing/autoenhance/masks/flatness_mask.h"
 #include "image_processing/autoenhance/masks/flatness_rows.h"
 #include "image_processing/autoenhance/masks/grid_blur.h"
 #include "image_processing/autoenhance/masks/grid_slice.h"
 #include "image_processing/autoenhance/masks/grid_splat.h"
+#include "image_processing/autoenhance/masks/skin.h"
 #include "image_processing/autoenhance/masks/summed_area_rows.h"
 #include "image_processing/dupe/green_cdf.h"
 #include "image_processing/features/brief_bits.h"
@@ -280,6 +282,26 @@ Kernel flatnessShape(const Photo& photo) {
       out);
 }
 
+Kernel skin(const Photo& photo) {
+  return overPixels<float>(photo, findSkin, findSkinScalar);
+}
+
+/// Eight faces in one place; the weights of columns are any.
+template <typename Mask>
+Kernel faceBlend(const Photo& photo) {
+  Image<float> skin(photo.width, photo.height);
+  findSkin(photo.data.get(), skin.data.get(), photo.pixelCount());
+  const Output<Mask> out(photo.width, photo.height);
+  return kernelOf(
+      blendFaceRow<Mask>, blendFaceRowScalar<Mask>,
+      [=, columns = lightnessOf(photo), before = smoothed<Mask>(photo)](auto* kernel) {
+        std::copy_n(before.data.get(), before.pixelCount(), out.image.data.get());
+        kernel(columns.data.get(), 0.7f, skin.data.get(), 8, out.image.data.get(),
+               photo.pixelCount());
+      },
+      out);
+}
+
 /// The pass over the pixels as one slider position asks for it; both masks are the smoothing.
 template <typename Mask, bool withMasks>
 Kernel pass(const Photo& photo) {
@@ -453,11 +475,14 @@ const std::vector<KernelRow>& kernelRows() {
       {"flatness/weights/float", row, flatnessWeights<float>},
       {"flatness/sums", picture, flatnessSums},
       {"flatness/shape/float", picture, flatnessShape<float>},
+      {"skin", row, skin},
+      {"face-blend/float", row, faceBlend<float>},
       {"pass/float", row, pass<float, true>},
       {"slice/8bit", picture, gridSlice<Quantized>},
       {"flatness/8bit", picture, flatness<Quantized>},
       {"flatness/weights/8bit", row, flatnessWeights<Quantized>},
       {"flatness/shape/8bit", picture, flatnessShape<Quantized>},
+      {"face-blend/8bit", row, faceBlend<Quantized>},
       {"pass/8bit", row, pass<Quantized, true>},
       {"pass/no-masks", row, pass<float, false>},
       {"look/ZebraBW/vignette", picture, look<ZebraBWFilter, true>},

@@ -10,6 +10,8 @@
 #include <hwy/highway.h>
 
 #include "image_processing/autoenhance/colour/lab_constants.h"
+#include "image_processing/autoenhance/colour/srgb.h"
+#include "image_processing/core/pixel_types.h"
 #include "image_processing/core/simd.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -18,6 +20,7 @@ namespace lab {
 namespace hn = hwy::HWY_NAMESPACE;
 using Floats = hn::CappedTag<float, 16>;
 using F = hn::Vec<Floats>;
+using I = hn::Vec<hn::RebindToSigned<Floats>>;
 constexpr float lastInverseSample = inverseCompandingSamples - 1;
 
 HWY_INLINE F set(float value) {
@@ -29,6 +32,32 @@ HWY_INLINE F product(const MatrixRow& row, F x, F y, F z) {
   F sum = hn::Mul(set(row.first), x);
   sum = hn::Add(sum, hn::Mul(set(row.second), y));
   return hn::Add(sum, hn::Mul(set(row.third), z));
+}
+
+/// Where the companding table is read for X, Y and Z.
+struct Steps {
+  I x, y, z;
+};
+
+/// Those of a vector of pixels.
+HWY_INLINE Steps stepsOf(const RGBA8Pixel* at) {
+  using Words = hn::RebindToUnsigned<Floats>;
+  using Ints = hn::RebindToSigned<Floats>;
+  // Red in the low byte: every target is little-endian.
+  const auto pixels = hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(at));
+  const auto channel = [](auto word) HWY_ATTR {
+    const auto code = hn::BitCast(Ints(), hn::And(word, hn::Set(Words(), 0xFFu)));
+    return hn::GatherIndex(Floats(), sRGBToLinearTable.data(), code);
+  };
+  const F r = channel(pixels);
+  const F g = channel(hn::ShiftRight<8>(pixels));
+  const F b = channel(hn::ShiftRight<16>(pixels));
+  // No colour goes beyond white, which takes the last step.
+  const auto step = [](F value) HWY_ATTR {
+    return simd::truncate(hn::Mul(value, set(compandingSamples - 1)));
+  };
+  return {step(product(xOfRgb, r, g, b)), step(product(yOfRgb, r, g, b)),
+          step(product(zOfRgb, r, g, b))};
 }
 
 HWY_INLINE F lightness(F fy) {

@@ -6,8 +6,9 @@
 #include <optional>
 #include <utility>
 
-#include "image_processing/autoenhance/colour/lab.h"
+#include "image_processing/autoenhance/masks/face_blend_row.h"
 #include "image_processing/autoenhance/masks/face_region.h"
+#include "image_processing/autoenhance/masks/skin.h"
 
 namespace pelorin::image_processing {
 
@@ -50,41 +51,42 @@ void FaceBlendRows::blendRow(std::uint32_t y, const RGBA8Pixel* pixels, TL* mask
     active.insert(std::upper_bound(active.begin(), active.end(), region), region);
   }
   if (active.empty()) return;
-  findSkin(pixels, scratch);
-  const std::vector<SkinPixel>& skin = scratch.skin_;
+  findRuns(pixels, scratch);
+  const std::vector<Run>& runs = scratch.runs_;
   for (const std::uint32_t i : active) {
     const Window& rows = *regions_[i].region.rows;
     const Window& columns = *regions_[i].region.columns;
     const float atY = rows.weights[static_cast<std::size_t>(y - rows.first)];
-    auto pixel = std::lower_bound(skin.begin(), skin.end(), columns.first,
-                                  [](const SkinPixel& s, std::int64_t x) { return s.x < x; });
-    for (; pixel != skin.end() && pixel->x <= columns.last; ++pixel) {
-      const float atX = columns.weights[static_cast<std::size_t>(pixel->x - columns.first)];
-      const float weight = atX * atY * pixel->skin;
-      TL& out = mask[pixel->x];
-      for (std::uint64_t time = 0; time < regions_[i].times; ++time) {
-        const float before = out;
-        out = 0.5f * weight + (1.0f - weight) * before;
-        if (static_cast<float>(out) == before) break;
-      }
+    auto run = std::lower_bound(runs.begin(), runs.end(), columns.first,
+                                [](const Run& r, std::int64_t x) { return r.end <= x; });
+    for (; run != runs.end() && run->first <= columns.last; ++run) {
+      const std::int64_t first = std::max(run->first, columns.first);
+      const std::int64_t end = std::min(run->end, columns.last + 1);
+      blendFaceRow(columns.weights.data() + (first - columns.first), atY,
+                   scratch.skin_.data() + first, regions_[i].times, mask + first,
+                   static_cast<std::size_t>(end - first));
     }
   }
 }
 
 // Pixels that are no skin at all have the weight 0 for every face, which changes no mask.
-void FaceBlendRows::findSkin(const RGBA8Pixel* pixels, Scratch& scratch) const {
+void FaceBlendRows::findRuns(const RGBA8Pixel* pixels, Scratch& scratch) const {
   const std::vector<std::uint32_t>& active = scratch.active_;
   std::int64_t first = regions_[active.front()].region.columns->first, last = first;
   for (const std::uint32_t i : active) {
     first = std::min(first, regions_[i].region.columns->first);
     last = std::max(last, regions_[i].region.columns->last);
   }
-  const ColourTables& tables = colourTables();
-  scratch.skin_.clear();
+  std::vector<float>& skin = scratch.skin_;
+  skin.resize(std::max(skin.size(), static_cast<std::size_t>(last + 1)));
+  findSkin(pixels + first, skin.data() + first, static_cast<std::size_t>(last + 1 - first));
+  constexpr std::int64_t gap = 32;  // pixels without skin that a run rather takes than ends at
+  scratch.runs_.clear();
   for (std::int64_t x = first; x <= last; ++x) {
-    const Lab lab = rgbToLab(tables, pixels[x].r, pixels[x].g, pixels[x].b);
-    const float skin = tables.skinA(lab.a) * tables.skinB(lab.b);
-    if (skin != 0.0f) scratch.skin_.push_back({static_cast<std::uint32_t>(x), skin});
+    if (skin[static_cast<std::size_t>(x)] == 0.0f) continue;
+    if (scratch.runs_.empty() || x - scratch.runs_.back().end > gap)
+      scratch.runs_.push_back({x, x});
+    scratch.runs_.back().end = x + 1;
   }
 }
 

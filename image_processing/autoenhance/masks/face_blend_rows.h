@@ -14,9 +14,9 @@ namespace pelorin::image_processing {
 /// for once however many faces cross it, and faces that cover the same part of the photo cost
 /// little beyond the first. Any thread may use it.
 class FaceBlendRows {
-  struct SkinPixel {
-    std::uint32_t x;
-    float skin;
+  // Columns from `first` to before `end`.
+  struct Run {
+    std::int64_t first, end;
   };
 
  public:
@@ -26,7 +26,8 @@ class FaceBlendRows {
 
     std::size_t nextStart_ = 0;          // the first in `starts_` that the rows have not come to
     std::vector<std::uint32_t> active_;  // their numbers, in the order of the faces
-    std::vector<SkinPixel> skin_;        // of the row, from left to right
+    std::vector<float> skin_;            // of the row's pixels, where a face is
+    std::vector<Run> runs_;              // that hold all of its skin, from left to right
   };
 
   /// Boxes may reach out of the photo; null ones are none. @throws std::bad_alloc.
@@ -55,7 +56,7 @@ class FaceBlendRows {
     std::uint64_t times;
   };
 
-  void findSkin(const RGBA8Pixel* pixels, Scratch& scratch) const;
+  void findRuns(const RGBA8Pixel* pixels, Scratch& scratch) const;
 
   std::vector<Repeated> regions_;      // in the order of the faces
   std::vector<std::uint32_t> starts_;  // their numbers by first row
