@@ -73,7 +73,10 @@ photo::DecodeLimits limitsOf(jlong maxPixels, jint maxScans, jint maxSegments) {
     throw std::invalid_argument("limits: are negative");
   }
   photo::DecodeLimits limits;
-  if (maxPixels != 0) limits.pixels = static_cast<std::uint64_t>(maxPixels);
+  // Who names a number of pixels gets as many, also from a file that is small for them.
+  if (maxPixels != 0) {
+    limits.pixels = limits.compressedPixels = static_cast<std::uint64_t>(maxPixels);
+  }
   if (maxScans != 0) limits.scans = maxScans;
   if (maxSegments != 0) limits.segments = maxSegments;
   return limits;
@@ -93,7 +96,7 @@ jbyteArray filterBytes(JNIEnv* env, jobject, jbyteArray array, jobject buffer, j
                        jint length, jint quality, jint subsampling, jint rotation,
                        jfloatArray faces, jint scale, jstring filter, jstring params, jboolean mark,
                        jlong cancel, jobjectArray lost, jlong maxPixels, jint maxScans,
-                       jint maxSegments) {
+                       jint maxSegments, jboolean png) {
   const std::stop_token stop = cancellations().token(cancel);
   const std::optional<photo::ChromaSampling> sampling = samplingOf(subsampling);
   const photo::DecodeLimits limits = limitsOf(maxPixels, maxScans, maxSegments);
@@ -105,8 +108,8 @@ jbyteArray filterBytes(JNIEnv* env, jobject, jbyteArray array, jobject buffer, j
       .save = {.quality = quality, .stop = stop, .sampling = sampling},
       .mark = mark != JNI_FALSE};
   const FileBytes file(env, array, buffer, offset, length);
-  const photo::FilteredPhoto made =
-      photo::filterPhoto(file.bytes(), request, photo::formatNamed("JPEG"));
+  const photo::FilteredPhoto made = photo::filterPhoto(
+      file.bytes(), request, photo::formatNamed(png != JNI_FALSE ? "PNG" : "JPEG"));
   if (lost != nullptr) tellLosses(env, made.lost, lost);
   return javaArray(env, made.file);
 }
@@ -187,7 +190,7 @@ void registerPhotoNatives() {
   const JNINativeMethod methods[] = {
       nativeMethod(
           "filter",
-          "([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[BJII)[B",
+          "([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[BJIIZ)[B",
           photoNative<&filterBytes>()),
       nativeMethod("niqe", "([BLjava/nio/ByteBuffer;IIJJII)F", photoNative<&niqe>()),
       nativeMethod("niqeFeatures", "([BLjava/nio/ByteBuffer;IIJJII)[F",

@@ -19,13 +19,14 @@ namespace pelorin::quenby {
 /// @param mark   whether the file tells of the edit.
 /// @param lost   of one element, which receives what of the metadata is not in the file: what and
 ///               why of each, in UTF-8, a zero byte behind either; may be null.
+/// @param png    whether it is a PNG file; a JPEG file else.
 /// @param faces  left, top, right, bottom of each as fractions of the upright, turned picture; null
 ///               is none. Those that the file knows of come with them.
 jbyteArray filterBytes(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset,
                        jint length, jint quality, jint subsampling, jint rotation,
                        jfloatArray faces, jint scale, jstring filter, jstring params, jboolean mark,
                        jlong cancel, jobjectArray lost, jlong maxPixels, jint maxScans,
-                       jint maxSegments);
+                       jint maxSegments, jboolean png);
 
 /// The NIQE score of the upright picture; NaN when a side is below 96 pixels.
 jfloat niqe(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset, jint length,

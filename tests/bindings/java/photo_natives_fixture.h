@@ -78,9 +78,9 @@ struct PhotoCalls {
                jlong cancel, jint subsampling = 0, jboolean mark = JNI_TRUE,
                jobjectArray lost = nullptr, const MaxOf& most = {}) const {
     const FakeObject* const made = taken(call<jbyteArray>(
-        "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[BJII)[B",
+        "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[BJIIZ)[B",
         array, buffer, offset, length, quality, subsampling, rotation, faces, scale, name, params,
-        mark, cancel, lost, most.pixels, most.scans, most.segments));
+        mark, cancel, lost, most.pixels, most.scans, most.segments, jboolean{JNI_FALSE}));
     return made == nullptr ? Bytes() : made->bytes;
   }
 

@@ -259,25 +259,26 @@ class PhotoNativesUnderFaults : public PhotoNatives {
                                                size(), jlong{0}, jlong{0}, jint{0}, jint{0}));
       };
     };
-    return {[this] {
-              env.DeleteLocalRef(calls.call<jobject>(
-                  "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/"
-                  "String;ZJ[[BJII)[B",
-                  array(), jobject{}, jint{0}, size(), jint{90}, jint{0}, jint{90},
-                  static_cast<jfloatArray>(faces), jint{1}, static_cast<jstring>(ae),
-                  static_cast<jstring>(slider), jboolean{JNI_TRUE}, jlong{0},
-                  static_cast<jobjectArray>(lost), jlong{0}, jint{0}, jint{0}));
-            },
-            [this] {
-              calls.call<jfloat>("niqe([BLjava/nio/ByteBuffer;IIJJII)F", array(), jobject{},
-                                 jint{0}, size(), jlong{0}, jlong{0}, jint{0}, jint{0});
-            },
-            measured("niqeFeatures([BLjava/nio/ByteBuffer;IIJJII)[F"),
-            measured("greenCdf([BLjava/nio/ByteBuffer;IIJJII)[F"),
-            [this] {
-              env.DeleteLocalRef(calls.call<jobject>("facts([BLjava/nio/ByteBuffer;II)[D", array(),
-                                                     jobject{}, jint{0}, size()));
-            }};
+    return {
+        [this] {
+          env.DeleteLocalRef(calls.call<jobject>(
+              "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/"
+              "String;ZJ[[BJIIZ)[B",
+              array(), jobject{}, jint{0}, size(), jint{90}, jint{0}, jint{90},
+              static_cast<jfloatArray>(faces), jint{1}, static_cast<jstring>(ae),
+              static_cast<jstring>(slider), jboolean{JNI_TRUE}, jlong{0},
+              static_cast<jobjectArray>(lost), jlong{0}, jint{0}, jint{0}, jboolean{JNI_FALSE}));
+        },
+        [this] {
+          calls.call<jfloat>("niqe([BLjava/nio/ByteBuffer;IIJJII)F", array(), jobject{}, jint{0},
+                             size(), jlong{0}, jlong{0}, jint{0}, jint{0});
+        },
+        measured("niqeFeatures([BLjava/nio/ByteBuffer;IIJJII)[F"),
+        measured("greenCdf([BLjava/nio/ByteBuffer;IIJJII)[F"),
+        [this] {
+          env.DeleteLocalRef(calls.call<jobject>("facts([BLjava/nio/ByteBuffer;II)[D", array(),
+                                                 jobject{}, jint{0}, size()));
+        }};
   }
 
   jbyteArray array() { return small; }

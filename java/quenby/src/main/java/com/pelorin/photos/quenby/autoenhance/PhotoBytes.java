@@ -33,6 +33,7 @@ public final class PhotoBytes {
         int rotation;
         int scale = 1;
         float[] faces;
+        boolean png;
         boolean mark = true;
         Consumer<? super Loss> losses;
         Cancellation cancellation;
@@ -62,7 +63,7 @@ public final class PhotoBytes {
     }
 
     /**
-     * Takes a file's bytes: quality 90, upright, full size, and the faces that the file knows of.
+     * Takes a file's bytes: JPEG of quality 90, upright, full size, and the faces that the file knows of.
      *
      * @param file all of them
      * @return the photo
@@ -152,6 +153,17 @@ public final class PhotoBytes {
     }
 
     /**
+     * Makes PNG files instead of JPEG files; those have no quality.
+     *
+     * @return a photo that does
+     */
+    public PhotoBytes png() {
+        Settings changed = settings.copy();
+        changed.png = true;
+        return with(changed);
+    }
+
+    /**
      * Chooses whether files that are made tell of it, by which the command knows them.
      *
      * @param mark true unless chosen
@@ -231,7 +243,8 @@ public final class PhotoBytes {
     /**
      * Refuses larger pictures, as too large.
      *
-     * @param pixels at least 1, of the picture as stored; 268435456 unless given
+     * @param pixels at least 1, of the picture as stored; unless given 268435456, or
+     *               40000000 for a file of a few kB that only says to have them
      * @return a photo that does
      * @throws IllegalArgumentException for less
      */
@@ -287,7 +300,7 @@ public final class PhotoBytes {
     }
 
     /**
-     * Makes the automatically enhanced JPEG file.
+     * Makes the automatically enhanced file.
      *
      * @param slider how much, of 0 (hardly anything) to 1; not clamped
      * @return its bytes, those that the command writes
@@ -303,7 +316,7 @@ public final class PhotoBytes {
     }
 
     /**
-     * Makes the filtered JPEG file, with the photo's metadata as far as it still holds.
+     * Makes the filtered file, with the photo's metadata as far as it still holds.
      *
      * @param filter which
      * @param params its parameters, "key=value;" items, every one with its semicolon
@@ -321,7 +334,7 @@ public final class PhotoBytes {
         byte[] made = call(cancel -> filter(array, buffer, offset, length, settings.quality,
                 settings.subsampling, settings.rotation, settings.faces, settings.scale,
                 filter.key(), params == null ? "" : params, settings.mark, cancel, lost,
-                settings.maxPixels, settings.maxScans, settings.maxSegments));
+                settings.maxPixels, settings.maxScans, settings.maxSegments, settings.png));
         if (lost != null) {
             Loss.all(lost[0]).forEach(settings.losses);
         }
@@ -389,7 +402,7 @@ public final class PhotoBytes {
     static native byte[] filter(byte[] array, ByteBuffer buffer, int offset, int length,
             int quality, int subsampling, int rotation, float[] faces, int scale, String filter,
             String params, boolean mark, long cancel, byte[][] lost, long maxPixels, int maxScans,
-            int maxSegments) throws PhotoException;
+            int maxSegments, boolean png) throws PhotoException;
 
     private static native float niqe(byte[] array, ByteBuffer buffer, int offset, int length,
             long cancel, long maxPixels, int maxScans, int maxSegments) throws PhotoException;

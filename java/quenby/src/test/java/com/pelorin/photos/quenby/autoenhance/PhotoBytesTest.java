@@ -3,6 +3,7 @@ package com.pelorin.photos.quenby.autoenhance;
 import static org.junit.jupiter.api.Assertions.assertArrayEquals;
 import static org.junit.jupiter.api.Assertions.assertEquals;
 import static org.junit.jupiter.api.Assertions.assertFalse;
+import static org.junit.jupiter.api.Assertions.assertNotNull;
 import static org.junit.jupiter.api.Assertions.assertThrows;
 import static org.junit.jupiter.api.Assertions.assertTrue;
 import static org.junit.jupiter.api.Assumptions.assumeFalse;
@@ -316,12 +317,12 @@ class PhotoBytesTest {
         threads.shutdown();
     }
 
-    private byte[] ofTheCommand(byte[] file, String name) throws Exception {
+    private byte[] ofTheCommand(byte[] file, String name, String made) throws Exception {
         String command = System.getProperty("quenby.command", "");
         assumeFalse(command.isEmpty(),
                 "quenby.command names no quenby to compare with");
         Path input = Files.write(folder.resolve(name), file);
-        Path output = folder.resolve("command.jpg");
+        Path output = folder.resolve(made);
         Process process = new ProcessBuilder(command, "enhance", input.toString(), "-o",
                 output.toString(), "--slider", "0.7", "--overwrite").redirectErrorStream(true)
                         .start();
@@ -332,13 +333,16 @@ class PhotoBytesTest {
 
     @Test
     void aFileIsTheCommands() throws Exception {
-        byte[] expected = ofTheCommand(turned, "turned.jpg");
+        byte[] expected = ofTheCommand(turned, "turned.jpg", "command.jpg");
         assertArrayEquals(expected, PhotoBytes.of(turned).enhance(0.7f));
         Path own = folder.resolve("own.jpg");
         JpegJob.of(folder.resolve("turned.jpg"), own).filter(Filter.AUTO, "slider=0.7;").run();
         assertArrayEquals(expected, Files.readAllBytes(own));
         for (byte[] png : pngFiles()) {
-            assertArrayEquals(ofTheCommand(png, "in.png"), PhotoBytes.of(png).enhance(0.7f));
+            assertArrayEquals(ofTheCommand(png, "in.png", "command.jpg"),
+                    PhotoBytes.of(png).enhance(0.7f));
+            assertArrayEquals(ofTheCommand(png, "in.png", "command.png"),
+                    PhotoBytes.of(png).png().enhance(0.7f));
         }
     }
 
@@ -384,5 +388,17 @@ class PhotoBytesTest {
             byte[] cut = Arrays.copyOf(png, png.length * 2 / 3);
             assertEquals(PhotoException.Kind.TRUNCATED, kindOf(cut));
         }
+    }
+
+    @Test
+    void pixelsThatAreNamedAreAllowedToSmallFilesToo() throws IOException {
+        ByteArrayOutputStream blank = new ByteArrayOutputStream();
+        ImageIO.write(new BufferedImage(7000, 6000, BufferedImage.TYPE_BYTE_BINARY), "png", blank);
+        PhotoBytes photo = PhotoBytes.of(blank.toByteArray());
+        assertEquals(PhotoException.Kind.TOO_LARGE,
+                assertThrows(PhotoException.class, photo::greenCdf).kind());
+        assertEquals(PhotoException.Kind.TOO_LARGE, assertThrows(PhotoException.class,
+                () -> photo.maxPixels(41_999_999).greenCdf()).kind());
+        assertNotNull(photo.maxPixels(42_000_000).greenCdf());
     }
 }
