@@ -32,7 +32,7 @@ photo::Photo openFor(std::uint32_t side, std::span<const std::uint8_t> file,
                      photo::OpenOptions options) {
   options = limited(std::move(options));
   if (!options.raw) {
-    const photo::PhotoFacts facts = photo::readFacts(file);
+    const photo::PhotoFacts facts = photo::openRows(file, options)->facts();
     options.scale = std::max(options.scale, scaleForSide({facts.width, facts.height}, side));
   }
   return photo::open(file, options);

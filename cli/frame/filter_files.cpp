@@ -15,6 +15,7 @@
 #include "cli/frame/interrupt.h"
 #include "cli/frame/jobs_option.h"
 #include "cli/frame/json_output.h"
+#include "cli/frame/limits.h"
 #include "cli/frame/photo_files.h"
 #include "cli/frame/print_plan.h"
 #include "cli/frame/raw_option.h"
@@ -120,7 +121,7 @@ Done existing(const Work& work, const PlannedFile& file) {
 // The mark of the same edit, as text; empty without one, and where edits are done again.
 std::string earlierEdit(const Work& work, std::span<const std::uint8_t> file) {
   if (work.again || work.photo.raw) return "";
-  const photo::PhotoFacts facts = photo::readFacts(file);
+  const photo::PhotoFacts facts = photo::openRows(file, {.limits = limits().decode})->facts();
   const photo::EditMark* const mark = photo::earlierEdit(facts, work.filter.filter);
   return mark == nullptr ? "" : textOf(*mark);
 }

@@ -31,7 +31,7 @@ int scaleFor(std::uint32_t width, std::uint32_t height) {
 
 PhotoRecord readPhotoRecord(std::span<const std::uint8_t> file, int scale, std::stop_token stop,
                             const DecodeLimits& limits) {
-  const PhotoFacts facts = readFacts(file);
+  const PhotoFacts facts = openRows(file, {.limits = limits, .stop = stop})->facts();
   if (scale == automaticScale) scale = scaleFor(facts.width, facts.height);
   const std::unique_ptr<RowReader> rows =
       openRows(file, {.scale = scale, .limits = limits, .stop = std::move(stop)});

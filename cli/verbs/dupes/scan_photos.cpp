@@ -46,9 +46,9 @@ class Scan {
         {.work =
              [&](std::size_t job) {
                const std::vector<std::uint8_t> file = readInput(unread[job]);
-               tellNotices(unread[job], photo::readFacts(file), talk);
-               return photo::readPhotoRecord(file, options_.scale, interruptToken(),
-                                             limits().decode);
+               const photo::DecodeLimits decode = limits().decode;
+               tellNotices(unread[job], photo::openRows(file, {.limits = decode})->facts(), talk);
+               return photo::readPhotoRecord(file, options_.scale, interruptToken(), decode);
              },
          .done =
              [&](std::size_t job, const photo::PhotoRecord& record) {

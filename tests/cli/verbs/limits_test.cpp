@@ -78,11 +78,14 @@ std::vector<std::uint8_t> headerOfBlankPage(std::uint32_t width, std::uint32_t h
 TEST(Limits, OfPixelsThatAreNamedHoldForSmallFilesAsWell) {
   const TemporaryFolder folder;
   const std::string page = folder.write("page.png", headerOfBlankPage(8000, 8000));
-  const std::vector<std::string> run = {"score", page};
-  EXPECT_THAT(quenby(run).errors, HasSubstr("too large: 8000 x 8000 pixels in a file of this"));
-  const Finished allowed = quenby({"score", page, "--max-pixels", "64M"});
-  EXPECT_EQ(allowed.exitCode, 1);
-  EXPECT_THAT(allowed.errors, Not(HasSubstr("too large")));
+  for (std::vector<std::string> run :
+       {std::vector<std::string>{"score", page}, {"dupes", page}, {"enhance", page}}) {
+    SCOPED_TRACE(run[0]);
+    EXPECT_THAT(quenby(run).errors, HasSubstr("too large: 8000 x 8000 pixels in a file of this"));
+    run.insert(run.end(), {"--max-pixels", "64M"});
+    EXPECT_THAT(quenby(run).errors, Not(HasSubstr("too large")));
+  }
+  EXPECT_EQ(quenby({"score", page, "--max-pixels", "64M"}).exitCode, 1);
 }
 
 TEST(Limits, AreNumbersAboveNought) {
