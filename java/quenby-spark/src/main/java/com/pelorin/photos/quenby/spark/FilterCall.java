@@ -47,7 +47,7 @@ final class FilterCall implements Serializable {
         }
         filter.check(params);
         FilterCall call = new FilterCall(filter, params, quality);
-        call.settings(new byte[0]); // refuses the quality
+        call.settings(PhotoBytes.of(new byte[0])); // refuses the quality
         return call;
     }
 
@@ -63,12 +63,11 @@ final class FilterCall implements Serializable {
                         .collect(Collectors.joining(", ")));
     }
 
-    byte[] apply(byte[] content) throws PhotoException {
-        return settings(content).filter(filter, params);
+    byte[] apply(PhotoBytes photo) throws PhotoException {
+        return settings(photo).filter(filter, params);
     }
 
-    private PhotoBytes settings(byte[] content) {
-        PhotoBytes photo = PhotoBytes.of(content);
+    private PhotoBytes settings(PhotoBytes photo) {
         if (quality.isEmpty()) {
             return photo;
         }

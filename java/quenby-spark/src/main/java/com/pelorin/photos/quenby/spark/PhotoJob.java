@@ -19,6 +19,7 @@ import java.util.ArrayList;
 import java.util.Arrays;
 import java.util.Iterator;
 import java.util.List;
+import java.util.Locale;
 import java.util.UUID;
 import org.apache.hadoop.fs.FileSystem;
 import org.apache.hadoop.fs.Path;
@@ -58,6 +59,7 @@ final class PhotoJob {
 
     private final SparkSession spark;
     private final PhotoWork work;
+    private final PhotoLimits limits;
     private final Path out;
     private final boolean overwrite;
     private final Manifest manifest;
@@ -66,13 +68,16 @@ final class PhotoJob {
     /**
      * Prepares a job.
      *
+     * @param limits    what a photo may cost
      * @param out       the folder of the files that it makes; one job at a time works there
      * @param overwrite whether it may replace other files there
      * @param told      the folder of the manifest
      */
-    PhotoJob(SparkSession spark, PhotoWork work, Path out, boolean overwrite, Path told) {
+    PhotoJob(SparkSession spark, PhotoWork work, PhotoLimits limits, Path out, boolean overwrite,
+            Path told) {
         this.spark = spark;
         this.work = work;
+        this.limits = limits;
         this.out = out;
         this.overwrite = overwrite;
         this.manifest = new Manifest(spark, told, work.columns());
@@ -99,7 +104,7 @@ final class PhotoJob {
                 int most = Math.max(MOST_TASKS, 4 * spark.sparkContext().defaultParallelism());
                 int tasks = (int) Math.min(most, 1 + (count - 1) / PHOTOS_OF_A_TASK);
                 manifest.append(missing.repartition(tasks).mapPartitions(
-                        new Worker(work, parts.toString(), overwrite, hadoop),
+                        new Worker(work, limits, parts.toString(), overwrite, hadoop),
                         Encoders.row(manifest.schema())), run);
             }
         } finally {
@@ -139,7 +144,7 @@ final class PhotoJob {
         Dataset<Row> there = PhotoList.below(spark, folder, hadoop).select("input")
                 .withColumnRenamed("input", "output").withColumn("there", lit(true));
         Dataset<Row> named = photos.withColumn("output", concat(lit(folder + "/"),
-                expr("IF(lower(name) RLIKE '[.](jpe?g|jpe)$', name, concat(name, '.jpg'))")));
+                expr("IF(lower(name) RLIKE '[.](jpe?g|jpe|png)$', name, concat(name, '.jpg'))")));
         return named
                 .withColumn("nth", row_number().over(
                         Window.partitionBy("output").orderBy("input")))
@@ -157,14 +162,16 @@ final class PhotoJob {
     private static final class Worker implements MapPartitionsFunction<Row, Row> {
         private static final long serialVersionUID = 1;
         private final PhotoWork work;
+        private final PhotoLimits limits;
         private final String parts;
         private final boolean overwrite;
         private final SerializableConfiguration hadoop;
         private final int columns;
 
-        Worker(PhotoWork work, String parts, boolean overwrite,
+        Worker(PhotoWork work, PhotoLimits limits, String parts, boolean overwrite,
                 SerializableConfiguration hadoop) {
             this.work = work;
+            this.limits = limits;
             this.parts = parts;
             this.overwrite = overwrite;
             this.hadoop = hadoop;
@@ -196,10 +203,12 @@ final class PhotoJob {
             Object[] made = new Object[columns];
             if (error == null) {
                 try {
-                    byte[] content = ResultFile.read(new Path(input), hadoop.value());
+                    byte[] content =
+                            ResultFile.read(new Path(input), limits.bytes(), hadoop.value());
                     hash = sha256(content);
-                    made = work.run(content, file -> ResultFile.write(new Path(output), file,
-                            new Path(parts), overwrite, hadoop.value()));
+                    made = limits.apply(content, it -> work.run(isPng(output) ? it.png() : it,
+                            file -> ResultFile.write(new Path(output), file, new Path(parts),
+                                    overwrite, hadoop.value())));
                 } catch (IOException | RuntimeException failure) {
                     error = Outcome.reason(failure);
                 }
@@ -210,6 +219,11 @@ final class PhotoJob {
                     (System.nanoTime() - start) / 1_000_000, engine));
             row.addAll(Arrays.asList(made));
             return RowFactory.create(row.toArray());
+        }
+
+        /** Its name says what a file is, as everywhere. */
+        private static boolean isPng(String output) {
+            return output != null && output.toLowerCase(Locale.ROOT).endsWith(".png");
         }
 
         private static String sha256(byte[] content) {

@@ -27,12 +27,11 @@ final class PhotoRows {
                 known(facts.wallClockSeconds()), known(facts.utcSeconds()));
     }
 
-    static Row fingerprint(byte[] content) throws PhotoException {
-        return RowFactory.create(fingerprintValues(content));
+    static Row fingerprint(PhotoBytes photo) throws PhotoException {
+        return RowFactory.create(fingerprintValues(photo));
     }
 
-    static Object[] fingerprintValues(byte[] content) throws PhotoException {
-        PhotoBytes photo = PhotoBytes.of(content);
+    static Object[] fingerprintValues(PhotoBytes photo) throws PhotoException {
         PhotoFacts facts = photo.facts();
         return new Object[] {facts.width(), facts.height(), facts.orientation(),
             known(facts.wallClockSeconds()), known(facts.utcSeconds()),

@@ -1,5 +1,6 @@
 package com.pelorin.photos.quenby.spark;
 
+import com.pelorin.photos.quenby.autoenhance.PhotoBytes;
 import java.io.IOException;
 import java.io.Serializable;
 import org.apache.spark.sql.types.StructType;
@@ -25,8 +26,8 @@ interface PhotoWork extends Serializable {
     /**
      * Does it.
      *
-     * @param content of the photo's file
+     * @param photo within the limits of the job
      * @return values of the columns
      */
-    Object[] run(byte[] content, Output output) throws IOException;
+    Object[] run(PhotoBytes photo, Output output) throws IOException;
 }

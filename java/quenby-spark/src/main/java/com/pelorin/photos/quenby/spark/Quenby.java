@@ -58,12 +58,13 @@ public final class Quenby {
 
     private static Row enhance(byte[] content, String params) {
         return content == null ? null
-                : Outcome.of(() -> FilterCall.of(Filter.AUTO, params).apply(content));
+                : Outcome.of(() -> FilterCall.of(Filter.AUTO, params).apply(PhotoBytes.of(content)));
     }
 
     private static Row look(byte[] content, String look, String params) {
         return content == null ? null
-                : Outcome.of(() -> FilterCall.of(FilterCall.look(look), params).apply(content));
+                : Outcome.of(() -> FilterCall.of(FilterCall.look(look), params)
+                        .apply(PhotoBytes.of(content)));
     }
 
     private static Row score(byte[] content) {
@@ -86,6 +87,7 @@ public final class Quenby {
     }
 
     private static Row fingerprint(byte[] content) {
-        return content == null ? null : Outcome.of(() -> PhotoRows.fingerprint(content));
+        return content == null ? null
+                : Outcome.of(() -> PhotoRows.fingerprint(PhotoBytes.of(content)));
     }
 }

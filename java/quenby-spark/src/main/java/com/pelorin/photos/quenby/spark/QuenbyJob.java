@@ -1,7 +1,5 @@
 package com.pelorin.photos.quenby.spark;
 
-import static org.apache.spark.sql.functions.col;
-
 import com.pelorin.photos.quenby.autoenhance.Filter;
 import com.pelorin.photos.quenby.autoenhance.PhotoBytes;
 import java.io.IOException;
@@ -13,10 +11,9 @@ import org.apache.hadoop.conf.Configuration;
 import org.apache.hadoop.fs.Path;
 import org.apache.spark.sql.Dataset;
 import org.apache.spark.sql.Row;
-import org.apache.spark.sql.SaveMode;
 import org.apache.spark.sql.SparkSession;
-import org.apache.spark.sql.types.DataTypes;
 import org.apache.spark.sql.types.StructType;
+import org.apache.spark.storage.StorageLevel;
 
 /** The job that {@code spark-submit} runs. */
 public final class QuenbyJob {
@@ -25,10 +22,12 @@ public final class QuenbyJob {
             "  enhance [--params \"slider=0.4;quality=90;\"] [--overwrite]",
             "  look --look NAME [--params \"maskAlpha=0.5;\"] [--overwrite]",
             "  score",
-            "  dupes [--threshold 1.5]",
+            "  dupes [--threshold 1.5] [--assume-mtime] [--keep best]",
+            "each: [--max-pixels 268M] [--max-bytes 1074M] [--timeout SECONDS], of a photo",
             "--in is a folder, a text file with a path a line, or NAME.parquet with a column path;",
             "enhance and look write files below --out and OUT/_manifest, score writes OUT/scores,",
-            "dupes OUT/fingerprints, OUT/pairs, OUT/groups. Run again, each does what is missing.");
+            "dupes OUT/fingerprints, OUT/pairs, OUT/groups and, of the best, OUT/ranking.",
+            "Run again, each does what is missing.");
 
     private QuenbyJob() {}
 
@@ -61,14 +60,20 @@ public final class QuenbyJob {
                 "enhance", Set.of("--params", "--overwrite"),
                 "look", Set.of("--look", "--params", "--overwrite"),
                 "score", Set.of(),
-                "dupes", Set.of("--threshold"));
+                "dupes", Set.of("--threshold", "--assume-mtime", "--keep"));
+        private static final Set<String> OF_ALL =
+                Set.of("--in", "--out", "--max-pixels", "--max-bytes", "--timeout");
+        private static final Set<String> FLAGS = Set.of("--overwrite", "--assume-mtime");
 
         final String verb;
         final String in;
         final Path out;
         final boolean overwrite;
+        final PhotoLimits limits;
+        final float threshold;
+        final boolean assumeFileTime;
+        final boolean ranks;
         private final PhotoWork work;
-        private final float threshold;
 
         Arguments(String... arguments) {
             verb = arguments.length == 0 ? "" : arguments[0];
@@ -78,11 +83,10 @@ public final class QuenbyJob {
             Map<String, String> values = new HashMap<>();
             for (int i = 1; i < arguments.length; ++i) {
                 String option = arguments[i];
-                if (!option.equals("--in") && !option.equals("--out")
-                        && !OPTIONS.get(verb).contains(option)) {
+                if (!OF_ALL.contains(option) && !OPTIONS.get(verb).contains(option)) {
                     throw new IllegalArgumentException(verb + " has no option " + option);
                 }
-                boolean isFlag = option.equals("--overwrite");
+                boolean isFlag = FLAGS.contains(option);
                 if (!isFlag && i + 1 == arguments.length) {
                     throw new IllegalArgumentException(option + " wants a value");
                 }
@@ -91,8 +95,14 @@ public final class QuenbyJob {
             in = required(values, "--in");
             out = new Path(required(values, "--out"));
             overwrite = values.containsKey("--overwrite");
+            limits = PhotoLimits.of(values);
             work = workOf(values);
             threshold = number(values.get("--threshold"));
+            assumeFileTime = values.containsKey("--assume-mtime");
+            ranks = values.containsKey("--keep");
+            if (ranks && !values.get("--keep").equals("best")) {
+                throw new IllegalArgumentException("--keep: is not best: " + values.get("--keep"));
+            }
         }
 
         private static String required(Map<String, String> values, String option) {
@@ -134,14 +144,16 @@ public final class QuenbyJob {
 
     static void run(SparkSession spark, Arguments given, PrintStream talk) throws IOException {
         requireApart(spark, given);
-        Dataset<Row> photos = PhotoList.of(spark, given.in);
+        Dataset<Row> photos = PhotoList.of(spark, given.in).persist(StorageLevel.MEMORY_AND_DISK());
         Path told = new Path(given.out, given.verb.equals("score") ? "scores"
                 : given.verb.equals("dupes") ? "fingerprints" : "_manifest");
-        PhotoJob job = new PhotoJob(spark, given.work, given.out, given.overwrite, told);
+        PhotoJob job = new PhotoJob(spark, given.work, given.limits, given.out, given.overwrite,
+                told);
         talk.println("quenby " + given.verb + ": " + job.run(photos) + "; see " + told);
         if (given.verb.equals("dupes")) {
-            findDuplicates(job.results(photos), given, talk);
+            DupesJob.run(spark, given, job.results(photos), talk);
         }
+        photos.unpersist();
     }
 
     /** Results among the photos would be photos of the next run. */
@@ -157,21 +169,6 @@ public final class QuenbyJob {
 
     private static String folder(Path path, Configuration hadoop) throws IOException {
         return path.getFileSystem(hadoop).makeQualified(path) + "/";
-    }
-
-    private static void findDuplicates(Dataset<Row> fingerprints, Arguments given,
-            PrintStream talk) {
-        Path groups = new Path(given.out, "groups");
-        try (NearDuplicates found = NearDuplicates.of(
-                fingerprints.withColumnRenamed("input", "path"), given.threshold)) {
-            found.pairs().write().mode(SaveMode.Overwrite)
-                    .parquet(new Path(given.out, "pairs").toString());
-            found.groups().write().mode(SaveMode.Overwrite).parquet(groups.toString());
-            long count = fingerprints.sparkSession().read().parquet(groups.toString())
-                    .select(col("photos")).count();
-            talk.println("quenby dupes: " + count + " groups; " + found.untimed()
-                    + " photos tell no time and are in none; see " + groups);
-        }
     }
 
     private static final class FilterWork implements PhotoWork {
@@ -198,28 +195,9 @@ public final class QuenbyJob {
         }
 
         @Override
-        public Object[] run(byte[] content, Output output) throws IOException {
-            output.write(call.apply(content));
+        public Object[] run(PhotoBytes photo, Output output) throws IOException {
+            output.write(call.apply(photo));
             return new Object[0];
-        }
-    }
-
-    private static final class ScoreWork implements PhotoWork {
-        private static final long serialVersionUID = 1;
-
-        @Override
-        public String parameters() {
-            return "niqe";
-        }
-
-        @Override
-        public StructType columns() {
-            return new StructType().add("niqe", DataTypes.FloatType);
-        }
-
-        @Override
-        public Object[] run(byte[] content, Output output) throws IOException {
-            return new Object[] {PhotoBytes.of(content).niqe()};
         }
     }
 
@@ -237,8 +215,8 @@ public final class QuenbyJob {
         }
 
         @Override
-        public Object[] run(byte[] content, Output output) throws IOException {
-            return PhotoRows.fingerprintValues(content);
+        public Object[] run(PhotoBytes photo, Output output) throws IOException {
+            return PhotoRows.fingerprintValues(photo);
         }
     }
 }

@@ -1,17 +1,20 @@
 package com.pelorin.photos.quenby.spark;
 
+import java.io.EOFException;
 import java.io.FileNotFoundException;
 import java.io.IOException;
 import java.io.InputStream;
 import java.io.OutputStream;
+import java.nio.file.Files;
 import java.util.Arrays;
 import java.util.Set;
 import java.util.UUID;
 import org.apache.hadoop.conf.Configuration;
 import org.apache.hadoop.fs.ChecksumFileSystem;
-import org.apache.hadoop.fs.FileStatus;
+import org.apache.hadoop.fs.FSDataInputStream;
 import org.apache.hadoop.fs.FileSystem;
 import org.apache.hadoop.fs.Path;
+import org.apache.hadoop.fs.RawLocalFileSystem;
 
 /**
  * A file that appears whole and once, however many attempts write it: each writes a file of its own
@@ -21,18 +24,33 @@ import org.apache.hadoop.fs.Path;
 final class ResultFile {
     private static final Set<String> OBJECT_STORES =
             Set.of("s3", "s3a", "s3n", "gs", "oss", "cosn", "obs");
+    private static final int LONGEST_ARRAY = Integer.MAX_VALUE - 8;
 
     private ResultFile() {}
 
-    static byte[] read(Path path, Configuration hadoop) throws IOException {
-        FileSystem files = path.getFileSystem(hadoop);
-        FileStatus status = files.getFileStatus(path);
-        if (status.getLen() > Integer.MAX_VALUE - 8) {
-            throw new IOException("has " + status.getLen() + " bytes, more than an array holds");
+    /**
+     * Reads a file.
+     *
+     * @param most bytes that it may have
+     * @throws IOException when it has more or cannot be read
+     */
+    static byte[] read(Path path, long most, Configuration hadoop) throws IOException {
+        FileSystem files = plain(path.getFileSystem(hadoop));
+        long length = files.getFileStatus(path).getLen();
+        if (length > most) {
+            throw new IOException("is larger than " + most
+                    + " bytes, the most that is read of a file");
         }
-        try (InputStream in = files.open(path)) {
-            return in.readNBytes((int) status.getLen());
+        if (length > LONGEST_ARRAY) {
+            throw new IOException("has " + length + " bytes, more than an array holds");
         }
+        byte[] content = new byte[(int) length];
+        try (FSDataInputStream in = files.open(path)) {
+            in.readFully(content);
+        } catch (EOFException error) {
+            throw new IOException("became shorter while it was read", error);
+        }
+        return content;
     }
 
     /**
@@ -55,12 +73,12 @@ final class ResultFile {
             }
         }
         if (OBJECT_STORES.contains(files.getUri().getScheme())) {
-            put(files, target, content, true);
+            put(files, target, content);
             return;
         }
         Path part = new Path(parts, UUID.randomUUID().toString());
         try {
-            put(files, part, content, false);
+            put(files, part, content);
             files.mkdirs(target.getParent());
             // Another attempt may have been faster, and a file system refuses or replaces.
             if (isThere(files, target, content)) {
@@ -77,9 +95,14 @@ final class ResultFile {
         }
     }
 
-    private static void put(FileSystem files, Path path, byte[] content, boolean overwrite)
-            throws IOException {
-        try (OutputStream out = files.create(path, overwrite)) {
+    private static void put(FileSystem files, Path path, byte[] content) throws IOException {
+        if (files instanceof RawLocalFileSystem) { // whose create runs chmod for each file
+            java.nio.file.Path local = ((RawLocalFileSystem) files).pathToFile(path).toPath();
+            Files.createDirectories(local.getParent());
+            Files.write(local, content);
+            return;
+        }
+        try (OutputStream out = files.create(path, true)) {
             out.write(content);
         }
     }

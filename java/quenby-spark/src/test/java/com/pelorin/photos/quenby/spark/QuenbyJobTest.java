@@ -8,12 +8,18 @@ import static org.junit.jupiter.api.Assertions.assertTrue;
 
 import com.fasterxml.jackson.databind.JsonNode;
 import com.fasterxml.jackson.databind.ObjectMapper;
+import java.awt.image.BufferedImage;
+import java.io.ByteArrayInputStream;
 import java.io.ByteArrayOutputStream;
 import java.io.IOException;
 import java.io.PrintStream;
 import java.io.UncheckedIOException;
 import java.nio.file.Files;
 import java.nio.file.Path;
+import java.nio.file.attribute.FileTime;
+import java.time.Instant;
+import java.time.LocalDateTime;
+import java.time.ZoneId;
 import java.util.Arrays;
 import java.util.List;
 import java.util.Map;
@@ -22,6 +28,7 @@ import java.util.TreeMap;
 import java.util.TreeSet;
 import java.util.stream.Collectors;
 import java.util.stream.Stream;
+import javax.imageio.ImageIO;
 import org.apache.spark.sql.Dataset;
 import org.apache.spark.sql.Encoders;
 import org.apache.spark.sql.Row;
@@ -205,6 +212,102 @@ class QuenbyJobTest {
         assertTrue(run("dupes", in, out).contains("0 done, 0 failed, 29 done before"));
     }
 
+    private void writeShot(String name, byte[] jpeg, LocalDateTime time) throws IOException {
+        Files.write(in.resolve(name), TestPhotos.withExif(jpeg, 1, time, null));
+    }
+
+    @Test
+    void theBestOfEachGroupIsTheCommands() throws Exception {
+        LocalDateTime time = LocalDateTime.of(2023, 1, 1, 12, 0);
+        writeShot("more.jpg", TestPhotos.jpeg(160, 140, 7, 1), time);
+        writeShot("less.jpg", TestPhotos.jpeg(150, 130, 8, 1), time);
+        for (String name : new String[] {"tiny1.jpg", "tiny2.jpg"}) { // too small for a score
+            writeShot(name, TestPhotos.jpeg(80, 60, 9, 1), time.plusDays(1));
+        }
+        assertTrue(run("dupes", "--in", in.toString(), "--out", out.toString(), "--threshold", "0",
+                "--keep", "best").contains("34 done"));
+        Set<String> expected = new TreeSet<>();
+        for (JsonNode group : new ObjectMapper().readTree(LocalSpark.command(0, "dupes", "-r",
+                in.toString(), "--json", "--threshold", "0", "--keep", "best")).get("groups")) {
+            int place = 0;
+            for (JsonNode photo : group.get("ranking")) {
+                expected.add(group.get("photos").get(0).get("file").asText() + " " + ++place + " "
+                        + photo.get("file").asText() + " " + photo.get("keep") + " "
+                        + (photo.get("niqe").isNull() ? null : (float) photo.get("niqe").asDouble()));
+            }
+        }
+        Set<String> told = new TreeSet<>();
+        for (Row photo : spark.read().parquet(out + "/ranking").selectExpr(
+                "substr(group, 6)", "place", "substr(photo, 6)", "keep", "niqe").collectAsList()) {
+            told.add(photo.mkString(" "));
+        }
+        assertFalse(expected.isEmpty());
+        assertEquals(expected, told);
+    }
+
+    @Test
+    void photosWithoutATimeMayTakeThatOfTheirFile() throws Exception {
+        String[] names = {"x.jpg", "y.jpg", "z.jpg"};
+        for (int i = 0; i < names.length; ++i) {
+            Path photo = Files.write(in.resolve(names[i]), TestPhotos.jpeg(120, 100, 99, 1));
+            Files.setLastModifiedTime(photo, FileTime.fromMillis(1_720_000_000_000L + 700 * i));
+        }
+        // One that the camera's clock, without a zone, puts beside them: times of files have one.
+        writeShot("w.jpg", TestPhotos.jpeg(120, 100, 99, 1), LocalDateTime.ofInstant(
+                Instant.ofEpochSecond(1_720_000_000), ZoneId.systemDefault()));
+        Set<String> expected = new TreeSet<>();
+        new ObjectMapper().readTree(LocalSpark.command(0, "dupes", "-r", in.toString(), "--json",
+                "--assume-mtime")).get("groups").forEach(group -> expected.add(group
+                        .findValuesAsText("file") + " " + group.get("seconds").asDouble()));
+        assertTrue(run("dupes", "--in", in.toString(), "--out", out.toString(), "--assume-mtime")
+                .contains("; 0 photos tell no time"));
+        Set<String> told = new TreeSet<>();
+        for (Row group : spark.read().parquet(out + "/groups").selectExpr(
+                "transform(photos, photo -> substr(photo, 6))", "seconds").collectAsList()) {
+            told.add(group.getList(0) + " " + group.get(1));
+        }
+        assertTrue(expected.toString().contains("z.jpg"), expected.toString());
+        assertEquals(expected, told);
+    }
+
+    @Test
+    void photosBeyondTheLimitsAreRows() throws IOException {
+        String[] limited = {"score", "--in", in.toString(), "--out", out.toString(), "", "11999"};
+        limited[5] = "--max-pixels";
+        assertTrue(run(limited).contains("0 done, 30 failed"));
+        limited[5] = "--max-bytes";
+        limited[6] = "1k";
+        assertTrue(run(limited).contains("0 done, 30 failed"));
+        assertEquals(2, spark.read().parquet(out + "/scores").select("error").distinct()
+                .where("error LIKE '%larger than 1000 bytes%' OR error LIKE '%pixels%'").count());
+        limited[6] = "1M";
+        assertTrue(run(limited).contains("30 done, 0 failed"));
+    }
+
+    @Test
+    void aPhotoThatTakesTooLongIsGivenUp() {
+        PhotoLimits limits = PhotoLimits.of(Map.of("--timeout", "1"));
+        assertTrue(assertThrows(IOException.class, () -> limits.apply(
+                TestPhotos.jpeg(120, 100, 1, 1), photo -> {
+                    while (true) {
+                        photo.niqe();
+                    }
+                })).getMessage().contains("raise --timeout"));
+    }
+
+    @Test
+    void pngFilesStayPngFiles() throws Exception {
+        Path pictures = Files.createDirectory(folder.resolve("pictures"));
+        BufferedImage picture = ImageIO.read(
+                new ByteArrayInputStream(TestPhotos.jpeg(120, 100, 3, 1)));
+        ImageIO.write(picture, "png", pictures.resolve("a.PNG").toFile());
+        assertTrue(run("enhance", pictures, out).contains("1 done"));
+        Path expected = folder.resolve("expected");
+        LocalSpark.command(0, "enhance", pictures + "/a.PNG", "-o", expected + "/", "--name",
+                "{stem}.PNG");
+        assertSame(files(expected), files(out));
+    }
+
     @Test
     void whatIsAskedForIsCheckedFirst() {
         String[][] wrong = {{}, {"enhanced"}, {"enhance"}, {"enhance", "--in", "a"},
@@ -213,7 +316,12 @@ class QuenbyJobTest {
             {"enhance", "--in", "a", "--out", "b", "--threshold", "1"},
             {"look", "--in", "a", "--out", "b"},
             {"look", "--in", "a", "--out", "b", "--look", "autumn"},
-            {"dupes", "--in", "a", "--out", "b", "--threshold", "high"}};
+            {"dupes", "--in", "a", "--out", "b", "--threshold", "high"},
+            {"dupes", "--in", "a", "--out", "b", "--keep", "all"},
+            {"score", "--in", "a", "--out", "b", "--max-pixels", "0"},
+            {"score", "--in", "a", "--out", "b", "--max-pixels", "40m"},
+            {"score", "--in", "a", "--out", "b", "--max-bytes", "99999999999999999999"},
+            {"score", "--in", "a", "--out", "b", "--timeout", "-1"}};
         for (String[] arguments : wrong) {
             assertThrows(IllegalArgumentException.class,
                     () -> new QuenbyJob.Arguments(arguments), String.join(" ", arguments));

@@ -1,0 +1,105 @@
+package com.pelorin.photos.quenby.spark;
+
+import com.pelorin.photos.quenby.autoenhance.Cancellation;
+import com.pelorin.photos.quenby.autoenhance.PhotoBytes;
+import java.io.IOException;
+import java.io.Serializable;
+import java.util.Map;
+import java.util.concurrent.CancellationException;
+import java.util.concurrent.Executors;
+import java.util.concurrent.Future;
+import java.util.concurrent.ScheduledExecutorService;
+import java.util.concurrent.TimeUnit;
+
+/** What a photo of a job may cost at most: the command's limits, with its options and defaults. */
+final class PhotoLimits implements Serializable {
+    private static final long serialVersionUID = 1;
+    private static final Map<String, Long> UNITS =
+            Map.of("", 1L, "k", 1_000L, "M", 1_000_000L, "G", 1_000_000_000L);
+    private static final long USUAL_BYTES = 1L << 30;
+
+    private final long pixels; // 0: what the natives have
+    private final long bytes;
+    private final long seconds; // 0: as long as it takes
+
+    private PhotoLimits(long pixels, long bytes, long seconds) {
+        this.pixels = pixels;
+        this.bytes = bytes;
+        this.seconds = seconds;
+    }
+
+    /**
+     * Reads options.
+     *
+     * @throws IllegalArgumentException when one is no number
+     */
+    static PhotoLimits of(Map<String, String> options) {
+        return new PhotoLimits(number(options, "--max-pixels", 1, 0),
+                number(options, "--max-bytes", 1, USUAL_BYTES),
+                number(options, "--timeout", 0, 0));
+    }
+
+    private static long number(Map<String, String> options, String option, long least,
+            long usual) {
+        String text = options.get(option);
+        if (text == null) {
+            return usual;
+        }
+        String digits = text.replaceAll("[kMG]$", "");
+        try {
+            long number = Math.multiplyExact(
+                    Long.parseLong(digits), UNITS.get(text.substring(digits.length())));
+            if (number >= least) {
+                return number;
+            }
+        } catch (ArithmeticException | NumberFormatException error) {
+            // Falls through: as bad as a number that is too small.
+        }
+        throw new IllegalArgumentException(
+                option + ": is no number from " + least + " on, such as 20 or 40M: " + text);
+    }
+
+    /** Of a file. */
+    long bytes() {
+        return bytes;
+    }
+
+    /** What is done with a photo. */
+    interface Work<T> {
+        T run(PhotoBytes photo) throws IOException;
+    }
+
+    /**
+     * Works on a photo within the limits.
+     *
+     * @throws IOException what the work throws; and when the photo is beyond a limit
+     */
+    <T> T apply(byte[] content, Work<T> work) throws IOException {
+        PhotoBytes photo = PhotoBytes.of(content);
+        if (pixels > 0) {
+            photo = photo.maxPixels(pixels);
+        }
+        if (seconds == 0) {
+            return work.run(photo);
+        }
+        Cancellation late = new Cancellation();
+        Future<?> alarm = Clock.ALARMS.schedule(late::cancel, seconds, TimeUnit.SECONDS);
+        try {
+            return work.run(photo.cancellation(late));
+        } catch (CancellationException error) {
+            throw new IOException("takes longer than " + seconds + " s; raise --timeout", error);
+        } finally {
+            alarm.cancel(false);
+        }
+    }
+
+    /** A thread for each process that has limited times. */
+    private static final class Clock {
+        static final ScheduledExecutorService ALARMS =
+                Executors.newSingleThreadScheduledExecutor(work -> {
+                    Thread thread = new Thread(work, "quenby time limits");
+                    thread.setDaemon(true);
+                    return thread;
+                });
+    }
+}
