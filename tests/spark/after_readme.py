@@ -14,9 +14,8 @@ for row in better.where("photo.error IS NULL").limit(20).collect():
         assert expected.read() == bytes(row.photo.result), name
 
 manifest = spark.read.parquet(os.path.join(scratch, "out", "_manifest"))
-assert manifest.count() == count + 2, manifest.count()
 assert manifest.select("input").distinct().count() == count + 2
-assert manifest.where("status = 'done'").count() == count
+assert manifest.where("status = 'done'").count() == count  # each once, of two runs together
 failed = {row.input.rsplit("/", 1)[1]: row.error for row in manifest.where("error IS NOT NULL").collect()}
 assert failed.keys() == {"cut.jpg", "empty.jpg"}, failed
 

@@ -83,18 +83,23 @@ class NearDuplicatesTest {
     }
 
     @Test
-    void aCrowdOfOneSecondIsOneGroup() throws IOException {
-        TestPhotos.library(folder, 1, 24, 16, 3);
-        Dataset<Row> photo = NearDuplicates.fingerprints(LocalSpark.photos(spark, folder));
-        Dataset<Row> crowd = spark.range(300).crossJoin(photo).selectExpr(
-                "concat('photo', id) AS path", "1.7e9D AS wall_clock",
-                "CAST(NULL AS DOUBLE) AS utc", "1 AS orientation", "green_cdf");
-        try (NearDuplicates found = NearDuplicates.of(crowd, 1.5f, 64)) {
-            assertEquals(300 * 299 / 2, found.pairs().count());
-            List<Row> groups = found.groups().collectAsList();
-            assertEquals(1, groups.size());
-            assertEquals(300, groups.get(0).getList(0).size());
+    void aThousandPhotosOfOneSecondAreComparedOnce() throws IOException {
+        for (int scene = 0; scene < 20; ++scene) {
+            Files.write(folder.resolve(scene + ".jpg"), TestPhotos.jpeg(24, 16, scene, 1));
         }
+        Dataset<Row> scenes = NearDuplicates.fingerprints(LocalSpark.photos(spark, folder))
+                .coalesce(1).cache();
+        Dataset<Row> crowd = spark.range(50).crossJoin(scenes).selectExpr(
+                "concat(path, id) AS path", "1.7e9D AS wall_clock",
+                "CAST(NULL AS DOUBLE) AS utc", "1 AS orientation", "green_cdf");
+        assertEquals(1000, crowd.count());
+        try (NearDuplicates found = NearDuplicates.of(crowd, 3.6f, 200)) { // little but copies
+            List<Row> groups = found.groups().collectAsList();
+            assertEquals(20, groups.size());
+            groups.forEach(group -> assertEquals(50, group.getList(0).size()));
+            assertEquals(20 * 50 * 49 / 2, found.pairs().count());
+        }
+        scenes.unpersist();
     }
 
     @Test

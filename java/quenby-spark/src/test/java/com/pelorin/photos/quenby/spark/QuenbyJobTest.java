@@ -309,6 +309,23 @@ class QuenbyJobTest {
     }
 
     @Test
+    void anyFileSystemOfHadoopWillDo() throws Exception {
+        spark.sparkContext().hadoopConfiguration().set(
+                "fs.viewfs.mounttable.test.link./photos", in.toUri().toString());
+        spark.sparkContext().hadoopConfiguration().set(
+                "fs.viewfs.mounttable.test.link./made", folder.toUri().toString());
+        String[] elsewhere = {"enhance", "--in", "viewfs://test/photos", "--out",
+            "viewfs://test/made/out"};
+        assertTrue(run(elsewhere).contains("30 done, 0 failed, 0 done before"));
+        Map<String, byte[]> made = files(out);
+        made.keySet().removeIf(name -> name.endsWith(".crc")); // the local files behind it
+        assertEquals(30, made.size());
+        assertTrue(run(elsewhere).contains("0 done, 0 failed, 30 done before"));
+        run("enhance", in, folder.resolve("here"));
+        assertSame(files(folder.resolve("here")), made);
+    }
+
+    @Test
     void whatIsAskedForIsCheckedFirst() {
         String[][] wrong = {{}, {"enhanced"}, {"enhance"}, {"enhance", "--in", "a"},
             {"enhance", "--in", "a", "--out", "b", "--params", "slide=1;"},

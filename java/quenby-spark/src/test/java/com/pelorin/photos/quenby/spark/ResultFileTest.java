@@ -2,10 +2,12 @@ package com.pelorin.photos.quenby.spark;
 
 import static org.junit.jupiter.api.Assertions.assertArrayEquals;
 import static org.junit.jupiter.api.Assertions.assertEquals;
+import static org.junit.jupiter.api.Assertions.assertFalse;
 import static org.junit.jupiter.api.Assertions.assertThrows;
 import static org.junit.jupiter.api.Assertions.assertTrue;
 
 import java.io.IOException;
+import java.net.URI;
 import java.nio.file.Files;
 import java.nio.file.Path;
 import java.util.ArrayList;
@@ -15,6 +17,7 @@ import java.util.concurrent.Executors;
 import java.util.concurrent.Future;
 import java.util.stream.Stream;
 import org.apache.hadoop.conf.Configuration;
+import org.apache.hadoop.fs.RawLocalFileSystem;
 import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.io.TempDir;
 
@@ -59,6 +62,34 @@ class ResultFileTest {
         try (Stream<Path> made = Files.list(folder.resolve("below"))) {
             assertEquals(1, made.count());
         }
+    }
+
+    /** A store of objects, of which none can be renamed. */
+    public static final class Bucket extends RawLocalFileSystem {
+        @Override
+        public URI getUri() {
+            return URI.create("gs://bucket");
+        }
+
+        @Override
+        public boolean rename(org.apache.hadoop.fs.Path from, org.apache.hadoop.fs.Path to) {
+            throw new IllegalStateException("renamed " + from);
+        }
+    }
+
+    @Test
+    void objectsAreWrittenInPlace() throws IOException {
+        hadoop.set("fs.gs.impl", Bucket.class.getName());
+        org.apache.hadoop.fs.Path target =
+                new org.apache.hadoop.fs.Path("gs://bucket" + folder + "/made.jpg");
+        for (byte[] made : new byte[][] {{1, 2, 3}, {1, 2, 3}, {4}}) {
+            ResultFile.write(target, made, path("parts"), made.length == 1, hadoop);
+            assertArrayEquals(made, ResultFile.read(target, 9, hadoop));
+        }
+        assertThrows(IOException.class,
+                () -> ResultFile.write(target, new byte[2], path("parts"), false, hadoop));
+        assertThrows(IOException.class, () -> ResultFile.read(target, 0, hadoop));
+        assertFalse(Files.exists(folder.resolve("parts")));
     }
 
     @Test
