@@ -3,6 +3,7 @@ package com.pelorin.photos.quenby.spark;
 import static org.junit.jupiter.api.Assertions.assertArrayEquals;
 import static org.junit.jupiter.api.Assertions.assertEquals;
 import static org.junit.jupiter.api.Assertions.assertNull;
+import static org.junit.jupiter.api.Assertions.assertThrows;
 import static org.junit.jupiter.api.Assertions.assertTrue;
 
 import com.pelorin.photos.quenby.autoenhance.Filter;
@@ -95,6 +96,13 @@ class QuenbyTest {
         assertTrue(error("quenby_enhance(content, 'slider=1;quality=0;')").contains("quality"));
         assertTrue(error("quenby_enhance(content, 'slider=1;quality=x;')").contains("quality"));
         assertTrue(error("quenby_cdf_distance(content, content)").contains("1024"));
+    }
+
+    @Test
+    void exhaustedMemoryIsNoPhotosFailure() {
+        assertThrows(OutOfMemoryError.class, () -> Outcome.of(() -> {
+            throw new OutOfMemoryError("as the natives throw it");
+        }));
     }
 
     @Test
