@@ -19,8 +19,10 @@ namespace pelorin::photo {
 class Descriptor {
  public:
   /// @throws std::system_error when it cannot be opened.
-  Descriptor(const std::string& path, int flags, mode_t mode = 0)
-      : descriptor_(::open(path.c_str(), flags | O_CLOEXEC, mode)) {
+  Descriptor(const std::string& path, int flags, mode_t mode = 0) {
+    do {
+      descriptor_ = ::open(path.c_str(), flags | O_CLOEXEC, mode);
+    } while (descriptor_ < 0 && errno == EINTR);
     if (descriptor_ < 0) throwSystemError(errno, path);
   }
   ~Descriptor() {
