@@ -61,7 +61,8 @@ if(PELORIN_SANITIZE)
                       -fno-sanitize-recover=all)
   add_link_options(-fsanitize=${PELORIN_SANITIZE})
   set(PELORIN_ASAN_RUNTIME libasan.so)
-  if(CMAKE_CXX_COMPILER_ID MATCHES Clang AND PELORIN_SANITIZE MATCHES address)
+  if(CMAKE_CXX_COMPILER_ID MATCHES Clang AND PELORIN_SANITIZE MATCHES address
+     AND NOT PELORIN_SANITIZE MATCHES fuzzer)
     # As a library, since a virtual machine must load it before ours.
     set(PELORIN_ASAN_RUNTIME libclang_rt.asan-${CMAKE_SYSTEM_PROCESSOR}.so)
     pelorin_runtime(runtime ${PELORIN_ASAN_RUNTIME})
@@ -278,8 +279,8 @@ function(pelorin_bench name)
 endfunction()
 
 # pelorin_fuzz(<name> [RUNS n] DEPENDS ...): the fuzz target in <name>.cpp. With clang it is a libFuzzer
-# binary; with any other compiler it replays files and runs seeded random inputs, so that a short
-# run belongs to the tests everywhere.
+# binary; with any other compiler it replays fuzz/corpus/<name>.txt and runs seeded random inputs, so that
+# a short run belongs to the tests everywhere.
 function(pelorin_fuzz name)
   cmake_parse_arguments(PARSE_ARGV 1 arg "" "RUNS" "DEPENDS")
   if(NOT arg_RUNS)
@@ -287,13 +288,16 @@ function(pelorin_fuzz name)
   endif()
   add_executable(${name} ${PROJECT_SOURCE_DIR}/fuzz/${name}.cpp)
   target_link_libraries(${name} PRIVATE ${arg_DEPENDS})
+  add_dependencies(fuzz_targets ${name})
   if(CMAKE_CXX_COMPILER_ID MATCHES Clang)
     target_compile_options(${name} PRIVATE -fsanitize=fuzzer)
     target_link_options(${name} PRIVATE -fsanitize=fuzzer)
     add_test(NAME ${name} COMMAND ${name} -runs=${arg_RUNS} -seed=1 -max_len=4096)
   else()
     target_sources(${name} PRIVATE ${PROJECT_SOURCE_DIR}/fuzz/replay_main.cpp)
-    add_test(NAME ${name} COMMAND ${name} --random ${arg_RUNS} --seed 1 --max-length 4096)
+    set(corpus ${PROJECT_SOURCE_DIR}/fuzz/corpus/${name}.txt)
+    add_test(NAME ${name} COMMAND ${name} --corpus ${corpus} --random ${arg_RUNS} --seed 1
+                                          --max-length 4096)
   endif()
   pelorin_run_early(${name})
 endfunction()

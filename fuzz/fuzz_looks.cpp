@@ -73,7 +73,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   using namespace pelorin::image_processing;
   if (size < 5) return 0;
   const std::uint32_t width = 1 + data[0] % 64;
-  const bool large = data[1] % 32 == 0;
+  const bool large = data[1] == 17;
   const std::uint8_t* const body = data + 4;
   const std::size_t bodySize = size - 4;
   const std::size_t picked = std::min<std::size_t>(data[2] % 32, bodySize);

@@ -11,7 +11,9 @@ using namespace pelorin::image_processing;
 // Four bytes of sizes and a mode, then pixels, repeated as often as needed.
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
   if (size < 6) return 0;
-  const std::uint32_t width = 90 + data[0] + (data[1] & 3) * 100u, height = 90 + data[2] % 120;
+  // About a block; now and then two of them side by side.
+  const std::uint32_t width = 94 + data[0] % 16 + (data[1] % 8 == 0 ? 96u : 0u);
+  const std::uint32_t height = 94 + data[2] % 16;
   const std::uint8_t mask = data[3];  // few bits make flat areas
   data += 4;
   size -= 4;

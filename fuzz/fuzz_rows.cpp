@@ -65,7 +65,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   const FilterDescription& filter =
       *std::next(filters.begin(), bytes.below(static_cast<std::uint32_t>(filters.size())))->second;
   const bool thin = bytes.below(4) == 0;
-  RowRequest request{1 + bytes.below(300), 1 + bytes.below(thin ? 3 : 300)};
+  RowRequest request{1 + bytes.below(130), 1 + bytes.below(thin ? 3 : 130)};
   if (bytes.below(2) == 0) std::swap(request.width, request.height);
   request.metadata = facesOf(request.width, request.height, bytes);
   request.params = "slider=" + std::to_string(bytes.below(12) / 10.0) + ";";
