@@ -5,8 +5,7 @@
 #
 #   bench/cluster/run.sh QUENBY NATIVES [PHOTOS [ROUNDS [FINGERPRINTS]]]
 #
-# "enhance" is the job as docs/spark.md says it runs best, with Java's quick compiler alone; "usual" is
-# the job without that option. Start-up is what the same takes for one photo, and taken off. Processor time is told beside the time
+# "quick" is the job with Java's quick compiler alone (docs/spark.md). Start-up is what the same takes for one photo, and taken off. Processor time is told beside the time
 # that passes, since only the former means something on a machine that is busy.
 set -euo pipefail
 root=$(cd "$(dirname "${BASH_SOURCE[0]}")/../.." && pwd)
@@ -32,8 +31,8 @@ count=$(find "$scratch/many" -type f | wc -l)
 find "$scratch/distinct" -type f | head -n 1 | xargs -I{} cp {} "$scratch/one/"
 
 spark() { "$home/bin/spark-submit" --master 'local[2]' --driver-memory 1g "$@"; }
-enhance() { spark --driver-java-options -XX:TieredStopAtLevel=1 "$jar" enhance --in "$1" --out "$2"; }
-usual() { spark "$jar" enhance --in "$1" --out "$2"; }
+enhance() { spark "$jar" enhance --in "$1" --out "$2"; }
+quick() { spark --driver-java-options -XX:TieredStopAtLevel=1 "$jar" enhance --in "$1" --out "$2"; }
 imageio() { spark --class com.pelorin.photos.quenby.spark.ImageIoJob "$scratch/bench.jar" "$1" "$2"; }
 quenby() { "$command" enhance -r "$1" -o "$2/" -j 2 --quiet; }
 
@@ -45,7 +44,7 @@ took() { # WHAT IN: seconds that passed, and of processors
 
 printf '%-9s %6s %15s %15s %15s\n' "" "start" "photos a second" "processor ms" "of the command"
 for ((round = 0; round < rounds; ++round)); do
-  for what in quenby enhance usual imageio; do
+  for what in quenby enhance quick imageio; do
     printf '%s %s %s %s\n' $what $count "$(took $what "$scratch/one")" "$(took $what "$scratch/many")"
   done
 done | awk '

@@ -25,6 +25,7 @@ public class PhotoException extends IOException {
         INVALID_REQUEST
     }
 
+    /** What is wrong with the photo. */
     private final Kind kind;
 
     /**
