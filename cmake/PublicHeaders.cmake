@@ -20,6 +20,7 @@ set(PELORIN_PHOTO_API
     photo/collection/photo_score.h
     photo/file_io.h
     photo/filter_photo.h
+    photo/long_file.h
     photo/photo.h
     photo/photo_writer.h
     photo/thread_workers.h

@@ -116,7 +116,7 @@ Descriptor makeTemporary(const fs::path& folder, mode_t mode, std::string& path,
                                  std::to_string(counter++) + std::string(temporaryEnd));
     try {
       record.record(name);
-      Descriptor file(name, O_WRONLY | O_CREAT | O_EXCL, mode);
+      Descriptor file(name, O_RDWR | O_CREAT | O_EXCL, mode);
       path = std::move(name);
       ::flock(file.get(), LOCK_EX | LOCK_NB);
       struct stat made = {};
@@ -179,7 +179,7 @@ std::vector<std::uint8_t> readDescriptor(int descriptor, const std::string& path
 }
 
 // Delegates, so that the destructor also runs when this throws.
-Replacement::Replacement(const std::string& path, std::span<const std::uint8_t> bytes,
+Replacement::Replacement(const std::string& path, const FileView& bytes,
                          const ReplaceOptions& options)
     : Replacement() {
   struct stat old = {};
@@ -187,7 +187,7 @@ Replacement::Replacement(const std::string& path, std::span<const std::uint8_t> 
   if (exists && (!S_ISREG(old.st_mode) || old.st_nlink == 0)) {
     // Renaming over a device would put an ordinary file in its place; a file without a name, reached
     // through its descriptor, has none to take over.
-    writeStream(path, bytes, options.wait);
+    writeStream(path, wholeOf(bytes), options.wait);
     return;
   }
   if (exists && !options.mayReplace) throwSystemError(EEXIST, path);
@@ -204,7 +204,13 @@ Replacement::Replacement(const std::string& path, std::span<const std::uint8_t> 
   Descriptor file =
       makeTemporary(target.parent_path(), hasModel ? 0600 : 0666, temporary_, recorded_);
   if (hasModel) takeAfter(old, model, file, temporary_);
-  writeAll(file, temporary_, bytes);
+  writeAll(file, temporary_, bytes.bytes);
+  if (bytes.rest != nullptr) {
+    forEachBlock(*bytes.rest, [&](std::span<const std::uint8_t> block) {
+      if (options.wait.stop.stop_requested()) throw Stopped();
+      writeAll(file, temporary_, block);
+    });
+  }
   if (hasModel && options.keepTimes) takeTimes(old, file, temporary_);
   if (!options.timesOf.empty()) {
     struct stat other = {};
@@ -232,9 +238,23 @@ void Replacement::replace() {
   syncFolder(folder_);
 }
 
-void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes,
+void writeFileAtomically(const std::string& path, const FileView& bytes,
                          const ReplaceOptions& options) {
   Replacement(path, bytes, options).replace();
+}
+
+Descriptor unnamedTemporary(const std::string& folder) {
+  const std::string place = folder.empty() ? "." : folder;
+  const int file = ::open(place.c_str(), O_TMPFILE | O_RDWR | O_CLOEXEC, 0600);
+  if (file >= 0) return Descriptor(file);
+  // File systems without it, or kernels that take it for something else.
+  if (errno != EOPNOTSUPP && errno != EISDIR && errno != ENOENT && errno != EINVAL)
+    throwSystemError(errno, place);
+  std::string path;
+  RecordedTemporary recorded;
+  Descriptor named = makeTemporary(place, 0600, path, recorded);
+  if (::unlink(path.c_str()) != 0) throwSystemError(errno, path);
+  return named;
 }
 
 int renameToNew(const char* from, const char* to) {

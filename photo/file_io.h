@@ -7,6 +7,8 @@
 #include <string>
 #include <vector>
 
+#include "photo/descriptor.h"
+#include "photo/file_view.h"
 #include "photo/temporaries.h"
 
 namespace pelorin::photo {
@@ -59,8 +61,7 @@ class Replacement {
  public:
   /// Writes `bytes` to a temporary in the folder of `path`.
   /// @throws std::system_error when it cannot be written; nothing is then left behind.
-  Replacement(const std::string& path, std::span<const std::uint8_t> bytes,
-              const ReplaceOptions& options = {});
+  Replacement(const std::string& path, const FileView& bytes, const ReplaceOptions& options = {});
   /// Removes the temporary, unless it has taken its place.
   ~Replacement();
   Replacement(const Replacement&) = delete;
@@ -83,8 +84,12 @@ class Replacement {
 /// Replaces `path` in one step: a `Replacement` that takes its place at once.
 /// @throws std::system_error when it cannot be written; the old file is then untouched and nothing
 ///         is left behind.
-void writeFileAtomically(const std::string& path, std::span<const std::uint8_t> bytes,
+void writeFileAtomically(const std::string& path, const FileView& bytes,
                          const ReplaceOptions& options = {});
+
+/// A new file in `folder` ("" is the current one) to write and read, which has no name and is gone once
+/// it is closed. @throws std::system_error.
+Descriptor unnamedTemporary(const std::string& folder);
 
 /// The rename that fails where there is a file (EEXIST), in one step.
 /// @returns 0, or -1 with `errno`.

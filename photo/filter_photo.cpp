@@ -74,8 +74,8 @@ void requireFinite(const std::vector<Face>& faces) {
   }
 }
 
-FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const FilterRequest& request,
-                          const Format* format, const RowResources& resources) {
+FilteredPhoto filterPhoto(const FileView& file, const FilterRequest& request, const Format* format,
+                          const RowResources& resources) {
   checkRequest(request);
   const OpenOptions& open = request.open;
   PhotoRows photo(file, open, resources);

@@ -1,7 +1,6 @@
 #pragma once
 
 #include <cstdint>
-#include <span>
 #include <string>
 #include <vector>
 
@@ -42,7 +41,7 @@ void requireFinite(const std::vector<Face>& faces);
 
 /// A filtered photo as a file, and what is to say of it.
 struct FilteredPhoto {
-  std::vector<std::uint8_t> file;
+  std::vector<std::uint8_t> file;  ///< Behind it belongs what an overflow has.
   PictureSize size;
   PhotoFacts facts;             ///< Of the photo that it is made of.
   std::vector<Loss> lost = {};  ///< What of the metadata is not in the file.
@@ -54,8 +53,9 @@ struct FilteredPhoto {
 /// @param format  of the result; null for that of `file`.
 /// @throws std::invalid_argument that names what is wrong with the request: filter, params, quality,
 ///         rotation, scale or faces; PhotoError as `open` and `save`, and for a face in pixels that
-///         lies outside the picture; Stopped when a stop token says so; std::bad_alloc.
-FilteredPhoto filterPhoto(std::span<const std::uint8_t> file, const FilterRequest& request,
+///         lies outside the picture; Stopped when a stop token says so; std::bad_alloc; what reading
+///         the rest of `file` and writing into `request.save.overflow` throw.
+FilteredPhoto filterPhoto(const FileView& file, const FilterRequest& request,
                           const Format* format = nullptr, const RowResources& resources = {});
 
 }  // namespace pelorin::photo

@@ -6,6 +6,7 @@
 #include <string>
 #include <string_view>
 
+#include "photo/file_view.h"
 #include "photo/options.h"
 #include "photo/rows.h"
 
@@ -22,10 +23,13 @@ struct Format {
   /// Whether bytes begin as a file of this format does.
   bool (*recognises)(std::span<const std::uint8_t> file);
 
+  /// Whether a file that begins so can be read where the rest of it is elsewhere.
+  bool (*mayBePart)(std::span<const std::uint8_t> first);
+
+  /// @param file  outlives the reader; with a rest where `mayBePart` says so.
   /// @throws PhotoError when the file is damaged or beyond the limits: before anything of the
-  ///         picture's size is allocated.
-  std::unique_ptr<RowReader> (*reader)(std::span<const std::uint8_t> file,
-                                       const OpenOptions& options);
+  ///         picture's size is allocated. What reading the rest throws.
+  std::unique_ptr<RowReader> (*reader)(const FileView& file, const OpenOptions& options);
 
   /// Takes out what a file of this format cannot hold, and names it among the losses.
   void (*removeForeign)(KeptMetadata& kept);

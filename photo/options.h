@@ -4,6 +4,7 @@
 #include <stop_token>
 
 #include "photo/decode_limits.h"
+#include "photo/file_view.h"
 #include "photo/jpeg/jpeg_coding.h"
 #include "photo/metadata/edit_mark.h"
 #include "photo/metadata/kept_metadata.h"
@@ -40,6 +41,9 @@ struct SaveOptions {
   ColourDetail colour = ColourDetail::usual;
   /// Of a JPEG file; else that of the photo's own one, and 4:2:0 where it tells none.
   std::optional<ChromaSampling> sampling = {};
+  /// Takes what of a long file stands behind its first 8 MiB, in formats that can part it; null to have
+  /// all of it in memory. Empty before, for one file, and outlives the writing of it.
+  ByteStore* overflow = nullptr;
 };
 
 /// @throws Stopped when `stop` asks for it.

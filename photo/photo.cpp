@@ -23,9 +23,8 @@ std::uint32_t divisorOf(int scale) {
   return std::min(8u, std::bit_floor(static_cast<unsigned>(std::max(1, scale))));
 }
 
-std::unique_ptr<RowReader> readerOf(std::span<const std::uint8_t> file,
-                                    const OpenOptions& options) {
-  const Format& format = options.raw ? rawPixels() : formatOf(file);
+std::unique_ptr<RowReader> readerOf(const FileView& file, const OpenOptions& options) {
+  const Format& format = options.raw ? rawPixels() : formatOf(file.bytes);
   std::unique_ptr<RowReader> reader = format.reader(file, options);
   const std::uint32_t divisor = divisorOf(options.scale);
   if (divisor == 1 || format.scalesWhileDecoding) return reader;
@@ -38,8 +37,7 @@ void stopIfAsked(const std::stop_token& stop) {
   if (stop.stop_requested()) throw Stopped();
 }
 
-std::unique_ptr<RowReader> openRows(std::span<const std::uint8_t> file,
-                                    const OpenOptions& options) {
+std::unique_ptr<RowReader> openRows(const FileView& file, const OpenOptions& options) {
   stopIfAsked(options.stop);
   return readerOf(file, options);
 }

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "image_processing/core/image.h"
+#include "photo/file_view.h"
 #include "photo/format.h"
 #include "photo/metadata/known_faces.h"
 #include "photo/metadata/metadata.h"
@@ -44,8 +45,7 @@ PhotoFacts readFacts(std::span<const std::uint8_t> file);
 /// stored, not turned.
 /// @param file  outlives the reader.
 /// @throws PhotoError as `open`.
-std::unique_ptr<RowReader> openRows(std::span<const std::uint8_t> file,
-                                    const OpenOptions& options = {});
+std::unique_ptr<RowReader> openRows(const FileView& file, const OpenOptions& options = {});
 
 /// The bytes of a file with this picture.
 /// @param format    from the table of formats.

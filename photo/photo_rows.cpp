@@ -32,7 +32,7 @@ class PhotoRows::Decoded : public RowSource {
   std::uint32_t next_ = 0;
 };
 
-PhotoRows::PhotoRows(std::span<const std::uint8_t> file, const OpenOptions& options,
+PhotoRows::PhotoRows(const FileView& file, const OpenOptions& options,
                      const RowResources& resources)
     : file_(file),
       options_(options),
@@ -49,7 +49,7 @@ PhotoRows::PhotoRows(std::span<const std::uint8_t> file, const OpenOptions& opti
 PhotoRows::~PhotoRows() {
   rows_ = nullptr;
   // What is more than this photo's part goes, since a photo elsewhere may wait for it.
-  if (kept_ != nullptr && resources_.spare != nullptr && kept_->byteSize() <= resources_.pixels)
+  if (kept_ != nullptr && resources_.spare != nullptr && kept_->byteSize() <= resources_.spared)
     resources_.spare->keep(*kept_);
 }
 

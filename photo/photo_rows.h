@@ -3,12 +3,12 @@
 #include <cstdint>
 #include <memory>
 #include <optional>
-#include <span>
 #include <vector>
 
 #include "image_processing/core/image.h"
 #include "image_processing/core/rows.h"
 #include "image_processing/core/workers.h"
+#include "photo/file_view.h"
 #include "photo/metadata/known_faces.h"
 #include "photo/options.h"
 #include "photo/pixel_budget.h"
@@ -25,6 +25,7 @@ struct RowResources {
   std::uint64_t pixels = std::uint64_t{128} << 20;
   PixelBudget* budget = nullptr;  ///< That kept pixels are part of; may be null.
   SparePixels* spare = nullptr;   ///< Where kept pixels may come from and go; may be null.
+  std::uint64_t spared = pixels;  ///< The most bytes that go there.
   /// Share the work: decoding, filtering and encoding go on at the same time. Null for none.
   image_processing::Workers* workers = nullptr;
 };
@@ -33,9 +34,8 @@ struct RowResources {
 class PhotoRows {
  public:
   /// @param file  outlives this, as do the resources.
-  /// @throws PhotoError as `open`; Stopped.
-  PhotoRows(std::span<const std::uint8_t> file, const OpenOptions& options,
-            const RowResources& resources = {});
+  /// @throws PhotoError as `open`; Stopped; what reading the rest of a file throws.
+  PhotoRows(const FileView& file, const OpenOptions& options, const RowResources& resources = {});
   ~PhotoRows();
   PhotoRows(const PhotoRows&) = delete;
   PhotoRows& operator=(const PhotoRows&) = delete;
@@ -59,7 +59,7 @@ class PhotoRows {
   std::unique_ptr<RowReader> takeReader();
   void makeRoom();
 
-  std::span<const std::uint8_t> file_;
+  FileView file_;
   const OpenOptions options_;
   const RowResources resources_;
   std::unique_ptr<RowReader> reader_;  // of which no row was read yet; null once one is in use

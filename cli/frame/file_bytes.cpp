@@ -2,6 +2,7 @@
 
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdio>
 #include <system_error>
@@ -10,6 +11,7 @@
 #include "cli/frame/interrupt.h"
 #include "cli/frame/limits.h"
 #include "photo/backup.h"
+#include "photo/format.h"
 
 namespace pelorin::cli {
 namespace {
@@ -23,20 +25,37 @@ void writeStream(std::FILE* stream, std::span<const std::uint8_t> bytes) {
   if (std::fflush(stream) != 0) throwSystemError();
 }
 
+photo::ReadOptions readOptions() {
+  return {.largest = limits().bytes, .wait = {.stop = interruptToken()}};
+}
+
+// Of every format that has one.
+bool mayBePart(std::span<const std::uint8_t> first) {
+  return std::ranges::any_of(photo::formats(), [&](const photo::Format& format) {
+    return format.recognises(first) && format.mayBePart(first);
+  });
+}
+
 }  // namespace
 
 std::vector<std::uint8_t> readInput(const Input& input) {
-  const photo::ReadOptions options = {.largest = limits().bytes,
-                                      .wait = {.stop = interruptToken()}};
+  const photo::ReadOptions options = readOptions();
   return input.isStandardInput() ? photo::readDescriptor(STDIN_FILENO, input.path, options)
                                  : photo::readFile(input.path, options);
 }
 
-void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes,
+photo::OpenedFile openInput(const Input& input, const photo::OpenOptions& options) {
+  if (input.isStandardInput() || options.raw) return {readInput(input)};
+  return photo::openFile(input.path, readOptions(), mayBePart);
+}
+
+void writeOutput(const std::string& path, const photo::FileView& bytes,
                  const photo::ReplaceOptions& options, const std::string& backup) {
   try {
     if (path == "-") {
-      writeStream(stdout, bytes);
+      writeStream(stdout, bytes.bytes);
+      if (bytes.rest != nullptr)
+        photo::forEachBlock(*bytes.rest, [](auto block) { writeStream(stdout, block); });
       return;
     }
     photo::ReplaceOptions replace = options;
@@ -44,7 +63,7 @@ void writeOutput(const std::string& path, std::span<const std::uint8_t> bytes,
     photo::Replacement replacement(path, bytes, replace);
     if (!backup.empty()) {
       photo::keepBackup(backup, path);
-      photo::recordResult(backup, path, bytes);
+      photo::recordResult(backup, path, photo::wholeOf(bytes));
     }
     replacement.replace();
   } catch (const Interrupted&) {

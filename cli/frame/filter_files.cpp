@@ -146,19 +146,26 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   const photo::OpenOptions open = limited(work.photo);
   photo::RowResources resources = work.pixels->resources();
   resources.workers = work.workers.get();
-  const std::vector<std::uint8_t> bytes = readInput(file.input);
+  // What is shown on a page or put on record is needed as a whole.
+  const bool mayBeParted = !work.shown && work.save.backup.empty() && file.output != "-";
+  const photo::OpenedFile input =
+      mayBeParted ? openInput(file.input, work.photo) : photo::OpenedFile{readInput(file.input)};
+  const std::vector<std::uint8_t>& bytes = input.bytes;
   if (std::string earlier = earlierEdit(work, bytes); !earlier.empty()) {
     Done done = {.earlier = std::move(earlier)};
     done.section = sectionOf(work, file, done, bytes, {});
     return done;
   }
+  photo::TemporaryStore overflow(std::filesystem::path(file.output).parent_path());
+  photo::SaveOptions coding = saveOptions(work.save);
+  if (mayBeParted) coding.overflow = &overflow;
   const photo::FilteredPhoto filtered =
-      photo::filterPhoto(bytes,
+      photo::filterPhoto(input.view(),
                          {.filter = work.filter.filter.name,
                           .params = work.filter.params,
                           .faces = work.faces.of(file.input),
                           .open = open,
-                          .save = saveOptions(work.save),
+                          .save = coding,
                           .mark = false},  // but for the one that is to be saved
                          // A name may lie; what stands in place of a photo is of its kind.
                          work.inPlace ? nullptr : &outputFormat(file.output, work.save), resources);
@@ -172,7 +179,7 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
     photo::recordResult(save.backup, file.output, filtered.file);
     save.backup.clear();
   }
-  writePhoto(file.output, filtered.file, filtered.lost, save);
+  writePhoto(file.output, {filtered.file, &overflow}, filtered.lost, save);
   Done done = {.width = filtered.size.width,
                .height = filtered.size.height,
                .lost = filtered.lost,

@@ -79,7 +79,7 @@ photo::SaveOptions saveOptions(const SaveChoice& choice) {
           .sampling = choice.sampling};
 }
 
-void writePhoto(const std::string& path, std::span<const std::uint8_t> file,
+void writePhoto(const std::string& path, const photo::FileView& file,
                 const std::vector<photo::Loss>& lost, const SaveChoice& choice) {
   refuseLosses(lost, choice.strict);
   writeOutput(path, file, choice.replace, choice.backup);

@@ -59,7 +59,7 @@ photo::SaveOptions saveOptions(const SaveChoice& choice);
 /// Writes a finished file, or standard output.
 /// @param lost  what of the metadata is not in it.
 /// @throws what writing throws, and where nothing may be lost; an old file is then as it was.
-void writePhoto(const std::string& path, std::span<const std::uint8_t> file,
+void writePhoto(const std::string& path, const photo::FileView& file,
                 const std::vector<photo::Loss>& lost, const SaveChoice& choice);
 
 /// Says what a photo's file makes a user wonder about.

@@ -49,8 +49,8 @@ struct Info {
 Info inspect(const Input& input, const photo::OpenOptions& options,
              const photo::RowResources& resources, const FaceChoice& faces, float slider,
              Talk& talk) {
-  const std::vector<std::uint8_t> file = readInput(input);
-  photo::PhotoRows photo(file, limited(options), resources);
+  const photo::OpenedFile file = openInput(input, options);
+  photo::PhotoRows photo(file.view(), limited(options), resources);
   Info info = {photo.size().width, photo.size().height, std::nullopt, photo.faces(), {}, {}};
   if (!options.raw) info.facts = photo.facts();
   const image_processing::ImageMetadata boxes =

@@ -119,8 +119,8 @@ ExitCode runKeypoints(const KeypointsOptions& options) {
       {input}, /*jobs=*/1, talk,
       {.work =
            [&](std::size_t) {
-             const std::vector<std::uint8_t> file = readInput(input);
-             photo::PhotoRows photo(file, limited(photoOptions));
+             const photo::OpenedFile file = openInput(input, photoOptions);
+             photo::PhotoRows photo(file.view(), limited(photoOptions));
              const auto [width, height] = photo.size();
              image_processing::RowSource& rows = photo.sweep(/*again=*/false);
              Keypoints keypoints = {width, height, {}};

@@ -59,8 +59,8 @@ Image<RGBA8Pixel> heatMapOf(const ShownPhoto& photo, const Input& input,
 ScoredPhoto score(const Input& input, const photo::OpenOptions& options,
                   const photo::RowResources& resources, const PlannedFile* map, bool overwrite,
                   Talk& talk) {
-  const std::vector<std::uint8_t> file = readInput(input);
-  photo::PhotoRows photo(file, limited(options), resources);
+  const photo::OpenedFile file = openInput(input, options);
+  photo::PhotoRows photo(file.view(), limited(options), resources);
   const auto [width, height] = photo.size();
   image_processing::RowSource& rows = photo.sweep(/*again=*/false);
   const bool mapped = map != nullptr && !map->skipped;

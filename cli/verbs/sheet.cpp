@@ -113,8 +113,8 @@ Image<RGBA8Pixel> filteredThumbnail(photo::PhotoRows& photo, image_processing::R
 
 SheetRow makeRow(const SheetWork& work, const Input& input, const photo::RowResources& resources,
                  photo::PictureSize room, Talk& talk) {
-  const std::vector<std::uint8_t> file = readInput(input);
-  photo::PhotoRows photo(file, limited(work.photo), resources);
+  const photo::OpenedFile file = openInput(input, work.photo);
+  photo::PhotoRows photo(file.view(), limited(work.photo), resources);
   const photo::PictureSize size = photo.size();
   const photo::PictureSize small = photo::fitWithin(size, room);
   const std::string name = input.isStandardInput()

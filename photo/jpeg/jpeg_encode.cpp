@@ -46,8 +46,8 @@ std::size_t expectedSize(std::uint32_t width, std::uint32_t height) {
 
 JpegPictureWriter::JpegPictureWriter(std::uint32_t width, std::uint32_t height,
                                      const JpegMaking& making,
-                                     std::span<const MetadataSegment> metadata)
-    : writer_(expectedSize(width, height)) {
+                                     std::span<const MetadataSegment> metadata, ByteStore* overflow)
+    : writer_(expectedSize(width, height), overflow) {
   for (const MetadataSegment& segment : metadata) checkSegment(segment);
   jpeg_compress_struct& codec = writer_.codec();
   writer_.run([&] {

@@ -19,7 +19,7 @@ constexpr std::uint32_t rowsBetweenStops = 256;
 
 class JpegRowReader : public RowReader {
  public:
-  JpegRowReader(std::span<const std::uint8_t> file, const OpenOptions& options)
+  JpegRowReader(const FileView& file, const OpenOptions& options)
       : stop_(options.stop),
         picture_(file, options.scale, options.limits, JpegPictureReader::Keep::everySegment) {
     JpegHeader header = picture_.header();
@@ -34,9 +34,11 @@ class JpegRowReader : public RowReader {
       facts_.notices.push_back("is CMYK, converted to sRGB");
       removeColourProfile(header.metadata);
     }
-    const auto tail = file.subspan(jpegEnd(file));
+    const std::uint64_t end = jpegEnd(file);
+    std::vector<std::uint8_t> tail(static_cast<std::size_t>(file.size() - end));
+    readFrom(file, end, tail);
     metadata_ = {.segments = std::move(header.metadata),
-                 .tail = {tail.begin(), tail.end()},
+                 .tail = std::move(tail),
                  .storedSize = {facts_.width, facts_.height},
                  .orientation = facts_.orientation,
                  .coding = std::move(header.coding)};
@@ -102,8 +104,12 @@ class JpegRowWriter : public RowWriter {
       : stop_(options.stop), width_(size.width) {
     constexpr std::span<const MetadataSegment> noSegments;
     JpegMaking making = makingFor(options, source);
-    picture_.emplace(size.width, size.height, making, noSegments);
-    if (!source.coding || !source.coding->grey) return;
+    const bool isGrey = source.coding && source.coding->grey;
+    // Where two files are made, or an index tells where what is appended stands, all is in memory.
+    const bool mayBeParted = !isGrey && source.tail.empty();
+    picture_.emplace(size.width, size.height, making, noSegments,
+                     mayBeParted ? options.overflow : nullptr);
+    if (!isGrey) return;
     // Whether it will do is known behind the last row.
     making.grey = true;
     grey_.emplace(size.width, size.height, making, noSegments);
@@ -158,8 +164,10 @@ constinit const Format jpegFormat = {
         [](std::span<const std::uint8_t> file) {
           return file.size() >= 2 && file[0] == 0xFF && file[1] == 0xD8;
         },
-    .reader = [](std::span<const std::uint8_t> file, const OpenOptions& options)
-        -> std::unique_ptr<RowReader> { return std::make_unique<JpegRowReader>(file, options); },
+    .mayBePart = beginsPlainJpeg,
+    .reader = [](const FileView& file, const OpenOptions& options) -> std::unique_ptr<RowReader> {
+      return std::make_unique<JpegRowReader>(file, options);
+    },
     .removeForeign = removeForeign,
     .writer = [](PictureSize size, bool, const SaveOptions& options,
                  const Metadata& source) -> std::unique_ptr<RowWriter> {

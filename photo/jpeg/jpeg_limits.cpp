@@ -40,13 +40,13 @@ int countScans(std::span<const std::uint8_t> bytes, int enough) {
 
 // A Huffman code is a bit or more, and every block of 8 x 8 has one: what asks for more blocks than the
 // file has bits would end early, after memory was taken for all of them.
-void checkBlocks(const jpeg_decompress_struct& codec, std::size_t bytes) {
+void checkBlocks(const jpeg_decompress_struct& codec, std::uint64_t bytes) {
   std::uint64_t blocks = 0;
   for (const jpeg_component_info& component :
        std::span(codec.comp_info, static_cast<std::size_t>(codec.num_components))) {
     blocks += std::uint64_t{component.width_in_blocks} * component.height_in_blocks;
   }
-  if (blocks > std::uint64_t{bytes} * 8) {
+  if (blocks > bytes * 8) {
     throw PhotoError(PhotoError::Kind::truncated, "truncated: the picture data ends early");
   }
 }
@@ -59,10 +59,11 @@ void checkLimits(LibjpegReader& reader, const DecodeLimits& limits) {
   const std::uint64_t pixels = checkPixels(size, limits);
   // readHeader has consumed the first scan's start.
   const std::span rest(codec.src->next_input_byte, codec.src->bytes_in_buffer);
+  const std::uint64_t bytes = rest.size() + reader.bytesElsewhere();
   if (codec.arith_code) {  // whose symbols take less than a bit
-    checkCompressedPixels(size, rest.size(), limits);
+    checkCompressedPixels(size, bytes, limits);
   } else {
-    checkBlocks(codec, rest.size());
+    checkBlocks(codec, bytes);
   }
   if (!jpeg_has_multiple_scans(&codec)) return;
   const int scans = 1 + countScans(rest, limits.scans);

@@ -45,8 +45,8 @@ std::vector<std::uint8_t> embeddedProfile(LibjpegReader& reader) {
 
 }  // namespace
 
-JpegPictureReader::JpegPictureReader(std::span<const std::uint8_t> file, int scale,
-                                     const DecodeLimits& limits, Keep keep)
+JpegPictureReader::JpegPictureReader(const FileView& file, int scale, const DecodeLimits& limits,
+                                     Keep keep)
     : reader_(file) {
   if (keep == Keep::everySegment) {
     reader_.keepAllSegments();

@@ -2,7 +2,6 @@
 
 #include <cstdint>
 #include <optional>
-#include <span>
 
 #include "photo/jpeg/cmyk_to_rgba.h"
 #include "photo/jpeg/jpeg_codec.h"
@@ -16,10 +15,9 @@ class JpegPictureReader {
   enum class Keep { profile, everySegment };
 
   /// Reads the header and checks it against the limits; nothing of the picture's size is allocated.
-  /// @param file   outlives this.
+  /// @param file   outlives this; as for `LibjpegReader`.
   /// @param scale  as for `decodeJpeg`.
-  JpegPictureReader(std::span<const std::uint8_t> file, int scale, const DecodeLimits& limits,
-                    Keep keep);
+  JpegPictureReader(const FileView& file, int scale, const DecodeLimits& limits, Keep keep);
 
   /// With the segments that were kept.
   JpegHeader header() const;

@@ -4,6 +4,7 @@
 #include <span>
 #include <vector>
 
+#include "photo/file_view.h"
 #include "photo/jpeg/jpeg_codec.h"
 #include "photo/jpeg/libjpeg_writer.h"
 
@@ -20,14 +21,15 @@ struct JpegMaking {
 /// A JPEG file that is made of rows, as `encodeJpeg` makes it.
 class JpegPictureWriter {
  public:
+  /// @param overflow  as in `SaveOptions`.
   JpegPictureWriter(std::uint32_t width, std::uint32_t height, const JpegMaking& making,
-                    std::span<const MetadataSegment> metadata);
+                    std::span<const MetadataSegment> metadata, ByteStore* overflow = nullptr);
 
   /// The next `count` rows, back to back; no more than the picture has. RGBA, or of a grey file a
   /// byte for each pixel.
   void write(const std::uint8_t* pixels, std::uint32_t count);
 
-  /// The file, once, after the last row.
+  /// The file, or what of it is in memory, once, after the last row.
   std::vector<std::uint8_t> finish();
 
  private:

@@ -1,18 +1,20 @@
 #pragma once
 
 #include <cstdint>
-#include <span>
+#include <exception>
+#include <memory>
 
 #include "photo/decode_limits.h"
+#include "photo/file_view.h"
 #include "photo/jpeg/libjpeg_errors.h"
 
 namespace pelorin::photo {
 
-/// A libjpeg decompressor over a file in memory, and what its errors become.
+/// A libjpeg decompressor over a file, and what its errors become.
 class LibjpegReader {
  public:
-  /// @param file  outlives this.
-  explicit LibjpegReader(std::span<const std::uint8_t> file);
+  /// @param file  outlives this. With a rest, `beginsPlainJpeg` holds for its first bytes.
+  explicit LibjpegReader(const FileView& file);
   ~LibjpegReader() { jpeg_destroy_decompress(&codec_); }
   LibjpegReader(const LibjpegReader&) = delete;
   LibjpegReader& operator=(const LibjpegReader&) = delete;
@@ -20,11 +22,19 @@ class LibjpegReader {
   jpeg_decompress_struct& codec() { return codec_; }
   const jpeg_decompress_struct& codec() const { return codec_; }
 
-  /// As LibjpegErrors::run.
+  /// As LibjpegErrors::run; it also throws what reading the file throws.
   template <typename Body>
   void run(const Body& body) {
-    errors_.run(body);
+    try {
+      errors_.run(body);
+    } catch (...) {
+      if (rest_.failure != nullptr) std::rethrow_exception(rest_.failure);
+      throw;
+    }
   }
+
+  /// How many bytes of the file are not in memory and still to come.
+  std::uint64_t bytesElsewhere() const;
 
   /// Keeps the segments of `marker` in the codec's `marker_list`; before readHeader.
   void keepSegments(int marker);
@@ -46,7 +56,24 @@ class LibjpegReader {
   void checkEveryChannelCame() const;
 
  private:
-  std::span<const std::uint8_t> file_;
+  static constexpr std::size_t blockSize = 65536;
+
+  // What libjpeg reads a file from that is partly elsewhere.
+  struct Rest {
+    jpeg_source_mgr base;  // first, so that libjpeg's pointer to it is one to the whole
+    ByteSource* source;
+    std::uint64_t next;  // place in it
+    std::unique_ptr<std::uint8_t[]> block;
+    std::exception_ptr failure;  // which cannot cross libjpeg
+  };
+
+  void beginWithRest();
+  static Rest& restOf(j_decompress_ptr codec);
+  static boolean fill(j_decompress_ptr codec);
+  static void skip(j_decompress_ptr codec, long count);
+
+  FileView file_;
+  Rest rest_ = {};
   LibjpegErrors errors_;
   jpeg_decompress_struct codec_ = {};
 };

@@ -2,12 +2,17 @@
 
 #include <jerror.h>
 
+#include <algorithm>
 #include <exception>
+#include <new>
+#include <stdexcept>
 
 namespace pelorin::photo {
 
-LibjpegWriter::LibjpegWriter(std::size_t expectedSize) {
-  destination_.bytes.reserve(expectedSize);
+LibjpegWriter::LibjpegWriter(std::size_t expectedSize, ByteStore* overflow) {
+  destination_.overflow = overflow;
+  destination_.bytes.reserve(overflow != nullptr ? std::min(expectedSize, mostInMemory)
+                                                 : expectedSize);
   codec_.err = errors_.manager();
   try {
     run([this] { jpeg_create_compress(&codec_); });
@@ -33,13 +38,20 @@ LibjpegWriter::Destination& LibjpegWriter::destinationOf(j_compress_ptr codec) {
 void LibjpegWriter::append(j_compress_ptr codec, std::size_t count) {
   Destination& destination = destinationOf(codec);
   const std::uint8_t* const block = destination.block.get();
-  bool done = false;
   try {
-    destination.bytes.insert(destination.bytes.end(), block, block + count);
-    done = true;
-  } catch (const std::exception&) {  // bad_alloc or length_error; neither may cross libjpeg
+    ByteStore* const overflow = destination.overflow;
+    if (overflow != nullptr &&
+        (overflow->size() > 0 || destination.bytes.size() + count > mostInMemory)) {
+      overflow->append({block, count});
+    } else {
+      destination.bytes.insert(destination.bytes.end(), block, block + count);
+    }
+  } catch (const std::length_error&) {
+    destination.failure = std::make_exception_ptr(std::bad_alloc());
+  } catch (...) {
+    destination.failure = std::current_exception();
   }
-  if (!done) ERREXIT1(codec, JERR_OUT_OF_MEMORY, 0);
+  if (destination.failure != nullptr) ERREXIT1(codec, JERR_OUT_OF_MEMORY, 0);
 }
 
 void LibjpegWriter::begin(j_compress_ptr codec) {

@@ -68,6 +68,37 @@ TEST_F(FileFaults, LeaveTheOldFileOrTheNewOneAndNothingElse) {
   EXPECT_GT(failed, 10);
 }
 
+// Whose bytes are read and laid away piece by piece, in the folder of the result.
+TEST_F(FileFaults, OfALongPhotoLeaveTheOldFileAndNothingElse) {
+  constexpr std::uint32_t width = 2000, height = 1500;
+  std::vector<RGBA8Pixel> pixels = randomPixels(std::size_t{width} * height, 1);
+  Bytes samples;
+  for (const RGBA8Pixel& pixel : pixels) samples.insert(samples.end(), {pixel.r, pixel.g, pixel.b});
+  folder.write("long.jpg", makeJpeg({.width = width,
+                                     .height = height,
+                                     .horizontalSampling = 1,
+                                     .verticalSampling = 1,
+                                     .quality = 100},
+                                    samples));
+  const std::string command = "look winter -q long.jpg -o out.jpg --overwrite --quality 100";
+  ASSERT_EQ(traced("-e trace=pwrite64,pread64", command).exitCode, 0);
+  if (!folder.has("trace")) GTEST_SKIP() << "strace cannot trace here";
+  EXPECT_THAT(text(folder.read("trace")), HasSubstr("pwrite64("));
+  folder.write("out.jpg", old);
+  const auto content = folder.content();
+  for (const std::string fault :
+       {"pread64:error=EIO:when=20", "pread64:error=EIO:when=90", "pread64:retval=0:when=90",
+        "pwrite64:error=ENOSPC:when=1", "pwrite64:error=ENOSPC:when=9"}) {
+    const std::string call = fault.substr(0, fault.find(':'));
+    const Finished run = traced("-e trace=" + call + " -e inject=" + fault, command);
+    EXPECT_THAT(text(folder.read("trace")), HasSubstr("INJECTED")) << fault;
+    EXPECT_EQ(run.exitCode, 1) << fault;
+    EXPECT_THAT(run.errors, HasSubstr("long.jpg")) << fault;
+    EXPECT_EQ(folder.read("out.jpg"), old) << fault;
+    EXPECT_EQ(folder.content(), content) << fault;
+  }
+}
+
 TEST_F(FileFaults, OfADamagedSecondHalfComeBeforeAnythingIsWritten) {
   Bytes cut = jpegOf(photoLikePicture(400, 300, 3));
   cut.resize(cut.size() / 2);
