@@ -3,6 +3,7 @@
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <sstream>
 #include <string_view>
 #include <vector>
 
@@ -41,21 +42,22 @@ std::string wholeFileTable(const std::string& command, const std::string& avx2Co
   };
   std::vector<Row> rows = {
       {"`quenby --version`: start and end of a process", {command, "--version"}}};
-  const auto enhance = [&](const std::string& filter, const std::string& input) {
-    return std::vector<std::string>{command,         "enhance",     "-r",      input,       "-o",
-                                    files.results(), "--overwrite", "--quiet", "--threads", "1",
-                                    "--filter",      filter};
+  const auto addRows = [&](const std::string& options) {
+    for (const int photos : {1, photosInARun}) {
+      std::vector<std::string> arguments = {command, "enhance", "-r"};
+      arguments.push_back(photos == 1 ? files.first() : files.folder());
+      arguments.insert(arguments.end(), {"-o", files.results(), "--overwrite", "--quiet"});
+      arguments.insert(arguments.end(), {"--threads", "1"});
+      std::istringstream words(options);
+      for (std::string word; words >> word;) arguments.push_back(word);
+      const std::string each = photos == 1 ? "" : fmt::format(", each of {} photos", photos);
+      rows.push_back({fmt::format("`{}`{}", options, each), arguments, photos});
+    }
   };
-  for (const char* filter : {"PassThrough", "AE0", "AE08bit", "WinterRGB"}) {
-    rows.push_back({fmt::format("`--filter {}`", filter), enhance(filter, files.first())});
-    rows.push_back({fmt::format("`--filter {}`, each of {} photos", filter, photosInARun),
-                    enhance(filter, files.folder()), photosInARun});
-  }
-  for (const char* filter : {"AE0", "WinterRGB"}) {
-    std::vector<std::string> arguments = enhance(filter, files.first());
-    arguments.insert(arguments.end(), {"--memory", "0"});
-    rows.push_back({fmt::format("`--filter {} --memory 0`", filter), arguments});
-  }
+  for (const char* options :
+       {"--filter PassThrough", "--filter AE0", "--filter AE0 --memory 128", "--filter AE08bit",
+        "--filter AE08bit --memory 128", "--filter WinterRGB"})
+    addRows(options);
   const std::vector<InstructionSet> sets = instructionSets();
 
   // Round by round, so that the machine's moods meet all of them. The fastest counts: a run also
