@@ -61,7 +61,8 @@ if(PELORIN_CLI)
     "Quenby brightens photos with care for faces and local contrast, applies looks,
 finds near-duplicates, scores quality and finds corners. Metadata is kept.
 The same photo and options give the same bytes on every processor."
-    SHARED DEPENDS fonts-dejavu-core libcairo2) # Cairo, which is loaded when something is drawn
+    # Cairo and SQLite are loaded when something is drawn or a database is opened.
+    SHARED DEPENDS fonts-dejavu-core libcairo2 libsqlite3-0)
 endif()
 set(development "")
 if(NOT TARGET pelorin_instruction_sets)
