@@ -119,7 +119,7 @@ Done existing(const Work& work, const PlannedFile& file) {
 }
 
 // The mark of the same edit, as text; empty without one, and where edits are done again.
-std::string earlierEdit(const Work& work, std::span<const std::uint8_t> file) {
+std::string earlierEdit(const Work& work, const photo::FileView& file) {
   if (work.again || work.photo.raw) return "";
   const photo::PhotoFacts facts = photo::openRows(file, {.limits = limits().decode})->facts();
   const photo::EditMark* const mark = photo::earlierEdit(facts, work.filter.filter);
@@ -133,7 +133,7 @@ void findMarks(const Work& work, int jobs, std::vector<PlannedFile>& plan) {
     std::error_code ignored;
     if (file.skipped || !std::filesystem::is_regular_file(file.input.path, ignored)) return;
     try {
-      file.earlier = earlierEdit(work, readInput(file.input));
+      file.earlier = earlierEdit(work, openInput(file.input, work.photo).view());
     } catch (const Interrupted&) {
       throw;
     } catch (const std::exception&) {
@@ -151,7 +151,7 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   const photo::OpenedFile input =
       mayBeParted ? openInput(file.input, work.photo) : photo::OpenedFile{readInput(file.input)};
   const std::vector<std::uint8_t>& bytes = input.bytes;
-  if (std::string earlier = earlierEdit(work, bytes); !earlier.empty()) {
+  if (std::string earlier = earlierEdit(work, input.view()); !earlier.empty()) {
     Done done = {.earlier = std::move(earlier)};
     done.section = sectionOf(work, file, done, bytes, {});
     return done;
