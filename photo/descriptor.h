@@ -25,8 +25,6 @@ class Descriptor {
     } while (descriptor_ < 0 && errno == EINTR);
     if (descriptor_ < 0) throwSystemError(errno, path);
   }
-  /// Takes over an open one.
-  explicit Descriptor(int open) noexcept : descriptor_(open) {}
   ~Descriptor() {
     if (descriptor_ >= 0) ::close(descriptor_);
   }

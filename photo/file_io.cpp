@@ -245,11 +245,13 @@ void writeFileAtomically(const std::string& path, const FileView& bytes,
 
 Descriptor unnamedTemporary(const std::string& folder) {
   const std::string place = folder.empty() ? "." : folder;
-  const int file = ::open(place.c_str(), O_TMPFILE | O_RDWR | O_CLOEXEC, 0600);
-  if (file >= 0) return Descriptor(file);
-  // File systems without it, or kernels that take it for something else.
-  if (errno != EOPNOTSUPP && errno != EISDIR && errno != ENOENT && errno != EINVAL)
-    throwSystemError(errno, place);
+  try {
+    return Descriptor(place, O_TMPFILE | O_RDWR, 0600);
+  } catch (const std::system_error& error) {
+    // File systems without it, or kernels that take it for something else.
+    constexpr int unknown[] = {EOPNOTSUPP, EISDIR, ENOENT, EINVAL};
+    if (std::ranges::find(unknown, error.code().value()) == std::end(unknown)) throw;
+  }
   std::string path;
   RecordedTemporary recorded;
   Descriptor named = makeTemporary(place, 0600, path, recorded);
