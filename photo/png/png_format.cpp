@@ -349,8 +349,9 @@ constinit const Format pngFormat = {
           return file.size() >= signatureSize && png_sig_cmp(file.data(), 0, signatureSize) == 0;
         },
     .mayBePart = [](std::span<const std::uint8_t>) { return false; },
-    .reader = [](const FileView& file, const OpenOptions& options)
-        -> std::unique_ptr<RowReader> { return std::make_unique<PngRowReader>(file.bytes, options); },
+    .reader = [](const FileView& file, const OpenOptions& options) -> std::unique_ptr<RowReader> {
+      return std::make_unique<PngRowReader>(file.bytes, options);
+    },
     .removeForeign = removeWhatPngLacks,
     .writer = [](PictureSize size, bool hasAlpha, const SaveOptions& options,
                  const Metadata&) -> std::unique_ptr<RowWriter> {

@@ -74,8 +74,9 @@ constinit const Format rawFormat = {
     .losesDetail = false,
     .recognises = [](std::span<const std::uint8_t>) { return false; },
     .mayBePart = [](std::span<const std::uint8_t>) { return false; },
-    .reader = [](const FileView& file, const OpenOptions& options)
-        -> std::unique_ptr<RowReader> { return std::make_unique<RawReader>(file.bytes, options); },
+    .reader = [](const FileView& file, const OpenOptions& options) -> std::unique_ptr<RowReader> {
+      return std::make_unique<RawReader>(file.bytes, options);
+    },
     .removeForeign = [](KeptMetadata& kept) { kept = {}; },  // nothing but pixels is what they are
     .writer = [](PictureSize size, bool, const SaveOptions&, const Metadata&)
         -> std::unique_ptr<RowWriter> { return std::make_unique<RawWriter>(size); },
