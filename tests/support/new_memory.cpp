@@ -76,9 +76,10 @@ void operator delete(void* block) noexcept {
 void operator delete[](void* block) noexcept {
   operator delete(block);
 }
-void operator delete(void* block, std::size_t) noexcept {
+// Which clang hides when it is told to hide all that it does not declare itself.
+__attribute__((visibility("default"))) void operator delete(void* block, std::size_t) noexcept {
   operator delete(block);
 }
-void operator delete[](void* block, std::size_t) noexcept {
+__attribute__((visibility("default"))) void operator delete[](void* block, std::size_t) noexcept {
   operator delete(block);
 }
