@@ -93,17 +93,30 @@ mkdir -p "$prefix/source" "$prefix/share/licences"
 for package in "${packages[@]}"; do
   dpkg-source --no-check -x "$sources/$package"_*.dsc "$prefix/source/$package"
 done
-library fmtlib "$prefix/source/fmtlib" -DFMT_TEST=OFF -DFMT_DOC=OFF
+# All at once: configuring, which is half of it, takes one core.
+together=()
+library fmtlib "$prefix/source/fmtlib" -DFMT_TEST=OFF -DFMT_DOC=OFF &
+together+=($!)
 # Highway's library chooses among instruction sets; other machines than this take its headers and one.
 [[ $* == *-DCMAKE_TOOLCHAIN_FILE=* ]] ||
   library highway "$prefix/source/highway" -DBUILD_SHARED_LIBS=OFF -DHWY_ENABLE_CONTRIB=OFF \
-    -DHWY_ENABLE_EXAMPLES=OFF -DHWY_ENABLE_TESTS=OFF -DBUILD_TESTING=OFF
-library libjpeg-turbo "$prefix/source/libjpeg-turbo" -DENABLE_SHARED=OFF -DWITH_TURBOJPEG=OFF
-c_sources lcms2 lcms2 src include/lcms2.h include/lcms2_plugin.h
-c_sources zlib z . zlib.h zconf.h
-library libpng1.6 "$prefix/source/libpng1.6" -DPNG_SHARED=OFF -DPNG_TESTS=OFF -DPNG_EXECUTABLES=OFF \
-  -DZLIB_LIBRARY="$prefix/lib/libz.a" -DZLIB_INCLUDE_DIR="$prefix/include"
-library pugixml "$prefix/source/pugixml" -DBUILD_SHARED_LIBS=OFF -DBUILD_TESTING=OFF
+    -DHWY_ENABLE_EXAMPLES=OFF -DHWY_ENABLE_TESTS=OFF -DBUILD_TESTING=OFF &
+together+=($!)
+library libjpeg-turbo "$prefix/source/libjpeg-turbo" -DENABLE_SHARED=OFF -DWITH_TURBOJPEG=OFF &
+together+=($!)
+c_sources lcms2 lcms2 src include/lcms2.h include/lcms2_plugin.h &
+together+=($!)
+library pugixml "$prefix/source/pugixml" -DBUILD_SHARED_LIBS=OFF -DBUILD_TESTING=OFF &
+together+=($!)
+{
+  c_sources zlib z . zlib.h zconf.h
+  library libpng1.6 "$prefix/source/libpng1.6" -DPNG_SHARED=OFF -DPNG_TESTS=OFF -DPNG_EXECUTABLES=OFF \
+    -DZLIB_LIBRARY="$prefix/lib/libz.a" -DZLIB_INCLUDE_DIR="$prefix/include"
+} &
+together+=($!)
+failed=0
+for job in "${together[@]}"; do wait "$job" || failed=1; done
+[ $failed -eq 0 ]
 cp "$prefix/source/fmtlib/LICENSE.rst" "$prefix/share/licences/fmt.txt"
 cp "$prefix/source/highway/LICENSE" "$prefix/share/licences/highway.txt"
 cp "$prefix/source/libjpeg-turbo/LICENSE.md" "$prefix/share/licences/libjpeg-turbo.txt"
