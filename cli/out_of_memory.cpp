@@ -1,5 +1,6 @@
 #include <unistd.h>
 
+#include <atomic>
 #include <cstdlib>
 #include <exception>
 #include <new>
@@ -10,23 +11,25 @@
 namespace pelorin::cli {
 namespace {
 
+std::atomic<bool> ranOut = false;
+
+void remember() {
+  ranOut = true;
+  throw std::bad_alloc();
+}
+
 // Memory can run out where nothing catches: in tables that are made before `main`, while options
-// are set up. Nothing has been written by then.
+// are set up, in functions of the C++ library that promise not to throw, which do not say what was thrown.
 [[noreturn]] void leave() {
-  try {
-    if (const std::exception_ptr error = std::current_exception()) std::rethrow_exception(error);
-  } catch (const std::bad_alloc&) {
-    constexpr std::string_view message = "quenby: not enough memory\n";
-    [[maybe_unused]] const auto written = ::write(STDERR_FILENO, message.data(), message.size());
-    std::_Exit(static_cast<int>(ExitCode::someFailed));
-  } catch (...) {
-    std::abort();
-  }
-  std::abort();
+  if (!ranOut) std::abort();
+  constexpr std::string_view message = "quenby: not enough memory\n";
+  [[maybe_unused]] const auto written = ::write(STDERR_FILENO, message.data(), message.size());
+  std::_Exit(static_cast<int>(ExitCode::someFailed));
 }
 
 // Before every other initialiser of the program.
 [[gnu::constructor(101)]] void install() {
+  std::set_new_handler(remember);
   std::set_terminate(leave);
 }
 

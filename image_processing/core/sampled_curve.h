@@ -25,10 +25,11 @@ inline float applyToneCurve(float x, std::span<const float> curve, std::size_t m
   const float position = x * samplesPerUnit;
   const std::int32_t index = truncateTo<std::int32_t>(position);
   const float fraction = position - static_cast<float>(index);
-  const std::int64_t last = static_cast<std::int64_t>(maxIndex);
-  const std::int64_t lower = std::clamp<std::int64_t>(index, 0, last);
-  const std::int64_t upper = std::clamp<std::int64_t>(std::int64_t{index} + 1, 0, last);
-  return fraction * curve[upper] + (1.0f - fraction) * curve[lower];
+  const auto sample = [&](std::int64_t at) {
+    const auto last = static_cast<std::int64_t>(maxIndex);
+    return curve[static_cast<std::size_t>(std::clamp<std::int64_t>(at, 0, last))];
+  };
+  return fraction * sample(std::int64_t{index} + 1) + (1.0f - fraction) * sample(index);
 }
 
 }  // namespace pelorin::image_processing

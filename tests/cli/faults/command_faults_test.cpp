@@ -100,8 +100,10 @@ TEST_P(CommandFaults, AreOneLineAndAnExitCodeAndLeaveWholeFiles) {
   const Bytes expected = folder.read("out.jpg");
   const auto content = folder.content();
   ASSERT_GT(counts["memory"], GetParam().least);
+  for (const char* kind : {"read", "open", "close", "stat"}) ASSERT_GT(counts[kind], 0) << kind;
   const bool all = std::getenv("QUENBY_HARDEN") != nullptr;
   std::map<std::string, long> tried;
+  long endedByTheLibrary = 0;
   for (const Fault& fault : faults) {
     const long step = all ? 1 : std::max(counts[fault.kind] / 6, 1L);
     for (long number = 1; number <= counts[fault.kind]; number += step) {
@@ -116,6 +118,10 @@ TEST_P(CommandFaults, AreOneLineAndAnExitCodeAndLeaveWholeFiles) {
         EXPECT_EQ(faulty.exitCode, 0) << faulty.errors;
         EXPECT_EQ(faulty.output, clean.output);
         EXPECT_EQ(left, expected);
+      } else if (faulty.errors.starts_with("Fatal glibc error")) {
+        // The C library itself ends a process that has no memory for a thread's destructors.
+        EXPECT_EQ(left, old);
+        ++endedByTheLibrary;
       } else {
         // A photo that is whole may be called failed, when what comes after it goes wrong.
         EXPECT_EQ(faulty.exitCode, 1) << faulty.errors;
@@ -127,6 +133,7 @@ TEST_P(CommandFaults, AreOneLineAndAnExitCodeAndLeaveWholeFiles) {
     }
   }
   for (const auto& [kind, count] : tried) std::cout << kind << ' ' << count << '\n';
+  EXPECT_LE(endedByTheLibrary, 2);
   EXPECT_EQ(run("memory 0 0").output, clean.output);
   EXPECT_EQ(folder.read("out.jpg"), expected);
 }

@@ -77,6 +77,7 @@ std::size_t half(std::size_t size) {
 
 #define ORIGINAL(function) static auto* const real = original(&function, #function)
 
+#pragma GCC visibility push(default)  // what is hidden takes nobody's place
 extern "C" {
 
 void* __libc_malloc(std::size_t size);
