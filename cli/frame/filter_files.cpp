@@ -158,7 +158,9 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   }
   photo::TemporaryStore overflow(std::filesystem::path(file.output).parent_path());
   photo::SaveOptions coding = saveOptions(work.save);
-  if (mayBeParted) coding.overflow = &overflow;
+  std::error_code ignored;
+  // The folder of a device or a pipe is no place for temporaries.
+  if (mayBeParted && !std::filesystem::is_other(file.output, ignored)) coding.overflow = &overflow;
   const photo::FilteredPhoto filtered =
       photo::filterPhoto(input.view(),
                          {.filter = work.filter.filter.name,
