@@ -41,7 +41,7 @@ std::size_t jpegEnd(std::span<const std::uint8_t> bytes) {
   return bytes.size();
 }
 
-std::uint64_t jpegEnd(const FileView& file) {
+std::uint64_t jpegEndIn(const FileView& file) {
   if (file.rest == nullptr) return jpegEnd(file.bytes);
   if (jpegEnd(file.bytes) == 0) return 0;
   constexpr std::uint64_t windowSize = std::uint64_t{1} << 18;

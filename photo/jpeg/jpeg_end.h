@@ -13,7 +13,7 @@ namespace pelorin::photo {
 std::size_t jpegEnd(std::span<const std::uint8_t> bytes);
 
 /// The same of a file that may be partly elsewhere. @throws what reading throws.
-std::uint64_t jpegEnd(const FileView& file);
+std::uint64_t jpegEndIn(const FileView& file);
 
 /// Whether bytes begin with the whole header of a JPEG file that is not progressive, up to a first scan
 /// that has every channel, so that nothing behind it needs to be known beforehand. Any bytes are safe.

@@ -34,7 +34,7 @@ class JpegRowReader : public RowReader {
       facts_.notices.push_back("is CMYK, converted to sRGB");
       removeColourProfile(header.metadata);
     }
-    const std::uint64_t end = jpegEnd(file);
+    const std::uint64_t end = jpegEndIn(file);
     std::vector<std::uint8_t> tail(static_cast<std::size_t>(file.size() - end));
     readFrom(file, end, tail);
     metadata_ = {.segments = std::move(header.metadata),
