@@ -20,11 +20,11 @@ struct Row {
 const std::vector<Row>& rows() {
   static const std::vector<Row> all = {
       {"`quenby enhance`", {"enhance", "--threads", "1"}},
-      {"the same with `--memory 128`", {"enhance", "--threads", "1", "--memory", "128"}},
+      {"the same with `--memory 0`", {"enhance", "--threads", "1", "--memory", "0"}},
       {"the same with `--rotate 90`", {"enhance", "--threads", "1", "--rotate", "90"}},
       {"two photos with `-j 1`", {"enhance", "-j", "1"}, 2},
       {"two photos with `-j 2`", {"enhance", "-j", "2"}, 2},
-      {"two photos with `-j 2 --memory 128`", {"enhance", "-j", "2", "--memory", "128"}, 2},
+      {"two photos with `-j 2 --memory 0`", {"enhance", "-j", "2", "--memory", "0"}, 2},
       {"`quenby look winter`", {"look", "winter", "--threads", "1"}},
       {"`quenby score`", {"score"}, 1, false},
       {"`quenby info`", {"info"}, 1, false},

@@ -55,8 +55,8 @@ std::string wholeFileTable(const std::string& command, const std::string& avx2Co
     }
   };
   for (const char* options :
-       {"--filter PassThrough", "--filter AE0", "--filter AE0 --memory 128", "--filter AE08bit",
-        "--filter AE08bit --memory 128", "--filter WinterRGB"})
+       {"--filter PassThrough", "--filter AE0", "--filter AE0 --memory 0", "--filter AE08bit",
+        "--filter AE08bit --memory 0", "--filter WinterRGB"})
     addRows(options);
   const std::vector<InstructionSet> sets = instructionSets();
 

@@ -35,7 +35,7 @@ struct FilterFilesOptions {
   int scale = 1;
   int jobs = 0;
   int threads = usualThreads;  ///< On each file.
-  int memory = thriftyMemory;  ///< MiB of pixels kept, by all jobs together.
+  int memory = usualMemory;    ///< MiB of pixels kept, by all jobs together.
 };
 
 /// Adds what a verb may do with a photo beside the filter: faces, turning, quality, metadata, jobs.
