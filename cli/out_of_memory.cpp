@@ -12,6 +12,7 @@ namespace pelorin::cli {
 namespace {
 
 std::atomic<bool> ranOut = false;
+std::terminate_handler usual = nullptr;
 
 void remember() {
   ranOut = true;
@@ -21,7 +22,10 @@ void remember() {
 // Memory can run out where nothing catches: in tables that are made before `main`, while options
 // are set up, in functions of the C++ library that promise not to throw, which do not say what was thrown.
 [[noreturn]] void leave() {
-  if (!ranOut) std::abort();
+  if (!ranOut) {
+    usual();
+    std::abort();
+  }
   constexpr std::string_view message = "quenby: not enough memory\n";
   [[maybe_unused]] const auto written = ::write(STDERR_FILENO, message.data(), message.size());
   std::_Exit(static_cast<int>(ExitCode::someFailed));
@@ -30,7 +34,7 @@ void remember() {
 // Before every other initialiser of the program.
 [[gnu::constructor(101)]] void install() {
   std::set_new_handler(remember);
-  std::set_terminate(leave);
+  usual = std::set_terminate(leave);
 }
 
 }  // namespace
