@@ -82,12 +82,38 @@ function(pelorin_compile_at_once)
   endif()
 endfunction()
 
+# Where vectors cannot be chosen as a program runs, which is in WebAssembly, there are two programs: kernels
+# are compiled for each, with vectors and without, all else once. The global properties PELORIN_KERNELS_simd
+# and PELORIN_KERNELS_scalar name the objects.
+function(pelorin_kernels target)
+  cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "SOURCES;LIBRARIES")
+  foreach(build simd scalar)
+    set(kernels ${target}_${build})
+    add_library(${kernels} OBJECT ${arg_SOURCES})
+    target_include_directories(${kernels} PRIVATE ${PROJECT_SOURCE_DIR})
+    target_compile_features(${kernels} PRIVATE cxx_std_20)
+    target_compile_options(${kernels} PRIVATE -O3 $<$<STREQUAL:${build},simd>:-msimd128>)
+    target_link_libraries(${kernels} PRIVATE ${arg_LIBRARIES})
+    set_property(GLOBAL APPEND PROPERTY PELORIN_KERNELS_${build} $<TARGET_OBJECTS:${kernels}>)
+  endforeach()
+endfunction()
+
 # pelorin_library(<name> SOURCES ... [DEPENDS ...] [PRIVATE ...]): the library pelorin_<name> of one
 # folder; PRIVATE is what only its sources include. Folders that set PELORIN_INSTALLED_LIBRARIES have
 # shared ones where BUILD_SHARED_LIBS wants them. Their interface may change with every version.
 function(pelorin_library name)
   cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "SOURCES;DEPENDS;PRIVATE")
   set(target pelorin_${name})
+  set(smallest "")
+  if(EMSCRIPTEN)
+    set(smallest -Oz)
+    set(kernels ${arg_SOURCES})
+    list(FILTER kernels INCLUDE REGEX "_simd\\.cpp$")
+    list(FILTER arg_SOURCES EXCLUDE REGEX "_simd\\.cpp$")
+    if(kernels)
+      pelorin_kernels(${target} SOURCES ${kernels} LIBRARIES ${arg_DEPENDS} ${arg_PRIVATE})
+    endif()
+  endif()
   if(BUILD_SHARED_LIBS AND PELORIN_INSTALLED_LIBRARIES)
     add_library(${target} SHARED ${arg_SOURCES})
     set_target_properties(
@@ -101,6 +127,7 @@ function(pelorin_library name)
     ${target} PUBLIC $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}>
                      $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}/quenby>)
   target_compile_features(${target} PUBLIC cxx_std_20)
+  target_compile_options(${target} PRIVATE ${smallest})
   target_link_libraries(${target} PUBLIC ${arg_DEPENDS} PRIVATE ${arg_PRIVATE})
   if(TARGET pelorin_library_headers)
     target_precompile_headers(${target} REUSE_FROM pelorin_library_headers)
@@ -139,13 +166,6 @@ if(PROJECT_IS_TOP_LEVEL AND NOT BUILD_SHARED_LIBS AND NOT EMSCRIPTEN)
   endforeach()
   pelorin_compile_quickly(pelorin_quick_library_headers)
 endif()
-
-# For the folders below that have no loops that count, where code is loaded over a network.
-macro(pelorin_compile_small)
-  if(EMSCRIPTEN)
-    add_compile_options($<$<CONFIG:Release>:-Oz>)
-  endif()
-endmacro()
 
 # Tests compile in three quarters of the time without an optimiser, which hardly any of them gains from;
 # where they run under emulation they do. Undefined behaviour is looked for in what ships. (SHELL, since an

@@ -1,4 +1,5 @@
 // build.mjs PACKAGE LICENCES OUT: the page as files for any static host.
+import { execFileSync } from "node:child_process";
 import { createHash } from "node:crypto";
 import { cp, mkdir, readdir, readFile, rm, writeFile } from "node:fs/promises";
 import { dirname, join, relative } from "node:path";
@@ -13,6 +14,12 @@ await cp(join(here, "src"), out, { recursive: true });
 for (const name of await readdir(packageFolder)) {
   if (/\.(js|wasm)$/.test(name)) await cp(join(packageFolder, name), join(out, "quenby", name));
 }
+
+// Without comments and long names; what the service worker is filled with stays to be found.
+const written = (await readdir(out)).concat((await readdir(join(out, "quenby"))).map((name) => join("quenby", name)))
+  .filter((name) => /\.(js|css)$/.test(name) && name !== "sw.js").map((name) => join(out, name));
+execFileSync("esbuild", ["--minify", "--target=es2022", "--allow-overwrite", "--log-level=warning", `--outbase=${out}`,
+  `--outdir=${out}`, ...written], { stdio: "inherit" });
 
 const texts = [];
 for (const name of (await readdir(licences)).sort()) {

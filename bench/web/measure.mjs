@@ -1,12 +1,13 @@
-// measure.mjs PACKAGE LIBRARY DIST: processor time of the module's two builds in node beside the native
-// library's on one thread, then of the page in Chromium, as rows for docs/web.md. LIBRARY is libquenby.so.
+// measure.mjs PACKAGE LIBRARY DIST QUENBY PAPER: processor time of the module's two builds in node beside the
+// native library's on one thread, then of the page in Chromium, into the section "web" of a paper, such as
+// docs/performance.md. LIBRARY is libquenby.so, QUENBY the command.
 import { execFileSync } from "node:child_process";
-import { mkdtempSync, rmSync, writeFileSync } from "node:fs";
+import { mkdtempSync, readFileSync, rmSync, writeFileSync } from "node:fs";
 import { tmpdir } from "node:os";
 import { dirname, join, resolve } from "node:path";
 import { fileURLToPath, pathToFileURL } from "node:url";
 
-const [packageFolder, library, dist] = process.argv.slice(2).map((path) => resolve(path));
+const [packageFolder, library, dist, command, paper] = process.argv.slice(2).map((path) => resolve(path));
 const here = dirname(fileURLToPath(import.meta.url));
 const { load } = await import(pathToFileURL(join(packageFolder, "quenby.js")));
 const scratch = mkdtempSync(join(tmpdir(), "quenby-measure-"));
@@ -43,8 +44,11 @@ const spent = (body) => {
   return process.cpuUsage(start).user / 1000;
 };
 
+const lines = [];
+const tell = (line) => (console.log(line), lines.push(line));
+
 const builds = [await load({ build: "simd" }), await load({ build: "scalar" })];
-console.log("| processor time, ms | native | with vectors | without | times native |\n|---|---|---|---|---|");
+tell("| processor time, ms | native, one thread | with vectors | without | times native |\n|---|---|---|---|---|");
 for (const [name, width, height, filter, parameters, runs] of work) {
   const pixels = picture(width, height);
   const raw = join(scratch, "pixels");
@@ -58,7 +62,7 @@ for (const [name, width, height, filter, parameters, runs] of work) {
     session.close();
     return result;
   });
-  console.log(`| ${name} | ${[native, ...times].map((t) => t.toFixed(1)).join(" | ")} | ${(times[0] / native).toFixed(1)} |`);
+  tell(`| ${name} | ${[native, ...times].map((t) => t.toFixed(1)).join(" | ")} | ${(times[0] / native).toFixed(1)} |`);
 }
 
 const [quenby] = builds;
@@ -69,5 +73,17 @@ const hundred = join(scratch, "hundred.jpg");
   const other = await load({ build: "simd" });
   writeFileSync(hundred, other.write(picture(11600, 8640), "JPEG", { quality: 80 }).bytes);
 }
-console.log(execFileSync("python3", ["-B", join(here, "page.py"), dist, large, hundred], { encoding: "utf8" }));
+// The command from its start to the written file, as the page from a click.
+const started = performance.now();
+execFileSync(command, ["enhance", large, "-o", join(scratch, "native.jpg"), "--slider", "0.4", "-j", "1", "--quiet"]);
+const native = performance.now() - started;
+tell("");
+tell(execFileSync("python3", ["-B", join(here, "page.py"), dist, large, hundred, native.toFixed(0)],
+  { encoding: "utf8" }).trim());
 rmSync(scratch, { recursive: true });
+
+const begin = "<!-- web -->\n";
+const end = "<!-- end of web -->";
+const text = readFileSync(paper, "utf8");
+writeFileSync(paper, text.slice(0, text.indexOf(begin) + begin.length) + lines.join("\n") + "\n" +
+  text.slice(text.indexOf(end)));

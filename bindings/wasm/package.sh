@@ -11,10 +11,8 @@ mkdir -p "$out/licences"
 cp "$here"/src/* "$here/README.md" "$out/"
 sed "s/@VERSION@/$version/" "$here/package.json" >"$out/package.json"
 for build in simd scalar; do
-  preset=wasm
-  [ $build = simd ] || preset=wasm-scalar
-  cp "$root/build/$preset/bindings/wasm/quenby_engine.mjs" "$out/quenby-$build.js"
-  cp "$root/build/$preset/bindings/wasm/quenby_engine.wasm" "$out/quenby-$build.wasm"
+  cp "$root/build/wasm/bindings/wasm/quenby-$build.mjs" "$out/quenby-$build.js"
+  cp "$root/build/wasm/bindings/wasm/quenby-$build.wasm" "$out/"
 done
 cp "$root"/build/static/wasm/share/licences/* "$out/licences/"
 cp /usr/share/doc/libboost-dev/copyright "$out/licences/boost.txt"

@@ -7,10 +7,9 @@
 #include <boost/algorithm/string/split.hpp>
 #include <boost/lexical_cast/bad_lexical_cast.hpp>
 #include <cmath>
-#include <locale>
 #include <new>
-#include <sstream>
 #include <stdexcept>
+#include <string_view>
 
 namespace pelorin::image_processing {
 namespace {
@@ -78,11 +77,10 @@ const std::string& FilterParams::at(const std::string& key) const {
 bool FilterParams::readBool(const std::string& key) const {
   const auto found = items_.find(key);
   if (found == items_.end()) return false;
-  std::istringstream stream(found->second);
-  stream.imbue(std::locale::classic());
-  bool value = false;
-  stream >> std::boolalpha >> value;
-  return !stream.fail() && value;
+  // What a stream that knows the names of booleans reads: white space, the name, and then whatever it likes.
+  const std::string_view text = found->second;
+  const std::size_t start = text.find_first_not_of(" \t\n\v\f\r");
+  return start != text.npos && text.substr(start).starts_with("true");
 }
 
 float FilterParams::readFloat(const std::string& key) const {

@@ -1,9 +1,8 @@
 #include "image_processing/filters/parameter_check.h"
 
 #include <boost/lexical_cast/bad_lexical_cast.hpp>
+#include <charconv>
 #include <cmath>
-#include <locale>
-#include <sstream>
 #include <utility>
 
 #include "image_processing/core/parameter_strings.h"
@@ -14,10 +13,9 @@ namespace {
 using Kind = ParameterFault::Kind;
 
 std::string textOfNumber(double value) {
-  std::ostringstream stream;
-  stream.imbue(std::locale::classic());
-  stream << value;
-  return stream.str();
+  char text[32];
+  const auto end = std::to_chars(text, text + sizeof text, value, std::chars_format::general, 6);
+  return {text, end.ptr};
 }
 
 std::string quoted(const std::string& text) {

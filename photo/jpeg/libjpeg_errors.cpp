@@ -62,7 +62,7 @@ LibjpegErrors::LibjpegErrors() : state_() {
 }
 
 void LibjpegErrors::jumpOut(j_common_ptr codec) {
-  std::longjmp(reinterpret_cast<State*>(codec->err)->landing, 1);
+  reinterpret_cast<State*>(codec->err)->wayOut.take();
 }
 
 void LibjpegErrors::jumpOutIfDamaged(j_common_ptr codec, int level) {

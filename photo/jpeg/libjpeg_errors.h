@@ -6,12 +6,11 @@
 #include <cstdio>
 #include <jpeglib.h>
 // clang-format on
-#include <csetjmp>
+#include "photo/way_out.h"
 
 namespace pelorin::photo {
 
-/// Turns libjpeg's errors into exceptions. libjpeg must not return from an error and is C, which
-/// an exception may not cross: an error jumps back into `run`, and `run` throws.
+/// Turns libjpeg's errors into exceptions: an error goes back into `run`, and `run` throws.
 class LibjpegErrors {
  public:
   LibjpegErrors();
@@ -21,20 +20,18 @@ class LibjpegErrors {
   /// For the `err` of a codec object; lives as long as this.
   jpeg_error_mgr* manager() { return &state_.base; }
 
-  /// Calls `body`, which calls libjpeg. No object in it or below it may need its destructor: the
-  /// jump skips them. What it owns belongs to the caller.
+  /// Calls `body`, which calls libjpeg, as `WayOut::left` does.
   /// @throws PhotoError or std::bad_alloc when libjpeg reports an error or a warning that picture
   ///         data is missing or wrong.
   template <typename Body>
   void run(const Body& body) {
-    if (setjmp(state_.landing) != 0) throwError();
-    body();
+    if (state_.wayOut.left(body)) throwError();
   }
 
  private:
   struct State {
     jpeg_error_mgr base;  // first, so that libjpeg's pointer to it is one to the whole
-    std::jmp_buf landing;
+    WayOut wayOut;
   };
 
   [[noreturn]] static void jumpOut(j_common_ptr codec);

@@ -4,7 +4,6 @@
 #include <zlib.h>
 
 #include <algorithm>
-#include <csetjmp>
 #include <cstring>
 #include <new>
 #include <string>
@@ -17,6 +16,7 @@
 #include "photo/photo_error.h"
 #include "photo/png/png_chunks.h"
 #include "photo/png/png_losses.h"
+#include "photo/way_out.h"
 
 namespace pelorin::photo {
 namespace {
@@ -26,21 +26,19 @@ using image_processing::RGBA8Pixel;
 
 constexpr std::uint32_t rowsBetweenStops = 256;
 
-/// Turns libpng's errors into exceptions, which may not cross C: an error jumps back into `run`, and
-/// `run` throws.
+/// Turns libpng's errors into exceptions: an error goes back into `run`, and `run` throws.
 class PngErrors {
  public:
-  /// Calls `body`, which calls libpng. No object in it may need its destructor.
+  /// Calls `body`, which calls libpng, as `WayOut::left` does.
   template <typename Body>
   void run(const Body& body) {
-    if (setjmp(landing_) != 0) throwError();
-    body();
+    if (wayOut_.left(body)) throwError();
   }
 
   static void fail(png_structp png, png_const_charp message) {
     auto* errors = static_cast<PngErrors*>(png_get_error_ptr(png));
     std::strncpy(errors->message_, message, sizeof errors->message_ - 1);
-    std::longjmp(errors->landing_, 1);
+    errors->wayOut_.take();
   }
   static void ignore(png_structp, png_const_charp) {}
 
@@ -54,7 +52,7 @@ class PngErrors {
     throw PhotoError(PhotoError::Kind::damaged, std::string("damaged: ") + message_);
   }
 
-  std::jmp_buf landing_;
+  WayOut wayOut_;
   char message_[200] = {};
 };
 

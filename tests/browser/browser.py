@@ -86,12 +86,12 @@ class Browser:
 
     def emulate(self, width, height, dark=False):
         """Makes the page as large as this, which may be less than a window can be."""
-        self._command("Emulation.setDeviceMetricsOverride",
+        self.command("Emulation.setDeviceMetricsOverride",
                       {"width": width, "height": height, "deviceScaleFactor": 1, "mobile": False})
         scheme = {"name": "prefers-color-scheme", "value": "dark" if dark else "light"}
-        self._command("Emulation.setEmulatedMedia", {"features": [scheme]})
+        self.command("Emulation.setEmulatedMedia", {"features": [scheme]})
 
-    def _command(self, name, parameters):
+    def command(self, name, parameters):
         self._post("/goog/cdp/execute", {"cmd": name, "params": parameters})
 
     def choose(self, selector, *paths):

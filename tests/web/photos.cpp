@@ -86,6 +86,8 @@ int main(int, char** argv) {
 
   write("large.jpg", jpegOf(photoLikePicture(2000, 1500, 3), {taken(1, "2020:02:03 10:00:00")}));
 
+  write("hundred.jpg", jpegOf(photoLikePicture(11600, 8640, 4), {}, 75));
+
   const Bytes whole = jpegOf(picture);
   write("hostile/empty.jpg", {});
   write("hostile/cut.jpg",

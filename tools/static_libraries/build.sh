@@ -97,12 +97,16 @@ done
 together=()
 library fmtlib "$prefix/source/fmtlib" -DFMT_TEST=OFF -DFMT_DOC=OFF &
 together+=($!)
+# What comes over a network has no more than is called.
+jpeg=() png=()
+[ "$name" != wasm ] || jpeg=(-DWITH_ARITH_ENC=OFF -DCMAKE_C_FLAGS_RELEASE="-O3 -DNDEBUG")
+[ "$name" != wasm ] || png=(-DDFA_XTRA="$here/png_for_browsers.dfa")
 # Highway's library chooses among instruction sets; other machines than this take its headers and one.
 [[ $* == *-DCMAKE_TOOLCHAIN_FILE=* ]] ||
   library highway "$prefix/source/highway" -DBUILD_SHARED_LIBS=OFF -DHWY_ENABLE_CONTRIB=OFF \
     -DHWY_ENABLE_EXAMPLES=OFF -DHWY_ENABLE_TESTS=OFF -DBUILD_TESTING=OFF &
 together+=($!)
-library libjpeg-turbo "$prefix/source/libjpeg-turbo" -DENABLE_SHARED=OFF -DWITH_TURBOJPEG=OFF &
+library libjpeg-turbo "$prefix/source/libjpeg-turbo" -DENABLE_SHARED=OFF -DWITH_TURBOJPEG=OFF "${jpeg[@]}" &
 together+=($!)
 c_sources lcms2 lcms2 src include/lcms2.h include/lcms2_plugin.h &
 together+=($!)
@@ -111,7 +115,7 @@ together+=($!)
 {
   c_sources zlib z . zlib.h zconf.h
   library libpng1.6 "$prefix/source/libpng1.6" -DPNG_SHARED=OFF -DPNG_TESTS=OFF -DPNG_EXECUTABLES=OFF \
-    -DZLIB_LIBRARY="$prefix/lib/libz.a" -DZLIB_INCLUDE_DIR="$prefix/include"
+    -DZLIB_LIBRARY="$prefix/lib/libz.a" -DZLIB_INCLUDE_DIR="$prefix/include" "${png[@]}"
 } &
 together+=($!)
 failed=0

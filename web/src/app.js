@@ -678,6 +678,7 @@ $("selftest").addEventListener("click", async () => {
 
 matchMedia("(prefers-color-scheme: dark)").addEventListener("change", () => void settle());
 window.quenbyFrames = frames; // for measuring
+window.quenbyWorker = () => worker; // for tests
 if ("serviceWorker" in navigator) navigator.serviceWorker.register("sw.js").catch(() => {});
 startWorker().then(
   () => document.body.classList.add("ready"),

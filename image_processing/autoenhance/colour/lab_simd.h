@@ -13,6 +13,7 @@
 #include "image_processing/autoenhance/colour/srgb.h"
 #include "image_processing/core/pixel_types.h"
 #include "image_processing/core/simd.h"
+#include "image_processing/core/truncate_small.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace pelorin::image_processing::HWY_NAMESPACE {
@@ -67,7 +68,7 @@ HWY_INLINE F lightness(F fy) {
 /// Index of the sample that a look-up of `x` takes in an inverse table of `scale` samples per unit.
 HWY_INLINE F sampleIndex(F x, float scale) {
   const F place = simd::clampTo(hn::Mul(x, set(scale)), hn::Zero(Floats()), set(lastInverseSample));
-  return hn::ConvertTo(Floats(), simd::truncate(place));
+  return simd::wholePart(place);
 }
 
 /// `Lab2xzTable` at `x`: its samples are the formula at their own arguments, which takes less time

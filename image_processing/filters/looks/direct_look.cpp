@@ -16,6 +16,16 @@ DirectLook::Curve extended(const LookCurve& curve) {
   return {std::move(samples), static_cast<std::int32_t>(count) - 1, curve.samplesPerUnit()};
 }
 
+std::vector<float> sideBySide(const std::array<DirectLook::Curve, 3>& curves) {
+  std::vector<float> fours;
+  fours.reserve(4 * curves[0].samples.size());
+  for (std::size_t i = 0; i < curves[0].samples.size(); ++i) {
+    for (const DirectLook::Curve& curve : curves) fours.push_back(curve.samples[i]);
+    fours.push_back(0.0f);
+  }
+  return fours;
+}
+
 }  // namespace
 
 bool DirectLook::canCompute(const Look& look) {
@@ -40,6 +50,8 @@ DirectLook::DirectLook(const Look& ofLook)
       curves{extended(look.curves[0]), extended(look.curves[1]), extended(look.curves[2])},
       curvesAreShort(std::max({curves[0].last, curves[1].last, curves[2].last}) <
                      static_cast<std::int32_t>(shortCurve)),
-      stepsAreEqual(curves[0].last == curves[1].last && curves[0].last == curves[2].last) {}
+      stepsAreEqual(curves[0].last == curves[1].last && curves[0].last == curves[2].last),
+      fours(look.mix == ChannelMix::grey && stepsAreEqual ? sideBySide(curves)
+                                                          : std::vector<float>()) {}
 
 }  // namespace pelorin::image_processing

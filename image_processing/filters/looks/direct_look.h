@@ -35,6 +35,9 @@ struct DirectLook {
   std::array<Curve, 3> curves;
   bool curvesAreShort;  ///< None has more than `shortCurve` samples.
   bool stepsAreEqual;   ///< The curves have as many samples each.
+  /// The samples of the three curves side by side and a 0, for a grey mix of curves with equal steps;
+  /// else empty.
+  std::vector<float> fours;
 };
 
 /// Applies a look to the first `count` pixels of a row.

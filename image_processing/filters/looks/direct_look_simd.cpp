@@ -10,6 +10,7 @@
 #include "image_processing/core/prefetch.h"
 #include "image_processing/core/simd.h"
 #include "image_processing/core/small_table.h"
+#include "image_processing/core/truncate_small.h"
 #include "image_processing/filters/looks/soft_light.h"
 #include "image_processing/filters/looks/vignette_simd.h"
 
@@ -149,6 +150,50 @@ HWY_INLINE W byteAt(const Curve& curve, const Place& place) {
   return hn::And(hn::BitCast(Words(), whole), hn::Set(Words(), 0xFFu));
 }
 
+#undef PELORIN_GREY_BY_FOURS
+#if HWY_TARGET == HWY_SSSE3 || HWY_TARGET == HWY_SSE4 || HWY_TARGET == HWY_NEON || \
+    HWY_TARGET == HWY_WASM
+#define PELORIN_GREY_BY_FOURS
+/// Without gathers, three curves over the same grey are one of vectors: a load for each end of a segment.
+class CurveOfFours {
+ public:
+  explicit CurveOfFours(const DirectLook& direct)
+      : samples_(direct.fours.data()),
+        last_(direct.curves[0].last),
+        samplesPerUnit_(direct.curves[0].samplesPerUnit) {}
+
+  /// The pixels of four greys, with a 0 for alpha.
+  HWY_INLINE W at(F grey) const {
+    const F position = hn::Mul(grey, set(samplesPerUnit_));
+    const I index = hn::Min(simd::truncateSmall(position), hn::Set(Ints(), last_));
+    const F fraction = hn::Sub(position, simd::wholePart(position));
+    const F rest = hn::Sub(set(1.0f), fraction);
+    const hn::Repartition<std::int16_t, Ints> shorts;
+    const hn::Half<hn::Repartition<std::uint8_t, Ints>> bytes;
+    const auto first = hn::ReorderDemote2To(shorts, pixel<0>(index, fraction, rest),
+                                            pixel<1>(index, fraction, rest));
+    const auto second = hn::ReorderDemote2To(shorts, pixel<2>(index, fraction, rest),
+                                             pixel<3>(index, fraction, rest));
+    return hn::BitCast(
+        Words(), hn::Combine(hn::Repartition<std::uint8_t, Ints>(), hn::DemoteTo(bytes, second),
+                             hn::DemoteTo(bytes, first)));
+  }
+
+ private:
+  template <int lane>
+  HWY_INLINE I pixel(I index, F fraction, F rest) const {
+    const float* lower = samples_ + 4 * hn::ExtractLane(index, lane);
+    const F y = hn::Add(hn::Mul(hn::Broadcast<lane>(fraction), hn::LoadU(Floats(), lower + 4)),
+                        hn::Mul(hn::Broadcast<lane>(rest), hn::LoadU(Floats(), lower)));
+    return hn::And(simd::truncateSmall(hn::Max(y, hn::Zero(Floats()))), hn::Set(Ints(), 0xFF));
+  }
+
+  const float* samples_;
+  std::int32_t last_;
+  float samplesPerUnit_;
+};
+#endif
+
 template <ChannelMix mix, bool vignette, typename Curve>
 void applyToVectors(const DirectLook& direct, const VignetteRow& row, const RGBA8Pixel* from,
                     RGBA8Pixel* to, std::size_t count) {
@@ -161,6 +206,9 @@ void applyToVectors(const DirectLook& direct, const VignetteRow& row, const RGBA
   const VignetteRow coordinates = row;
   const float* const masks = vignette ? direct.look.vignette->samples().data() : nullptr;
   const float opacity = direct.look.maskAlpha;
+#ifdef PELORIN_GREY_BY_FOURS
+  const CurveOfFours fours(direct);
+#endif
 
   for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
     prefetchAhead(from + i);
@@ -176,6 +224,13 @@ void applyToVectors(const DirectLook& direct, const VignetteRow& row, const RGBA
       c = vignetted(c, hn::GatherIndex(Floats(), masks, sample), opacity);
     }
     c = mixed<mix>(c);
+#ifdef PELORIN_GREY_BY_FOURS
+    if (mix == ChannelMix::grey && samePlaces) {
+      const W alpha = hn::And(pixels, hn::Set(Words(), 0xFF000000u));
+      hn::StoreU(hn::Or(alpha, fours.at(c.r)), Words(), reinterpret_cast<std::uint32_t*>(to + i));
+      continue;
+    }
+#endif
     const Place r = placeOf(c.r, redSteps);
     const Place g = samePlaces ? r : placeOf(c.g, greenSteps);
     const Place b = samePlaces ? r : placeOf(c.b, blueSteps);
