@@ -266,10 +266,10 @@ def test_touch(page):
     assert page.run("return Number(document.querySelector('#divider').getAttribute('aria-valuenow'))") < share
 
     left, top, width, height = box("#stage")
-    x, y = left + width * 0.75, top + height / 2
+    x, y = left + width / 2, top + height / 2
     before = box("#after")
     touch("touchStart", (x - 20, y), (x + 20, y))
-    for far in (30, 40, 50):
+    for far in (40, 70, 100):
         touch("touchMove", (x - far, y), (x + far, y))
     touch("touchEnd")
     zoomed = box("#after")
@@ -289,9 +289,10 @@ def test_survives_a_broken_worker(page):
     page.run("quenbyWorker().worker.postMessage({ id: 0, call: 'what there is not', given: [] })")
     slide(page, 0.3)
     page.wait_until("return document.querySelector('#problems').textContent.includes('the engine stopped')")
-    page.forget_problems()
     page.wait_until("return quenbyWorker().error === undefined")
     page.shown()
+    assert len(page.problems()) == 1, page.problems()
+    page.forget_problems()
     slide(page, 0.6)
     page.click("#save")
     browser.wait_for(page.downloads / "cmyk_AE0.jpg")

@@ -13,12 +13,12 @@ mkdir -p "$scratch"
 export QUENBY=$quenby PHOTOS=$scratch/photos PACKAGE=$root/build/web/package TABLE=$root/tests/selftest/table.txt
 node --test "$here/module.test.mjs"
 
-cp "$here"/package*.json "$here/types.ts" "$scratch/"
+cp "$here"/package*.json "$here/types.mts" "$scratch/"
 if (cd "$scratch" && timeout 120 npm ci --prefer-offline --ignore-scripts --no-audit --no-fund >npm.log 2>&1); then
   rm -rf "$scratch/node_modules/quenby"
   ln -s "$PACKAGE" "$scratch/node_modules/quenby"
   (cd "$scratch" && node_modules/.bin/tsc --noEmit --strict --target es2022 --module nodenext \
-    --moduleResolution nodenext --lib es2022,dom types.ts)
+    --moduleResolution nodenext --lib es2022,dom types.mts)
   echo "the types: all well"
   export AXE=$scratch/node_modules/axe-core/axe.min.js
 elif grep -qE 'ENOTFOUND|EAI_AGAIN|ECONNREFUSED|ECONNRESET|ETIMEDOUT|ENETUNREACH|E40[34]|E50[0-9]|ENOTCACHED' "$scratch/npm.log" ||

@@ -72,6 +72,7 @@ async function ask(name, given, options) {
     return await asked.call(name, given, options);
   } catch (error) {
     if (asked.error && asked === worker) {
+      if (current) current.info = undefined; // until it is open again
       await startWorker();
       if (current) void openCurrent();
     }
@@ -304,6 +305,8 @@ function seen() {
 }
 
 function failed(error) {
+  if (error.told) return; // calls that ended with their worker end with one error
+  error.told = true;
   complain(`${current?.name ?? "Quenby"}: ${error.message}`);
 }
 

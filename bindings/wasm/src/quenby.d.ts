@@ -9,6 +9,7 @@ export type Kind =
   | "damaged" | "truncated" | "too-large" | "failed";
 
 export class QuenbyError extends Error {
+  constructor(kind: Kind, message: string);
   kind: Kind;
   /** One clause for a user: "truncated: the picture data ends early". */
   message: string;
