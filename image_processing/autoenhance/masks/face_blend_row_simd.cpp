@@ -32,7 +32,8 @@ HWY_INLINE F set(float value) {
   return hn::Set(Floats(), value);
 }
 
-/// A vector of a mask.
+/// A vector of a mask. Its constructors are written out, since GCC compiles others for the least of the
+/// instruction sets.
 template <typename T>
 struct Values;
 
@@ -40,6 +41,7 @@ template <>
 struct Values<float> {
   F value;
 
+  HWY_INLINE Values() {}
   HWY_INLINE void load(const float* mask) { value = hn::LoadU(Floats(), mask); }
   HWY_INLINE void assign(F next) { value = next; }
   HWY_INLINE void store(float* mask) const { hn::StoreU(value, Floats(), mask); }
@@ -52,6 +54,7 @@ struct Values<Quantized> {
   F value;
   I code;
 
+  HWY_INLINE Values() {}
   HWY_INLINE void load(const Quantized* mask) {
     setCode(hn::PromoteTo(Ints(), hn::LoadU(Bytes(), reinterpret_cast<const std::uint8_t*>(mask))));
   }

@@ -151,8 +151,8 @@ HWY_INLINE W byteAt(const Curve& curve, const Place& place) {
 }
 
 #undef PELORIN_GREY_BY_FOURS
-#if HWY_TARGET == HWY_SSSE3 || HWY_TARGET == HWY_SSE4 || HWY_TARGET == HWY_NEON || \
-    HWY_TARGET == HWY_WASM
+#if HWY_TARGET == HWY_SSSE3 || HWY_TARGET == HWY_SSE4 || HWY_TARGET == HWY_WASM || \
+    (HWY_TARGET == HWY_NEON && HWY_ARCH_ARM_A64)
 #define PELORIN_GREY_BY_FOURS
 /// Without gathers, three curves over the same grey are one of vectors: a load for each end of a segment.
 class CurveOfFours {
