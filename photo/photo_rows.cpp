@@ -49,7 +49,7 @@ PhotoRows::PhotoRows(const FileView& file, const OpenOptions& options,
 PhotoRows::~PhotoRows() {
   rows_ = nullptr;
   // What is more than this photo's part goes, since a photo elsewhere may wait for it.
-  if (kept_ != nullptr && resources_.spare != nullptr && kept_->byteSize() <= resources_.spared)
+  if (kept_ != nullptr && resources_.spare != nullptr && kept_->byteSize() <= resources_.pixels)
     resources_.spare->keep(*kept_);
 }
 

@@ -25,7 +25,6 @@ struct RowResources {
   std::uint64_t pixels = std::uint64_t{128} << 20;
   PixelBudget* budget = nullptr;  ///< That kept pixels are part of; may be null.
   SparePixels* spare = nullptr;   ///< Where kept pixels may come from and go; may be null.
-  std::uint64_t spared = pixels;  ///< The most bytes that go there.
   /// Share the work: decoding, filtering and encoding go on at the same time. Null for none.
   image_processing::Workers* workers = nullptr;
 };
