@@ -14,9 +14,8 @@ using namespace pelorin::image_processing;
 int32_t quenby_grey_of(const quenby_pixels* pixels, uint8_t* grey, size_t stride,
                        quenby_error* error) {
   return guarded(error, [&] {
-    required(grey, "grey");
     const auto picture = viewOf(pixels);
-    if (stride < picture->width) refuse("stride", "is below the width");
+    requireRows(grey, picture->width, picture->height, stride, 1, "grey");
     const GreyPicture made = imageMakeGrayscale(*picture);
     for (uint32_t y = 0; y < made.height; ++y) {
       std::copy_n(made.row(y), made.width, grey + y * stride);

@@ -9,8 +9,6 @@ namespace pelorin::c_api {
 using image_processing::Image;
 using image_processing::RGBA8Pixel;
 
-namespace {
-
 void requireRows(const void* first, std::uint32_t width, std::uint32_t height, std::size_t stride,
                  std::size_t bytesPerPixel, const char* name) {
   if (first == nullptr) refuse(name, "is null");
@@ -19,6 +17,8 @@ void requireRows(const void* first, std::uint32_t width, std::uint32_t height, s
   constexpr auto largest = static_cast<std::size_t>(std::numeric_limits<std::ptrdiff_t>::max());
   if (stride > largest / height) refuse(name, "are more than fit into memory");
 }
+
+namespace {
 
 template <typename T>
 void copyRows(const void* from, std::size_t fromStride, void* to, std::size_t toStride,

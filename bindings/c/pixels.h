@@ -15,6 +15,10 @@ using GreyPicture = image_processing::Image<unsigned char>;
 
 // Pixels of the caller's. @throws std::invalid_argument when they cannot be.
 
+/// Rows of the caller's from `first` on: some, none overlapping the next, all of them within memory.
+void requireRows(const void* first, std::uint32_t width, std::uint32_t height, std::size_t stride,
+                 std::size_t bytesPerPixel, const char* name);
+
 /// As a picture of its own.
 std::shared_ptr<Picture> copyOf(const quenby_pixels* pixels);
 
