@@ -65,7 +65,7 @@ def dupe_score(distance: float, seconds: float, same_orientation: bool = True) -
     """The duplicate score of two photos so far apart: larger is more likely, 0 the even chance, the same
     photo twice about 3.65. seconds lie between the two, of either sign."""
     result = c_float()
-    call("dupe_score", distance, seconds, int(same_orientation), byref(result))
+    call("dupe_score", distance, seconds, bool(same_orientation), byref(result))
     return result.value
 
 
@@ -73,7 +73,7 @@ def dupe_window(threshold: float = 0.0, same_orientation: bool = True) -> float:
     """The longest time between two photos, in seconds, that may reach a score: negative when none does,
     infinite when any does."""
     result = c_double()
-    call("dupe_window", threshold, int(same_orientation), byref(result))
+    call("dupe_window", threshold, bool(same_orientation), byref(result))
     return result.value
 
 

@@ -68,7 +68,7 @@ def fast(
     grey, corners = _grey_of(photo), CCorners()
     given = _struct_of(grey)
     threshold = max(-(2**31), min(threshold, 2**31 - 1))
-    call("fast", byref(given), arc, threshold, int(suppress), byref(corners))
+    call("fast", byref(given), arc, threshold, bool(suppress), byref(corners))
     try:
         found: npt.NDArray[np.int32] = _taken(corners, np.int32, 3)
     finally:

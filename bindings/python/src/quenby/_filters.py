@@ -108,6 +108,7 @@ def check_parameters(filter: str, params: str = "") -> list[Fault]:
 def look_named(name: str) -> Filter:
     """The filter a user means: its name or display name in any letters; of several with one display
     name the first."""
+    utf8(name)
     shown_so = None
     for filter in filters():
         if filter.name.lower() == name.lower():

@@ -307,7 +307,10 @@ def plain(name: str, *arguments: Any) -> Any:
 def call(name: str, *arguments: Any) -> None:
     """Calls a function, and raises what it ends with."""
     error = CError()
-    kind = getattr(_library, "quenby_" + name)(*arguments, byref(error))
+    try:
+        kind = getattr(_library, "quenby_" + name)(*arguments, byref(error))
+    except ctypes.ArgumentError as wrong:  # which is no TypeError of its own
+        raise TypeError(f"{name}: {wrong}") from None
     if kind == 0:
         return
     message = error.message.decode(errors="replace")
@@ -376,7 +379,11 @@ class Threads:
 
 
 def pointer_of(cancel: Optional[Cancel]) -> Optional[c_void_p]:
-    return None if cancel is None else cancel._handle.pointer
+    if cancel is None:
+        return None
+    if not isinstance(cancel, Cancel):
+        raise TypeError(f"cancel: is no Cancel but {type(cancel).__name__}")
+    return cancel._handle.pointer
 
 
 def utf8(text: str) -> bytes:

@@ -279,6 +279,8 @@ def _encoded(
     cancel: Optional[Cancel],
 ) -> tuple[bytes, list[Loss]]:
     save = _save_options(quality, strip, keep, subsampling)
+    if like is not None and not isinstance(like, Photo):
+        raise TypeError(f"like: is no Photo but {type(like).__name__}")
     rgba = pixels.rgba if isinstance(pixels, Photo) else rgba_of(array_of(pixels))
     given, pointer = pixels_of(rgba), c_void_p()
     rest = (byref(given), utf8(format), byref(save), pointer_of(cancel), byref(pointer))
