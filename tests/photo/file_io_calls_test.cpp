@@ -28,6 +28,9 @@ Function* next(const char* name) {
 
 }  // namespace
 
+// Seen by libraries, too.
+#pragma GCC visibility push(default)
+
 extern "C" int fsync(int file) {
   struct stat status = {};
   fstat(file, &status);
@@ -65,6 +68,8 @@ extern "C" long syscall(long number, ...) noexcept {
   return next<long(long, ...)>("syscall")(number, given[0], given[1], given[2], given[3], given[4],
                                           given[5]);
 }
+
+#pragma GCC visibility pop
 
 namespace pelorin::photo {
 namespace {
