@@ -22,10 +22,9 @@ set(CPACK_DEBIAN_ENABLE_COMPONENT_DEPENDS OFF)
 set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
 set(CPACK_DEBIAN_PACKAGE_PRIORITY optional)
 set(CPACK_DEBIAN_PACKAGE_CONTROL_STRICT_PERMISSION ON)
-set(PELORIN_MAINTAINER "Pelorin <quenby@pelorin.com>" CACHE STRING "Who answers for the packages")
-mark_as_advanced(PELORIN_MAINTAINER)
 set(CPACK_DEBIAN_PACKAGE_MAINTAINER ${PELORIN_MAINTAINER})
 set(CPACK_DEBIAN_PACKAGE_DEPENDS "")
+configure_file(packaging/copyright.in packaging/copyright @ONLY)
 
 # quenby_package(<component> <package> <section> <summary> <description> [ALL] [SHARED] [DEPENDS ...])
 # ALL: for every architecture. SHARED: its libraries' dependencies are read from them.
@@ -45,7 +44,7 @@ function(quenby_package component package section summary description)
     set(CPACK_DEBIAN_${COMPONENT}_PACKAGE_ARCHITECTURE all PARENT_SCOPE)
   endif()
   set(documents ${CMAKE_INSTALL_DATAROOTDIR}/doc/${package})
-  install(FILES ${PROJECT_SOURCE_DIR}/packaging/copyright DESTINATION ${documents}
+  install(FILES ${PROJECT_BINARY_DIR}/packaging/copyright DESTINATION ${documents}
           COMPONENT ${component})
   install(
     CODE "set(changelog \"\$ENV{DESTDIR}\${CMAKE_INSTALL_PREFIX}/${documents}/changelog.gz\")

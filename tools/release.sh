@@ -38,6 +38,8 @@ make_all() {
   # Options that somebody gave to an earlier build count for nothing: without precompiled headers, for one,
   # compilers write some functions in another order.
   rm -f build/{release,arm64,armhf,wasm,wasm-scalar,android-*}/CMakeCache.txt
+  # Jars that an earlier build made have its date, and stay where no class changed.
+  rm -rf build/jar build/release/java/*.jar
   rm -rf "$out"
   mkdir -p "$out"
   git archive --prefix="quenby-$version/" HEAD | gzip -9 -n >"$out/quenby-$version-source.tar.gz"
