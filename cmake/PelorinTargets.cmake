@@ -168,6 +168,23 @@ if(PROJECT_IS_TOP_LEVEL AND NOT BUILD_SHARED_LIBS AND NOT EMSCRIPTEN)
   pelorin_compile_quickly(pelorin_quick_library_headers)
 endif()
 
+# With PELORIN_UNITY, a target's files are compiled a dozen at a time, as one; not those that include themselves
+# once for every instruction set.
+function(pelorin_unite target)
+  if(NOT PELORIN_UNITY)
+    return()
+  endif()
+  set_target_properties(${target} PROPERTIES UNITY_BUILD ON UNITY_BUILD_BATCH_SIZE 12)
+  get_target_property(sources ${target} SOURCES)
+  foreach(source ${sources})
+    cmake_path(ABSOLUTE_PATH source)
+    file(STRINGS ${source} own REGEX "^#define HWY_TARGET_INCLUDE" LIMIT_COUNT 1)
+    if(own)
+      set_source_files_properties(${source} PROPERTIES SKIP_UNITY_BUILD_INCLUSION ON)
+    endif()
+  endforeach()
+endfunction()
+
 # Tests compile in three quarters of the time without an optimiser, which hardly any of them gains from;
 # where they run under emulation they do. Undefined behaviour is looked for in what ships. (SHELL, since an
 # option that is there already would be left out.)
@@ -265,7 +282,8 @@ function(pelorin_add_tests program)
   endif()
 endfunction()
 
-# pelorin_test(<file> [THREADS] [LABEL <label>] [SOURCES ...] DEPENDS ...): the tests in <file>.cpp.
+# pelorin_test(<file> [THREADS] [LABEL <label>] [SOURCES ...] DEPENDS ...): a program of the tests in <file>.cpp,
+# for those that need one of their own.
 # THREADS marks tests that start threads: the thread sanitizer's run builds and runs those; their label
 # is "threads", whatever LABEL says. LABEL machine marks what another processor or compiler would break
 # first: whole results, kernels, sizes, conversions, natives; a short run on an emulated machine builds
@@ -293,6 +311,21 @@ function(pelorin_test file)
   pelorin_add_tests(${name} PROPERTIES ${labels})
 endfunction()
 
+# pelorin_tests(<program> FILES ... [THREADS] [LABEL <label>] DEPENDS ...): one program of the tests in all these
+# files, which is what a folder has: reading GoogleTest is most of what a file of tests costs, and linking the rest.
+function(pelorin_tests program)
+  cmake_parse_arguments(PARSE_ARGV 1 arg "THREADS" "LABEL" "FILES;DEPENDS")
+  list(TRANSFORM arg_FILES APPEND .cpp)
+  set(kind "")
+  if(arg_THREADS)
+    set(kind THREADS)
+  elseif(arg_LABEL)
+    set(kind LABEL ${arg_LABEL})
+  endif()
+  pelorin_test(${program} ${kind} SOURCES ${arg_FILES} DEPENDS ${arg_DEPENDS})
+  pelorin_unite(${program})
+endfunction()
+
 # pelorin_bench(<name> DEPENDS ...): the benchmarks in <name>.cpp.
 function(pelorin_bench name)
   cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "DEPENDS")
@@ -318,7 +351,7 @@ function(pelorin_fuzz name)
     target_link_options(${name} PRIVATE -fsanitize=fuzzer)
     add_test(NAME ${name} COMMAND ${name} -runs=${arg_RUNS} -seed=1 -max_len=4096)
   else()
-    target_sources(${name} PRIVATE ${PROJECT_SOURCE_DIR}/fuzz/replay_main.cpp)
+    target_link_libraries(${name} PRIVATE pelorin_fuzz_replay)
     set(corpus ${PROJECT_SOURCE_DIR}/fuzz/corpus/${name}.txt)
     add_test(NAME ${name} COMMAND ${name} --corpus ${corpus} --random ${arg_RUNS} --seed 1
                                           --max-length 4096)

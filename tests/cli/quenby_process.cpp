@@ -10,10 +10,6 @@
 namespace pelorin::test_support {
 namespace {
 
-std::string textOf(const Bytes& bytes) {
-  return {bytes.begin(), bytes.end()};
-}
-
 Finished runWithInput(const std::vector<std::string>& command, const Bytes& input) {
   const TemporaryFolder folder;
   const int standardInput = open(folder.write("input", input).c_str(), O_RDONLY | O_CLOEXEC);

@@ -1,6 +1,8 @@
 #pragma once
 
 #include <cstdint>
+#include <string>
+#include <string_view>
 #include <vector>
 
 #include "image_processing/core/image.h"
@@ -8,6 +10,13 @@
 namespace pelorin::test_support {
 
 using Bytes = std::vector<std::uint8_t>;
+
+inline Bytes bytesOf(std::string_view text) {
+  return {text.begin(), text.end()};
+}
+inline std::string textOf(const Bytes& bytes) {
+  return {bytes.begin(), bytes.end()};
+}
 
 /// The packed RGBA bytes of a picture.
 inline Bytes rawBytes(const image_processing::Image<image_processing::RGBA8Pixel>& image) {

@@ -2,7 +2,7 @@
 
 #include <gtest/gtest.h>
 
-#include <limits>
+#include <cmath>
 
 #include "tests/support/pictures.h"
 
@@ -13,8 +13,7 @@ using image_processing::Image;
 using image_processing::RGBA8Pixel;
 using test_support::flatPicture;
 
-constexpr float nan = std::numeric_limits<float>::quiet_NaN();
-constexpr RGBA8Pixel grey{128, 128, 128, 255};
+constexpr RGBA8Pixel plain{128, 128, 128, 255};
 
 /// Finds the pixels of a picture that show points of the photo.
 class Finder {
@@ -39,8 +38,8 @@ Image<RGBA8Pixel> heatMapOf(const Image<RGBA8Pixel>& photo, const BlockValues& b
 TEST(HeatMap, TintsEachBlockByItsValue) {
   // Shown enlarged, as it is, and smaller.
   for (const std::uint32_t size : {10u, 500u, 2100u}) {
-    const auto photo = flatPicture(3 * size + size / 2, 2 * size + size / 2, grey);
-    const Finder shownAt(heatMapOf(photo, {size, 3, 2, {1, 5, 9, 9, 1, nan}}), photo);
+    const auto photo = flatPicture(3 * size + size / 2, 2 * size + size / 2, plain);
+    const Finder shownAt(heatMapOf(photo, {size, 3, 2, {1, 5, 9, 9, 1, NAN}}), photo);
     const auto block = [&](double column, double row) {
       return shownAt((column + 0.5) * size, (row + 0.5) * size);
     };
@@ -49,9 +48,9 @@ TEST(HeatMap, TintsEachBlockByItsValue) {
     EXPECT_GT(block(2, 0).r, block(2, 0).b + 40) << size;
     EXPECT_EQ(block(0, 1), block(2, 0)) << size;
     EXPECT_EQ(block(1, 1), block(0, 0)) << size;
-    EXPECT_EQ(block(2, 1), grey) << size;
-    EXPECT_EQ(block(2.7, 0), grey) << size;
-    EXPECT_EQ(block(0, 1.7), grey) << size;
+    EXPECT_EQ(block(2, 1), plain) << size;
+    EXPECT_EQ(block(2.7, 0), plain) << size;
+    EXPECT_EQ(block(0, 1.7), plain) << size;
   }
 }
 
@@ -64,10 +63,10 @@ TEST(HeatMap, LetsThePhotoShineThrough) {
 }
 
 TEST(HeatMap, HasNoSeamsBetweenBlocksOfOneValue) {
-  const auto photo = flatPicture(2500, 700, grey);  // shown at 4/5
+  const auto photo = flatPicture(2500, 700, plain);  // shown at 4/5
   const Finder shownAt(heatMapOf(photo, {96, 26, 7, std::vector<float>(26 * 7, 3.0f)}), photo);
   const RGBA8Pixel expected = shownAt(10, 10);
-  EXPECT_NE(expected, grey);
+  EXPECT_NE(expected, plain);
   for (double x = 1; x < 26 * 96 - 2; ++x) {
     ASSERT_EQ(shownAt(x, 300), expected) << x;
   }
@@ -78,7 +77,7 @@ TEST(HeatMap, HasNoSeamsBetweenBlocksOfOneValue) {
 
 TEST(HeatMap, StaysAReasonableSize) {
   const auto sizes = [](std::uint32_t width, std::uint32_t height) {
-    const auto picture = heatMapOf(flatPicture(width, height, grey), {96, 0, 0, {}});
+    const auto picture = heatMapOf(flatPicture(width, height, plain), {96, 0, 0, {}});
     return std::max(picture.width, picture.height);
   };
   EXPECT_LE(sizes(9000, 96), 2200u);
@@ -88,7 +87,7 @@ TEST(HeatMap, StaysAReasonableSize) {
 }
 
 TEST(HeatMap, ExplainsItsColoursBelowThePhoto) {
-  const auto photo = flatPicture(900, 900, grey);
+  const auto photo = flatPicture(900, 900, plain);
   const auto picture = heatMapOf(photo, {450, 2, 2, {1, 2, 3, 4}});
   const double bottom = AnnotatedPhoto(photo, "", "").at(0, 900).y;
   bool blue = false, red = false;

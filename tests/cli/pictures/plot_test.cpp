@@ -4,7 +4,6 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
-#include <limits>
 
 #include "cli/pictures/tone_curve_plot.h"
 
@@ -16,7 +15,6 @@ using image_processing::RGBA8Pixel;
 using testing::ElementsAre;
 
 constexpr Colour red{1, 0, 0};
-constexpr double infinity = std::numeric_limits<double>::infinity();
 
 Plot plotOf(std::vector<PlotLine> lines, std::vector<PlotMark> marks = {}) {
   return {"Title", "subtitle", {"x", 0, 10}, {"y", 0, 10}, std::move(lines), std::move(marks)};
@@ -128,7 +126,7 @@ TEST(DrawPlot, InterruptsALineAtPointsThatAreNotFinite) {
   for (const bool filled : {false, true}) {
     const auto picture =
         drawPlot(plotOf({{"",
-                          {{NAN, 1}, {0, 5}, {4, 5}, {5, infinity}, {6, 5}, {10, 5}, {NAN, NAN}},
+                          {{NAN, 1}, {0, 5}, {4, 5}, {5, HUGE_VAL}, {6, 5}, {10, 5}, {NAN, NAN}},
                           red,
                           3,
                           false,

@@ -12,7 +12,7 @@ using image_processing::Image;
 using image_processing::RGBA8Pixel;
 using test_support::flatPicture;
 
-constexpr RGBA8Pixel red{255, 0, 0, 255}, blue{0, 0, 255, 255};
+constexpr RGBA8Pixel redPixel{255, 0, 0, 255}, bluePixel{0, 0, 255, 255};
 
 /// The bounding box of a colour; right and bottom exclusive.
 struct Box {
@@ -42,8 +42,8 @@ int inkIn(const Image<RGBA8Pixel>& picture, std::uint32_t top, std::uint32_t bot
 TEST(SheetPainter, ShowsEveryPictureWholeAndInItsColumn) {
   const SheetPainter painter({"Title", {"Original", "Auto"}, {{200, 150}, {320, 240}}});
   const auto band =
-      painter.row(0, "a.jpg", {flatPicture(200, 150, red), flatPicture(200, 150, blue)});
-  const Box first = boxOf(band, red), second = boxOf(band, blue);
+      painter.row(0, "a.jpg", {flatPicture(200, 150, redPixel), flatPicture(200, 150, bluePixel)});
+  const Box first = boxOf(band, redPixel), second = boxOf(band, bluePixel);
   EXPECT_EQ(first.right - first.left, 200u);
   EXPECT_EQ(first.bottom - first.top, 150u);
   EXPECT_EQ(second.right - second.left, 200u);
@@ -55,8 +55,8 @@ TEST(SheetPainter, ShowsEveryPictureWholeAndInItsColumn) {
 TEST(SheetPainter, WritesTheNameAboveAndTheLabelsBelow) {
   const SheetPainter painter({"", {"Original", "Auto"}, {{200, 150}}});
   const auto band =
-      painter.row(0, "a.jpg", {flatPicture(200, 150, red), flatPicture(200, 150, red)});
-  const Box pictures = boxOf(band, red);
+      painter.row(0, "a.jpg", {flatPicture(200, 150, redPixel), flatPicture(200, 150, redPixel)});
+  const Box pictures = boxOf(band, redPixel);
   EXPECT_GT(inkIn(band, 0, pictures.top), 30);
   EXPECT_GT(inkIn(band, pictures.bottom, band.height), 60);
 }
@@ -91,7 +91,7 @@ TEST(SheetPainter, SaysWhyAPhotoIsMissing) {
 
 TEST(SheetPainter, KeepsLongNamesOfAnyBytesInside) {
   const SheetPainter painter({std::string(3000, 'T'), {std::string(3000, '\xFF')}, {{1, 1}}});
-  const auto band = painter.row(0, std::string(3000, 'm'), {flatPicture(1, 1, red)});
+  const auto band = painter.row(0, std::string(3000, 'm'), {flatPicture(1, 1, redPixel)});
   for (const auto& picture : {band, painter.heading()}) {
     for (std::uint32_t y = 0; y < picture.height; ++y) {
       EXPECT_GT(picture.row(y)[0].g, 200);

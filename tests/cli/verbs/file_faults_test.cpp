@@ -15,10 +15,6 @@ namespace {
 using testing::HasSubstr;
 using testing::Not;
 
-std::string text(const Bytes& bytes) {
-  return {bytes.begin(), bytes.end()};
-}
-
 class FileFaults : public testing::Test {
  protected:
   void SetUp() override {
@@ -62,7 +58,7 @@ TEST_F(FileFaults, LeaveTheOldFileOrTheNewOneAndNothingElse) {
       EXPECT_EQ(folder.content(), content) << place;
       if (run.exitCode != 0) ++failed;
       // When none was left to go wrong.
-      if (text(folder.read("trace")).find("INJECTED") == std::string::npos) break;
+      if (textOf(folder.read("trace")).find("INJECTED") == std::string::npos) break;
     }
   }
   EXPECT_GT(failed, 10);
@@ -83,7 +79,7 @@ TEST_F(FileFaults, OfALongPhotoLeaveTheOldFileAndNothingElse) {
   const std::string command = "look winter -q long.jpg -o out.jpg --overwrite --quality 100";
   ASSERT_EQ(traced("-e trace=pwrite64,pread64", command).exitCode, 0);
   if (!folder.has("trace")) GTEST_SKIP() << "strace cannot trace here";
-  EXPECT_THAT(text(folder.read("trace")), HasSubstr("pwrite64("));
+  EXPECT_THAT(textOf(folder.read("trace")), HasSubstr("pwrite64("));
   folder.write("out.jpg", old);
   const auto content = folder.content();
   for (const std::string fault :
@@ -91,7 +87,7 @@ TEST_F(FileFaults, OfALongPhotoLeaveTheOldFileAndNothingElse) {
         "pwrite64:error=ENOSPC:when=1", "pwrite64:error=ENOSPC:when=9"}) {
     const std::string call = fault.substr(0, fault.find(':'));
     const Finished run = traced("-e trace=" + call + " -e inject=" + fault, command);
-    EXPECT_THAT(text(folder.read("trace")), HasSubstr("INJECTED")) << fault;
+    EXPECT_THAT(textOf(folder.read("trace")), HasSubstr("INJECTED")) << fault;
     EXPECT_EQ(run.exitCode, 1) << fault;
     EXPECT_THAT(run.errors, HasSubstr("long.jpg")) << fault;
     EXPECT_EQ(folder.read("out.jpg"), old) << fault;
@@ -110,7 +106,7 @@ TEST_F(FileFaults, OfADamagedSecondHalfComeBeforeAnythingIsWritten) {
       if (!folder.has("trace")) GTEST_SKIP() << "strace cannot trace here";
       EXPECT_EQ(run.exitCode, 1);
       EXPECT_THAT(run.errors, HasSubstr("cut.jpg"));
-      const std::string calls = text(folder.read("trace"));
+      const std::string calls = textOf(folder.read("trace"));
       EXPECT_THAT(calls, HasSubstr("cut.jpg"));
       EXPECT_THAT(calls, Not(HasSubstr("O_CREAT"))) << verb;
       EXPECT_THAT(calls, Not(HasSubstr("out.jpg"))) << verb;

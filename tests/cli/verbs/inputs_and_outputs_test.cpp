@@ -19,10 +19,6 @@ Finished enhance(std::vector<std::string> arguments, const Bytes& input = {}) {
   return quenby(arguments, input);
 }
 
-std::string text(const Bytes& bytes) {
-  return {bytes.begin(), bytes.end()};
-}
-
 TEST(Folders, AreTakenRecursivelyInSortedOrderWithPhotosOnly) {
   const TemporaryFolder folder;
   for (const char* name :
@@ -260,7 +256,7 @@ TEST(Outputs, ThatAreThereAlreadyStay) {
   const Finished run = enhance({in, "-o", out});
   EXPECT_EQ(run.exitCode, 3);
   EXPECT_THAT(run.errors, HasSubstr(out + ": exists already; add --overwrite"));
-  EXPECT_EQ(text(folder.read("b.jpg")), "old");
+  EXPECT_EQ(textOf(folder.read("b.jpg")), "old");
   EXPECT_EQ(enhance({in, "-o", out, "--overwrite"}).exitCode, 0);
   EXPECT_EQ(decoded(folder.read("b.jpg")).width, 48u);
 }
@@ -274,7 +270,7 @@ TEST(Outputs, ThatAreThereAlreadyDoNotStopTheOthers) {
   EXPECT_EQ(run.exitCode, 0);
   EXPECT_EQ(run.errors,
             "1 of 2 photos done, 0 failed, 1 there already; --overwrite replaces them\n");
-  EXPECT_EQ(text(folder.read("out/a_PassThrough.jpg")), "old");
+  EXPECT_EQ(textOf(folder.read("out/a_PassThrough.jpg")), "old");
   EXPECT_TRUE(folder.has("out/b_PassThrough.jpg"));
 }
 
@@ -374,7 +370,7 @@ TEST(Outputs, NeverTakeThePlaceOfAStandardStream) {
                              " --filter PassThrough <&- >&- 2>&-");
   if (!folder.has("trace")) GTEST_SKIP() << "strace cannot trace here";
   EXPECT_EQ(run.exitCode, 0);
-  const std::string calls = text(folder.read("trace"));
+  const std::string calls = textOf(folder.read("trace"));
   const std::size_t at = calls.find(".tmp\"");
   ASSERT_NE(at, std::string::npos) << calls;
   const std::string line = calls.substr(at, calls.find('\n', at) - at);

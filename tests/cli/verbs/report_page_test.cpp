@@ -31,10 +31,7 @@ class ReportPage : public testing::Test {
     more.insert(more.begin(), {"enhance", "-r", folder / "in"});
     return quenby(more);
   }
-  std::string page() const {
-    const Bytes bytes = folder.read("page.html");
-    return {bytes.begin(), bytes.end()};
-  }
+  std::string page() const { return textOf(folder.read("page.html")); }
 
   TemporaryFolder folder;
   const std::string path = folder / "page.html";

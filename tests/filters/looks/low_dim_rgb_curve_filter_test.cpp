@@ -12,22 +12,22 @@
 namespace pelorin::image_processing {
 namespace {
 
-struct Curves {
+struct LowDimCurves {
   std::vector<float> red, green, blue;
 
-  explicit Curves(const std::string& params) {
+  explicit LowDimCurves(const std::string& params) {
     LowDimRGBCurveFilter(nullptr).getRGBCurves(red, green, blue, params);
   }
-  friend bool operator==(const Curves&, const Curves&) = default;
+  friend bool operator==(const LowDimCurves&, const LowDimCurves&) = default;
 };
 
 TEST(LowDimRGBCurveFilter, StartsFromTheMeanWithoutParameters) {
-  const Curves curves("");
+  const LowDimCurves curves("");
   EXPECT_EQ(curves.red.front(), 0.05822621f * 255.0f);
   EXPECT_EQ(curves.red.back(), 0.955746f * 255.0f);
   EXPECT_EQ(curves.green.front(), 0.06365407f * 255.0f);
   EXPECT_EQ(curves.blue.back(), 0.9387872f * 255.0f);
-  EXPECT_EQ(curves, Curves("s1=0.5;s2=0.5;s3=0.5;s4=0.5;"));
+  EXPECT_EQ(curves, LowDimCurves("s1=0.5;s2=0.5;s3=0.5;s4=0.5;"));
 }
 
 TEST(LowDimRGBCurveFilter, IsMildButNotTheIdentityByDefault) {
@@ -39,7 +39,7 @@ TEST(LowDimRGBCurveFilter, IsMildButNotTheIdentityByDefault) {
 }
 
 TEST(LowDimRGBCurveFilter, HasElevenSamplesACurve) {
-  const Curves curves("s1=0.9;");
+  const LowDimCurves curves("s1=0.9;");
   EXPECT_EQ(curves.red.size(), 11u);
   EXPECT_EQ(curves.green.size(), 11u);
   EXPECT_EQ(curves.blue.size(), 11u);
@@ -47,15 +47,15 @@ TEST(LowDimRGBCurveFilter, HasElevenSamplesACurve) {
 }
 
 TEST(LowDimRGBCurveFilter, ClampsItsParameters) {
-  EXPECT_EQ(Curves("s1=1.5;"), Curves("s1=1;"));
-  EXPECT_EQ(Curves("s3=-7;"), Curves("s3=0;"));
-  EXPECT_EQ(Curves("s4=inf;"), Curves("s4=1;"));
-  EXPECT_FALSE(Curves("s1=1;") == Curves("s1=0;"));
+  EXPECT_EQ(LowDimCurves("s1=1.5;"), LowDimCurves("s1=1;"));
+  EXPECT_EQ(LowDimCurves("s3=-7;"), LowDimCurves("s3=0;"));
+  EXPECT_EQ(LowDimCurves("s4=inf;"), LowDimCurves("s4=1;"));
+  EXPECT_FALSE(LowDimCurves("s1=1;") == LowDimCurves("s1=0;"));
 }
 
 TEST(LowDimRGBCurveFilter, WeighsEveryComponentByItsParameter) {
   // One weight at a time, at a sample that no clamp and no running maximum touches.
-  const auto atFifth = [](const std::string& params) { return Curves(params).blue[5]; };
+  const auto atFifth = [](const std::string& params) { return LowDimCurves(params).blue[5]; };
   EXPECT_FLOAT_EQ(atFifth("s1=1;"), 255.0f * (0.46027565f * 0.3223142f + 0.5550708f));
   EXPECT_FLOAT_EQ(atFifth("s2=1;"), 255.0f * (0.40102503f * 0.01667022f + 0.5550708f));
   EXPECT_FLOAT_EQ(atFifth("s3=1;"), 255.0f * (0.307871f * 0.08742924f + 0.5550708f));
@@ -71,7 +71,7 @@ TEST(LowDimRGBCurveFilter, HoldsACurveLevelWhereItWouldFall) {
     for (int i = 0; i < 4; ++i) {
       params += keys[i] + ((corner >> i & 1) != 0 ? "=1;" : "=0;");
     }
-    const Curves curves(params);
+    const LowDimCurves curves(params);
     for (const std::vector<float>* curve : {&curves.red, &curves.green, &curves.blue}) {
       EXPECT_GE(curve->front(), 0.0f) << params;
       EXPECT_LE(curve->back(), 255.0f) << params;
@@ -89,8 +89,8 @@ TEST(LowDimRGBCurveFilter, HasItsGoldenCurvesAllOverTheParameters) {
   std::vector<float> all;
   for (int n = 0; n < 625; ++n) {
     static constexpr const char* values[] = {"0;", "0.25;", "0.5;", "0.75;", "1;"};
-    const Curves curves(std::string("s1=") + values[n % 5] + "s2=" + values[n / 5 % 5] +
-                        "s3=" + values[n / 25 % 5] + "s4=" + values[n / 125]);
+    const LowDimCurves curves(std::string("s1=") + values[n % 5] + "s2=" + values[n / 5 % 5] +
+                              "s3=" + values[n / 25 % 5] + "s4=" + values[n / 125]);
     for (const std::vector<float>* curve : {&curves.red, &curves.green, &curves.blue}) {
       all.insert(all.end(), curve->begin(), curve->end());
     }
@@ -99,10 +99,10 @@ TEST(LowDimRGBCurveFilter, HasItsGoldenCurvesAllOverTheParameters) {
 }
 
 TEST(LowDimRGBCurveFilter, TakesTheLastOfSeveralItemsWithOneKeyAndDropsTheTail) {
-  EXPECT_EQ(Curves("s1=0.2;s1=0.7;"), Curves("s1=0.7;"));
-  EXPECT_EQ(Curves("s1=0.2;s1=0.7"), Curves("s1=0.2;"));
-  EXPECT_EQ(Curves(" s1=0.2;"), Curves(""));
-  EXPECT_EQ(Curves("s1=abc;"), Curves("s1=0;"));
+  EXPECT_EQ(LowDimCurves("s1=0.2;s1=0.7;"), LowDimCurves("s1=0.7;"));
+  EXPECT_EQ(LowDimCurves("s1=0.2;s1=0.7"), LowDimCurves("s1=0.2;"));
+  EXPECT_EQ(LowDimCurves(" s1=0.2;"), LowDimCurves(""));
+  EXPECT_EQ(LowDimCurves("s1=abc;"), LowDimCurves("s1=0;"));
 }
 
 TEST(LowDimRGBCurveFilter, DrawsANaNParameterAsBlack) {

@@ -2,14 +2,15 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <string_view>
 
+#include "tests/support/bytes.h"
 #include "tests/support/jpeg_files.h"
 
 namespace pelorin::photo {
 namespace {
 
 using test_support::Bytes;
+using test_support::bytesOf;
 using test_support::findSegment;
 using test_support::jpegErrorOf;
 using test_support::photoLikePicture;
@@ -21,14 +22,10 @@ Bytes encodedPhoto(int quality, std::span<const MetadataSegment> metadata = {}) 
   return encodeJpeg(&picture.data.get()->r, width, height, quality, metadata);
 }
 
-double errorOf(const Bytes& file) {
+double meanErrorOf(const Bytes& file) {
   const auto picture = photoLikePicture(width, height, /*seed=*/9);
   return test_support::meanDifference(&picture.data.get()->r, decodeJpeg(file).pixels.get(),
                                       picture.pixelCount());
-}
-
-Bytes bytesOf(std::string_view text) {
-  return {text.begin(), text.end()};
 }
 
 TEST(EncodeJpeg, IsReadBackAsNearlyTheSamePicture) {
@@ -38,14 +35,14 @@ TEST(EncodeJpeg, IsReadBackAsNearlyTheSamePicture) {
   EXPECT_EQ(header.height, height);
   EXPECT_EQ(header.components, 3);
   EXPECT_FALSE(header.coding.progressive);
-  EXPECT_LT(errorOf(file), 8.0);
+  EXPECT_LT(meanErrorOf(file), 8.0);
 }
 
 TEST(EncodeJpeg, GetsCloserAndLargerWithQuality) {
   EXPECT_LT(encodedPhoto(20).size(), encodedPhoto(60).size());
   EXPECT_LT(encodedPhoto(60).size(), encodedPhoto(95).size());
-  EXPECT_GT(errorOf(encodedPhoto(20)), errorOf(encodedPhoto(60)));
-  EXPECT_GT(errorOf(encodedPhoto(60)), errorOf(encodedPhoto(95)));
+  EXPECT_GT(meanErrorOf(encodedPhoto(20)), meanErrorOf(encodedPhoto(60)));
+  EXPECT_GT(meanErrorOf(encodedPhoto(60)), meanErrorOf(encodedPhoto(95)));
 }
 
 TEST(EncodeJpeg, TakesAQualityOutsideItsRangeAsTheNearerEnd) {

@@ -2,21 +2,18 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <string_view>
 
+#include "tests/support/bytes.h"
 #include "tests/support/jpeg_files.h"
 
 namespace pelorin::photo {
 namespace {
 
 using test_support::Bytes;
+using test_support::bytesOf;
 using test_support::findSegment;
 using test_support::jpegErrorOf;
 using test_support::makeJpeg;
-
-Bytes bytesOf(std::string_view text) {
-  return {text.begin(), text.end()};
-}
 
 TEST(JpegHeader, TellsSizeChannelsAndProgression) {
   const JpegHeader colour = readJpegHeader(makeJpeg({.width = 33, .height = 17}));

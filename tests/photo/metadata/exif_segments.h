@@ -5,9 +5,9 @@
 #include <string>
 #include <vector>
 
-namespace pelorin::test_support {
+#include "tests/support/bytes.h"
 
-using Bytes = std::vector<std::uint8_t>;
+namespace pelorin::test_support {
 
 /// What an Exif segment of a camera holds here.
 struct CameraExif {

@@ -32,7 +32,7 @@ struct Result {
 };
 
 // An error must be one of photo's, which say what is wrong.
-Result rewritten(const Bytes& file, std::string_view format = "JPEG") {
+Result outcomeOf(const Bytes& file, std::string_view format = "JPEG") {
   Result result;
   try {
     const Photo photo = open(file);
@@ -67,7 +67,7 @@ TEST(HostileMetadata, CutAtEveryByteIsAnErrorOrAPicture) {
   std::size_t opened = 0;
   for (std::size_t size = 0; size < whole.size(); ++size)
     opened +=
-        rewritten(Bytes(whole.begin(), whole.begin() + static_cast<std::ptrdiff_t>(size))).opened;
+        outcomeOf(Bytes(whole.begin(), whole.begin() + static_cast<std::ptrdiff_t>(size))).opened;
   EXPECT_EQ(opened, test_support::video().size());  // of the picture nothing may miss
 }
 
@@ -84,7 +84,7 @@ TEST(HostileMetadata, EverySegmentCutAtEveryByteCostsNoPicture) {
       for (const int marker : {0xE0, 0xE1, 0xE2, 0xED}) {
         const Bytes file =
             withSegments({{static_cast<std::uint8_t>(marker), bytesOf(part.substr(0, size))}});
-        EXPECT_TRUE(rewritten(file).opened);
+        EXPECT_TRUE(outcomeOf(file).opened);
       }
     }
   }
@@ -119,7 +119,7 @@ TEST(HostileMetadata, OffsetsBeyondTheEndAndLoopsLeadNowhere) {
     Bytes index = writeMpf(std::vector<MpfEntry>{{mpfPrimary, place, place}, {0, place, place}});
     for (std::size_t at = 8; at < 12; ++at)  // the directory itself lies there
       index[at] = static_cast<std::uint8_t>(place >> 8 * (11 - at));
-    EXPECT_TRUE(rewritten(withSegments({{0xE2, index}})).opened);
+    EXPECT_TRUE(outcomeOf(withSegments({{0xE2, index}})).opened);
   }
 }
 
@@ -132,7 +132,7 @@ TEST(HostileMetadata, BombsOfEntitiesAreNotUnfolded) {
     bomb += "'>";
   }
   bomb += "]>" + xmpPacket("<rdf:Description my:Thing='&y;'/>");
-  const Result result = rewritten(withSegments({xmpSegment(bomb)}));
+  const Result result = outcomeOf(withSegments({xmpSegment(bomb)}));
   EXPECT_EQ(result.lost, (std::vector<Loss>{{"XMP", "declares a document type"}}));
 }
 
@@ -179,14 +179,14 @@ TEST(HostileMetadata, OfSixtyFiveThousandSegmentsIsReadOrRefused) {
     Bytes file(picture.begin(), picture.begin() + 2);
     for (int i = 0; i < 65'535; ++i) file.insert(file.end(), segment.begin(), segment.end());
     file.insert(file.end(), picture.begin() + 2, picture.end());
-    EXPECT_FALSE(rewritten(file).opened);
+    EXPECT_FALSE(outcomeOf(file).opened);
     EXPECT_THROW(readJpegHeader(file), PhotoError);
   }
 }
 
 TEST(HostileMetadata, OfFourThousandSegmentsIsKept) {
   std::vector<MetadataSegment> segments(4000, {0xE1, bytesOf("x")});
-  const Result result = rewritten(jpegWith(photoLikePicture(8, 8, 1), segments));
+  const Result result = outcomeOf(jpegWith(photoLikePicture(8, 8, 1), segments));
   EXPECT_TRUE(result.opened);
   EXPECT_TRUE(result.lost.empty());
 }
@@ -197,7 +197,7 @@ TEST(HostileMetadata, OfSegmentsBehindThePictureDataIsLeftThere) {
   file.resize(file.size() - 2);  // the end mark
   for (int i = 0; i < 65'535; ++i) file.insert(file.end(), segment.begin(), segment.end());
   file.insert(file.end(), {0xFF, 0xD9});
-  EXPECT_TRUE(rewritten(file).opened);
+  EXPECT_TRUE(outcomeOf(file).opened);
 }
 
 }  // namespace

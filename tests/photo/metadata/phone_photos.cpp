@@ -34,10 +34,6 @@ const std::string container =
 
 }  // namespace
 
-Bytes bytesOf(const std::string& text) {
-  return {text.begin(), text.end()};
-}
-
 Bytes jpegWith(const Image<RGBA8Pixel>& picture, const std::vector<MetadataSegment>& segments) {
   return photo::encodeJpeg(reinterpret_cast<const std::uint8_t*>(picture.data.get()), picture.width,
                            picture.height, 90, segments);

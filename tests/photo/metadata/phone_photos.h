@@ -10,7 +10,6 @@
 
 namespace pelorin::test_support {
 
-Bytes bytesOf(const std::string& text);
 Bytes joined(std::initializer_list<Bytes> parts);
 
 /// A picture as a JPEG file with these segments.

@@ -15,7 +15,7 @@ using namespace std::string_literals;
 using test_support::xmpPacket;
 using Segments = std::vector<MetadataSegment>;
 
-constexpr XmpName orientation = {"http://ns.adobe.com/tiff/1.0/", "Orientation"};
+constexpr XmpName orientationName = {"http://ns.adobe.com/tiff/1.0/", "Orientation"};
 constexpr XmpName thing = {"urn:something:unknown", "Thing"};
 const std::string packetMark = "http://ns.adobe.com/xap/1.0/\0"s;
 const std::string extensionMark = "http://ns.adobe.com/xmp/extension/\0"s;
@@ -54,7 +54,7 @@ Segments withExtension(const std::string& extension, std::size_t partSize) {
 }
 
 void makeUpright(XmpPacket& packet) {
-  for (XmpProperty& property : packet.properties(orientation)) property.setText("1");
+  for (XmpProperty& property : packet.properties(orientationName)) property.setText("1");
 }
 
 // The values of a property in the packets as another reader would find them.
@@ -83,7 +83,7 @@ TEST(XmpSegments, AreEditedInPlaceAmongOthers) {
   ASSERT_EQ(segments.size(), 3u);
   EXPECT_EQ(segments[0].payload, before[0].payload);
   EXPECT_EQ(segments[2].payload, before[2].payload);
-  EXPECT_EQ(valuesIn(segments, orientation), std::vector<std::string>{"1"});
+  EXPECT_EQ(valuesIn(segments, orientationName), std::vector<std::string>{"1"});
   EXPECT_TRUE(lost.empty());
 }
 
@@ -106,7 +106,7 @@ TEST(XmpSegments, OfAnEditedExtensionTakeItsNewNameAndLength) {
   std::vector<Loss> lost;
   editXmp(segments, makeUpright, lost);
   EXPECT_TRUE(lost.empty());
-  EXPECT_EQ(valuesIn(segments, orientation), (std::vector<std::string>{"1", "1"}));
+  EXPECT_EQ(valuesIn(segments, orientationName), (std::vector<std::string>{"1", "1"}));
   std::string joined;
   for (std::size_t i = 1; i < segments.size(); ++i) {
     const std::string payload(segments[i].payload.begin(), segments[i].payload.end());
@@ -126,7 +126,7 @@ TEST(XmpSegments, ThatGrowMoveTheirLargestPropertyToAnExtension) {
   editXmp(
       segments,
       [](XmpPacket& packet) {
-        if (packet.property(orientation))
+        if (packet.property(orientationName))
           packet.add({"urn:n", "Note"}, "n", std::string(4000, 'n'));
       },
       lost);

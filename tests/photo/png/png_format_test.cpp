@@ -10,6 +10,7 @@
 #include <string>
 
 #include "photo/photo.h"
+#include "tests/support/bytes.h"
 #include "tests/support/pictures.h"
 
 namespace pelorin::photo {
@@ -17,8 +18,9 @@ namespace {
 
 using image_processing::Image;
 using image_processing::RGBA8Pixel;
+using test_support::Bytes;
+using test_support::bytesOf;
 using testing::HasSubstr;
-using Bytes = std::vector<std::uint8_t>;
 
 struct Recipe {
   int colourType = PNG_COLOR_TYPE_RGB;
@@ -78,10 +80,6 @@ Bytes makePng(const Recipe& recipe) {
   png_write_end(png, nullptr);
   png_destroy_write_struct(&png, &info);
   return file;
-}
-
-Bytes bytesOf(std::string_view text) {
-  return {text.begin(), text.end()};
 }
 
 // A TIFF file of one directory that states an orientation.
