@@ -135,6 +135,24 @@ def test_photos_and_facts_are_pickled(photo):
         assert pickle.loads(pickle.dumps(result)) == result
 
 
+def test_what_is_found_out_is_pickled(photo):
+    def again(result):
+        return pickle.loads(pickle.dumps(result))
+
+    niqe, keypoints = quenby.niqe(photo), quenby.brief(photo)
+    assert float(again(niqe)) == float(niqe)
+    assert np.array_equal(again(niqe).features, niqe.features)
+    assert np.array_equal(again(niqe).blocks, niqe.blocks)
+    assert np.array_equal(again(keypoints).positions, keypoints.positions)
+    assert np.array_equal(again(keypoints).descriptors, keypoints.descriptors)
+    pair = quenby.Pair("a", "b", 3.5, 0.001, None, True)
+    group = quenby.Group(("a", "b"), (pair,))
+    found = quenby.Duplicates((group,), (), {"c": quenby.PhotoError("no photo", "not a photo")})
+    assert again(found).groups == found.groups
+    error = again(found).failed["c"]
+    assert (type(error), str(error), error.kind) == (quenby.PhotoError, "no photo", "not a photo")
+
+
 def test_the_example_makes_its_pictures(photo, tmp_path):
     example = pathlib.Path(__file__).parents[3] / "bindings/python/examples/one_photo.py"
     python = shlex.split(os.environ.get("QUENBY_PYTHON", sys.executable))  # an emulator and its Python
