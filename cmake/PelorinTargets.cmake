@@ -218,7 +218,7 @@ endfunction()
 
 # What is linked in is nobody else's: two copies in one process must not mix. The C++ library is not
 # among it, since exceptions cross from one of the libraries into another.
-set(PELORIN_LINKED_IN fmt hwy jpeg lcms2 png16 pugixml z)
+set(PELORIN_LINKED_IN hwy jpeg lcms2 png16 pugixml z)
 function(pelorin_hold_everything target)
   if(NOT ANDROID)
     target_sources(${target} PRIVATE $<TARGET_OBJECTS:pelorin_older_glibc>)

@@ -1,10 +1,9 @@
 #include "photo/faces.h"
 
-#include <fmt/format.h>
-
 #include <memory>
 
 #include "image_processing/core/face_fractions.h"
+#include "image_processing/core/number_text.h"
 #include "photo/photo_error.h"
 
 namespace pelorin::photo {
@@ -40,9 +39,11 @@ image_processing::ImageMetadata metadataWithFaces(const std::vector<Face>& faces
     const BoundingBox box = boxOf(face, width, height, scale);
     if (face.inPixels && (box.left >= static_cast<std::int64_t>(width) ||
                           box.top >= static_cast<std::int64_t>(height))) {
+      using image_processing::roundedText;
       throw PhotoError(PhotoError::Kind::invalidRequest,
-                       fmt::format("the face {},{},{},{} lies outside the picture", face.left,
-                                   face.top, face.right, face.bottom));
+                       "the face " + roundedText(face.left, 7) + "," + roundedText(face.top, 7) +
+                           "," + roundedText(face.right, 7) + "," + roundedText(face.bottom, 7) +
+                           " lies outside the picture");
     }
     metadata.faces.push_back(std::make_shared<BoundingBox>(box));
   }

@@ -1,7 +1,5 @@
 #include "photo/filter_photo.h"
 
-#include <fmt/format.h>
-
 #include <algorithm>
 #include <cmath>
 #include <memory>
@@ -9,6 +7,7 @@
 #include <stdexcept>
 #include <utility>
 
+#include "image_processing/core/number_text.h"
 #include "image_processing/core/parameter_strings.h"
 #include "image_processing/core/stages.h"
 #include "image_processing/filters/default_filter_factory.h"
@@ -29,7 +28,7 @@ namespace {
 // A number as one front end writes it is the same in another: 1, 1.0 and 1.0E0.
 std::string shortest(const std::string& value) {
   const std::optional<double> number = wholeNumber(value);
-  return number ? fmt::format("{}", *number) : value;
+  return number ? shortestText(*number) : value;
 }
 
 void checkRequest(const FilterRequest& request) {

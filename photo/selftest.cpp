@@ -1,13 +1,13 @@
 #include "photo/selftest.h"
 
-#include <fmt/format.h>
-
 #include <algorithm>
+#include <charconv>
 #include <cstdint>
 #include <memory>
 #include <string_view>
 #include <vector>
 
+#include "image_processing/core/number_text.h"
 #include "image_processing/dupe/green_cdf.h"
 #include "image_processing/features/brief.h"
 #include "image_processing/filters/default_filter_factory.h"
@@ -27,12 +27,18 @@ struct Sample {
   std::shared_ptr<Picture> picture;
 };
 
+std::string hexadecimal(std::uint64_t value) {
+  char text[16];
+  return {text, std::to_chars(text, text + sizeof text, value, 16).ptr};
+}
+
 // FNV-1a in 64 bits.
 std::string hashOf(const void* bytes, std::size_t count) {
   const auto* const byte = static_cast<const unsigned char*>(bytes);
   std::uint64_t hash = 0xCBF29CE484222325u;
   for (std::size_t i = 0; i < count; ++i) hash = (hash ^ byte[i]) * 0x100000001B3u;
-  return fmt::format("{:016x}", hash);
+  const std::string text = hexadecimal(hash);
+  return std::string(16 - text.size(), '0') + text;
 }
 
 std::string hashOf(const Picture& picture) {
@@ -59,7 +65,7 @@ Sample sample(std::uint32_t width, std::uint32_t height) {
                             byte(255 - static_cast<int>(x % 7))};
     }
   }
-  return {fmt::format("{}x{}", width, height), picture};
+  return {std::to_string(width) + "x" + std::to_string(height), picture};
 }
 
 std::vector<std::string> parametersFor(const FilterDescription& filter) {
@@ -79,10 +85,17 @@ class Table {
  public:
   void add(std::string_view what, std::string_view parameters, std::string_view picture,
            std::string_view hash) {
-    text += fmt::format("{:<14} {:<42} {:<12} {}\n", what, parameters.empty() ? "-" : parameters,
-                        picture, hash);
+    addColumn(what, 14);
+    addColumn(parameters.empty() ? "-" : parameters, 42);
+    addColumn(picture, 12);
+    text.append(hash) += '\n';
   }
   std::string text;
+
+ private:
+  void addColumn(std::string_view words, std::size_t width) {
+    text.append(words).append(std::max(width, words.size()) - words.size() + 1, ' ');
+  }
 };
 
 void addFilters(Table& table, Sample from) {
@@ -109,7 +122,7 @@ void addMeasures(Table& table, const Sample& from) {
   table.add("green CDF", "", from.name, hashOf(cdf.data(), sizeof(cdf)));
   const NiqeAnalysis niqe = analyzeNiqe(*from.picture);
   if (!niqe.meanFeatures.empty()) {
-    table.add("NIQE", fmt::format("{:.6g}", niqe.score), from.name,
+    table.add("NIQE", roundedText(niqe.score, 6), from.name,
               hashOf(niqe.meanFeatures.data(), niqe.meanFeatures.size() * sizeof(float)));
   }
   Image<unsigned char> grey(from.picture->width, from.picture->height);
@@ -118,8 +131,8 @@ void addMeasures(Table& table, const Sample& from) {
   }
   std::string descriptors;
   for (const BriefDescriptor& found : computeBriefDescriptors(grey, 20)) {
-    descriptors += fmt::format("{} {}", found.center.x, found.center.y);
-    for (const std::uint32_t word : found.descriptor) descriptors += fmt::format(" {:x}", word);
+    descriptors += std::to_string(found.center.x) + " " + std::to_string(found.center.y);
+    for (const std::uint32_t word : found.descriptor) descriptors += " " + hexadecimal(word);
   }
   table.add("keypoints", "20", from.name, hashOf(descriptors.data(), descriptors.size()));
 }
@@ -129,7 +142,7 @@ void addCodec(Table& table, const Sample& from) {
     SaveOptions options;
     options.quality = quality;
     const std::vector<std::uint8_t> file = save(*from.picture, "JPEG", {}, options);
-    const std::string parameters = fmt::format("quality {}", quality);
+    const std::string parameters = "quality " + std::to_string(quality);
     table.add("JPEG coded", parameters, from.name, hashOf(file.data(), file.size()));
     table.add("JPEG decoded", parameters, from.name, hashOf(*open(file).image));
     table.add("JPEG halved", parameters, from.name, hashOf(*open(file, {.scale = 2}).image));

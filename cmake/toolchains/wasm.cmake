@@ -8,17 +8,15 @@ foreach(type SIZE_T UNSIGNED_LONG)
   set(HAVE_${type} TRUE CACHE INTERNAL "")
 endforeach()
 
-# What that C++ library lacks of C++20 stands in `wasm/`. fmt without a separator of thousands goes without
-# that library's locales, too, which are a tenth of a module.
+# What that C++ library lacks of C++20 stands in `wasm/`. Names of types, which are a tenth of a module's
+# data, are asked for by nobody.
 set(lacking ${CMAKE_CURRENT_LIST_DIR}/wasm)
-set(CMAKE_CXX_FLAGS_INIT "-fwasm-exceptions -isystem ${lacking}/include -include ${lacking}/cxx20.h")
-string(APPEND CMAKE_CXX_FLAGS_INIT
-       " -DFMT_STATIC_THOUSANDS_SEPARATOR=44 -DFMT_USE_INT128=0 -DFMT_USE_LONG_DOUBLE=0")
+set(CMAKE_CXX_FLAGS_INIT "-fwasm-exceptions -fno-rtti -isystem ${lacking}/include -include ${lacking}/cxx20.h")
 
 # A module is loaded over a network: all is made small but kernels (pelorin_library) and libjpeg, whose count
 # of bits is a table of 64 KiB, twice, otherwise.
 set(CMAKE_C_FLAGS_INIT "-DUSE_CLZ_INTRINSIC")
-set(CMAKE_C_FLAGS_RELEASE "-Os -DNDEBUG" CACHE STRING "")
+set(CMAKE_C_FLAGS_RELEASE "-Oz -DNDEBUG" CACHE STRING "")
 set(CMAKE_CXX_FLAGS_RELEASE "-Oz -DNDEBUG" CACHE STRING "")
 set(CMAKE_POSITION_INDEPENDENT_CODE OFF) # a table look-up for every address, and for nothing
 set(CMAKE_CROSSCOMPILING_EMULATOR node)

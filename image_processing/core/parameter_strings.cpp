@@ -93,7 +93,7 @@ float FilterParams::readFloat(const std::string& key) const {
   // Leading white space, hexadecimal digits and numbers too large for a float are no numbers here.
   const bool isNumber = isWhole && text.find_first_of(" \t\n\v\f\rxX") == std::string::npos &&
                         !(std::isinf(value) && hasDigits);
-  if (!isNumber) throw boost::bad_lexical_cast(typeid(std::string), typeid(float));
+  if (!isNumber) throw boost::bad_lexical_cast();
   return value;
 }
 

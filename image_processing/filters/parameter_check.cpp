@@ -1,10 +1,10 @@
 #include "image_processing/filters/parameter_check.h"
 
 #include <boost/lexical_cast/bad_lexical_cast.hpp>
-#include <charconv>
 #include <cmath>
 #include <utility>
 
+#include "image_processing/core/number_text.h"
 #include "image_processing/core/parameter_strings.h"
 
 namespace pelorin::image_processing {
@@ -13,9 +13,7 @@ namespace {
 using Kind = ParameterFault::Kind;
 
 std::string textOfNumber(double value) {
-  char text[32];
-  const auto end = std::to_chars(text, text + sizeof text, value, std::chars_format::general, 6);
-  return {text, end.ptr};
+  return roundedText(value, 6);
 }
 
 std::string quoted(const std::string& text) {

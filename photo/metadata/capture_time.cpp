@@ -1,13 +1,12 @@
 #include "photo/metadata/capture_time.h"
 
-#include <fmt/format.h>
-
 #include <algorithm>
 #include <array>
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
 
+#include "image_processing/core/number_text.h"
 #include "image_processing/core/parameter_strings.h"
 #include "photo/metadata/exif_orientation.h"
 #include "photo/metadata/segments.h"
@@ -69,8 +68,9 @@ std::optional<CaptureTime> readTime(const std::string& text, const std::string& 
   CaptureTime time;
   time.seconds =
       static_cast<double>(std::chrono::seconds(days).count()) + hour * 3600 + minute * 60 + second;
-  time.text =
-      fmt::format("{:04}-{:02}-{:02}T{:02}:{:02}:{:02}", year, month, day, hour, minute, second);
+  const auto two = [](int value) { return image_processing::paddedText(value, 2); };
+  time.text = image_processing::paddedText(year, 4) + "-" + two(month) + "-" + two(day) + "T" +
+              two(hour) + ":" + two(minute) + ":" + two(second);
   const auto isDigit = [](char letter) { return letter >= '0' && letter <= '9'; };
   if (!fraction.empty() && std::all_of(fraction.begin(), fraction.end(), isDigit)) {
     time.seconds += image_processing::readNumber("0." + fraction);

@@ -1,7 +1,5 @@
 #include "photo/metadata/xmp_regions.h"
 
-#include <fmt/format.h>
-
 #include <algorithm>
 #include <array>
 #include <cmath>
@@ -9,6 +7,7 @@
 #include <optional>
 #include <utility>
 
+#include "image_processing/core/number_text.h"
 #include "image_processing/core/parameter_strings.h"
 
 namespace pelorin::photo {
@@ -57,7 +56,7 @@ std::optional<double> numberOf(const std::string& text) {
 
 // Nine digits: what one minus a fraction of six looks like to a reader.
 std::string textOf(double value) {
-  return fmt::format("{:.9g}", value);
+  return image_processing::roundedText(value, 9);
 }
 
 // A number beside its property, where the property is one.
@@ -296,9 +295,9 @@ void turnMicrosoft(const XmpPacket& packet, const PictureChange& change) {
     const std::optional<Area> was = readRectangle(rectangle.text());
     if (!was) continue;
     const Area area = turned(*was, frame->turn);
-    rectangle.setText(fmt::format("{}, {}, {}, {}", textOf(area.centre.x - area.width / 2),
-                                  textOf(area.centre.y - area.height / 2), textOf(area.width),
-                                  textOf(area.height)));
+    rectangle.setText(textOf(area.centre.x - area.width / 2) + ", " +
+                      textOf(area.centre.y - area.height / 2) + ", " + textOf(area.width) + ", " +
+                      textOf(area.height));
   }
 }
 

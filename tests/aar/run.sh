@@ -24,7 +24,7 @@ ndk=()
 [[ $aar == *-glibc.aar ]] || ndk=(libc++_shared.so)
 {
   printf '%s\n' AndroidManifest.xml R.txt classes.jar proguard.txt
-  printf 'META-INF/licences/%s.txt\n' fmt highway lcms2 libjpeg-turbo libjpeg-turbo-ijg libpng pugixml zlib
+  printf 'META-INF/licences/%s.txt\n' highway lcms2 libjpeg-turbo libjpeg-turbo-ijg libpng pugixml zlib
   for abi in arm64-v8a armeabi-v7a x86_64; do
     printf "jni/$abi/%s\n" libpn.so libpnjni.so libpn_imgproc.so libpn_quenby.so libquenby_photo.so "${ndk[@]}"
   done

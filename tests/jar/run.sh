@@ -38,7 +38,7 @@ for machine in "${!machines[@]}"; do
 done
 
 step "licences, module names, sources, documentation"
-for licence in fmt highway lcms2 libjpeg-turbo libjpeg-turbo-ijg libpng pugixml zlib; do
+for licence in highway lcms2 libjpeg-turbo libjpeg-turbo-ijg libpng pugixml zlib; do
   [ -s "$scratch/unpacked/META-INF/licences/$licence.txt" ] || fail "no licence of $licence"
 done
 for file in "$jar" "$desktop"; do

@@ -23,8 +23,8 @@ function command(...args) {
   return new Uint8Array(readFileSync(out));
 }
 
-test("there are twenty photos, and this machine has vectors", () => {
-  assert.equal(twenty.length, 20);
+test("there are twenty photos and more, and this machine has vectors", () => {
+  assert.ok(twenty.length >= 20);
   assert.equal(bestBuild(), "simd");
 });
 

@@ -8,6 +8,7 @@
 #include "tests/photo/metadata/xmp_texts.h"
 #include "tests/support/exif_payload.h"
 #include "tests/support/jpeg_files.h"
+#include "tests/support/print_profile.h"
 
 using namespace pelorin;
 using namespace pelorin::test_support;
@@ -73,6 +74,11 @@ int main(int, char** argv) {
   write("twenty/grey.jpg", makeJpeg(recipe(JCS_GRAYSCALE, JCS_GRAYSCALE)));
   write("twenty/cmyk.jpg", makeJpeg(recipe(JCS_CMYK, JCS_CMYK)));
   write("twenty/ycck.jpg", makeJpeg(recipe(JCS_CMYK, JCS_YCCK)));
+  for (const double version : {2.1, 4.2}) {
+    JpegRecipe printed = recipe(JCS_CMYK, JCS_YCCK);
+    printed.profile = profileOfSwappedInks(version);
+    write("twenty/profile" + std::to_string(static_cast<int>(version)) + ".jpg", makeJpeg(printed));
+  }
   const auto portrait = photoLikePicture(640, 480, 8);
   write("twenty/faces.jpg", jpegOf(portrait, {taken(1), xmpSegment(xmpPacket(faces))}));
   write("twenty/phone.jpg", phonePhoto(6, joined({gainMap(), video()})));

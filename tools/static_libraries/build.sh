@@ -13,7 +13,7 @@ name=$1
 shift
 prefix=$root/build/static/$name
 sources=$root/build/static/sources
-packages=(fmtlib highway lcms2 libjpeg-turbo libpng1.6 pugixml zlib)
+packages=(highway lcms2 libjpeg-turbo libpng1.6 pugixml zlib)
 
 # The checksums are those of the authors' archives as Debian has them; its patches, which change with
 # its security updates, are covered by its signatures.
@@ -93,14 +93,18 @@ mkdir -p "$prefix/source" "$prefix/share/licences"
 for package in "${packages[@]}"; do
   dpkg-source --no-check -x "$sources/$package"_*.dsc "$prefix/source/$package"
 done
-# All at once: configuring, which is half of it, takes one core.
-together=()
-library fmtlib "$prefix/source/fmtlib" -DFMT_TEST=OFF -DFMT_DOC=OFF &
-together+=($!)
 # What comes over a network has no more than is called.
 jpeg=() png=()
-[ "$name" != wasm ] || jpeg=(-DWITH_ARITH_ENC=OFF -DCMAKE_C_FLAGS_RELEASE="-O3 -DNDEBUG")
-[ "$name" != wasm ] || png=(-DDFA_XTRA="$here/png_for_browsers.dfa")
+if [ "$name" = wasm ]; then
+  "$here/for_browsers.sh" "$prefix/source"
+  jpeg=(-DWITH_ARITH_ENC=OFF -DCMAKE_C_FLAGS_RELEASE=-DNDEBUG
+    -DCMAKE_PROJECT_libjpeg-turbo_INCLUDE="$here/jpeg_for_browsers.cmake")
+  png=(-DDFA_XTRA="$here/png_for_browsers.dfa")
+  # Tables are computed, and profiles have no numbers of 16 bits with a point.
+  CFLAGS+=" -DDYNAMIC_CRC_TABLE -DCMS_NO_HALF_SUPPORT"
+fi
+# All at once: configuring, which is half of it, takes one core.
+together=()
 # Highway's library chooses among instruction sets; other machines than this take its headers and one.
 [[ $* == *-DCMAKE_TOOLCHAIN_FILE=* ]] ||
   library highway "$prefix/source/highway" -DBUILD_SHARED_LIBS=OFF -DHWY_ENABLE_CONTRIB=OFF \
@@ -121,7 +125,6 @@ together+=($!)
 failed=0
 for job in "${together[@]}"; do wait "$job" || failed=1; done
 [ $failed -eq 0 ]
-cp "$prefix/source/fmtlib/LICENSE.rst" "$prefix/share/licences/fmt.txt"
 cp "$prefix/source/highway/LICENSE" "$prefix/share/licences/highway.txt"
 cp "$prefix/source/libjpeg-turbo/LICENSE.md" "$prefix/share/licences/libjpeg-turbo.txt"
 cp "$prefix/source/libjpeg-turbo/README.ijg" "$prefix/share/licences/libjpeg-turbo-ijg.txt"

@@ -2,6 +2,7 @@
 #include <lcms2.h>
 
 #include "tests/support/jpeg_files.h"
+#include "tests/support/print_profile.h"
 
 namespace pelorin::photo {
 namespace {
@@ -9,6 +10,7 @@ namespace {
 using test_support::Bytes;
 using test_support::JpegRecipe;
 using test_support::makeJpeg;
+using test_support::profileOfSwappedInks;
 
 struct Colour {
   int r, g, b;
@@ -31,44 +33,6 @@ void expectNear(const Colour& actual, const Colour& expected, int tolerance) {
   EXPECT_NEAR(actual.r, expected.r, tolerance);
   EXPECT_NEAR(actual.g, expected.g, tolerance);
   EXPECT_NEAR(actual.b, expected.b, tolerance);
-}
-
-// A print profile for inks that nobody sells, so that only the profile explains the colour: every
-// ink darkens, but what is called cyan takes blue away, magenta green and yellow red.
-Bytes profileOfSwappedInks() {
-  const cmsHPROFILE srgb = cmsCreate_sRGBProfile(), lab = cmsCreateLab4Profile(nullptr);
-  const cmsHTRANSFORM toLab =
-      cmsCreateTransform(srgb, TYPE_RGB_16, lab, TYPE_Lab_16, INTENT_RELATIVE_COLORIMETRIC, 0);
-  const auto labOfInks = [](const cmsUInt16Number inks[], cmsUInt16Number out[], void* transform) {
-    cmsUInt16Number rgb[3];
-    for (int i = 0; i < 3; ++i) {
-      rgb[i] = static_cast<cmsUInt16Number>((65535u - inks[2 - i]) * (65535u - inks[3]) / 65535u);
-    }
-    cmsDoTransform(transform, rgb, out, 1);
-    return cmsBool{TRUE};
-  };
-  cmsPipeline* pipeline = cmsPipelineAlloc(nullptr, 4, 3);
-  cmsStage* grid = cmsStageAllocCLut16bit(nullptr, 9, 4, 3, nullptr);
-  cmsStageSampleCLut16bit(grid, labOfInks, toLab, 0);
-  // The file format wants curves around the grid.
-  cmsPipelineInsertStage(pipeline, cmsAT_END, cmsStageAllocToneCurves(nullptr, 4, nullptr));
-  cmsPipelineInsertStage(pipeline, cmsAT_END, grid);
-  cmsPipelineInsertStage(pipeline, cmsAT_END, cmsStageAllocToneCurves(nullptr, 3, nullptr));
-
-  const cmsHPROFILE print = cmsCreateProfilePlaceholder(nullptr);
-  cmsSetProfileVersion(print, 4.2);
-  cmsSetDeviceClass(print, cmsSigOutputClass);
-  cmsSetColorSpace(print, cmsSigCmykData);
-  cmsSetPCS(print, cmsSigLabData);
-  cmsWriteTag(print, cmsSigAToB0Tag, pipeline);
-  cmsUInt32Number size = 0;
-  cmsSaveProfileToMem(print, nullptr, &size);
-  Bytes bytes(size);
-  EXPECT_TRUE(size > 0 && cmsSaveProfileToMem(print, bytes.data(), &size));
-  cmsPipelineFree(pipeline);
-  cmsDeleteTransform(toLab);
-  for (const cmsHPROFILE profile : {srgb, lab, print}) cmsCloseProfile(profile);
-  return bytes;
 }
 
 TEST(DecodeCmyk, WithoutAnAdobeSegmentTakes255AsFullInk) {

@@ -1,9 +1,9 @@
 #include "photo/metadata/xmp_regions.h"
 
-#include <fmt/format.h>
 #include <gtest/gtest.h>
 
 #include <cstdlib>
+#include <string>
 
 #include "tests/photo/metadata/xmp_texts.h"
 #include "tests/support/comma_locale.h"
@@ -35,13 +35,14 @@ std::string workingGroup(int width, int height,
                              "stArea:h='0.1' "
                              "stArea:unit='normalized'",
                          const std::string& more = "") {
-  return fmt::format(
-      "<rdf:Description><mwg-rs:Regions rdf:parseType='Resource'><mwg-rs:AppliedToDimensions "
-      "stDim:w='{}' stDim:h='{}' stDim:unit='pixel'/><mwg-rs:RegionList><rdf:Bag><rdf:li "
-      "rdf:parseType='Resource'><mwg-rs:Type>Face</mwg-rs:Type><mwg-rs:Name>Ada</mwg-rs:Name>"
-      "<mwg-rs:Area {}/>{}</rdf:li></rdf:Bag></mwg-rs:RegionList></mwg-rs:Regions>"
-      "</rdf:Description>",
-      width, height, area, more);
+  return "<rdf:Description><mwg-rs:Regions rdf:parseType='Resource'><mwg-rs:AppliedToDimensions "
+         "stDim:w='" +
+         std::to_string(width) + "' stDim:h='" + std::to_string(height) +
+         "' stDim:unit='pixel'/><mwg-rs:RegionList><rdf:Bag><rdf:li "
+         "rdf:parseType='Resource'><mwg-rs:Type>Face</mwg-rs:Type><mwg-rs:Name>Ada</"
+         "mwg-rs:Name><mwg-rs:Area " +
+         area + "/>" + more +
+         "</rdf:li></rdf:Bag></mwg-rs:RegionList></mwg-rs:Regions></rdf:Description>";
 }
 
 std::string microsoft(const std::string& rectangle) {
@@ -138,10 +139,8 @@ std::string rotation(const std::string& radians) {
   return "<mwg-rs:Rotation>" + radians + "</mwg-rs:Rotation>";
 }
 std::string extensions(int roll, int yaw) {
-  return fmt::format(
-      "<mwg-rs:Extensions apple-fi:AngleInfoRoll='{}' apple-fi:AngleInfoYaw='{}' "
-      "apple-fi:FaceID='7'/>",
-      roll, yaw);
+  return "<mwg-rs:Extensions apple-fi:AngleInfoRoll='" + std::to_string(roll) +
+         "' apple-fi:AngleInfoYaw='" + std::to_string(yaw) + "' apple-fi:FaceID='7'/>";
 }
 const std::string sameArea =
     "stArea:x='0.6' stArea:y='0.25' stArea:w='0.2' stArea:h='0.1' stArea:unit='normalized'";
