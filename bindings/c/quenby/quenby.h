@@ -220,6 +220,7 @@ enum {
   QUENBY_IGNORE_KNOWN_FACES = 2u /**< Of the faces that the file knows of, none are read. */
 };
 
+/** How a photo is opened, and how much work it may be. */
 typedef struct quenby_open_options {
   size_t struct_size;
   int32_t scale;       /**< 1, 2, 4 or 8: what the sides are divided by, rounded up. */
@@ -259,6 +260,7 @@ enum {
   QUENBY_KEEP_GAIN_MAP = 32u
 };
 
+/** How a file is coded, and what goes into it. */
 typedef struct quenby_save_options {
   size_t struct_size;
   int32_t quality; /**< 1 ... 100, 90 unless given; for formats that lose something. */
@@ -438,6 +440,7 @@ typedef struct quenby_pair {
   uint32_t times_known, same_orientation;
 } quenby_pair;
 
+/** What quenby_find_pairs found; quenby_pairs_free frees it. */
 typedef struct quenby_pairs {
   quenby_pair* data;
   size_t count;
@@ -529,6 +532,7 @@ typedef struct quenby_corner {
   int32_t x, y, score;
 } quenby_corner;
 
+/** What quenby_fast found; quenby_corners_free frees it. */
 typedef struct quenby_corners {
   quenby_corner* data;
   size_t count;
@@ -541,6 +545,7 @@ typedef struct quenby_descriptor {
   uint32_t words[8];
 } quenby_descriptor;
 
+/** What quenby_brief made; quenby_descriptors_free frees it. */
 typedef struct quenby_descriptors {
   quenby_descriptor* data;
   size_t count;
