@@ -25,13 +25,19 @@ double peakMegabytes() {
   return static_cast<double>(usage.ru_maxrss) / 1024.0;
 }
 
+double megabytesOf(const std::vector<Shot>& shots) {
+  std::size_t bytes = shots.size() * sizeof(Shot);
+  for (const Shot& shot : shots) bytes += shot.cdf.byteCount();
+  return static_cast<double>(bytes) / 1e6;
+}
+
 void findPairsOfALibrary(benchmark::State& state) {
   const std::vector<Shot>& shots = library(static_cast<std::size_t>(state.range(0)));
   std::size_t pairs = 0;
   for (auto _ : state) pairs = findPairs(shots, 0.0f).size();
   state.SetComplexityN(state.range(0));
   state.counters["pairs"] = static_cast<double>(pairs);
-  state.counters["shots_MB"] = static_cast<double>(shots.size() * sizeof(Shot)) / 1e6;
+  state.counters["shots_MB"] = megabytesOf(shots);
   state.counters["peak_MiB"] = peakMegabytes();  // of the process so far, the shots included
 }
 BENCHMARK(findPairsOfALibrary)

@@ -62,7 +62,8 @@ int32_t quenby_read_shot(const uint8_t* file, size_t size, const quenby_open_opt
         photo::readPhotoRecord(bytesOf(file, size), photo::automaticScale, open.stop, open.limits);
     constexpr double unknown = std::numeric_limits<double>::quiet_NaN();
     quenby_shot read{{}, record.orientation, 0, unknown, unknown};
-    std::copy(record.cdf.begin(), record.cdf.end(), read.green_cdf);
+    const GreenCDF cdf = record.cdf.unpacked();
+    std::copy(cdf.begin(), cdf.end(), read.green_cdf);
     if (record.captureTime) {
       const photo::ShotTime time = photo::shotTime(*record.captureTime);
       read.wall_clock = time.wallClock;
@@ -107,10 +108,11 @@ int32_t quenby_find_pairs(const quenby_shot* shots, size_t count, float threshol
     all.reserve(count);
     for (size_t i = 0; i < count; ++i) all.push_back(shotOf(shots[i]));
     const photo::PairSearch search(all, threshold);
+    photo::PreparedShots prepared(all);
     std::vector<photo::ShotPair> found;
     for (size_t step = 0; step < search.stepCount(); ++step) {
       photo::stopIfAsked(tokenOf(cancel));
-      search.run(step, found);
+      search.run(step, prepared, found);
     }
     sortPairs(found);
     std::vector<quenby_pair> given;

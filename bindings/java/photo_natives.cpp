@@ -139,7 +139,7 @@ jfloatArray greenCdf(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jin
   const FileBytes file(env, array, buffer, offset, length);
   return javaArray(env, photo::readPhotoRecord(file.bytes(), photo::automaticScale,
                                                cancellations().token(cancel), limits)
-                            .cdf);
+                            .cdf.unpacked());
 }
 
 jdoubleArray facts(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,

@@ -34,7 +34,9 @@ struct CompareOptions {
 photo::Shot readShot(const Input& input, const photo::OpenOptions& options, Talk& talk) {
   const photo::Photo photo = loadPhoto(input, options, talk);
   photo::Shot shot;
-  image_processing::computeGreenCDF(*photo.image, shot.cdf);
+  image_processing::GreenCDF cdf;
+  image_processing::computeGreenCDF(*photo.image, cdf);
+  shot.cdf = {cdf, photo.image->pixelCount()};
   shot.orientation = photo.facts.orientation;
   if (photo.facts.captureTime) shot.time = photo::shotTime(*photo.facts.captureTime);
   return shot;
@@ -82,8 +84,8 @@ ExitCode runCompare(const CompareOptions& options) {
   }
 
   const photo::ShotPair pair = photo::compareShots(a, b);
-  const float gainAB = image_processing::matchCDFDomain(a.cdf, b.cdf);
-  const float gainBA = image_processing::matchCDFDomain(b.cdf, a.cdf);
+  const float gainAB = image_processing::matchCDFDomain(a.cdf.unpacked(), b.cdf.unpacked());
+  const float gainBA = image_processing::matchCDFDomain(b.cdf.unpacked(), a.cdf.unpacked());
   JsonOutput json(options.report, /*singleFile=*/true);
   if (json.wanted()) {
     Json object = {{"a", options.a}, {"b", options.b}};

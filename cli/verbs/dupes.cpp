@@ -58,20 +58,25 @@ struct DupesOptions {
 
 constexpr const char* verbName = "dupes";
 
-// A few hundred pieces: enough to share among cores and to show how far the search is.
+// At most a few hundred pieces, to share among cores and to show how far the search is.
 bool searchPairs(const std::vector<photo::Shot>& shots, float threshold,
                  const DupesOptions& options, std::vector<photo::ShotPair>& pairs) {
   const photo::PairSearch search(shots, threshold, options.unknownTimes);
-  const std::size_t pieces = std::min<std::size_t>(search.stepCount(), 400);
+  constexpr std::size_t together = 64;  // steps: their shots are compared with each other
+  const std::size_t steps = search.stepCount();
+  const std::size_t pieces = std::min<std::size_t>((steps + together - 1) / together, 400);
   Talk talk(verbName, options.report, pieces);
   std::vector<std::vector<photo::ShotPair>> found(pieces);
   const bool finished = runJobs(
       pieces, options.jobs,
       [&](std::size_t piece) {
-        // Every so-manieth step: neighbours in time are equally dense, so pieces are equally long.
-        for (std::size_t step = piece; step < search.stepCount(); step += pieces) {
-          stopIfInterrupted();
-          search.run(step, found[piece]);
+        photo::PreparedShots prepared(shots);
+        // From everywhere: neighbours in time are equally dense, so pieces are equally long.
+        for (std::size_t first = piece * together; first < steps; first += pieces * together) {
+          for (std::size_t step = first; step < std::min(first + together, steps); ++step) {
+            stopIfInterrupted();
+            search.run(step, prepared, found[piece]);
+          }
         }
       },
       [&](std::size_t piece) {

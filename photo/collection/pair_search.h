@@ -1,9 +1,11 @@
 #pragma once
 
 #include <cstddef>
+#include <optional>
 #include <span>
 #include <vector>
 
+#include "image_processing/dupe/prepared_cdf.h"
 #include "photo/collection/shot.h"
 
 namespace pelorin::photo {
@@ -29,6 +31,24 @@ constexpr float leastDupeScore = 1.5f;
 /// little but copies of one shot reaches it.
 constexpr float leastLookAlikeScore = 3.5f;
 
+/// The distributions of shots that were compared last, ready to be compared again: what makes them so
+/// takes longer than a comparison. For one thread and one search.
+class PreparedShots {
+ public:
+  explicit PreparedShots(std::span<const Shot> shots);
+
+  /// The distribution of shot `shot`, until the next call.
+  const image_processing::PreparedCDF& of(std::size_t shot);
+
+ private:
+  struct Slot {
+    std::size_t shot;
+    image_processing::PreparedCDF cdf;
+  };
+  std::span<const Shot> shots_;
+  std::vector<std::optional<Slot>> slots_;  ///< Each for the shots of one remainder.
+};
+
 /// What `a` and `b` have in common; `first` and `second` are left 0.
 ShotPair compareShots(const Shot& a, const Shot& b);
 
@@ -48,7 +68,9 @@ class PairSearch {
   std::size_t stepCount() const { return untimed_.size() + byUTC_.size() + byWallClock_.size(); }
 
   /// Appends what step `step` (below `stepCount`) finds; every pair is found by exactly one step.
-  void run(std::size_t step, std::vector<ShotPair>& found) const;
+  /// @param prepared  of the searched shots, one for each thread; steps that follow one another
+  ///                  mostly find there what they need.
+  void run(std::size_t step, PreparedShots& prepared, std::vector<ShotPair>& found) const;
 
  private:
   struct Moment {
@@ -58,7 +80,7 @@ class PairSearch {
   using Timeline = std::vector<Moment>;
 
   static void sortByTime(Timeline& timeline);
-  void compare(std::size_t a, std::size_t b, std::vector<ShotPair>& found) const;
+  class Step;
 
   std::span<const Shot> shots_;
   float threshold_;

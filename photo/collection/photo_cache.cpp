@@ -15,6 +15,7 @@
 namespace pelorin::photo {
 namespace {
 
+using image_processing::GreenCDF;
 using image_processing::niqeModelId;
 
 constexpr int applicationId = 0x51426443;  // "QBdC": whose file it is
@@ -70,7 +71,7 @@ std::int64_t checksum(const Key& key, std::string_view content) {
   return static_cast<std::int64_t>(hash);
 }
 
-std::int64_t checksum(const Key& key, int scale, const PhotoRecord& record) {
+std::int64_t checksum(const Key& key, int scale, const PhotoRecord& record, const GreenCDF& cdf) {
   std::string text =
       fmt::format("{} {} {} {} ", scale, record.width, record.height, record.orientation);
   if (record.captureTime) {
@@ -78,7 +79,7 @@ std::int64_t checksum(const Key& key, int scale, const PhotoRecord& record) {
     text += fmt::format("{} {} {} {}", time.text, std::bit_cast<std::uint64_t>(time.seconds),
                         time.hasZone, time.zoneSeconds);
   }
-  text.append(reinterpret_cast<const char*>(record.cdf.data()), sizeof record.cdf);
+  text.append(reinterpret_cast<const char*>(cdf.data()), sizeof cdf);
   return checksum(key, text);
 }
 
@@ -104,8 +105,9 @@ void bindRecord(sqlite3_stmt* statement, const Key& key, int scale, const PhotoR
     sqlite3_bind_double(statement, 10, time.seconds);
     if (time.hasZone) sqlite3_bind_int(statement, 11, time.zoneSeconds);
   }
-  sqlite3_bind_blob(statement, 12, record.cdf.data(), sizeof record.cdf, SQLITE_TRANSIENT);
-  sqlite3_bind_int64(statement, 13, checksum(key, scale, record));
+  const GreenCDF cdf = record.cdf.unpacked();
+  sqlite3_bind_blob(statement, 12, cdf.data(), sizeof cdf, SQLITE_TRANSIENT);
+  sqlite3_bind_int64(statement, 13, checksum(key, scale, record, cdf));
 }
 
 // Empty when the row is not what was stored.
@@ -121,10 +123,12 @@ std::optional<PhotoRecord> readRecord(sqlite3_stmt* statement, const Key& key, i
     time.hasZone = sqlite3_column_type(statement, 5) != SQLITE_NULL;
     time.zoneSeconds = sqlite3_column_int(statement, 5);
   }
-  const void* cdf = sqlite3_column_blob(statement, 6);
-  if (sqlite3_column_bytes(statement, 6) != sizeof record.cdf) return std::nullopt;
-  std::memcpy(record.cdf.data(), cdf, sizeof record.cdf);
-  if (checksum(key, scale, record) != sqlite3_column_int64(statement, 7)) return std::nullopt;
+  const void* stored = sqlite3_column_blob(statement, 6);
+  GreenCDF cdf;
+  if (sqlite3_column_bytes(statement, 6) != sizeof cdf) return std::nullopt;
+  std::memcpy(cdf.data(), stored, sizeof cdf);
+  if (checksum(key, scale, record, cdf) != sqlite3_column_int64(statement, 7)) return std::nullopt;
+  record.cdf = {cdf, countedPixels(record.width, record.height, scale)};
   return record;
 }
 

@@ -29,6 +29,15 @@ int scaleFor(std::uint32_t width, std::uint32_t height) {
   return scale;
 }
 
+std::uint64_t countedPixels(std::uint32_t width, std::uint32_t height, int scale) {
+  const auto divisor =
+      static_cast<std::uint32_t>(scale == automaticScale ? scaleFor(width, height) : scale);
+  const auto reduced = [&](std::uint32_t side) {
+    return (std::uint64_t{side} + divisor - 1) / divisor;
+  };
+  return reduced(width) * reduced(height);
+}
+
 PhotoRecord readPhotoRecord(std::span<const std::uint8_t> file, int scale, std::stop_token stop,
                             const DecodeLimits& limits) {
   const PhotoFacts facts = openRows(file, {.limits = limits, .stop = stop})->facts();
@@ -44,7 +53,11 @@ PhotoRecord readPhotoRecord(std::span<const std::uint8_t> file, int scale, std::
     counter.add(band.data.get(), std::size_t{width} * count);
     y += count;
   }
-  return {facts.width, facts.height, facts.orientation, facts.captureTime, counter.cdf()};
+  return {facts.width,
+          facts.height,
+          facts.orientation,
+          facts.captureTime,
+          {counter.cdf(), std::uint64_t{width} * height}};
 }
 
 std::optional<FileStamp> stampOf(const std::string& path) {

@@ -6,7 +6,7 @@
 #include <stop_token>
 #include <string>
 
-#include "image_processing/dupe/green_cdf.h"
+#include "image_processing/dupe/packed_cdf.h"
 #include "photo/collection/shot.h"
 #include "photo/decode_limits.h"
 #include "photo/metadata/capture_time.h"
@@ -18,7 +18,7 @@ struct PhotoRecord {
   std::uint32_t width, height;  ///< As stored in the file.
   int orientation;              ///< EXIF, 1 ... 8.
   std::optional<CaptureTime> captureTime;
-  image_processing::GreenCDF cdf;
+  image_processing::PackedCDF cdf;
 };
 
 /// By what a photo's pixels are divided before they are counted: 1, 2, 4 or 8, or `automaticScale`.
@@ -27,6 +27,9 @@ constexpr int automaticScale = 0;
 /// The largest divisor of the decoder that leaves the distribution enough pixels, 8 from about four
 /// megapixels on.
 int scaleFor(std::uint32_t width, std::uint32_t height);
+
+/// How many pixels of a photo are counted at `scale`, one of those above.
+std::uint64_t countedPixels(std::uint32_t width, std::uint32_t height, int scale);
 
 /// Decodes a photo once; its pixels are counted as they are stored, not turned.
 /// @throws PhotoError as `open`, Stopped when `stop` says so.

@@ -3,7 +3,7 @@
 #include <cmath>
 #include <optional>
 
-#include "image_processing/dupe/green_cdf.h"
+#include "image_processing/dupe/packed_cdf.h"
 
 namespace pelorin::photo {
 
@@ -15,7 +15,7 @@ struct ShotTime {
 
 /// All that the duplicate score needs of a photo.
 struct Shot {
-  image_processing::GreenCDF cdf;
+  image_processing::PackedCDF cdf;
   int orientation = 1;  ///< Only compared for equality.
   std::optional<ShotTime> time;
 };

@@ -4,9 +4,12 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstring>
 #include <limits>
 #include <vector>
 
+#include "image_processing/dupe/prepared_cdf.h"
+#include "image_processing/dupe/quantiles.h"
 #include "tests/dupe/synthetic_cdfs.h"
 #include "tests/support/fingerprint.h"
 #include "tests/support/green_cdf.h"
@@ -31,11 +34,22 @@ GreenCDF evenCDF() {
   return cdf;
 }
 
+float matchByDefinition(const GreenCDF& a, const GreenCDF& b, GreenCDF& mapped) {
+  Quantiles quantilesA, quantilesB;
+  invertScalar(a, quantilesA);
+  invertScalar(b, quantilesB);
+  const float gain = fitGain(gainSamplesOf(quantilesA), gainSamplesOf(quantilesB));
+  for (float& quantile : quantilesA) quantile = std::min(gain * quantile, 255.0f);
+  invertScalar(quantilesA, mapped);
+  for (float& entry : mapped) entry = static_cast<float>(entry * double{1.0f / 255.0f});
+  return gain;
+}
+
 /// The distance as its definition reads: both directions matched in full, then one compared.
 float distanceByDefinition(GreenCDF a, GreenCDF b) {
   GreenCDF x, y;
-  const float gainAB = matchCDFDomain(a, b, &x);
-  const float gainBA = matchCDFDomain(b, a, &y);
+  const float gainAB = matchByDefinition(a, b, x);
+  const float gainBA = matchByDefinition(b, a, y);
   if (gainAB > gainBA) {
     clipCDF(b, 8);
     clipCDF(x, 8);
@@ -168,6 +182,35 @@ TEST(InvertCDF, ReadsNoEntryButItsOwnWhateverTheFloats) {
       }
     }
   }
+}
+
+// Those of photos, ever flatter, and what is none: values that fall, end at 0 or are no numbers.
+TEST(Invert, IsItsDefinitionBitForBit) {
+  const auto isDefinition = [](const Quantiles& v) {
+    Quantiles expected, actual;
+    invertScalar(v, expected);
+    invert(v, actual);
+    return std::memcmp(actual.data(), expected.data(), sizeof actual) == 0;
+  };
+  test_support::Random random(5);
+  for (std::uint64_t seed = 0; seed < 1000; ++seed) {
+    Quantiles v = syntheticCDF(seed);
+    const float scale = std::pow(10.0f, static_cast<float>(random.below(76)) - 37.0f);
+    for (float& entry : v) entry *= scale;
+    ASSERT_TRUE(isDefinition(v)) << seed;
+    // Steps, levels that are met exactly, and one place changed.
+    for (float& entry : v) entry = std::floor(entry / scale * static_cast<float>(1 + seed % 300));
+    ASSERT_TRUE(isDefinition(v)) << seed;
+    v[random.below(256)] = std::array{-1.0f, 0.0f, infinity, std::nanf(""), 1e-45f}[seed % 5];
+    ASSERT_TRUE(isDefinition(v)) << seed;
+    Quantiles inverse;
+    invertScalar(syntheticCDF(seed), inverse);
+    for (float& entry : inverse) entry = std::min(entry * 2.0f * random.nextFloat(), 255.0f);
+    std::sort(inverse.begin(), inverse.end());
+    ASSERT_TRUE(isDefinition(inverse)) << seed;
+  }
+  EXPECT_TRUE(isDefinition(Quantiles{}));
+  EXPECT_TRUE(isDefinition(cdfOf(flatPicture(1, 1, {0, 255, 0, 255}))));
 }
 
 TEST(MatchCDFDomain, FindsGainOneBetweenTheSamePhotos) {

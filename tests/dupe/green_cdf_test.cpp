@@ -3,9 +3,12 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
+#include <cmath>
 #include <cstring>
 #include <utility>
 
+#include "image_processing/dupe/packed_cdf.h"
 #include "tests/support/green_cdf.h"
 #include "tests/support/pictures.h"
 
@@ -86,6 +89,59 @@ TEST(GreenCDF, CountsAsFloatCountersThatStopAtTwoToTheTwentyFour) {
   const GreenCDF cdf = cdfOf(image);
   EXPECT_EQ(cdf[199], 4096.0f / 16777216.0f);
   EXPECT_EQ(cdf[200], 4096.0f / 16777216.0f + 1.0f);
+}
+
+void expectSame(const GreenCDF& actual, const GreenCDF& expected) {
+  EXPECT_EQ(std::memcmp(actual.data(), expected.data(), sizeof actual), 0);
+}
+
+TEST(PackedCDF, HoldsTheCountsOfAPhotoInAThirdOfTheRoom) {
+  for (const auto& [width, height] : {std::pair{500u, 375u}, {1u, 1u}, {320u, 240u}, {67u, 3u}}) {
+    for (std::uint64_t seed = 0; seed < 5; ++seed) {
+      const GreenCDF cdf = cdfOf(photoLikePicture(width, height, seed));
+      const PackedCDF packed(cdf, std::uint64_t{width} * height);
+      expectSame(packed.unpacked(), cdf);
+      EXPECT_LT(packed.byteCount(), sizeof cdf * 2 / 5) << width << 'x' << height;
+    }
+  }
+}
+
+TEST(PackedCDF, HoldsCountsOfEverySize) {
+  std::array<float, 256> histogram{};
+  for (int width = 0; width <= 24; ++width) {
+    histogram[10 * width] = static_cast<float>((1 << width) - 1);
+    histogram[10 * width + 1] = 1.0f;
+    float pixels = 0.0f;
+    for (const float count : histogram) pixels += count;
+    GreenCDF cdf;
+    computeCDFFromCounts(histogram, std::min(pixels, 16777216.0f), cdf);
+    expectSame(PackedCDF(cdf, static_cast<std::uint64_t>(pixels)).unpacked(), cdf);
+  }
+  // What counters hold that have stopped at 2^24: more than all pixels.
+  histogram.fill(16777216.0f);
+  GreenCDF cdf;
+  computeCDFFromCounts(histogram, 16777216.0f, cdf);
+  const PackedCDF packed(cdf, std::uint64_t{1} << 40);
+  expectSame(packed.unpacked(), cdf);
+  EXPECT_LT(packed.byteCount(), sizeof cdf);
+}
+
+TEST(PackedCDF, LosesNothingOfWhatIsNotMadeOfCounts) {
+  const GreenCDF photo = cdfOf(photoLikePicture(64, 48, 1));
+  for (const float odd :
+       {std::nanf(""), std::nanf("7"), HUGE_VALF, -HUGE_VALF, -0.0f, -1.0f, 3e38f, 1e-45f}) {
+    for (const std::size_t place : {0u, 100u, 255u}) {
+      GreenCDF cdf = photo;
+      cdf[place] = odd;
+      expectSame(PackedCDF(cdf, 64 * 48).unpacked(), cdf);
+    }
+  }
+  for (const std::uint64_t wrong :
+       {std::uint64_t{0}, std::uint64_t{64 * 48 - 1}, ~std::uint64_t{0}}) {
+    expectSame(PackedCDF(photo, wrong).unpacked(), photo);
+  }
+  expectSame(PackedCDF().unpacked(), GreenCDF{});
+  expectSame(PackedCDF(GreenCDF{}).unpacked(), GreenCDF{});
 }
 
 }  // namespace

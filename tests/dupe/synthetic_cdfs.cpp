@@ -1,6 +1,7 @@
 #include "tests/dupe/synthetic_cdfs.h"
 
 #include <algorithm>
+#include <cmath>
 
 #include "tests/support/pictures.h"
 
@@ -27,18 +28,20 @@ GreenCDF syntheticCDF(std::uint64_t seed) {
   return cdf;
 }
 
-GreenCDF anotherShot(const GreenCDF& scene, float share, std::uint64_t seed) {
+GreenCDF anotherShot(const GreenCDF& scene, float share, std::uint64_t seed,
+                     std::uint64_t* pixelCount) {
   Random random(seed);
   std::array<float, 256> histogram;
   float previous = 0.0f, pixels = 0.0f;
   for (std::size_t i = 0; i < scene.size(); ++i) {
-    histogram[i] = scene[i] - previous + share * random.nextFloat();
+    constexpr float pixelsOfScene = 180'000.0f;
+    histogram[i] = std::floor((scene[i] - previous + share * random.nextFloat()) * pixelsOfScene);
     previous = scene[i];
     pixels += histogram[i];
   }
-  for (float& bin : histogram) bin *= 1e6f;  // counts, of which there is at least one
+  if (pixelCount != nullptr) *pixelCount = static_cast<std::uint64_t>(pixels);
   GreenCDF cdf;
-  image_processing::computeCDFFromCounts(histogram, pixels * 1e6f, cdf);
+  image_processing::computeCDFFromCounts(histogram, pixels, cdf);
   return cdf;
 }
 

@@ -48,8 +48,8 @@ TEST_F(PhotoNatives, ScoreThePictureAsTheCommandDoes) {
 TEST_F(PhotoNatives, CompareTwoPhotosFromTheirDistributions) {
   FakeBytes other(jpegOf(photoLikePicture(160, 120, 9)));
   FakeFloats a(calls.floats("greenCdf", file)), b(calls.floats("greenCdf", other));
-  const auto cdfA = photo::readPhotoRecord(file.bytes).cdf;
-  const auto cdfB = photo::readPhotoRecord(other.bytes).cdf;
+  const auto cdfA = photo::readPhotoRecord(file.bytes).cdf.unpacked();
+  const auto cdfB = photo::readPhotoRecord(other.bytes).cdf.unpacked();
   EXPECT_EQ(a.floatElements, FakeFloats(cdfA).floatElements);
   const float distance = calls.call<jfloat>("distance([F[F)F", static_cast<jfloatArray>(a),
                                             static_cast<jfloatArray>(b));

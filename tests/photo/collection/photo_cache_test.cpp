@@ -32,7 +32,7 @@ void expectSame(const std::optional<PhotoRecord>& actual, const PhotoRecord& exp
   EXPECT_EQ(actual->width, expected.width);
   EXPECT_EQ(actual->height, expected.height);
   EXPECT_EQ(actual->orientation, expected.orientation);
-  EXPECT_EQ(actual->cdf, expected.cdf);
+  EXPECT_EQ(actual->cdf.unpacked(), expected.cdf.unpacked());
   ASSERT_EQ(actual->captureTime.has_value(), expected.captureTime.has_value());
   if (!expected.captureTime) return;
   EXPECT_EQ(actual->captureTime->text, expected.captureTime->text);

@@ -23,7 +23,10 @@ std::vector<photo::Shot> syntheticShots(std::size_t count, const LibraryKind& ki
     }
     --left;
     now += 0.25 * random.below(60);
-    shot.cdf = anotherShot(scene, 0.004f * random.nextFloat(), random.next32());
+    const float moved = 0.004f * random.nextFloat();
+    std::uint64_t pixels;
+    const image_processing::GreenCDF cdf = anotherShot(scene, moved, random.next32(), &pixels);
+    shot.cdf = {cdf, pixels};
     shot.orientation = happens(kind.turned) ? 6 : 1;
     const double offset = 3600.0 * (1 + random.below(2));
     if (happens(kind.withoutTime)) continue;
