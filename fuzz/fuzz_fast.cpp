@@ -41,24 +41,6 @@ void checkPicture(const GreyPixels& image, int arc, int threshold) {
   check(same(detectMaxima(image, arc, threshold), std::vector<xy>(kept.data(), kept.end())));
 }
 
-// Any positions at all, in order or not.
-void checkSuppression(const std::uint8_t* data, std::size_t size) {
-  const std::size_t count = size / 12;
-  std::vector<xy> corners(count);
-  std::vector<int> scores(count);
-  if (count == 0) return;
-  std::memcpy(corners.data(), data, count * sizeof(xy));
-  std::memcpy(scores.data(), data + count * sizeof(xy), count * sizeof(int));
-  int kept = -1;
-  std::free(nonmax_suppression(corners.data(), scores.data(), static_cast<int>(count), &kept));
-  std::sort(corners.begin(), corners.end(),
-            [](const xy& a, const xy& b) { return a.y != b.y ? a.y < b.y : a.x < b.x; });
-  xy* const maxima =
-      nonmax_suppression(corners.data(), scores.data(), static_cast<int>(count), &kept);
-  check(maxima != nullptr && kept >= 0 && static_cast<std::size_t>(kept) <= count);
-  std::free(maxima);
-}
-
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
@@ -73,6 +55,5 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   const bool upward = (data[4] & 2) != 0 && height > 0;
   const std::uint8_t* const first = pixels.data() + (upward ? (height - 1) * stride : 0);
   checkPicture({first, width, height, upward ? -stride : stride}, arc, threshold);
-  checkSuppression(data, size);
   return 0;
 }

@@ -9,6 +9,7 @@
 #include <string>
 #include <vector>
 
+#include "fuzz/bytes.h"
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/filtered_image.h"
 
@@ -16,23 +17,9 @@ using namespace pelorin::image_processing;
 
 namespace {
 
-class Bytes {
- public:
-  Bytes(const std::uint8_t* data, std::size_t size) : data_(data), left_(size) {}
-  bool empty() const { return left_ == 0; }
-  std::uint8_t next() {
-    if (left_ == 0) return 0;
-    --left_;
-    return *data_++;
-  }
-  std::int32_t place(std::uint32_t side) {
-    return static_cast<std::int32_t>(next() % (2 * side)) - static_cast<std::int32_t>(side / 2);
-  }
-
- private:
-  const std::uint8_t* data_;
-  std::size_t left_;
-};
+std::int32_t placeAlong(std::uint32_t side, Bytes& bytes) {
+  return static_cast<std::int32_t>(bytes.next() % (2 * side)) - static_cast<std::int32_t>(side / 2);
+}
 
 struct Call {
   std::string params;
@@ -64,9 +51,12 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   }
   ImageMetadata metadata;
   for (int faces = bytes.next() % 4; faces > 0; --faces) {
-    const std::int32_t left = bytes.place(width), top = bytes.place(height);
-    metadata.faces.push_back(std::make_shared<BoundingBox>(BoundingBox{
-        .left = left, .right = bytes.place(width), .bottom = bytes.place(height), .top = top}));
+    const std::int32_t left = placeAlong(width, bytes), top = placeAlong(height, bytes);
+    metadata.faces.push_back(
+        std::make_shared<BoundingBox>(BoundingBox{.left = left,
+                                                  .right = placeAlong(width, bytes),
+                                                  .bottom = placeAlong(height, bytes),
+                                                  .top = top}));
   }
 
   const auto factory = DefaultFilterFactory::filterFactory();

@@ -5,6 +5,7 @@
 #include <filesystem>
 #include <map>
 #include <memory>
+#include <set>
 #include <system_error>
 #include <utility>
 
@@ -77,8 +78,9 @@ class Watch {
     } catch (const Interrupted&) {
       // How it is meant to end; finished files stand.
     }
-    talk_.note(fmt::format("{} photos done, {} failed", done_, failed_));
-    return failed_ > 0 ? ExitCode::someFailed : ExitCode::allDone;
+    const std::size_t failed = failed_ + troubled_;
+    talk_.note(fmt::format("{} photos done, {} failed", done_, failed));
+    return failed > 0 ? ExitCode::someFailed : ExitCode::allDone;
   }
 
  private:
@@ -130,10 +132,12 @@ class Watch {
     below.recursive = true;
     const std::int64_t now = milliseconds();
     Photos complete;
+    troubled_ = 0;
     for (Input& input : expandInputs(below)) {
       if (isResult(input.path)) continue;
       if (!input.trouble.empty()) {
-        talk_.noteOnce(input.path, input.shownName() + ": " + input.trouble);
+        if (told_.insert(input.path).second) talk_.error(input.shownName(), input.trouble);
+        ++troubled_;
         continue;
       }
       const auto stamp = photo::stampOf(input.path);
@@ -274,6 +278,8 @@ class Watch {
   Talk talk_;
   std::map<std::string, photo::FileStamp> failures_;  // tried again when they change, or next time
   std::size_t done_ = 0, failed_ = 0;
+  std::set<std::string> told_;  // what cannot be looked at,
+  std::size_t troubled_ = 0;    // and how much of that there was at the last look
   bool planned_ = false;
 };
 
@@ -283,6 +289,9 @@ ExitCode runWatch(const WatchOptions& options) {
   const std::string params = options.parameters.read(filter, talk);
   std::error_code failed;
   const fs::path folder = fs::canonical(options.folder, failed);
+  const bool isMissing =
+      failed == std::errc::no_such_file_or_directory || failed == std::errc::not_a_directory;
+  if (failed && !isMissing) throw std::system_error(failed, options.folder);
   if (failed || !fs::is_directory(folder)) {
     throw UsageError(options.folder + ": is no folder that can be watched");
   }
