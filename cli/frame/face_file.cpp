@@ -13,7 +13,7 @@
 namespace pelorin::cli {
 namespace {
 
-using Json = nlohmann::json;
+using ReadJson = nlohmann::json;
 
 // A place in a file, for messages: "--faces: FILE: [2].faces[0]: ...".
 class Place {
@@ -34,7 +34,7 @@ class Place {
   std::string file_, within_;
 };
 
-Face readFace(const Json& json, const Place& place) {
+Face readFace(const ReadJson& json, const Place& place) {
   if (!json.is_object()) place.refuse("is no object with left, top, right and bottom");
   constexpr std::array<const char*, 4> bounds = {"left", "top", "right", "bottom"};
   std::array<float, 4> values;
@@ -57,11 +57,11 @@ Face readFace(const Json& json, const Place& place) {
   return face;
 }
 
-std::vector<Face> readFaces(const Json& json, const Place& place) {
+std::vector<Face> readFaces(const ReadJson& json, const Place& place) {
   if (!json.is_object() || !json.contains("faces") || !json["faces"].is_array())
     place.refuse("is no object with a list of \"faces\"");
   std::vector<Face> faces;
-  for (const Json& face : json["faces"])
+  for (const ReadJson& face : json["faces"])
     faces.push_back(readFace(face, place.at("faces", faces.size())));
   return faces;
 }
@@ -70,17 +70,17 @@ std::string normalised(const std::string& path) {
   return std::filesystem::path(path).lexically_normal().string();
 }
 
-Json parsed(const std::string& path, const Place& place) {
+ReadJson parsed(const std::string& path, const Place& place) {
   try {
     const std::vector<std::uint8_t> bytes = photo::readFile(path);
-    return Json::parse(bytes);
+    return ReadJson::parse(bytes);
   } catch (const std::system_error& error) {
     throw UsageError(
         "--faces: '" + path +
         "' is neither xmp nor none nor a file that can be read: " + error.code().message());
-  } catch (const Json::parse_error& error) {
+  } catch (const ReadJson::parse_error& error) {
     place.refuse("is no JSON at byte " + std::to_string(error.byte));
-  } catch (const Json::exception&) {
+  } catch (const ReadJson::exception&) {
     place.refuse("has a number that is too large");
   }
 }
@@ -96,7 +96,7 @@ const std::vector<Face>& FaceFile::of(const std::string& photo) const {
 
 FaceFile readFaceFile(const std::string& path) {
   const Place place(path);
-  const Json json = parsed(path, place);
+  const ReadJson json = parsed(path, place);
   FaceFile file{path, json.is_array(), {}, {}};
   if (!file.isList) {
     file.ofEveryPhoto = readFaces(json, place);

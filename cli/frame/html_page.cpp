@@ -38,8 +38,8 @@ small {{ display: block; opacity: .75; }}
 
 }  // namespace
 
-std::string htmlHead(std::string_view title, std::string_view style) {
-  return fmt::format(head, title, style);
+std::string htmlHead(std::string_view title, std::string_view styles) {
+  return fmt::format(head, title, styles);
 }
 
 std::string escapedHtml(std::string_view text) {

@@ -14,7 +14,7 @@ namespace pelorin::cli {
 
 /// The page up to its heading, which is the title.
 /// @param style  CSS, after what all pages have.
-std::string htmlHead(std::string_view title, std::string_view style);
+std::string htmlHead(std::string_view title, std::string_view styles);
 
 /// UTF-8 text for HTML, also within quotes.
 std::string escapedHtml(std::string_view text);

@@ -13,10 +13,6 @@ namespace {
 
 using photo::MetadataSegment;
 
-Bytes bytesOf(const std::string& text) {
-  return Bytes(text.begin(), text.end());
-}
-
 Bytes colourProfile() {
   Bytes payload = bytesOf(std::string("ICC_PROFILE\0\1\1", 14));
   payload.resize(500, 0x5A);

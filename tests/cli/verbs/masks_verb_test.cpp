@@ -21,14 +21,14 @@ using testing::HasSubstr;
 using testing::UnorderedElementsAre;
 using Byte = QuantizedFloat<unsigned char>;
 
-Bytes bytesOf(const void* data, std::size_t count) {
+Bytes memoryOf(const void* data, std::size_t count) {
   const auto* first = static_cast<const std::uint8_t*>(data);
   return {first, first + count};
 }
 
 template <typename T>
-Bytes bytesOf(const Image<T>& image) {
-  return bytesOf(image.data.get(), image.byteSize());
+Bytes memoryOf(const Image<T>& image) {
+  return memoryOf(image.data.get(), image.byteSize());
 }
 
 const image_processing::ImageMetadata noFaces;
@@ -59,7 +59,7 @@ class MasksVerb : public testing::Test {
  protected:
   /// Runs `quenby masks` on raw pixels.
   Finished onRaw(const Image<RGBA8Pixel>& picture, std::vector<std::string> options = {}) {
-    const std::string input = folder.write("in.rgba", bytesOf(picture));
+    const std::string input = folder.write("in.rgba", memoryOf(picture));
     std::vector<std::string> arguments = {
         "masks", input,   "-o",
         out,     "--raw", std::to_string(picture.width) + "x" + std::to_string(picture.height)};
@@ -69,8 +69,8 @@ class MasksVerb : public testing::Test {
 
   template <typename Planes>
   void expectPlanes(const Planes& expected) {
-    EXPECT_EQ(folder.read("out/bilateral.f32"), bytesOf(expected.first));
-    EXPECT_EQ(folder.read("out/ltm.f32"), bytesOf(expected.second));
+    EXPECT_EQ(folder.read("out/bilateral.f32"), memoryOf(expected.first));
+    EXPECT_EQ(folder.read("out/ltm.f32"), memoryOf(expected.second));
   }
 
   const TemporaryFolder folder;
@@ -91,7 +91,7 @@ TEST_F(MasksVerb, SeeEveryFace) {
   ASSERT_EQ(onRaw(picture, {"--face", faces[0], "--face", faces[1]}).exitCode, 0);
   const auto expected = masksOf<float>(picture, facesOf(faces, picture));
   expectPlanes(expected);
-  EXPECT_NE(bytesOf(expected.second), bytesOf(masksOf<float>(picture, noFaces).second));
+  EXPECT_NE(memoryOf(expected.second), memoryOf(masksOf<float>(picture, noFaces).second));
 }
 
 TEST_F(MasksVerb, OfTheSmallFilterAreItsBytesOver255) {
@@ -103,7 +103,7 @@ TEST_F(MasksVerb, AreSmoothedExactlyOnRequest) {
   ASSERT_EQ(onRaw(picture, {"--exact"}).exitCode, 0);
   const auto expected = masksOf<float>(picture, noFaces, /*grid=*/false);
   expectPlanes(expected);
-  EXPECT_NE(bytesOf(expected.first), bytesOf(masksOf<float>(picture, noFaces).first));
+  EXPECT_NE(memoryOf(expected.first), memoryOf(masksOf<float>(picture, noFaces).first));
 }
 
 TEST_F(MasksVerb, OfThinPicturesAreTheEnginesToo) {
