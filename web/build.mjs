@@ -10,16 +10,24 @@ const here = dirname(fileURLToPath(import.meta.url));
 
 await rm(out, { recursive: true, force: true });
 await mkdir(join(out, "quenby"), { recursive: true });
-await cp(join(here, "src"), out, { recursive: true });
+const sources = join(here, "src");
+for (const name of await readdir(sources)) {
+  if (!name.endsWith(".js") || name === "sw.js") await cp(join(sources, name), join(out, name));
+}
 for (const name of await readdir(packageFolder)) {
   if (/\.(js|wasm)$/.test(name)) await cp(join(packageFolder, name), join(out, "quenby", name));
 }
 
-// Without comments and long names; what the service worker is filled with stays to be found.
-const written = (await readdir(out)).concat((await readdir(join(out, "quenby"))).map((name) => join("quenby", name)))
-  .filter((name) => /\.(js|css)$/.test(name) && name !== "sw.js").map((name) => join(out, name));
-execFileSync("esbuild", ["--minify", "--target=es2022", "--allow-overwrite", "--log-level=warning", `--outbase=${out}`,
-  `--outdir=${out}`, ...written], { stdio: "inherit" });
+// The page's parts in one file, and all without comments and long names; what the service worker is filled
+// with stays to be found.
+const minify = (...options) =>
+  execFileSync("esbuild", ["--minify", "--target=es2022", "--log-level=warning", ...options], { stdio: "inherit" });
+minify("--bundle", "--format=esm", "--external:./quenby/*", `--outfile=${join(out, "app.js")}`, join(sources, "app.js"));
+const written = [join(out, "style.css")];
+for (const name of await readdir(join(out, "quenby"))) {
+  if (name.endsWith(".js")) written.push(join(out, "quenby", name));
+}
+minify("--allow-overwrite", `--outbase=${out}`, `--outdir=${out}`, ...written);
 
 const texts = [];
 for (const name of (await readdir(licences)).sort()) {
