@@ -52,7 +52,7 @@ class Build:
             self.compiles.setdefault(source, []).append(words)
         listed = self._ninja("-t", "targets", "all")
         names = [line.split(": ")[0] for line in listed.splitlines() if "EXECUTABLE_LINKER" in line]
-        programs = [name for name in names if name.startswith("tests/") and name.endswith("_test")]
+        programs = [name for name in names if name.startswith("tests/") and name.endswith(("_test", "_tests"))]
         self.programs = [name for name in programs if (folder / name).exists()]
         self.missing = len(programs) - len(self.programs)
         self._inputs, self._seconds, self._links, self._readers = {}, {}, {}, None
