@@ -5,9 +5,11 @@
 #include "bindings/c/photos.h"
 #include "bindings/c/pixels.h"
 #include "bindings/c/workers.h"
+#include "image_processing/core/work_stopped.h"
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/filtered_image.h"
 #include "photo/filter_photo.h"
+#include "photo/photo_error.h"
 
 using namespace pelorin;
 using namespace pelorin::c_api;
@@ -18,11 +20,12 @@ struct quenby_session {
       : width(picture->width),
         height(picture->height),
         filters(picture, metadata, "", defaultFilterConfigValue,
-                DefaultFilterFactory::filterFactory()) {}
+                DefaultFilterFactory::filterFactory(), &stoppable) {}
 
   const uint32_t width, height;
-  FilteredImage filters;
   std::optional<CallersWorkers> workers = {};
+  StoppableWorkers stoppable = {};
+  FilteredImage filters;
 };
 
 int32_t quenby_session_open(const quenby_pixels* pixels, const quenby_face* faces,
@@ -61,9 +64,16 @@ int32_t quenby_session_apply(quenby_session* session, const char* filter, const 
     const std::string text = params == nullptr ? "" : params;
     const std::string& name = photo::filterFor(&required(filter, "filter"), text).name;
     Output output(rgba, stride, session->width, session->height);
-    photo::stopIfAsked(tokenOf(cancel));
-    session->filters.applyFilterWithParams(name, text, defaultFilterConfigValue, output.picture());
-    photo::stopIfAsked(tokenOf(cancel));
+    const std::stop_token stop = tokenOf(cancel);
+    photo::stopIfAsked(stop);
+    try {
+      const StoppableWorkers::Call call(stop);
+      session->filters.applyFilterWithParams(name, text, defaultFilterConfigValue,
+                                             output.picture());
+    } catch (const WorkStopped&) {
+      throw photo::Stopped();
+    }
+    photo::stopIfAsked(stop);
     output.close();
   });
 }
@@ -73,7 +83,7 @@ int32_t quenby_session_share(quenby_session* session, const quenby_workers* work
   return guarded(error, [&] {
     required(session, "session");
     session->workers.emplace(required(workers, "workers"));
-    session->filters.share(&*session->workers);
+    session->stoppable.lend(&*session->workers);
   });
 }
 

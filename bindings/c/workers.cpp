@@ -1,9 +1,11 @@
 #include "bindings/c/workers.h"
 
+#include <algorithm>
 #include <atomic>
 #include <exception>
 #include <mutex>
 
+#include "image_processing/core/work_stopped.h"
 #include "photo/thread_workers.h"
 
 struct quenby_threads {
@@ -43,7 +45,35 @@ extern "C" void runOnThreads(void* context, std::size_t tasks,
   }
 }
 
+// Of the call that this thread is in; the session's state has no place for it, since several threads may
+// have filters of one session applied.
+thread_local const std::stop_token* stopOfCall = nullptr;
+
+constexpr std::size_t leastTasks = 16;  // of 12 megapixels each takes some milliseconds
+
 }  // namespace
+
+StoppableWorkers::Call::Call(const std::stop_token& stop) {
+  stopOfCall = stop.stop_possible() ? &stop : nullptr;
+}
+
+StoppableWorkers::Call::~Call() {
+  stopOfCall = nullptr;
+}
+
+std::size_t StoppableWorkers::count() const {
+  const std::size_t count = image_processing::tasksFor(lent_);
+  return stopOfCall == nullptr ? count : std::max(count, leastTasks);
+}
+
+void StoppableWorkers::run(std::size_t tasks, const Task& task) {
+  const std::stop_token* const stop = stopOfCall;  // tasks have threads of their own
+  if (stop == nullptr) return image_processing::runTasks(lent_, tasks, task);
+  image_processing::runTasks(lent_, tasks, [&](std::size_t index) {
+    if (stop->stop_requested()) throw image_processing::WorkStopped();
+    task(index);
+  });
+}
 
 CallersWorkers::CallersWorkers(const quenby_workers& workers)
     : workers_(optionsOf(&workers, "workers")) {

@@ -1,5 +1,8 @@
 #pragma once
 
+#include <cstddef>
+#include <stop_token>
+
 #include "bindings/c/boundary.h"
 #include "image_processing/core/workers.h"
 
@@ -17,6 +20,30 @@ class CallersWorkers : public image_processing::Workers {
 
  private:
   quenby_workers workers_;
+};
+
+/// Workers of a session, which leave the work of a call that is cancelled: before each of its tasks,
+/// of which a call that can be cancelled has some dozen even on one thread.
+class StoppableWorkers : public image_processing::Workers {
+ public:
+  /// Makes what the calling thread has done while it lives one call, to end with WorkStopped when
+  /// `stop` says so.
+  class Call {
+   public:
+    explicit Call(const std::stop_token& stop);
+    ~Call();
+    Call(const Call&) = delete;
+    Call& operator=(const Call&) = delete;
+  };
+
+  /// @param workers  outlive this one; null for none.
+  void lend(image_processing::Workers* workers) { lent_ = workers; }
+
+  std::size_t count() const override;
+  void run(std::size_t tasks, const Task& task) override;
+
+ private:
+  image_processing::Workers* lent_ = nullptr;
 };
 
 }  // namespace pelorin::c_api

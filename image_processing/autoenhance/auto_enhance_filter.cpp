@@ -7,6 +7,7 @@
 #include "image_processing/autoenhance/lab_tone_pass.h"
 #include "image_processing/autoenhance/photo_analysis.h"
 #include "image_processing/core/parameter_strings.h"
+#include "image_processing/core/work_stopped.h"
 #include "image_processing/filters/through_picture.h"
 
 namespace pelorin::image_processing {
@@ -57,6 +58,8 @@ void AEFilterT<TB, TL>::init(const std::string& params) {
   masks_ = {};
   try {
     prepare(FilterParams(params));
+  } catch (const WorkStopped&) {
+    throw;
   } catch (...) {
     // Statistics come first and outlive what fails after them; they wait for the masks only because
     // both are found from the photo's lightness.

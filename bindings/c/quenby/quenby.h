@@ -72,8 +72,8 @@ typedef struct quenby_error {
 
 /* ---- Cancelling ---- */
 
-/** A wish that work ends. Calls look at it between their steps: before and after decoding, filtering
- * and encoding, and from pair to pair. */
+/** A wish that work ends. Calls look at it between their steps: while they decode, filter and encode from
+ * some rows to the next, and from pair to pair. */
 typedef struct quenby_cancel quenby_cancel;
 
 /** @param cancel  receives an object that asks for nothing yet. */

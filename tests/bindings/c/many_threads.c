@@ -139,6 +139,58 @@ static void* until_cancelled(void* cancel) {
   return kind == QUENBY_CANCELLED ? wanted : NULL;
 }
 
+/* Cancels after some tasks, and counts those that follow. */
+struct cancelling_workers {
+  quenby_cancel* cancel;
+  int tasks_before;
+};
+
+static void run_and_cancel(void* context, size_t tasks, void (*task)(void* state, size_t index),
+                           void* state) {
+  struct cancelling_workers* const workers = context;
+  for (size_t i = 0; i < tasks; ++i) {
+    if (workers->tasks_before-- == 0) quenby_cancel_request(workers->cancel);
+    task(state, i);
+  }
+}
+
+/* After the first tasks of a filter, which begins at the top, the last row is as it was; after any
+ * number of them the session is as good as new. */
+static void cancelled_at_work(void) {
+  static const char* const filters[] = {"AE0", "AE08bit", "WinterRGB"};
+  uint8_t out[bytes], row[width * 4];
+  memset(row, 77, sizeof row);
+  for (int filter = 0; filter < 3; ++filter) {
+    const char* const wish = filter < 2 ? "slider=0.2;" : "";
+    uint8_t usual[bytes];
+    quenby_session* session = NULL;
+    DONE(quenby_session_open(&pixels, NULL, 0, 0, &session, &error));
+    DONE(quenby_session_apply(session, filters[filter], wish, usual, width * 4, NULL, &error));
+    quenby_session_free(session);
+    int cancelled = 0;
+    for (int tasks = 1; tasks < 100; tasks += 7) {
+      struct cancelling_workers own = {NULL, tasks};
+      const quenby_workers workers = {sizeof(workers), 1, &own, run_and_cancel};
+      DONE(quenby_cancel_new(&own.cancel, &error));
+      DONE(quenby_session_open(&pixels, NULL, 0, 0, &session, &error));
+      DONE(quenby_session_share(session, &workers, &error));
+      memset(out, 77, sizeof out);
+      const int32_t kind =
+          quenby_session_apply(session, filters[filter], wish, out, width * 4, own.cancel, NULL);
+      CHECK(kind == (own.tasks_before < 0 ? QUENBY_CANCELLED : QUENBY_OK));
+      cancelled += kind == QUENBY_CANCELLED;
+      if (tasks == 1 && kind == QUENBY_CANCELLED)
+        CHECK(memcmp(out + bytes - width * 4, row, sizeof row) == 0);
+      if (kind == QUENBY_OK) CHECK(memcmp(out, usual, bytes) == 0);
+      DONE(quenby_session_apply(session, filters[filter], wish, out, width * 4, NULL, &error));
+      CHECK(memcmp(out, usual, bytes) == 0);
+      quenby_session_free(session);
+      quenby_cancel_free(own.cancel);
+    }
+    CHECK(cancelled > 0);
+  }
+}
+
 static void cancelled_by_another_thread(void) {
   quenby_cancel* cancel = NULL;
   DONE(quenby_cancel_new(&cancel, &error));
@@ -224,6 +276,7 @@ int main(void) {
   same_bytes(1);
   with_workers();
   with_the_librarys_threads();
+  cancelled_at_work();
   cancelled_before();
   cancelled_by_the_time();
   cancelled_by_another_thread();
