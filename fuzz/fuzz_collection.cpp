@@ -25,10 +25,12 @@ std::vector<Shot> shotsOf(const std::uint8_t* data, std::size_t size) {
   for (std::size_t i = 0; i + bytesOfOne <= size && shots.size() < most; i += bytesOfOne) {
     const std::uint8_t* const b = data + i;
     Shot shot;
-    for (std::size_t level = 0; level < shot.cdf.size(); ++level) {
+    pelorin::image_processing::GreenCDF cdf;
+    for (std::size_t level = 0; level < cdf.size(); ++level) {
       const float x = static_cast<float>(level + 1) / 256.0f;
-      shot.cdf[level] = std::pow(x, 0.5f + static_cast<float>(b[0]) / 64.0f);
+      cdf[level] = std::pow(x, 0.5f + static_cast<float>(b[0]) / 64.0f);
     }
+    shot.cdf = cdf;
     shot.orientation = 1 + b[1] % 8;
     if (b[2] % 8 != 0) {
       const double clock = b[3] * 60.0 + b[4] / 8.0 + (b[2] % 16 == 1 ? 1e15 : 0);
