@@ -132,7 +132,8 @@ void addMeasures(Table& table, const Sample& from) {
   std::string descriptors;
   for (const BriefDescriptor& found : computeBriefDescriptors(grey, 20)) {
     descriptors += std::to_string(found.center.x) + " " + std::to_string(found.center.y);
-    for (const std::uint32_t word : found.descriptor) descriptors += " " + hexadecimal(word);
+    for (const std::uint32_t word : found.descriptor)
+      descriptors.append(" ").append(hexadecimal(word));
   }
   table.add("keypoints", "20", from.name, hashOf(descriptors.data(), descriptors.size()));
 }

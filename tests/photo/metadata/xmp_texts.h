@@ -27,7 +27,8 @@ inline std::string xmpPacket(const std::string& descriptions, std::size_t paddin
          " xmlns:apple-fi=\"http://ns.apple.com/faceinfo/1.0/\"\n"
          "   xmlns:my=\"urn:something:unknown\">\n" +
          descriptions + "\n </rdf:RDF>\n</x:xmpmeta>" +
-         (padding > 0 ? "\n" + std::string(padding - 1, ' ') : "") + "<?xpacket end=\"w\"?>";
+         std::string(padding > 0 ? 1 : 0, '\n').append(padding > 0 ? padding - 1 : 0, ' ') +
+         "<?xpacket end=\"w\"?>";
 }
 
 }  // namespace pelorin::test_support
