@@ -13,7 +13,7 @@ namespace pelorin::cli {
 // itself forbids them.
 
 /// The page up to its heading, which is the title.
-/// @param style  CSS, after what all pages have.
+/// @param styles  CSS, after what all pages have.
 std::string htmlHead(std::string_view title, std::string_view styles);
 
 /// UTF-8 text for HTML, also within quotes.

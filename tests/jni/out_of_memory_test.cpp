@@ -7,6 +7,7 @@
 #include "tests/jni/support/whole_run.h"
 #include "tests/support/allocation_faults.h"
 #include "tests/support/pictures.h"
+#include "tests/support/slow_build.h"
 
 namespace pelorin::test_support {
 namespace {
@@ -35,7 +36,7 @@ class OutOfMemory : public NativesTest {
                           const std::string& message) {
     long faults = 0, unnoticed = 0;
     for (const Later later : {Later::succeed, Later::fail}) {
-      for (long failing = 1;; ++failing) {
+      for (long failing = 1;; failing += slowBuild && failing > 40 ? 9 : 1) {
         const long blocks = blocksInUse();
         Result result;
         long count;

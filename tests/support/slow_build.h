@@ -15,7 +15,7 @@ namespace pelorin::test_support {
 
 /// Whether this build runs an order slower than a plain one, under a sanitizer or an emulator. Tests
 /// that try all of something try a part of it there; the plain build leaves nothing out.
-#if defined(PELORIN_SANITIZED) || defined(__arm__)
+#if defined(PELORIN_SANITIZED) || defined(__arm__) || defined(__aarch64__)
 constexpr bool slowBuild = true;
 #else
 constexpr bool slowBuild = false;

@@ -66,6 +66,11 @@ testing::AssertionResult equalsScalar(const Look& look, const Image<RGBA8Pixel>&
 // From 400 · 400 pixels on a look without mix goes through tables, below it does not.
 constexpr std::uint32_t largeWidth = 401, largeHeight = 403, smallWidth = 37, smallHeight = 29;
 
+// Of the large pictures, which take their time.
+bool leftOut(int n) {
+  return test_support::slowBuild && n % 5 != 0;
+}
+
 TEST(ApplyLook, EqualsTheScalarDefinitionOnEveryGeometry) {
   const CubicRadialMask mask = maskOf<SummerRGBFilter>();
   const std::pair<std::uint32_t, std::uint32_t> sizes[] = {
@@ -106,11 +111,14 @@ TEST(ApplyLook, EqualsTheScalarDefinitionForAnyOpacity) {
   const CubicRadialMask mask = maskOf<SummerRGBFilter>();
   const Image<RGBA8Pixel> large = noisePicture(largeWidth, largeHeight, 1);
   const Image<RGBA8Pixel> small = noisePicture(smallWidth, smallHeight, 2);
+  int n = 0;
   for (Look& look : looksOfEveryMix(&mask)) {
     for (const float alpha : {0.0f, -0.0f, 0.3f, 0.999f, 1.0f, 1.0001f, -0.01f, 1.7f, -2.0f, 30.0f,
                               -1e4f, 1e9f, -1e12f, 1e38f, infinity, -infinity, nan}) {
       look.maskAlpha = alpha;
-      EXPECT_TRUE(equalsScalar(look, large));
+      if (!leftOut(n++)) {
+        EXPECT_TRUE(equalsScalar(look, large));
+      }
       EXPECT_TRUE(equalsScalar(look, small));
     }
   }
@@ -120,12 +128,15 @@ TEST(ApplyLook, EqualsTheScalarDefinitionForAnyRadius) {
   const CubicRadialMask mask = maskOf<SummerRGBFilter>();
   const Image<RGBA8Pixel> large = noisePicture(largeWidth, largeHeight, 1);
   const Image<RGBA8Pixel> small = noisePicture(smallWidth, smallHeight, 2);
+  int n = 0;
   const Image<RGBA8Pixel> one = noisePicture(1, 1, 3);
   for (Look& look : looksOfEveryMix(&mask)) {
     for (const float radius : {0.0f, -0.0f, 1.0f, -2.28f, 0.01f, 1e-20f, 1e-37f, 1e-40f, 1e-45f,
                                1e20f, 3e38f, infinity, -infinity, nan}) {
       look.maskRadius = radius;
-      EXPECT_TRUE(equalsScalar(look, large));
+      if (!leftOut(n++)) {
+        EXPECT_TRUE(equalsScalar(look, large));
+      }
       EXPECT_TRUE(equalsScalar(look, small));
       EXPECT_TRUE(equalsScalar(look, one));
     }
@@ -136,6 +147,7 @@ TEST(ApplyLook, EqualsTheScalarDefinitionForAnyCurve) {
   const CubicRadialMask mask = maskOf<SummerRGBFilter>();
   const Image<RGBA8Pixel> large = noisePicture(largeWidth, largeHeight, 1);
   const Image<RGBA8Pixel> small = noisePicture(smallWidth, smallHeight, 2);
+  int n = 0;
   std::vector<std::vector<float>> curves = {
       {0.0f, 255.0f},         {255.0f, 0.0f},      {-400.0f, 700.0f},
       {-2e6f, 2e6f, 1.0f},    {-1e30f, 1e30f},     {nan, 255.0f},
@@ -151,7 +163,9 @@ TEST(ApplyLook, EqualsTheScalarDefinitionForAnyCurve) {
     for (Look& look : looksOfEveryMix(vignette)) {
       for (const std::vector<float>& curve : curves) {
         look.curves[1] = LookCurve(curve);
-        EXPECT_TRUE(equalsScalar(look, large)) << curve.size() << " from " << curve[0];
+        if (!leftOut(n++)) {
+          EXPECT_TRUE(equalsScalar(look, large)) << curve.size() << " from " << curve[0];
+        }
         EXPECT_TRUE(equalsScalar(look, small)) << curve.size() << " from " << curve[0];
       }
     }
@@ -161,6 +175,7 @@ TEST(ApplyLook, EqualsTheScalarDefinitionForAnyCurve) {
 TEST(ApplyLook, EqualsTheScalarDefinitionForAnyMask) {
   const Image<RGBA8Pixel> large = noisePicture(largeWidth, largeHeight, 1);
   const Image<RGBA8Pixel> small = noisePicture(smallWidth, smallHeight, 2);
+  int n = 0;
   const std::pair<float, float> ends[] = {{0.0f, 1.0f},   {1.0f, 0.0f}, {-3.0f, 5.0f},
                                           {0.5f, 0.5f},   {nan, 1.0f},  {infinity, 0.0f},
                                           {1e30f, -1e30f}};
@@ -169,7 +184,9 @@ TEST(ApplyLook, EqualsTheScalarDefinitionForAnyMask) {
       const CubicRadialMask mask(edge, centre, count);
       for (Look& look : looksOfEveryMix(&mask)) {
         look.maskRadius = 1.2f;
-        EXPECT_TRUE(equalsScalar(look, large)) << edge << " " << centre << " " << count;
+        if (!leftOut(n++)) {
+          EXPECT_TRUE(equalsScalar(look, large)) << edge << " " << centre << " " << count;
+        }
         EXPECT_TRUE(equalsScalar(look, small)) << edge << " " << centre << " " << count;
       }
     }

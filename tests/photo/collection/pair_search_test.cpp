@@ -8,11 +8,13 @@
 #include "image_processing/dupe/dupe_score.h"
 #include "tests/dupe/synthetic_cdfs.h"
 #include "tests/photo/collection/synthetic_shots.h"
+#include "tests/support/slow_build.h"
 
 namespace pelorin::photo {
 namespace {
 
 using test_support::LibraryKind;
+using test_support::slowBuild;
 using test_support::syntheticShots;
 
 // Every pair, without any thought of time windows. Rounding is monotone, so a pair that fails at
@@ -42,9 +44,10 @@ Shot shotAt(double wallClock, std::optional<double> utc) {
 }
 
 TEST(PairSearch, FindsWhatComparingAllOfThousandsFinds) {
-  const std::vector<Shot> shots = syntheticShots(2500, {.withoutTime = 10, .withoutZone = 200}, 1);
+  constexpr std::uint32_t count = slowBuild ? 500 : 2500;
+  const std::vector<Shot> shots = syntheticShots(count, {.withoutTime = 10, .withoutZone = 200}, 1);
   const std::vector<ShotPair> pairs = findPairs(shots, 0.0f);
-  EXPECT_GT(pairs.size(), 1500u);
+  EXPECT_GT(pairs.size(), count * 3 / 5);
   EXPECT_EQ(pairs, allPairs(shots, 0.0f, /*skipHopeless=*/true));
 }
 
@@ -54,8 +57,9 @@ TEST(PairSearch, FindsWhatComparingAllFindsWhateverTheLibrary) {
     for (const std::uint32_t withoutZone : {0u, 500u, 1000u}) {
       for (const double pause : {0.0, 3.0, 4000.0}) {
         for (const float threshold : {-4.0f, 0.0f, 2.0f, 3.6f, 4.0f}) {
+          if (++seed % 4 != 0 && slowBuild) continue;
           const std::vector<Shot> shots =
-              syntheticShots(60, {pause, withoutTime, withoutZone, 300}, ++seed);
+              syntheticShots(60, {pause, withoutTime, withoutZone, 300}, seed);
           ASSERT_EQ(findPairs(shots, threshold), allPairs(shots, threshold))
               << withoutTime << ' ' << withoutZone << ' ' << pause << ' ' << threshold;
         }
