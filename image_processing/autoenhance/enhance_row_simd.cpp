@@ -17,6 +17,7 @@
 #include "image_processing/core/prefetch.h"
 #include "image_processing/core/simd.h"
 #include "image_processing/core/small_table.h"
+#include "image_processing/core/truncate_small.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace pelorin::image_processing::HWY_NAMESPACE {
@@ -39,6 +40,9 @@ HWY_INLINE F toFloats(I ints) {
 HWY_INLINE F lookUp(const float* table, I index) {
   return hn::GatherIndex(Floats(), table, index);
 }
+
+// Where a gather takes its lanes apart and puts others together, look-ups from memory to memory take less.
+constexpr bool gathersByLane = HWY_TARGET == HWY_WASM;
 
 // Pixels go through four stages in blocks. Each stage is short enough that a processor has several
 // vectors of it in flight, where the whole way would be one long chain; a function of its own
@@ -79,7 +83,7 @@ class ToneMap {
   /// The curve at L from 0 on, less than one sample beyond the last.
   HWY_INLINE F operator()(F L) const {
     const F place = hn::Mul(L, set(perUnit_));
-    const I index = simd::truncate(place);
+    const I index = simd::truncateSmall(place);
     const F fraction = hn::Sub(place, toFloats(index));
     const F upper = simd::SmallTable(tables_.samples + 1)(index);
     const F lower = simd::SmallTable(tables_.samples)(index);
@@ -188,14 +192,26 @@ HWY_NOINLINE void encode(std::size_t count, Block& block) {
     const F X = lab::labToXz(hn::Add(hn::Load(Floats(), block.redness + i), fy));
     const F Y = lab::labToY(L);
     const F Z = lab::labToXz(hn::Sub(fy, hn::Load(Floats(), block.yellowness + i)));
-    const auto encoded = [&](F value) HWY_ATTR {
+    const auto encode = [&](F value, std::int32_t* places, float* channel) HWY_ATTR {
       const F last = set(sRGBSteps - 1);
-      const F place = simd::clampTo(hn::Mul(value, last), hn::Zero(Floats()), last);
-      return lookUp(codes, simd::truncate(place));
+      const F held = simd::clampTo(hn::Mul(value, last), hn::Zero(Floats()), last);
+      const I place = simd::truncateSmall(held);
+      if constexpr (gathersByLane) {
+        hn::Store(place, Ints(), places + i);
+      } else {
+        hn::Store(lookUp(codes, place), Floats(), channel + i);
+      }
     };
-    hn::Store(encoded(product(redOfXyz, X, Y, Z)), Floats(), block.r + i);
-    hn::Store(encoded(product(greenOfXyz, X, Y, Z)), Floats(), block.g + i);
-    hn::Store(encoded(product(blueOfXyz, X, Y, Z)), Floats(), block.b + i);
+    encode(product(redOfXyz, X, Y, Z), block.xStep, block.r);
+    encode(product(greenOfXyz, X, Y, Z), block.yStep, block.g);
+    encode(product(blueOfXyz, X, Y, Z), block.zStep, block.b);
+  }
+  if constexpr (gathersByLane) {
+    for (std::size_t i = 0; i < count; ++i) {
+      block.r[i] = codes[block.xStep[i]];
+      block.g[i] = codes[block.yStep[i]];
+      block.b[i] = codes[block.zStep[i]];
+    }
   }
 }
 
@@ -209,7 +225,7 @@ HWY_NOINLINE void finish(float vibrance, const RGBA8Pixel* in, RGBA8Pixel* out, 
     F b = hn::Load(Floats(), block.b + i);
     vibranceInRGB(vibrance, r, g, b);
     const auto code = [](F channel)
-                          HWY_ATTR { return hn::BitCast(Words(), simd::truncate(channel)); };
+                          HWY_ATTR { return hn::BitCast(Words(), simd::truncateSmall(channel)); };
     const auto pixels = hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(in + i));
     const auto alpha = hn::And(pixels, hn::Set(Words(), 0xFF000000u));
     const auto red = code(r), green = hn::ShiftLeft<8>(code(g)), blue = hn::ShiftLeft<16>(code(b));
