@@ -9,6 +9,10 @@ namespace {
 
 constexpr std::uint8_t startOfImage = 0xD8, endOfImage = 0xD9, startOfScan = 0xDA;
 
+bool hasStartMark(std::span<const std::uint8_t> bytes) {
+  return bytes.size() >= 2 && bytes[0] == 0xFF && bytes[1] == startOfImage;
+}
+
 bool isBare(std::uint8_t marker) {
   return marker == 0x01 || (marker >= 0xD0 && marker <= startOfImage);
 }
@@ -30,7 +34,7 @@ std::size_t nextMarker(std::span<const std::uint8_t> bytes, std::size_t at) {
 }  // namespace
 
 std::size_t jpegEnd(std::span<const std::uint8_t> bytes) {
-  if (bytes.size() < 2 || bytes[0] != 0xFF || bytes[1] != startOfImage) return 0;
+  if (!hasStartMark(bytes)) return 0;
   std::size_t at = 2;
   while ((at = nextMarker(bytes, at)) < bytes.size()) {
     const std::uint8_t marker = bytes[at + 1];
@@ -43,7 +47,7 @@ std::size_t jpegEnd(std::span<const std::uint8_t> bytes) {
 
 std::uint64_t jpegEndIn(const FileView& file) {
   if (file.rest == nullptr) return jpegEnd(file.bytes);
-  if (jpegEnd(file.bytes) == 0) return 0;
+  if (!hasStartMark(file.bytes)) return 0;
   constexpr std::uint64_t windowSize = std::uint64_t{1} << 18;
   constexpr std::size_t markerAndLength = 4;
   const std::uint64_t size = file.size();
@@ -75,7 +79,7 @@ std::uint64_t jpegEndIn(const FileView& file) {
 }
 
 bool beginsPlainJpeg(std::span<const std::uint8_t> bytes) {
-  if (jpegEnd(bytes) == 0) return false;
+  if (!hasStartMark(bytes)) return false;
   constexpr std::uint8_t baseline = 0xC0, extended = 0xC1, huffmanTables = 0xC4, lastFrame = 0xCF;
   constexpr std::size_t channelsPlace = 9;  // in a frame
   std::uint8_t channels = 0;
