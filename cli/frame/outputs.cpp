@@ -39,12 +39,17 @@ std::string fillIn(const std::string& name, const std::map<std::string, std::str
   return filled;
 }
 
+// Whether it is a folder; false when there is nothing.
+bool isFolder(const fs::path& folder) {
+  std::error_code failed, ignored;
+  if (fs::is_directory(folder, failed)) return true;
+  if (!fs::exists(folder, ignored)) return false;
+  if (failed) throw std::system_error(failed, folder.string());
+  throw UsageError(folder.string() + ": is not a folder; choose another output");
+}
+
 void requireFolder(const fs::path& folder) {
-  std::error_code ignored;
-  if (fs::is_directory(folder, ignored)) return;
-  if (fs::exists(folder, ignored)) {
-    throw UsageError(folder.string() + ": is not a folder; choose another output");
-  }
+  if (isFolder(folder)) return;
   throw UsageError(folder.string() + ": there is no such folder; make it first (mkdir -p)");
 }
 
@@ -92,11 +97,7 @@ void refuseClashes(const std::vector<PlannedFile>& plan, const InputOptions& nam
 }
 
 void requireFolderOrNothing(const std::string& output, bool endsInSlash) {
-  std::error_code ignored;
-  if (fs::is_directory(output, ignored)) return;
-  if (fs::exists(output, ignored)) {
-    throw UsageError(output + ": is not a folder; choose another output");
-  }
+  if (isFolder(output)) return;
   if (!endsInSlash && photo::isPictureExtension(fs::path(output).extension().string())) {
     throw UsageError(output + ": is called like one picture; several need a folder (" + output +
                      "/ would be one)");

@@ -135,6 +135,16 @@ TEST(JpegEnd, IsTheSameWhereverTheBytesAre) {
   EXPECT_GT(ended, 5);
 }
 
+TEST(JpegEnd, IsSeenAtTheEndOfWhatIsReadAtOnce) {
+  constexpr std::size_t end = 2 + (1 << 18);
+  Bytes bytes(end + 20, 0x55);
+  bytes[0] = 0xFF, bytes[1] = 0xD8;
+  bytes[end - 4] = 0xFF, bytes[end - 3] = 0;
+  bytes[end - 2] = 0xFF, bytes[end - 1] = 0xD9;
+  Kept rest(bytes, 100);
+  EXPECT_EQ(jpegEndIn(FileView(std::span<const std::uint8_t>(bytes).first(100), &rest)), end);
+}
+
 TEST(LongFile, IsPartlyReadAndGivesTheResultOfAllOfItInMemory) {
   const TemporaryFolder folder;
   folder.write("large.jpg", largePhoto());
