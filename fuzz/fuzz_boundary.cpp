@@ -68,7 +68,9 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
                                           : FakeEnvironment::Failure::withoutException;
     env.failCall((what & 128) != 0 ? 1 + bytes.next() % 6 : 0, failure);
     FakeBitmap& bitmap = bitmaps[bytes.next() % std::size(bitmaps)];
-    bitmap.heightOnceLocked = (what & 32) != 0 ? bytes.next() % 40 : 0;
+    const std::size_t mostRows = bitmap.bytes.size() / bitmap.info.stride;
+    bitmap.heightOnceLocked =
+        (what & 32) != 0 ? static_cast<std::uint32_t>(bytes.next() % (mostRows + 1)) : 0;
     const std::uint8_t which = bytes.next();
     const jlong handle = which > 250 ? bytes.next<jlong>() : handles[which % handles.size()];
     switch (what % 5) {
