@@ -254,8 +254,15 @@ def test_touch(page):
             {"x": x, "y": y, "id": i} for i, (x, y) in enumerate(points)]})
 
     def box(selector):
-        return page.run("const b = document.querySelector(arguments[0]).getBoundingClientRect();"
-                        "return [b.left, b.top, b.width, b.height]", selector)
+        """Where it is, once it stays there: what a finger or another size of the window moves comes a little later."""
+        before = None
+        while True:
+            now = page.run("const b = document.querySelector(arguments[0]).getBoundingClientRect();"
+                           "return [b.left, b.top, b.width, b.height]", selector)
+            if now == before:
+                return now
+            before = now
+            time.sleep(0.1)
 
     left, top, width, height = box("#divider")
     divider = (left + width / 2, top + height / 2)
@@ -263,7 +270,8 @@ def test_touch(page):
     touch("touchStart", divider)
     touch("touchMove", (divider[0] - 80, divider[1]))
     touch("touchEnd")
-    assert page.run("return Number(document.querySelector('#divider').getAttribute('aria-valuenow'))") < share
+    page.wait_until("return Number(document.querySelector('#divider').getAttribute('aria-valuenow')) < arguments[0]",
+                    share)
 
     left, top, width, height = box("#stage")
     x, y = left + width / 2, top + height / 2
