@@ -60,6 +60,7 @@ using pelorin::test_support::counted;
 using pelorin::test_support::mayAllocate;
 using pelorin::test_support::uncount;
 
+#pragma GCC visibility push(default)  // what is hidden takes nobody's place
 #if defined(PELORIN_SANITIZED)
 
 void* operator new(std::size_t size) {
@@ -83,11 +84,10 @@ void operator delete(void* block) noexcept {
 void operator delete[](void* block) noexcept {
   operator delete(block);
 }
-// Which clang hides when it is told to hide all that it does not declare itself.
-__attribute__((visibility("default"))) void operator delete(void* block, std::size_t) noexcept {
+void operator delete(void* block, std::size_t) noexcept {
   operator delete(block);
 }
-__attribute__((visibility("default"))) void operator delete[](void* block, std::size_t) noexcept {
+void operator delete[](void* block, std::size_t) noexcept {
   operator delete(block);
 }
 
@@ -145,3 +145,4 @@ void free(void* block) {
 }
 
 #endif
+#pragma GCC visibility pop

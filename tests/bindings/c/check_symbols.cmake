@@ -29,7 +29,7 @@ endmacro()
 run(defined ${NM} -D --defined-only ${LIBRARY})
 foreach(line IN LISTS defined)
   string(REGEX REPLACE "^[0-9a-f]+ . " "" name "${line}")
-  if(name MATCHES "^QUENBY_${abi}(_[0-9]+)?$")
+  if(name MATCHES "^QUENBY_${abi}(_[0-9]+)?(@@|$)") # a version itself, as one nm or the other writes it
     continue()
   endif()
   string(REGEX REPLACE "@@QUENBY_${abi}(_[0-9]+)?$" "" plain "${name}")
