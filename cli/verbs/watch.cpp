@@ -135,17 +135,25 @@ class Watch {
     troubled_ = 0;
     for (Input& input : expandInputs(below)) {
       if (isResult(input.path)) continue;
+      const auto stamp = photo::stampOf(input.path);
+      if (input.trouble.empty() && !stamp && !isGone(input.path)) {
+        input.trouble = "its size and time cannot be read";
+      }
       if (!input.trouble.empty()) {
         if (told_.insert(input.path).second) talk_.error(input.shownName(), input.trouble);
         ++troubled_;
         continue;
       }
-      const auto stamp = photo::stampOf(input.path);
       if (!stamp || isDone(input.path, *stamp)) continue;
       if (settling_.isComplete(input.path, *stamp, now)) complete.emplace_back(input, *stamp);
     }
     settling_.forgetAllBut(now);
     return complete;
+  }
+
+  static bool isGone(const std::string& path) {
+    std::error_code failed;
+    return !fs::exists(path, failed) && !failed;
   }
 
   bool isResult(const fs::path& path) const {
