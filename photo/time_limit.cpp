@@ -7,6 +7,14 @@ namespace pelorin::photo {
 
 using std::chrono::milliseconds;
 
+#ifdef __EMSCRIPTEN__
+TimeLimit::TimeLimit(milliseconds most, std::stop_token outer)
+    : end_(std::chrono::steady_clock::now() +
+           std::min<milliseconds>(most, std::chrono::years(100))),
+      source_(end_, outer) {}
+
+TimeLimit::~TimeLimit() = default;
+#else
 TimeLimit::TimeLimit(milliseconds most, std::stop_token outer)
     : watcher_([this, most, outer = std::move(outer)] { watch(most, outer); }) {}
 
@@ -36,5 +44,6 @@ void TimeLimit::watch(milliseconds most, const std::stop_token& outer) {
   passed_ = !outer.stop_requested();
   source_.request_stop();
 }
+#endif
 
 }  // namespace pelorin::photo

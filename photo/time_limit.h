@@ -10,7 +10,8 @@
 namespace pelorin::photo {
 
 /// Stops work that takes too long: its token says stop once the time is over, or when another token does.
-/// What is at work notices between two of its steps. Runs a thread of its own.
+/// What is at work notices between two of its steps. Runs a thread of its own, but in WebAssembly, which has one
+/// alone and whose tokens look at the clock themselves.
 class TimeLimit {
  public:
   /// Counts from here on.
@@ -23,9 +24,21 @@ class TimeLimit {
 
   std::stop_token token() const { return source_.get_token(); }
   /// Whether the time was over before this was destroyed.
-  bool passed() const { return passed_; }
+#ifdef __EMSCRIPTEN__
+  bool passed() const {
+    return std::chrono::steady_clock::now() >= end_;
+  }
+#else
+  bool passed() const {
+    return passed_;
+  }
+#endif
 
  private:
+#ifdef __EMSCRIPTEN__
+  std::chrono::steady_clock::time_point end_;
+  std::stop_source source_;
+#else
   void watch(std::chrono::milliseconds most, const std::stop_token& outer);
 
   std::stop_source source_;
@@ -34,6 +47,7 @@ class TimeLimit {
   std::condition_variable end_;
   bool ended_ = false;
   std::thread watcher_;  // last, so that it finds all else
+#endif
 };
 
 }  // namespace pelorin::photo

@@ -143,6 +143,32 @@ test("too little memory is an error, and the next photo works", () => {
   assert.equal(simd.open(photo("twenty/plain.jpg")).width, 203);
 });
 
+test("what takes too long is given up, and the module lives on", () => {
+  const { simd } = builds;
+  const file = photo("large.jpg");
+  const slow = { kind: "cancelled", message: "was given up after 0 ms" };
+  const opened = simd.open(file, { timeout: 60_000 });
+  const session = opened.session();
+  const pixels = session.setSlider(0.3).slice();
+  for (const call of [
+    () => simd.open(file, { timeout: 0 }), () => simd.shot(file, { timeout: 0 }),
+    () => simd.filterFile(file, "AE0", { slider: 1 }, { timeout: 0 }),
+    () => simd.write(opened, "PNG", { timeout: 0 }), () => opened.save({ timeout: 0 }),
+    () => session.setSlider(0.9, { timeout: 0 }), () => session.look("ZebraBW", "", { timeout: 0 }),
+    () => simd.duplicates([simd.shot(file), simd.shot(file)], 0, { timeout: 0 }),
+  ]) assert.throws(call, slow, String(call));
+  // Some dozen milliseconds' work, so on the way.
+  assert.throws(() => simd.filterFile(file, "AE0", { slider: 1 }, { timeout: 1 }), { kind: "cancelled" });
+  assert.deepEqual(simd.filterFile(file, "AE0", { slider: 1 }, { timeout: 60_000 }),
+    simd.filterFile(file, "AE0", { slider: 1 }));
+  assert.deepEqual(session.setSlider(0.3, { timeout: 60_000 }), pixels);
+  for (const wrong of [-1, NaN, 2 ** 32]) {
+    assert.throws(() => simd.open(file, { timeout: wrong }), { kind: "invalid-argument" });
+  }
+  session.close();
+  opened.close();
+});
+
 test("a package is what npm packs", () => {
   const packed = spawnSync("npm", ["pack", "--dry-run", "--json"], { cwd: PACKAGE, encoding: "utf8" });
   const files = JSON.parse(packed.stdout)[0].files.map(({ path }) => path);

@@ -5,9 +5,9 @@ import { QuenbyWorker } from "quenby/client";
 export async function enhance(file: Uint8Array): Promise<SavedFile> {
   const quenby: Quenby = await load({ build: bestBuild() });
   const faces: Face[] = [{ left: 0.1, top: 0.1, right: 0.3, bottom: 0.4 }];
-  const photo = quenby.open(file, { scale: 2, maxPixels: 1e8 });
+  const photo = quenby.open(file, { scale: 2, maxPixels: 1e8, timeout: 5000 });
   const session = photo.session(faces);
-  const pixels: Uint8ClampedArray = session.setSlider(0.4);
+  const pixels: Uint8ClampedArray = session.setSlider(0.4, { timeout: 100 });
   session.look("WinterRGB", { applyMask: true });
   session.apply("AE0", parameterText({ slider: 0.4 }));
   const score: number | null = quenby.score({ data: pixels, width: session.width, height: session.height });

@@ -69,6 +69,13 @@ export interface Facts {
   lastEdit: string;
 }
 
+/** What may take long can be limited. A call that is given up throws a `QuenbyError` of kind "cancelled" and
+ * leaves everything as it was but a session's pixels; steps that have begun are ended first. */
+export interface Timed {
+  /** Milliseconds, of this call. */
+  timeout?: number;
+}
+
 export interface OpenOptions {
   /** 1, 2, 4 or 8: what the sides are divided by, rounded up. */
   scale?: 1 | 2 | 4 | 8;
@@ -148,21 +155,21 @@ export class Quenby {
   /** What a file says, without decoding it. */
   facts(file: Uint8Array): Facts;
   /** Decodes a JPEG or PNG file and turns the picture upright. */
-  open(file: Uint8Array, options?: OpenOptions): Photo;
+  open(file: Uint8Array, options?: OpenOptions & Timed): Photo;
   /** A session on pixels, which are copied. */
   session(picture: Picture, faces?: Face[]): Session;
   /** The file that `quenby enhance` and `quenby look` make. It goes by rows: hardly more memory than the
    *  two files and 128 MiB, whatever the size of the photo. */
-  filterFile(file: Uint8Array, filter: string, parameters?: Parameters, options?: {
+  filterFile(file: Uint8Array, filter: string, parameters?: Parameters, options?: Timed & {
     faces?: Face[]; open?: OpenOptions; format?: "JPEG" | "PNG"; save?: SaveOptions;
   }): SavedFile;
   /** A file with a picture and no metadata. */
-  write(picture: Picture, format?: "JPEG" | "PNG", save?: SaveOptions): SavedFile;
+  write(picture: Picture, format?: "JPEG" | "PNG", save?: SaveOptions & Timed): SavedFile;
   /** NIQE: lower is better; null below 96 pixels a side. */
   score(picture: Picture): number | null;
-  shot(file: Uint8Array): Shot;
+  shot(file: Uint8Array, options?: Timed): Shot;
   /** For each shot the place of the first of its group, its own where it is in none. */
-  duplicates(shots: Shot[], threshold?: number): number[];
+  duplicates(shots: Shot[], threshold?: number, options?: Timed): number[];
   /** The table of `quenby selftest`. */
   selftest(): string;
 }
@@ -181,7 +188,7 @@ export class Photo {
   /** @param faces  beside those that the file knows of. */
   session(faces?: Face[]): Session;
   /** A file with this or another picture of the same size, and the photo's metadata. */
-  save(options?: SaveOptions & { picture?: Picture; format?: "JPEG" | "PNG" }): SavedFile;
+  save(options?: SaveOptions & Timed & { picture?: Picture; format?: "JPEG" | "PNG" }): SavedFile;
   score(): number | null;
   close(): void;
 }
@@ -193,10 +200,10 @@ export class Session {
   readonly height: number;
   /** Applies a filter to the picture as it was opened. The result is the module's own memory, which the
    *  next application writes again: copy it before anything else is called. */
-  apply(filter: string, parameters?: Parameters): Uint8ClampedArray;
+  apply(filter: string, parameters?: Parameters, options?: Timed): Uint8ClampedArray;
   /** Auto-enhance. @param slider  0 to 1. */
-  setSlider(slider: number): Uint8ClampedArray;
-  look(name: string, parameters?: Parameters): Uint8ClampedArray;
+  setSlider(slider: number, options?: Timed): Uint8ClampedArray;
+  look(name: string, parameters?: Parameters, options?: Timed): Uint8ClampedArray;
   /** Of what was applied last. */
   score(): number | null;
   close(): void;

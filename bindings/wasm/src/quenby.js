@@ -189,6 +189,23 @@ export class Quenby {
     });
   }
 
+  // What a call gets that may take `timeout` milliseconds: an object that ends it, null without a limit.
+  timed(timeout, body) {
+    if (timeout === undefined) return body(0);
+    if (!(timeout >= 0 && timeout < 2 ** 32 - 1)) {
+      throw new QuenbyError("invalid-argument", "timeout: is not 0 to 4294967294 milliseconds");
+    }
+    const cancel = this.receive("quenby_cancel_new_after", Math.ceil(timeout));
+    try {
+      return body(cancel);
+    } catch (error) {
+      if (error.kind !== "cancelled") throw error;
+      throw new QuenbyError(error.kind, `was given up after ${timeout} ms`);
+    } finally {
+      this.module._quenby_cancel_free(cancel);
+    }
+  }
+
   filters() {
     const kindNames = ["number", "boolean", "numbers"];
     return Array.from({ length: this.receive("quenby_filter_count") }, (_, index) => {
@@ -216,9 +233,10 @@ export class Quenby {
       this.receiveStruct(layout.Facts, "quenby_read_facts", scope.bytes(file), file.length)));
   }
 
-  open(file, options) {
-    return this.scoped((scope) => new Photo(this, this.receive("quenby_photo_open", scope.bytes(file),
-      file.length, scope.struct(layout.OpenOptions, openValues(options)), 0)));
+  open(file, options = {}) {
+    return this.scoped((scope) => this.timed(options.timeout, (cancel) =>
+      new Photo(this, this.receive("quenby_photo_open", scope.bytes(file), file.length,
+        scope.struct(layout.OpenOptions, openValues(options)), cancel))));
   }
 
   session(picture, faces = []) {
@@ -238,18 +256,18 @@ export class Quenby {
       { rgba: scope.bytes(data), width, height, stride: 4 * width });
   }
 
-  filterFile(file, filter, parameters, { faces = [], open, format, save } = {}) {
-    return this.scoped((scope) => this.takeFile(this.receive("quenby_filter_file", scope.bytes(file),
-      file.length, scope.text(filter), scope.text(parameterText(parameters)),
-      scope.array(layout.Face, faces.map(faceValues)), faces.length,
-      scope.struct(layout.OpenOptions, openValues(open)), format ? scope.text(format) : 0,
-      scope.struct(layout.SaveOptions, saveValues(save)), 0)));
+  filterFile(file, filter, parameters, { faces = [], open, format, save, timeout } = {}) {
+    return this.scoped((scope) => this.timed(timeout, (cancel) =>
+      this.takeFile(this.receive("quenby_filter_file", scope.bytes(file), file.length, scope.text(filter),
+        scope.text(parameterText(parameters)), scope.array(layout.Face, faces.map(faceValues)), faces.length,
+        scope.struct(layout.OpenOptions, openValues(open)), format ? scope.text(format) : 0,
+        scope.struct(layout.SaveOptions, saveValues(save)), cancel))));
   }
 
   write(picture, format = "JPEG", save = {}) {
-    return this.scoped((scope) => this.takeFile(this.receive("quenby_write",
-      this.pixels(scope, picture), scope.text(format),
-      scope.struct(layout.SaveOptions, saveValues(save)), 0)));
+    return this.scoped((scope) => this.timed(save.timeout, (cancel) =>
+      this.takeFile(this.receive("quenby_write", this.pixels(scope, picture), scope.text(format),
+        scope.struct(layout.SaveOptions, saveValues(save)), cancel))));
   }
 
   // The bytes of a quenby_file, which is freed.
@@ -278,19 +296,20 @@ export class Quenby {
     });
   }
 
-  shot(file) {
-    return this.scoped((scope) => {
+  shot(file, { timeout } = {}) {
+    return this.scoped((scope) => this.timed(timeout, (cancel) => {
       const { reserved, ...shot } = this.receiveStruct(layout.Shot, "quenby_read_shot",
-        scope.bytes(file), file.length, 0, 0);
+        scope.bytes(file), file.length, 0, cancel);
       return shot;
-    });
+    }));
   }
 
   /** @returns for each shot the index of the first of its group, its own where it is in none. */
-  duplicates(shots, threshold = 1.5) {
+  duplicates(shots, threshold = 1.5, { timeout } = {}) {
     return this.scoped((scope) => {
       const list = scope.struct(layout.List);
-      this.call("quenby_find_pairs", scope.array(layout.Shot, shots), shots.length, threshold, 0, list);
+      this.timed(timeout, (cancel) => this.call("quenby_find_pairs", scope.array(layout.Shot, shots),
+        shots.length, threshold, cancel, list));
       const { data, count } = layout.List.read(this.bytes, list);
       try {
         const firstOf = scope.allocate(8 * shots.length);
@@ -362,9 +381,10 @@ export class Photo extends Held {
 
   save({ picture, format, ...save } = {}) {
     const { quenby } = this;
-    return quenby.scoped((scope) => quenby.takeFile(quenby.receive("quenby_photo_save", this.handle,
-      picture ? quenby.pixels(scope, picture) : 0, format ? scope.text(format) : 0,
-      scope.struct(layout.SaveOptions, saveValues(save)), 0)));
+    return quenby.scoped((scope) => quenby.timed(save.timeout, (cancel) =>
+      quenby.takeFile(quenby.receive("quenby_photo_save", this.handle,
+        picture ? quenby.pixels(scope, picture) : 0, format ? scope.text(format) : 0,
+        scope.struct(layout.SaveOptions, saveValues(save)), cancel))));
   }
 
   score() {
@@ -383,22 +403,23 @@ export class Session extends Held {
 
   /** Applies a filter to the picture as it was opened. @returns the module's own memory, which the next
    *  application writes again: to be copied before anything else is called. */
-  apply(filter, parameters) {
+  apply(filter, parameters, { timeout } = {}) {
     const { quenby, handle } = this;
     const size = 4 * this.width * this.height;
     if (this.output === 0) this.output = quenby.malloc(size);
     if (this.output === 0) throw new QuenbyError("out-of-memory", "not enough memory");
-    quenby.scoped((scope) => quenby.call("quenby_session_apply", handle, scope.text(filter),
-      scope.text(parameterText(parameters)), this.output, 4 * this.width, 0));
+    quenby.scoped((scope) => quenby.timed(timeout, (cancel) =>
+      quenby.call("quenby_session_apply", handle, scope.text(filter), scope.text(parameterText(parameters)),
+        this.output, 4 * this.width, cancel)));
     return new Uint8ClampedArray(quenby.bytes.buffer, this.output, size);
   }
 
-  setSlider(slider) {
-    return this.apply("AE0", { slider });
+  setSlider(slider, options) {
+    return this.apply("AE0", { slider }, options);
   }
 
-  look(name, parameters) {
-    return this.apply(name, parameters);
+  look(name, parameters, options) {
+    return this.apply(name, parameters, options);
   }
 
   /** The NIQE score of what was applied last. */
