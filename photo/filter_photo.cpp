@@ -97,9 +97,12 @@ FilteredPhoto filterPhoto(const FileView& file, const FilterRequest& request, co
     if (!done) throw Stopped();
   };
 
-  const bool asksAlpha = format->keepsAlpha && photo.facts().hasAlpha;
-  const bool hasAlpha =
-      asksAlpha && !isOpaque(photo.picture().data.get(), photo.picture().pixelCount());
+  // Filters copy it.
+  const auto isTransparent = [&] {
+    const Image<RGBA8Pixel>& picture = photo.picture();
+    return !isOpaque(picture.data.get(), picture.pixelCount());
+  };
+  const bool hasAlpha = photo.facts().hasAlpha && (!format->keepsAlpha || isTransparent());
   if (filter->looksFirst()) stopUnless(filter->look(photo.sweep(/*again=*/true), work));
 
   SaveOptions save = request.save;

@@ -65,7 +65,7 @@ std::vector<std::uint8_t> save(const Image<RGBA8Pixel>& picture, const Format& f
                                const Metadata& metadata, const SaveOptions& options,
                                std::vector<Loss>* lost) {
   stopIfAsked(options.stop);
-  const bool alpha = format.keepsAlpha && !isOpaque(picture.data.get(), picture.pixelCount());
+  const bool alpha = !format.keepsAlpha || !isOpaque(picture.data.get(), picture.pixelCount());
   PhotoWriter writer({picture.width, picture.height}, format, alpha, metadata, options);
   for (std::uint32_t y = 0; y < picture.height;) {
     const std::uint32_t count = std::min(picture.height - y, rowsAtOnce);

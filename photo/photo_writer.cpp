@@ -29,7 +29,8 @@ PhotoWriter::PhotoWriter(PictureSize size, const Format& format, bool hasAlpha,
       metadata_(metadata),
       options_(std::move(options)),
       thumbnails_(size),
-      writer_(format.writer(size, hasAlpha, options_, metadata)) {
+      writer_(format.writer(size, hasAlpha, options_, metadata)),
+      asksAlpha_(hasAlpha && !format.keepsAlpha) {
   expectThumbnails(thumbnails_, size, metadata, options_.keep);
 }
 
@@ -37,8 +38,9 @@ void PhotoWriter::write(const RGBA8Pixel* rows, std::uint32_t count) {
   writer_->write(rows, count);
   // Behind the writer, while the rows are near: memory would take longer than the looking.
   thumbnails_.addRows(rows, count);
-  if (!format_.keepsAlpha) {
-    opaque_ = isOpaque(rows, std::size_t{count} * size_.width) && opaque_;
+  if (asksAlpha_ && !isOpaque(rows, std::size_t{count} * size_.width)) {
+    losesAlpha_ = true;
+    asksAlpha_ = false;
   }
 }
 
@@ -51,7 +53,7 @@ std::vector<std::uint8_t> PhotoWriter::finish(std::vector<Loss>* lost) {
     kept.lost.push_back({"colour profile", "is for grey, and the result is in colour"});
   }
   std::vector<std::uint8_t> file = writer_->finish(kept);
-  if (!opaque_)
+  if (losesAlpha_)
     kept.lost.push_back({"transparency", "a " + std::string(format_.name) + " file has none"});
   if (lost != nullptr) *lost = std::move(kept.lost);
   stopIfAsked(options_.stop);

@@ -20,7 +20,8 @@ bool isOpaque(const image_processing::RGBA8Pixel* pixels, std::size_t count);
 /// For one thread.
 class PhotoWriter {
  public:
-  /// @param hasAlpha  whether any pixel is not opaque, where the format keeps that.
+  /// @param hasAlpha  whether any pixel is not opaque; where the format does not keep that, whether one
+  ///                  may be, to tell the loss.
   /// @param metadata  outlives this.
   /// @throws PhotoError when the format cannot hold such a picture; std::bad_alloc.
   PhotoWriter(PictureSize size, const Format& format, bool hasAlpha, const Metadata& metadata,
@@ -41,7 +42,8 @@ class PhotoWriter {
   SaveOptions options_;
   ThumbnailMaker thumbnails_;
   std::unique_ptr<RowWriter> writer_;
-  bool opaque_ = true;
+  bool asksAlpha_;
+  bool losesAlpha_ = false;
 };
 
 }  // namespace pelorin::photo

@@ -104,7 +104,7 @@ class EnhanceRows : public RowFilter {
     Workers* const workers = work.workers;
     const std::size_t parts = tasksFor(workers);
     const int steps =
-        workers == nullptr ? 1 : std::max(1, static_cast<int>(work.bandHeight / sumRowsAtOnce));
+        parts == 1 ? 1 : std::max(1, static_cast<int>(work.bandHeight / sumRowsAtOnce));
     // The steps that may be under way from one stage to another, those stages' own included.
     const auto stepsOver = [&](std::size_t stages) {
       return steps * static_cast<int>(bandsUnderWay(stages, workers));

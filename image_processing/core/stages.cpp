@@ -18,7 +18,7 @@ bool runStages(std::int64_t bands, std::initializer_list<Stage> stages, Workers*
                const std::function<bool()>& stop) {
   const auto last = static_cast<std::int64_t>(stages.size()) - 1;
   // Bands between a stage and the next one.
-  const std::int64_t lag = workers == nullptr ? 0 : 1;
+  const std::int64_t lag = bandsUnderWay(2, workers) - 1;
   std::vector<StageTask> now;
   for (std::int64_t step = 0; bands > 0 && step < bands + last * lag; ++step) {
     if (stop && stop()) return false;
@@ -30,11 +30,11 @@ bool runStages(std::int64_t bands, std::initializer_list<Stage> stages, Workers*
       }
       band -= lag;
     }
-    if (workers != nullptr) {
+    if (lag > 0) {
       std::stable_partition(now.begin(), now.end(),
                             [](const StageTask& task) { return task.stage->tasks == 1; });
     }
-    runTasks(workers, now.size(),
+    runTasks(lag > 0 ? workers : nullptr, now.size(),
              [&](std::size_t i) { now[i].stage->work(now[i].band, now[i].task); });
   }
   return true;

@@ -20,7 +20,7 @@ struct Stage {
 /// How many bands are under way at once: the first stage has one of them when the last has the one
 /// that came so much earlier, less one.
 inline std::int64_t bandsUnderWay(std::size_t stages, const Workers* workers) {
-  return workers == nullptr ? 1 : static_cast<std::int64_t>(stages);
+  return tasksFor(workers) == 1 ? 1 : static_cast<std::int64_t>(stages);
 }
 
 /// Rows of a band that is worth sharing among workers: few, so that they stay near the processor,
@@ -31,8 +31,8 @@ inline std::uint32_t sharedBandHeight(std::uint32_t width, std::uint32_t height)
   return std::max(rows / step * step, step);
 }
 
-/// Takes bands 0 ... `bands` - 1 through all stages. With workers every stage is at work on another
-/// band at the same time, without them a band is done before the next one begins.
+/// Takes bands 0 ... `bands` - 1 through all stages. With several workers every stage is at work on
+/// another band at the same time, else a band is done, on this thread, before the next one begins.
 /// @param stop  asked before each step whether to give up; may be empty.
 /// @returns false when it gave up.
 /// @throws what a stage throws, and what the workers do; std::bad_alloc.

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <functional>
 
 #include "image_processing/filters/mapped_rows.h"
 
@@ -32,8 +33,17 @@ void PassThrough::init(const std::string&) {}
 void PassThrough::applyConfig(const std::string&, const FilterConfig&, Image<RGBA8Pixel>& output) {
   const Image<RGBA8Pixel>& source = *state->image;
   if (output.data == source.data) return;
-  std::memmove(output.data.get(), source.data.get(),
-               std::min(source.byteSize(), output.byteSize()));
+  const std::size_t bytes = std::min(source.byteSize(), output.byteSize());
+  const auto* const from = reinterpret_cast<const std::uint8_t*>(source.data.get());
+  auto* const to = reinterpret_cast<std::uint8_t*>(output.data.get());
+  const std::less<const std::uint8_t*> isBelow;
+  const bool overlap = isBelow(from, to + bytes) && isBelow(to, from + bytes);
+  const std::size_t parts = overlap ? 1 : tasksFor(state->workers);
+  runTasks(state->workers, parts, [&](std::size_t part) {
+    const auto first = static_cast<std::size_t>(partStart(bytes, part, parts));
+    const auto end = static_cast<std::size_t>(partStart(bytes, part + 1, parts));
+    std::memmove(to + first, from + first, end - first);
+  });
 }
 
 }  // namespace pelorin::image_processing

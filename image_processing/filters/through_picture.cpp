@@ -3,11 +3,34 @@
 #include <algorithm>
 #include <utility>
 
+#include "image_processing/core/work_stopped.h"
+
 namespace pelorin::image_processing {
 namespace {
 
 using MakeFilter =
     std::function<std::unique_ptr<AbstractFilter>(std::shared_ptr<FilteredImageState>&)>;
+
+// That a filter divides its work into, to be asked between them.
+constexpr std::size_t leastTasks = 16;
+
+/// Workers that leave a filter's work where it is to be given up.
+class AskingWorkers : public Workers {
+ public:
+  explicit AskingWorkers(const RowWork& work) : work_(work) {}
+
+  std::size_t count() const override { return std::max(tasksFor(work_.workers), leastTasks); }
+
+  void run(std::size_t tasks, const Task& task) override {
+    runTasks(work_.workers, tasks, [&](std::size_t i) {
+      if (shallStop(work_)) throw WorkStopped();
+      task(i);
+    });
+  }
+
+ private:
+  const RowWork& work_;
+};
 
 class ThroughPicture : public RowFilter {
  public:
@@ -29,11 +52,16 @@ class ThroughPicture : public RowFilter {
     };
     if (!forEachBand(collect)) return false;
 
-    auto state = std::make_shared<FilteredImageState>(
-        FilteredImageState{picture, request_.metadata, "", request_.config, work.workers});
+    AskingWorkers asking(work);
+    auto state = std::make_shared<FilteredImageState>(FilteredImageState{
+        picture, request_.metadata, "", request_.config, work.stop ? &asking : work.workers});
     const std::unique_ptr<AbstractFilter> filter = makeFilter_(state);
-    filter->init(request_.params);
-    filter->applyConfig(request_.params, request_.config, *picture);
+    try {
+      filter->init(request_.params);
+      filter->applyConfig(request_.params, request_.config, *picture);
+    } catch (const WorkStopped&) {
+      return false;
+    }
     return forEachBand([&](RGBA8Pixel* from, std::uint32_t count) { filtered.write(from, count); });
   }
 

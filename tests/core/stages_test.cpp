@@ -32,15 +32,23 @@ TEST(SharedBandHeight, IsAMultipleOf16) {
   EXPECT_EQ(sharedBandHeight(0, 0), 16u);
 }
 
-TEST(RunStages, WithoutWorkersTakesEachBandThroughAllStages) {
+TEST(RunStages, WithNoWorkersOrOneTakesEachBandThroughAllStages) {
+  struct One : Workers {
+    std::size_t count() const override { return 1; }
+    void run(std::size_t, const Task&) override { ADD_FAILURE() << "has nothing to share"; }
+  } one;
   std::vector<int> done;
   const auto note = [&](int stage) {
     return [&done, stage](std::int64_t band, std::size_t task) {
       done.push_back(100 * static_cast<int>(band) + 10 * stage + static_cast<int>(task));
     };
   };
-  EXPECT_TRUE(runStages(2, {{1, note(0)}, {2, note(1)}, {1, note(2)}}, nullptr));
-  EXPECT_EQ(done, (std::vector{0, 10, 11, 20, 100, 110, 111, 120}));
+  for (Workers* const workers : {static_cast<Workers*>(nullptr), static_cast<Workers*>(&one)}) {
+    done.clear();
+    EXPECT_TRUE(runStages(2, {{1, note(0)}, {2, note(1)}, {1, note(2)}}, workers));
+    EXPECT_EQ(done, (std::vector{0, 10, 11, 20, 100, 110, 111, 120}));
+    EXPECT_EQ(bandsUnderWay(3, workers), 1);
+  }
 }
 
 TEST(RunStages, ServesBandsInOrderAndEachStageAfterTheOneBefore) {

@@ -159,6 +159,30 @@ TEST(RowFilter, GivesUpBetweenBands) {
   }
 }
 
+// Of exact masks every row is a piece of work that is asked before, beside the bands that are read.
+TEST(RowFilter, GivesUpWithinAFilterOfWholePictures) {
+  const Image<RGBA8Pixel> picture = photoLikePicture(30, 50, 1);
+  RowRequest request{30, 50};
+  request.params = "slider=0.4;";
+  request.config.useBilateralGrid = 0;
+  const auto filters = [&](int mostAsked, int& asked) {
+    const RowWork work{.bandHeight = 10, .stop = [&] { return ++asked > mostAsked; }};
+    const std::unique_ptr<RowFilter> rows = filterNamed("AE0").makeRowFilter(request);
+    PictureSource source(picture);
+    Image<RGBA8Pixel> output(30, 50);
+    PictureSink sink(output);
+    return rows->filter(source, sink, work);
+  };
+  int all = 0;
+  EXPECT_TRUE(filters(1000, all));
+  EXPECT_GE(all, 5 + 50 + 5);
+  for (int most = 0; most < all; most += 7) {
+    int asked = 0;
+    EXPECT_FALSE(filters(most, asked));
+    EXPECT_EQ(asked, most + 1);
+  }
+}
+
 TEST(RowFilter, LetsErrorsOfTheSourceThrough) {
   struct Damaged : RowSource {
     const RGBA8Pixel* next(std::uint32_t, RGBA8Pixel*) override {

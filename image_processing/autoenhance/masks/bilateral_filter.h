@@ -1,6 +1,7 @@
 #pragma once
 
 #include "image_processing/core/image.h"
+#include "image_processing/core/workers.h"
 
 namespace pelorin::image_processing {
 
@@ -11,11 +12,13 @@ namespace pelorin::image_processing {
 /// @param sigmaRange  lightness difference at which a neighbour stops counting.
 /// @param radius      half the window's side in pixels; 0 or less returns every pixel unchanged.
 /// @param smoothed    written; of the size of `lightness`, its own buffer.
+/// @param workers     share the rows; null for none.
+/// @throws std::bad_alloc; what the workers throw.
 ///
-/// Never throws but std::bad_alloc and keeps no state. Costs (2 · radius + 1)² weights a pixel: the
-/// slow alternative to the grid. For T = float and QuantizedFloat<unsigned char>.
+/// Keeps no state. Costs (2 · radius + 1)² weights a pixel: the slow alternative to the grid. For
+/// T = float and QuantizedFloat<unsigned char>.
 template <typename T>
 void bilateralFilter(const Image<float>& lightness, float sigmaRange, int radius,
-                     Image<T>& smoothed);
+                     Image<T>& smoothed, Workers* workers = nullptr);
 
 }  // namespace pelorin::image_processing

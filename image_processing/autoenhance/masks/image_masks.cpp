@@ -41,7 +41,8 @@ void blendFacesIntoMask(const ImageMetadata& metadata, const Image<RGBA8Pixel>& 
 /// Through the exact filter.
 template <typename TB, typename TL>
 void computeMasksExactly(const Image<RGBA8Pixel>& photo, const ImageMetadata& metadata,
-                         const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm) {
+                         const FilterConfig& config, Image<TB>& bilateral, Image<TL>& ltm,
+                         Workers* workers) {
   Image<float> lightness(photo.width, photo.height);
   LightnessRow row(photo.width);
   for (std::uint32_t y = 0; y < photo.height; ++y) {
@@ -49,7 +50,7 @@ void computeMasksExactly(const Image<RGBA8Pixel>& photo, const ImageMetadata& me
   }
   bilateralFilter(lightness, config.bilateralRange,
                   truncateTo<std::int32_t>(spatialExtent(photo.width, photo.height, config)),
-                  bilateral);
+                  bilateral, workers);
   computeLtmMask(metadata, photo, lightness, bilateral, config.ltmMaskAmount, config.ltmMaskRadius,
                  ltm);
 }
@@ -64,7 +65,7 @@ std::optional<ImageStatistics> computeMasks(const Image<RGBA8Pixel>& photo,
   if (config.detailGainHigh == 0.0f) return std::nullopt;
   std::optional<ImageStatistics> statistics;
   if (config.useBilateralGrid == 0) {
-    computeMasksExactly(photo, metadata, config, *masks.bilateralMask, *masks.ltmMask);
+    computeMasksExactly(photo, metadata, config, *masks.bilateralMask, *masks.ltmMask, workers);
   } else if (photo.pixelCount() > 0) {
     statistics =
         computeMasksByGrid(photo, metadata, config, *masks.bilateralMask, *masks.ltmMask, workers);
@@ -97,7 +98,7 @@ ImageStatistics computeMasksByGrid(const Image<RGBA8Pixel>& photo, const ImageMe
   const std::size_t parts = tasksFor(workers);
   // Of which a band consists.
   const std::int64_t steps =
-      workers == nullptr ? 1 : sharedBandHeight(photo.width, photo.height) / sumRowsAtOnce;
+      parts == 1 ? 1 : sharedBandHeight(photo.width, photo.height) / sumRowsAtOnce;
   Rows rows(
       grid, cellSize, photo.width, photo.height, config, metadata,
       [&](std::uint32_t y) { return photo.row(y); }, RowRing<TB>(bilateral),

@@ -157,10 +157,10 @@ static void run_and_cancel(void* context, size_t tasks, void (*task)(void* state
 /* After the first tasks of a filter, which begins at the top, the last row is as it was; after any
  * number of them the session is as good as new. */
 static void cancelled_at_work(void) {
-  static const char* const filters[] = {"AE0", "AE08bit", "WinterRGB"};
+  static const char* const filters[] = {"AE0", "AE08bit", "WinterRGB", "PassThrough"};
   uint8_t out[bytes], row[width * 4];
   memset(row, 77, sizeof row);
-  for (int filter = 0; filter < 3; ++filter) {
+  for (int filter = 0; filter < 4; ++filter) {
     const char* const wish = filter < 2 ? "slider=0.2;" : "";
     uint8_t usual[bytes];
     quenby_session* session = NULL;
