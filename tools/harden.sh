@@ -1,10 +1,10 @@
 #!/usr/bin/env bash
-# harden.sh RELEASE FUZZ [SECONDS]: what ./quenby test does a little of, done at length with the builds in the
-# folders RELEASE and FUZZ (libFuzzer's), and as a table in docs/reliability.md. With SECONDS it takes about so
+# harden.sh RELEASE FUZZ TSAN [SECONDS]: what ./quenby test does a little of, done at length with the builds in the
+# folders RELEASE, FUZZ (libFuzzer's) and TSAN (the thread sanitizer's), and as a table in docs/reliability.md. With SECONDS it takes about so
 # long, half of it for each; without, every call of the command fails in turn, and targets get 45 s each.
 set -euo pipefail
 root=$(cd "$(dirname "${BASH_SOURCE[0]}")/.." && pwd)
-release=$1 fuzz=$2 budget=${3-}
+release=$1 fuzz=$2 tsan=$3 budget=${4-}
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
@@ -65,6 +65,24 @@ quietly "$release/tests/bindings/c/c_memory_test"
 memory=$(summed 'injected faults')
 at_least "the C library's allocations" "$memory" 1000
 row "allocations of the C library" "$memory" $((SECONDS - start)) nothing
+
+# Sessions by the million, threads for as long as a fault of theirs may take to show, libraries that come and go.
+# Virtual machines do it in the release's tests.
+threads_seconds=$((budget > 0 ? budget / 10 + 1 : 3600)) watched_seconds=$((budget > 0 ? budget / 10 + 1 : 600))
+cycles=$((budget > 0 ? 10000 * budget : 1000000))
+start=$SECONDS
+quietly env QUENBY_CYCLES=$((cycles < 1000000 ? cycles : 1000000)) "$release/tests/jni/endurance_test" \
+  --gtest_filter='*LeaveMemoryWhereItWas'
+row "sessions that leave memory where it was, to 64 KiB" "$(awk '/sessions:/ { print $1 }' "$work/log")" \
+  $((SECONDS - start)) nothing
+quietly env QUENBY_SECONDS=$threads_seconds "$release/tests/jni/endurance_test" --gtest_filter='*SerialTwin'
+row "results of 8 threads in 8 sessions and every filter beside those of one" \
+  "$(awk '/results of/ { print $1 }' "$work/log")" $threads_seconds nothing
+quietly env QUENBY_SECONDS=$watched_seconds "$tsan/tests/jni/endurance_test" --gtest_filter='*SerialTwin'
+row "the same under the thread sanitizer" "$(awk '/results of/ { print $1 }' "$work/log")" $watched_seconds nothing
+start=$SECONDS
+quietly env QUENBY_CYCLES=1000 "$release/tests/jni/unloading_test"
+row "times that all libraries for Java are loaded and unloaded" 1000 $((SECONDS - start)) nothing
 
 # Inputs that libFuzzer makes, from those that are kept.
 "$root/fuzz/corpus.py" unpack "$work/corpus"
