@@ -48,9 +48,13 @@ class PreparedTonePass {
 
   /// The tone curve, and its values where the argument is one of a few.
   struct Tables {
+#ifdef __EMSCRIPTEN__  // With vectors, each after fy of its step: one load brings both.
+    alignas(64) float ofSteps[2 * compandingStepCount];
+#else
     alignas(64) float ofSteps[compandingStepCount];  ///< At the L of a step of Y.
-    alignas(64) float ofBytes[256];                  ///< At the L that a byte of a mask stands for.
-    alignas(64) float samples[65];                   ///< The last one repeated to the end.
+#endif
+    alignas(64) float ofBytes[256];  ///< At the L that a byte of a mask stands for.
+    alignas(64) float samples[65];   ///< The last one repeated to the end.
   };
 
  private:

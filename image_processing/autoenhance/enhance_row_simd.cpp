@@ -17,7 +17,10 @@
 #include "image_processing/core/prefetch.h"
 #include "image_processing/core/simd.h"
 #include "image_processing/core/small_table.h"
-#include "image_processing/core/truncate_small.h"
+
+#if HWY_TARGET == HWY_WASM
+#include "image_processing/autoenhance/enhance_stages_wasm.h"
+#endif
 
 HWY_BEFORE_NAMESPACE();
 namespace pelorin::image_processing::HWY_NAMESPACE {
@@ -41,33 +44,10 @@ HWY_INLINE F lookUp(const float* table, I index) {
   return hn::GatherIndex(Floats(), table, index);
 }
 
-// Where a gather takes its lanes apart and puts others together, look-ups from memory to memory take less.
-constexpr bool gathersByLane = HWY_TARGET == HWY_WASM;
-
-// Pixels go through four stages in blocks. Each stage is short enough that a processor has several
-// vectors of it in flight, where the whole way would be one long chain; a function of its own
-// leaves each all registers for its constants. Stages ask for the memory they will meet two blocks
-// on.
-constexpr std::size_t blockPixels = 256;
-
-/// What the stages leave to each other of the pixels of one block.
-struct Block {
-  HWY_ALIGN std::int32_t xStep[blockPixels], yStep[blockPixels], zStep[blockPixels];
-  HWY_ALIGN float redness[blockPixels], yellowness[blockPixels];  // fx - fy, fy - fz by way of a, b
-  HWY_ALIGN float L[blockPixels];
-  HWY_ALIGN float r[blockPixels], g[blockPixels], b[blockPixels];
-};
-
-/// The steps of Lab's companding that a pixel's X, Y and Z fall on.
-HWY_NOINLINE void findSteps(const RGBA8Pixel* in, std::size_t count, Block& block) {
-  for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
-    prefetchAhead(in + i);
-    const lab::Steps steps = lab::stepsOf(in + i);
-    hn::Store(steps.x, Ints(), block.xStep + i);
-    hn::Store(steps.y, Ints(), block.yStep + i);
-    hn::Store(steps.z, Ints(), block.zStep + i);
-  }
-}
+// Pixels go through short stages in blocks: a processor has several vectors of a stage in flight, where the
+// whole way would be one long chain; a function of its own leaves each all registers for its constants. Stages
+// ask for the memory they will meet two blocks on.
+constexpr std::size_t blockPixels = HWY_TARGET == HWY_WASM ? 128 : 256;
 
 /// A byte of a mask as the value it stands for.
 HWY_INLINE F valueOf(I byte) {
@@ -83,7 +63,7 @@ class ToneMap {
   /// The curve at L from 0 on, less than one sample beyond the last.
   HWY_INLINE F operator()(F L) const {
     const F place = hn::Mul(L, set(perUnit_));
-    const I index = simd::truncateSmall(place);
+    const I index = simd::truncate(place);
     const F fraction = hn::Sub(place, toFloats(index));
     const F upper = simd::SmallTable(tables_.samples + 1)(index);
     const F lower = simd::SmallTable(tables_.samples)(index);
@@ -106,11 +86,58 @@ void fillTables(const TonePass& pass, PreparedTonePass::Tables& tables) {
   const ToneMap toneMap(pass, tables);
   const float* const fy = colourTables().xyzToLab.samples().data();
   for (std::size_t i = 0; i < compandingStepCount; i += hn::Lanes(Floats())) {
-    hn::Store(toneMap(lab::lightness(hn::LoadU(Floats(), fy + i))), Floats(), tables.ofSteps + i);
+    const F ofStep = hn::LoadU(Floats(), fy + i);
+    const F mapped = toneMap(lab::lightness(ofStep));
+#if HWY_TARGET == HWY_WASM
+    hn::Store(hn::InterleaveLower(Floats(), ofStep, mapped), Floats(), tables.ofSteps + 2 * i);
+    hn::Store(hn::InterleaveUpper(Floats(), ofStep, mapped), Floats(), tables.ofSteps + 2 * i + 4);
+#else
+    hn::Store(mapped, Floats(), tables.ofSteps + i);
+#endif
   }
   for (std::size_t i = 0; i < 256; i += hn::Lanes(Floats())) {
     const I byte = hn::Iota(Ints(), static_cast<std::int32_t>(i));
     hn::Store(toneMap(hn::Mul(set(pass.scale), valueOf(byte))), Floats(), tables.ofBytes + i);
+  }
+}
+
+/// Whether masks are in [0, 1] but for rounding, as our own are.
+HWY_INLINE bool areUsual(const float* bilateral, const float* ltm, std::size_t count) {
+  // As whole numbers, floats from 0 on are ordered alike; negative ones and NaN come last.
+  const auto bits = [](const float* mask) HWY_ATTR {
+    return hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(mask));
+  };
+  auto most = hn::Zero(Words());
+  for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
+    most = hn::Max(most, hn::Max(bits(bilateral + i), bits(ltm + i)));
+  }
+  const auto high = hn::Set(Words(), std::bit_cast<std::uint32_t>(1.01f));
+  return hn::AllFalse(Words(), hn::Gt(most, high));
+}
+HWY_INLINE bool areUsual(const Quantized*, const Quantized*, std::size_t) {
+  return true;
+}
+
+#if HWY_TARGET == HWY_WASM
+using stages::enhanceBlock;
+using Block = stages::Four[blockPixels / 4];
+#else
+/// What the stages leave to each other of the pixels of one block.
+struct Block {
+  HWY_ALIGN std::int32_t xStep[blockPixels], yStep[blockPixels], zStep[blockPixels];
+  HWY_ALIGN float redness[blockPixels], yellowness[blockPixels];  // fx - fy, fy - fz by way of a, b
+  HWY_ALIGN float L[blockPixels];
+  HWY_ALIGN float r[blockPixels], g[blockPixels], b[blockPixels];
+};
+
+/// The steps of Lab's companding that a pixel's X, Y and Z fall on.
+HWY_NOINLINE void findSteps(const RGBA8Pixel* in, std::size_t count, Block& block) {
+  for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
+    prefetchAhead(in + i);
+    const lab::Steps steps = lab::stepsOf(in + i);
+    hn::Store(steps.x, Ints(), block.xStep + i);
+    hn::Store(steps.y, Ints(), block.yStep + i);
+    hn::Store(steps.z, Ints(), block.zStep + i);
   }
 }
 
@@ -132,23 +159,6 @@ HWY_INLINE MaskTerms maskTerms(const TonePass& pass, const ToneMap& toneMap,
   };
   const I base = bytes(bilateral);
   return {hn::Mul(set(pass.scale), valueOf(base)), toneMap.ofByte(base), valueOf(bytes(ltm))};
-}
-
-/// Whether masks are in [0, 1] but for rounding, as our own are.
-HWY_INLINE bool areUsual(const float* bilateral, const float* ltm, std::size_t count) {
-  // As whole numbers, floats from 0 on are ordered alike; negative ones and NaN come last.
-  const auto bits = [](const float* mask) HWY_ATTR {
-    return hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(mask));
-  };
-  auto most = hn::Zero(Words());
-  for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
-    most = hn::Max(most, hn::Max(bits(bilateral + i), bits(ltm + i)));
-  }
-  const auto high = hn::Set(Words(), std::bit_cast<std::uint32_t>(1.01f));
-  return hn::AllFalse(Words(), hn::Gt(most, high));
-}
-HWY_INLINE bool areUsual(const Quantized*, const Quantized*, std::size_t) {
-  return true;
 }
 
 /// To Lab, with L tone-mapped and, with masks, recombined.
@@ -192,26 +202,14 @@ HWY_NOINLINE void encode(std::size_t count, Block& block) {
     const F X = lab::labToXz(hn::Add(hn::Load(Floats(), block.redness + i), fy));
     const F Y = lab::labToY(L);
     const F Z = lab::labToXz(hn::Sub(fy, hn::Load(Floats(), block.yellowness + i)));
-    const auto encode = [&](F value, std::int32_t* places, float* channel) HWY_ATTR {
+    const auto encoded = [&](F value) HWY_ATTR {
       const F last = set(sRGBSteps - 1);
-      const F held = simd::clampTo(hn::Mul(value, last), hn::Zero(Floats()), last);
-      const I place = simd::truncateSmall(held);
-      if constexpr (gathersByLane) {
-        hn::Store(place, Ints(), places + i);
-      } else {
-        hn::Store(lookUp(codes, place), Floats(), channel + i);
-      }
+      const F place = simd::clampTo(hn::Mul(value, last), hn::Zero(Floats()), last);
+      return lookUp(codes, simd::truncate(place));
     };
-    encode(product(redOfXyz, X, Y, Z), block.xStep, block.r);
-    encode(product(greenOfXyz, X, Y, Z), block.yStep, block.g);
-    encode(product(blueOfXyz, X, Y, Z), block.zStep, block.b);
-  }
-  if constexpr (gathersByLane) {
-    for (std::size_t i = 0; i < count; ++i) {
-      block.r[i] = codes[block.xStep[i]];
-      block.g[i] = codes[block.yStep[i]];
-      block.b[i] = codes[block.zStep[i]];
-    }
+    hn::Store(encoded(product(redOfXyz, X, Y, Z)), Floats(), block.r + i);
+    hn::Store(encoded(product(greenOfXyz, X, Y, Z)), Floats(), block.g + i);
+    hn::Store(encoded(product(blueOfXyz, X, Y, Z)), Floats(), block.b + i);
   }
 }
 
@@ -225,7 +223,7 @@ HWY_NOINLINE void finish(float vibrance, const RGBA8Pixel* in, RGBA8Pixel* out, 
     F b = hn::Load(Floats(), block.b + i);
     vibranceInRGB(vibrance, r, g, b);
     const auto code = [](F channel)
-                          HWY_ATTR { return hn::BitCast(Words(), simd::truncateSmall(channel)); };
+                          HWY_ATTR { return hn::BitCast(Words(), simd::truncate(channel)); };
     const auto pixels = hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(in + i));
     const auto alpha = hn::And(pixels, hn::Set(Words(), 0xFF000000u));
     const auto red = code(r), green = hn::ShiftLeft<8>(code(g)), blue = hn::ShiftLeft<16>(code(b));
@@ -235,20 +233,27 @@ HWY_NOINLINE void finish(float vibrance, const RGBA8Pixel* in, RGBA8Pixel* out, 
 }
 
 template <bool masked, typename Mask>
+HWY_INLINE void enhanceBlock(const TonePass& pass, const PreparedTonePass::Tables& tables,
+                             const RGBA8Pixel* in, const Mask* bilateral, const Mask* ltm,
+                             RGBA8Pixel* out, std::size_t count, Block& block) {
+  findSteps(in, count, block);
+  mapTones<masked>(pass, ToneMap(pass, tables), bilateral, ltm, count, block);
+  encode(count, block);
+  finish(pass.vibrance, in, out, count, block);
+}
+#endif
+
+template <bool masked, typename Mask>
 HWY_INLINE void enhanceBlocks(const TonePass& pass, const PreparedTonePass::Tables& tables,
                               const RGBA8Pixel* in, const Mask* bilateral, const Mask* ltm,
                               RGBA8Pixel* out, std::size_t count) {
-  const ToneMap toneMap(pass, tables);
   Block block;
   while (count >= hn::Lanes(Floats())) {
     const std::size_t size = std::min(blockPixels, count - count % hn::Lanes(Floats()));
     if (masked && !areUsual(bilateral, ltm, size)) {
       enhanceRowScalar(pass, in, bilateral, ltm, out, size);
     } else {
-      findSteps(in, size, block);
-      mapTones<masked>(pass, toneMap, bilateral, ltm, size, block);
-      encode(size, block);
-      finish(pass.vibrance, in, out, size, block);
+      enhanceBlock<masked>(pass, tables, in, bilateral, ltm, out, size, block);
     }
     in += size;
     out += size;

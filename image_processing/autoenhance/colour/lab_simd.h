@@ -22,8 +22,6 @@ namespace hn = hwy::HWY_NAMESPACE;
 using Floats = hn::CappedTag<float, 16>;
 using F = hn::Vec<Floats>;
 using I = hn::Vec<hn::RebindToSigned<Floats>>;
-// Whether a branch around a division is worth it: WebAssembly has no fused multiply-add to divide by.
-constexpr bool slowDivision = HWY_TARGET == HWY_WASM;
 constexpr float lastInverseSample = inverseCompandingSamples - 1;
 
 HWY_INLINE F set(float value) {
@@ -78,11 +76,9 @@ HWY_INLINE F sampleIndex(F x, float scale) {
 HWY_INLINE F labToXz(F x) {
   const F sample = hn::Mul(sampleIndex(x, lastInverseSample), set(1.0f / lastInverseSample));
   const F cube = hn::Mul(hn::Mul(sample, sample), sample);
-  const auto isBright = hn::Gt(cube, set(cieEpsilon));
-  if (slowDivision && hn::AllTrue(Floats(), isBright)) return cube;
   const F line = simd::divide(hn::Sub(hn::Mul(set(labLGain), sample), set(labLOffset)),
                               simd::Divisor(cieKappa));
-  return hn::IfThenElse(isBright, cube, line);
+  return hn::IfThenElse(hn::Gt(cube, set(cieEpsilon)), cube, line);
 }
 
 /// `Lab2yTable` likewise.
@@ -91,10 +87,8 @@ HWY_INLINE F labToY(F L) {
   const F sample = hn::Mul(sampleIndex(L, scale), set(1.0f / scale));
   const F fy = simd::divide(hn::Add(sample, set(labLOffset)), simd::Divisor(labLGain));
   const F cube = hn::Mul(hn::Mul(fy, fy), fy);
-  const auto isBright = hn::Gt(sample, set(cieKappaEpsilon));
-  if (slowDivision && hn::AllTrue(Floats(), isBright)) return cube;
   const F line = simd::divide(sample, simd::Divisor(cieKappa));
-  return hn::IfThenElse(isBright, cube, line);
+  return hn::IfThenElse(hn::Gt(sample, set(cieKappaEpsilon)), cube, line);
 }
 
 }  // namespace lab
