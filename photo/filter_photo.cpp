@@ -93,6 +93,7 @@ FilteredPhoto filterPhoto(const FileView& file, const FilterRequest& request, co
     work.workers = resources.workers;
     work.bandHeight = sharedBandHeight(size.width, size.height);
   }
+  if (resources.bandHeight > 0) work.bandHeight = resources.bandHeight;
   const auto stopUnless = [](bool done) {
     if (!done) throw Stopped();
   };

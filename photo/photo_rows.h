@@ -27,6 +27,7 @@ struct RowResources {
   SparePixels* spare = nullptr;   ///< Where kept pixels may come from and go; may be null.
   /// Share the work: decoding, filtering and encoding go on at the same time. Null for none.
   image_processing::Workers* workers = nullptr;
+  std::uint32_t bandHeight = 0;  ///< Rows that are filtered at a time; 0 for as many as go fast.
 };
 
 /// The rows of a photo, upright, to go over once or several times. For one thread.

@@ -30,7 +30,7 @@ void requireNumber(float threshold) {
 
 photo::Shot shotOf(const quenby_shot& given) {
   if (std::isinf(given.wall_clock) || std::isinf(given.utc)) refuse("shots", "a time is infinite");
-  photo::Shot shot{cdfOf(given.green_cdf, "shots"), given.orientation, {}};
+  photo::Shot shot{{cdfOf(given.green_cdf, "shots"), given.pixel_count}, given.orientation, {}};
   if (std::isnan(given.wall_clock)) return shot;
   shot.time = photo::ShotTime{given.wall_clock, {}};
   if (!std::isnan(given.utc)) shot.time->utc = given.utc;
@@ -61,7 +61,11 @@ int32_t quenby_read_shot(const uint8_t* file, size_t size, const quenby_open_opt
     const photo::PhotoRecord record =
         photo::readPhotoRecord(bytesOf(file, size), photo::automaticScale, open.stop, open.limits);
     constexpr double unknown = std::numeric_limits<double>::quiet_NaN();
-    quenby_shot read{{}, record.orientation, 0, unknown, unknown};
+    const std::uint64_t pixels =
+        photo::countedPixels(record.width, record.height, photo::automaticScale);
+    const bool fits = pixels <= std::numeric_limits<std::uint32_t>::max();
+    quenby_shot read{
+        {}, record.orientation, fits ? static_cast<std::uint32_t>(pixels) : 0, unknown, unknown};
     const GreenCDF cdf = record.cdf.unpacked();
     std::copy(cdf.begin(), cdf.end(), read.green_cdf);
     if (record.captureTime) {

@@ -95,14 +95,17 @@ struct RandomPhoto {
 TEST(StreamedPhotos, AreTheFilesOfWholePictures) {
   constexpr std::uint64_t photos = slowBuild ? 20 : 500;
   constexpr std::array<std::size_t, 4> counts = {1, 2, 3, 8};
+  constexpr std::array<std::uint32_t, 4> bandHeights = {1, 16, 64, 0};
   for (std::uint64_t seed = 0; seed < photos; ++seed) {
     const RandomPhoto photo(seed);
     const Bytes expected = byPicture(photo.file, photo.request);
-    for (const std::size_t i : {seed % 4, (seed / 4 + 1) % 4}) {
+    for (std::size_t i = 0; i < counts.size(); ++i) {
+      // All pairs of a number of threads and of rows within four photos.
       const RowResources resources{.pixels = (seed + i) % 3 == 0 ? 0 : std::uint64_t{1} << 30,
-                                   .workers = counts[i] == 1 ? nullptr : &threads(counts[i])};
+                                   .workers = counts[i] == 1 ? nullptr : &threads(counts[i]),
+                                   .bandHeight = bandHeights[(seed + i) % bandHeights.size()]};
       ASSERT_EQ(filterPhoto(photo.file, photo.request, nullptr, resources).file, expected)
-          << photo.what << ", " << counts[i] << " threads";
+          << photo.what << ", " << counts[i] << " threads, bands of " << resources.bandHeight;
     }
   }
 }

@@ -90,7 +90,7 @@ export const KnownFace = struct({
 });
 export const Loss = struct({ struct_size: "u32", what: "u32", why: "u32" });
 export const Shot = struct({
-  green_cdf: "f32[256]", orientation: "i32", reserved: "u32", wall_clock: "f64", utc: "f64",
+  green_cdf: "f32[256]", orientation: "i32", pixel_count: "u32", wall_clock: "f64", utc: "f64",
 });
 export const Pair = struct({
   first: "u64", second: "u64", seconds: "f64", score: "f32", distance: "f32", times_known: "u32",

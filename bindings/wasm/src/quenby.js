@@ -297,11 +297,8 @@ export class Quenby {
   }
 
   shot(file, { timeout } = {}) {
-    return this.scoped((scope) => this.timed(timeout, (cancel) => {
-      const { reserved, ...shot } = this.receiveStruct(layout.Shot, "quenby_read_shot",
-        scope.bytes(file), file.length, 0, cancel);
-      return shot;
-    }));
+    return this.scoped((scope) => this.timed(timeout, (cancel) => this.receiveStruct(layout.Shot,
+      "quenby_read_shot", scope.bytes(file), file.length, 0, cancel)));
   }
 
   /** @returns for each shot the index of the first of its group, its own where it is in none. */

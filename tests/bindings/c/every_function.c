@@ -227,9 +227,12 @@ static void duplicates(struct bytes photo) {
   quenby_shot shots[3];
   DONE(quenby_read_shot(photo.data, photo.size, NULL, NULL, &shots[0], &error));
   CHECK(shots[0].orientation == 6 && shots[0].wall_clock == 1714566645.0);
+  CHECK(shots[0].pixel_count == 200 * 150);
   shots[1] = shots[2] = shots[0];
   shots[1].wall_clock += 2;
   shots[2].wall_clock += 1e6;
+  shots[1].pixel_count = 0; /* unknown, or wrong: the same pairs */
+  shots[2].pixel_count = 7;
   float distance = -1, score = -1;
   double window = -1;
   DONE(quenby_distance(shots[0].green_cdf, shots[1].green_cdf, &distance, &error));

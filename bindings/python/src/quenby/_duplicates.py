@@ -164,6 +164,7 @@ def find_duplicates(
     found = {name: shot for name, shot in shots.items() if shot is not None}
     names = list(found)
     given, pairs = (CShot * len(names))(*found.values()), CPairs()
+    del shots, found  # a kilobyte each
     call("find_pairs", given, len(names), threshold, pointer_of(cancel), byref(pairs))
     every = [CPair.from_buffer_copy(pair) for pair in pairs.data[: pairs.count]]
     plain("pairs_free", byref(pairs))

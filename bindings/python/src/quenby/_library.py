@@ -157,7 +157,7 @@ class CShot(ctypes.Structure):
     _fields_ = [
         ("green_cdf", c_float * 256),
         ("orientation", c_int32),
-        ("reserved", c_uint32),
+        ("pixel_count", c_uint32),
         ("wall_clock", c_double),
         ("utc", c_double),
     ]
