@@ -1,19 +1,17 @@
 // The stages of enhance_row_simd.cpp for WebAssembly, which reads tables a lane at a time: included by it alone.
 //
-// What one stage finds in a table is for the next one to read: stages leave the addresses of entries behind,
-// which takes a vector no more operations than indices. All stages are short, since a processor's window holds
-// few vectors of four lanes otherwise, and what they leave of four pixels stands together, so that one pointer
-// reaches all of it.
+// What one stage finds in a table is for the next one to read. All stages are short, since a processor's window
+// holds few vectors of four lanes otherwise, and what they leave of four pixels stands together, so that one
+// pointer reaches all of it.
 #pragma once
 
 #include <hwy/highway.h>
-
-#include <bit>
 
 #include "image_processing/autoenhance/colour/colour_tables.h"
 #include "image_processing/autoenhance/colour/lab_simd.h"
 #include "image_processing/autoenhance/colour/vibrance_simd.h"
 #include "image_processing/autoenhance/enhance_row.h"
+#include "image_processing/core/entries_wasm.h"
 
 namespace pelorin::image_processing::HWY_NAMESPACE {
 namespace {
@@ -25,47 +23,15 @@ using lab::product;
 using lab::set;
 using Ints = hn::RebindToSigned<Floats>;
 using Words = hn::RebindToUnsigned<Floats>;
-using I = hn::Vec<Ints>;
-
-/// The addresses of the entries at `index`, truncated, in a table of `stride` floats an entry. Indices are
-/// above -1 and below 2^20.
-template <int stride = 1>
-HWY_INLINE void findEntries(const float* table, F index, std::int32_t* addresses) {
-  // In the sum with this number, the offset of an entry is the mantissa.
-  constexpr float unit = 0x1p23f / (4 * stride);
-  const I bits = hn::BitCast(Ints(), hn::Add(hn::Trunc(index), set(unit)));
-  const auto start = reinterpret_cast<std::uintptr_t>(table) - std::bit_cast<std::uint32_t>(unit);
-  hn::Store(hn::Add(bits, hn::Set(Ints(), static_cast<std::int32_t>(start))), Ints(), addresses);
-}
-
-/// The entries at four addresses, of which `step` are apart.
-template <int step = 1>
-HWY_INLINE F read(const std::int32_t* addresses) {
-  const auto at = [=](int lane) { return reinterpret_cast<const void*>(addresses[step * lane]); };
-  auto entries = wasm_v128_load32_zero(at(0));
-  entries = wasm_v128_load32_lane(at(1), entries, 1);
-  entries = wasm_v128_load32_lane(at(2), entries, 2);
-  return F{wasm_v128_load32_lane(at(3), entries, 3)};
-}
-
-/// Entries and the floats after them.
-struct Pairs {
-  F first, second;
-};
-template <int step = 1>
-HWY_INLINE Pairs readPairs(const std::int32_t* addresses) {
-  const auto at = [=](int lane) { return reinterpret_cast<const void*>(addresses[step * lane]); };
-  const auto low = wasm_v128_load64_lane(at(1), wasm_v128_load64_zero(at(0)), 1);
-  const auto high = wasm_v128_load64_lane(at(3), wasm_v128_load64_zero(at(2)), 1);
-  return {F{wasm_i32x4_shuffle(low, high, 0, 2, 4, 6)},
-          F{wasm_i32x4_shuffle(low, high, 1, 3, 5, 7)}};
-}
+using simd::findEntries;
+using simd::read;
+using simd::readPairs;
 
 /// What the stages leave to each other of four pixels.
 struct alignas(16) Four {
   std::int32_t steps[4][4];  ///< Of each pixel those of X, Y, Z in `ofSteps`.
   std::int32_t baseInCurve[4];
-  float placeOfBase[4];
+  float baseFraction[4];
   float redness[4], yellowness[4];  // fx - fy, fy - fz by way of a, b
   float L[4];
   std::int32_t xyz[3][4];    ///< In the inverse tables.
@@ -127,8 +93,9 @@ HWY_NOINLINE void findBases(const TonePass& pass, const float* curve, const Mask
   for (std::size_t i = 0; i < fours; ++i, bilateral += 4) {
     const F base = hn::Mul(set(pass.scale), valuesOf(bilateral));
     const F place = hn::Mul(base, set(pass.samplesPerUnit));
-    findEntries(curve, place, block[i].baseInCurve);
-    hn::Store(place, Floats(), block[i].placeOfBase);
+    const F whole = hn::Trunc(place);
+    simd::findEntriesAtWhole(curve, whole, block[i].baseInCurve);
+    hn::Store(hn::Sub(place, whole), Floats(), block[i].baseFraction);
   }
 }
 
@@ -149,8 +116,7 @@ HWY_NOINLINE void mapTones(const TonePass& pass, const Mask* bilateral, const Ma
     F L = mapped;
     if constexpr (masked) {
       const auto [lower, upper] = readPairs(block[i].baseInCurve);
-      const F place = hn::Load(Floats(), block[i].placeOfBase);
-      const F fraction = hn::Sub(place, hn::Trunc(place));
+      const F fraction = hn::Load(Floats(), block[i].baseFraction);
       const F mappedBase =
           hn::Add(hn::Mul(fraction, upper), hn::Mul(hn::Sub(set(1.0f), fraction), lower));
       const F base = hn::Mul(set(pass.scale), valuesOf(bilateral + 4 * i));

@@ -63,6 +63,24 @@ test("faces, quality and what is left out become the command's file", () => {
     "--strip", "gps"));
 });
 
+// Of a size that pays for tables which smaller ones go without.
+test("vectors give the bytes of plain code, whatever the colours", () => {
+  const [width, height] = [701, 401];
+  const data = new Uint8Array(4 * width * height);
+  for (let i = 0, random = 1; i < data.length; ++i) {
+    random = (Math.imul(random, 1664525) + 1013904223) >>> 0;
+    data[i] = (random >>> 24) >> (i >> 14 & 3); // dark ones, too
+  }
+  const sessions = Object.values(builds).map((quenby) => quenby.session({ data, width, height }));
+  for (const [filter, parameters] of [["AE0", "slider=0.9;"], ["AE08bit", "slider=0.2;"],
+    ["AE0", "slider=0.6;gtmOnly=true;"], ["LowDimRGBCurve", "s1=0.9;"], ["SummerRGB", ""],
+    ["ZebraBW", ""], ["ZebraBW", "maskRadius=0.7;maskAlpha=0.6;"], ["ZebraBW", "applyMask=0;"]]) {
+    const [vectors, plain] = sessions.map((session) => session.apply(filter, parameters));
+    assert.ok(Buffer.compare(Buffer.from(vectors), Buffer.from(plain)) === 0, `${filter} ${parameters}`);
+  }
+  for (const session of sessions) session.close();
+});
+
 test("a session gives what the file holds", () => {
   const { simd, scalar } = builds;
   const [first, second] = [simd, scalar].map((quenby) => {

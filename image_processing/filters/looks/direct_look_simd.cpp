@@ -6,6 +6,7 @@
 #include <hwy/highway.h>
 
 #include <algorithm>
+#include <cmath>
 
 #include "image_processing/core/prefetch.h"
 #include "image_processing/core/simd.h"
@@ -13,6 +14,10 @@
 #include "image_processing/core/truncate_small.h"
 #include "image_processing/filters/looks/soft_light.h"
 #include "image_processing/filters/looks/vignette_simd.h"
+
+#if HWY_TARGET == HWY_WASM
+#include "image_processing/core/entries_wasm.h"
+#endif
 
 HWY_BEFORE_NAMESPACE();
 namespace pelorin::image_processing::HWY_NAMESPACE {
@@ -36,6 +41,14 @@ HWY_INLINE F toFloats(I ints) {
 struct Colour {
   F r, g, b;
 };
+
+HWY_INLINE Colour coloursOf(W pixels) {
+  // Red in the low byte: every target is little-endian.
+  const W byte = hn::Set(Words(), 0xFFu);
+  return {toFloats(hn::BitCast(Ints(), hn::And(pixels, byte))),
+          toFloats(hn::BitCast(Ints(), hn::And(hn::ShiftRight<8>(pixels), byte))),
+          toFloats(hn::BitCast(Ints(), hn::And(hn::ShiftRight<16>(pixels), byte)))};
+}
 
 /// `softLight` for masks up to 0.5.
 HWY_INLINE F darkened(F x, F mask) {
@@ -151,7 +164,7 @@ HWY_INLINE W byteAt(const Curve& curve, const Place& place) {
 }
 
 #undef PELORIN_GREY_BY_FOURS
-#if HWY_TARGET == HWY_SSSE3 || HWY_TARGET == HWY_SSE4 || HWY_TARGET == HWY_WASM || \
+#if HWY_TARGET == HWY_SSSE3 || HWY_TARGET == HWY_SSE4 || \
     (HWY_TARGET == HWY_NEON && HWY_ARCH_ARM_A64)
 #define PELORIN_GREY_BY_FOURS
 /// Without gathers, three curves over the same grey are one of vectors: a load for each end of a segment.
@@ -213,12 +226,8 @@ void applyToVectors(const DirectLook& direct, const VignetteRow& row, const RGBA
   for (std::size_t i = 0; i < count; i += hn::Lanes(Floats())) {
     prefetchAhead(from + i);
     prefetchAhead(to + i);
-    // Red in the low byte: every target is little-endian.
     const W pixels = hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(from + i));
-    const W byte = hn::Set(Words(), 0xFFu);
-    Colour c{toFloats(hn::BitCast(Ints(), hn::And(pixels, byte))),
-             toFloats(hn::BitCast(Ints(), hn::And(hn::ShiftRight<8>(pixels), byte))),
-             toFloats(hn::BitCast(Ints(), hn::And(hn::ShiftRight<16>(pixels), byte)))};
+    Colour c = coloursOf(pixels);
     if constexpr (vignette) {
       const I sample = simd::maskSamples(Floats(), coordinates, coordinates.uSquares + i);
       c = vignetted(c, hn::GatherIndex(Floats(), masks, sample), opacity);
@@ -242,11 +251,124 @@ void applyToVectors(const DirectLook& direct, const VignetteRow& row, const RGBA
   }
 }
 
+#if HWY_TARGET == HWY_WASM
+/// The same in short stages over blocks: V8's code is as slow as its chains of operations are long.
+namespace grey {
+
+struct alignas(16) Four {
+  std::int32_t masks[4];
+  std::int32_t segments[4];  ///< In `fours`.
+  float fractions[4];
+};
+
+HWY_NOINLINE void findMasks(const float* masks, const VignetteRow& row, const float* uSquares,
+                            std::size_t fours, Four* block) {
+  for (std::size_t i = 0; i < fours; ++i, uSquares += 4) {
+    const F square = hn::Add(hn::LoadU(Floats(), uSquares), set(row.vSquare));
+    const F last = set(row.lastSample);
+    simd::findEntries(masks, hn::Min(hn::Mul(square, last), last), block[i].masks);
+  }
+}
+
+/// What `lightened` adds to each code, for masks of 1.
+struct Lightening {
+  float ofCode[256];
+
+  Lightening() {
+    using namespace soft_light;
+    for (int code = 0; code < 256; ++code) {
+      const auto x = static_cast<float>(code);
+      const float cubic = ((cubic3 * x - cubic2) * x + cubic1) * x;
+      ofCode[code] = (x <= quarter ? cubic : rootGain * std::sqrt(x)) - x;
+    }
+  }
+
+  /// Of every fourth code.
+  HWY_INLINE F of(const std::uint8_t* codes) const {
+    auto lanes = wasm_v128_load32_zero(ofCode + codes[0]);
+    lanes = wasm_v128_load32_lane(ofCode + codes[4], lanes, 1);
+    lanes = wasm_v128_load32_lane(ofCode + codes[8], lanes, 2);
+    return F{wasm_v128_load32_lane(ofCode + codes[12], lanes, 3)};
+  }
+};
+
+HWY_INLINE Colour vignettedPixels(const Lightening& lightening, const RGBA8Pixel* from,
+                                  const Colour& c, F mask, float opacity) {
+  const int areDark = wasm_i32x4_bitmask(hn::Le(mask, set(0.5f)).raw);
+  if (areDark != 0) return vignetted(c, mask, opacity);
+  const F strength = hn::Sub(hn::Mul(set(2.0f), mask), set(1.0f));
+  const auto blended = [&](F x, const std::uint8_t& codes) HWY_ATTR {
+    const F light = hn::Add(x, hn::Mul(strength, lightening.of(&codes)));
+    if (opacity == 1.0f) return light;
+    return hn::Add(hn::Mul(set(opacity), light), hn::Mul(set(1.0f - opacity), x));
+  };
+  return {blended(c.r, from->r), blended(c.g, from->g), blended(c.b, from->b)};
+}
+
+template <bool vignette>
+HWY_NOINLINE void findSegments(const DirectLook& direct, const RGBA8Pixel* from, std::size_t fours,
+                               Four* block) {
+  static const Lightening lightening;
+  for (std::size_t i = 0; i < fours; ++i, from += 4) {
+    Colour c = coloursOf(hn::LoadU(Words(), reinterpret_cast<const std::uint32_t*>(from)));
+    if constexpr (vignette) {
+      c = vignettedPixels(lightening, from, c, simd::read(block[i].masks), direct.look.maskAlpha);
+    }
+    const F position = hn::Mul(mixed<ChannelMix::grey>(c).r, set(direct.curves[0].samplesPerUnit));
+    const F whole = hn::Trunc(position);
+    const F last = set(static_cast<float>(direct.curves[0].last));
+    simd::findEntriesAtWhole<4>(direct.fours.data(), hn::Min(whole, last), block[i].segments);
+    hn::Store(hn::Sub(position, whole), Floats(), block[i].fractions);
+  }
+}
+
+HWY_NOINLINE void paint(const RGBA8Pixel* from, RGBA8Pixel* to, std::size_t fours,
+                        const Four* block) {
+  for (std::size_t i = 0; i < fours; ++i, from += 4, to += 4) {
+    const auto codes = [&](int lane) HWY_ATTR {
+      const auto* segment = reinterpret_cast<const float*>(block[i].segments[lane]);
+      const F fraction{wasm_v128_load32_splat(&block[i].fractions[lane])};
+      const F y = hn::Add(hn::Mul(fraction, hn::LoadU(Floats(), segment + 4)),
+                          hn::Mul(hn::Sub(set(1.0f), fraction), hn::LoadU(Floats(), segment)));
+      // In the sum with this number, a whole one is the mantissa.
+      const F whole = hn::Add(hn::Trunc(hn::Max(y, hn::Zero(Floats()))), set(0x1p23f));
+      return wasm_v128_and(whole.raw, wasm_i32x4_splat(0xFF));
+    };
+    const auto first = wasm_i16x8_narrow_i32x4(codes(0), codes(1));
+    const auto second = wasm_i16x8_narrow_i32x4(codes(2), codes(3));
+    const auto alpha = wasm_v128_and(wasm_v128_load(from), wasm_u32x4_splat(0xFF000000u));
+    wasm_v128_store(to, wasm_v128_or(wasm_u8x16_narrow_i16x8(first, second), alpha));
+  }
+}
+
+template <bool vignette>
+void apply(const DirectLook& direct, const VignetteRow& row, const RGBA8Pixel* from, RGBA8Pixel* to,
+           std::size_t count) {
+  constexpr std::size_t most = 64;
+  Four block[most];
+  const VignetteRow coordinates = row;  // `to` might be anything the row refers to
+  for (std::size_t i = 0; i < count; i += 4 * most) {
+    const std::size_t fours = std::min(most, (count - i) / 4);
+    if constexpr (vignette) {
+      findMasks(direct.look.vignette->samples().data(), coordinates, coordinates.uSquares + i,
+                fours, block);
+    }
+    findSegments<vignette>(direct, from + i, fours, block);
+    paint(from + i, to + i, fours, block);
+  }
+}
+
+}  // namespace grey
+#endif
+
 template <ChannelMix mix, bool vignette>
 void applyMix(const DirectLook& direct, const VignetteRow& row, const RGBA8Pixel* from,
               RGBA8Pixel* to, std::size_t count) {
-  const auto apply = direct.curvesAreShort ? applyToVectors<mix, vignette, ShortCurve>
-                                           : applyToVectors<mix, vignette, LongCurve>;
+  auto apply = direct.curvesAreShort ? applyToVectors<mix, vignette, ShortCurve>
+                                     : applyToVectors<mix, vignette, LongCurve>;
+#if HWY_TARGET == HWY_WASM
+  if (mix == ChannelMix::grey && direct.stepsAreEqual) apply = grey::apply<vignette>;
+#endif
   const std::size_t lanes = hn::Lanes(Floats());
   const std::size_t left = count % lanes, whole = count - left;
   apply(direct, row, from, to, whole);

@@ -59,6 +59,63 @@ std::size_t applyToVectors(const LookTable& table, const RGBA8Pixel* from, RGBA8
   }
   return i;
 }
+#elif HWY_TARGET == HWY_WASM
+/// A look by two channels at a time. Tables of all pairs stand in memory for good, which no other thread has
+/// here.
+class PairsTable {
+ public:
+  /// So many pixels take longer by one channel at a time than to fill the table.
+  static constexpr std::size_t leastPixels = 1 << 18;
+
+  /// Of red and green, then of blue and alpha.
+  static const PairsTable& of(const LookTable& table) {
+    static PairsTable pairs;
+    for (std::size_t high = 0; high < 256; ++high) {
+      fill(table[0], table[1][high], pairs.redGreen_ + 256 * high);
+      fill(table[2], high, pairs.blueAlpha_ + 256 * high);
+    }
+    return pairs;
+  }
+
+  /// Looks up as many pixels as fill whole vectors and returns their number.
+  std::size_t apply(const RGBA8Pixel* from, RGBA8Pixel* to, std::size_t count) const {
+    const std::size_t whole = count - count % 4;
+    for (std::size_t i = 0; i < whole; i += 4) {
+      const auto* const pairs = reinterpret_cast<const std::uint16_t*>(from + i);
+      const auto redGreen = lookUp(redGreen_, pairs);
+      const auto blueAlpha = wasm_i32x4_shl(lookUp(blueAlpha_, pairs + 1), 16);
+      wasm_v128_store(to + i,
+                      wasm_v128_or(wasm_v128_and(redGreen, wasm_i32x4_splat(0xFFFF)), blueAlpha));
+    }
+    return whole;
+  }
+
+ private:
+  static void fill(const std::array<std::uint8_t, 256>& low, std::size_t high, std::uint16_t* row) {
+    const hn::ScalableTag<std::uint16_t> words;
+    const auto highs = hn::Set(words, static_cast<std::uint16_t>(high << 8));
+    for (std::size_t i = 0; i < 256; i += hn::Lanes(words)) {
+      const auto lows =
+          hn::PromoteTo(words, hn::LoadU(hn::Rebind<std::uint8_t, decltype(words)>(), &low[i]));
+      hn::Store(hn::Or(highs, lows), words, row + i);
+    }
+  }
+
+  /// Entries of four pairs, each with the one after it above it.
+  static HWY_INLINE v128_t lookUp(const std::uint16_t* table, const std::uint16_t* pairs) {
+    auto entries = wasm_v128_load32_zero(table + pairs[0]);
+    entries = wasm_v128_load32_lane(table + pairs[2], entries, 1);
+    entries = wasm_v128_load32_lane(table + pairs[4], entries, 2);
+    return wasm_v128_load32_lane(table + pairs[6], entries, 3);
+  }
+
+  HWY_ALIGN std::uint16_t redGreen_[65536], blueAlpha_[65536 + 1];
+};
+
+std::size_t applyToVectors(const LookTable& table, const RGBA8Pixel* from, RGBA8Pixel* to,
+                           std::size_t count) {
+  return count < PairsTable::leastPixels ? 0 : PairsTable::of(table).apply(from, to, count);
+}
 #else
 std::size_t applyToVectors(const LookTable&, const RGBA8Pixel*, RGBA8Pixel*, std::size_t) {
   return 0;
