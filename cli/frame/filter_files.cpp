@@ -144,7 +144,8 @@ void findMarks(const Work& work, int jobs, std::vector<PlannedFile>& plan) {
 
 Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   const photo::OpenOptions open = limited(work.photo);
-  photo::RowResources resources = work.pixels->resources();
+  const KeptPixels::Lent lent(*work.pixels);
+  photo::RowResources resources = lent.resources();
   resources.workers = work.workers.get();
   // What is shown on a page or put on record is needed as a whole.
   const bool mayBeParted = !work.shown && work.save.backup.empty() && file.output != "-";

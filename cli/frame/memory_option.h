@@ -1,6 +1,8 @@
 #pragma once
 
 #include <cstddef>
+#include <mutex>
+#include <vector>
 
 #include "cli/frame/verb.h"
 #include "photo/photo_rows.h"
@@ -20,12 +22,28 @@ class KeptPixels {
   /// @param jobs       as `-j` says.
   KeptPixels(int mebibytes, int jobs, std::size_t files);
 
-  /// For one of the files. They refer to this, and to what stays with the thread that calls.
-  photo::RowResources resources();
+  /// What one of the files has of it, on the thread that makes it, as long as this lives.
+  class Lent {
+   public:
+    explicit Lent(KeptPixels& pixels);
+    ~Lent();
+    Lent(const Lent&) = delete;
+    Lent& operator=(const Lent&) = delete;
+
+    photo::RowResources resources() const;
+
+   private:
+    KeptPixels& pixels_;
+    photo::SparePixels* spare_ = nullptr;
+  };
 
  private:
-  std::uint64_t each_;
+  const std::uint64_t each_;
   photo::PixelBudget budget_;
+  // What threads keep of their own would take memory in a place that has no way to say that there is none.
+  std::mutex mutex_;
+  std::vector<photo::SparePixels> spares_;
+  std::vector<photo::SparePixels*> free_;  // the last one is the last that was used
 };
 
 }  // namespace pelorin::cli

@@ -6,25 +6,6 @@
 
 #include "cli/frame/shown_text.h"
 
-#if defined(__SANITIZE_ADDRESS__)
-#define PELORIN_LOOKS_FOR_LEAKS
-#elif defined(__has_feature)
-#if __has_feature(address_sanitizer)
-#define PELORIN_LOOKS_FOR_LEAKS
-#endif
-#endif
-
-#ifdef PELORIN_LOOKS_FOR_LEAKS
-// Fontconfig keeps offsets in place of pointers, so that the fonts it still holds at the end look
-// lost.
-extern "C" __attribute__((visibility("default"))) const char* __lsan_default_suppressions() {
-  return "leak:libfontconfig.so\n";
-}
-extern "C" __attribute__((visibility("default"))) const char* __asan_default_options() {
-  return "print_suppressions=0";
-}
-#endif
-
 namespace pelorin::cli {
 namespace {
 

@@ -111,8 +111,9 @@ bool scorePhotos(const DupesOptions& options, photo::PhotoCache* cache, std::str
       eachPhoto<float>(inputs, options.jobs, talk,
                        {.work =
                             [&](std::size_t job) {
+                              const KeptPixels::Lent lent(pixels);
                               return photo::scoreOf(readInput(inputs[job]), interruptToken(),
-                                                    pixels.resources(), limits().decode);
+                                                    lent.resources(), limits().decode);
                             },
                         .done =
                             [&](std::size_t job, float score) {

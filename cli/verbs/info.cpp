@@ -168,7 +168,8 @@ ExitCode runInfo(const InfoOptions& options) {
       inputs, options.jobs, talk,
       {.work =
            [&](std::size_t index) {
-             return inspect(inputs[index], photo, pixels.resources(), faces, slider, talk);
+             const KeptPixels::Lent lent(pixels);
+             return inspect(inputs[index], photo, lent.resources(), faces, slider, talk);
            },
        .done =
            [&](std::size_t index, const Info& info) {

@@ -126,7 +126,8 @@ ExitCode runScore(const ScoreOptions& options) {
       inputs, options.jobs, talk,
       {.work =
            [&](std::size_t index) {
-             return score(inputs[index], photoOptions, pixels.resources(),
+             const KeptPixels::Lent lent(pixels);
+             return score(inputs[index], photoOptions, lent.resources(),
                           maps.empty() ? nullptr : &maps[index], options.maps.overwrite, talk);
            },
        .done = report,
