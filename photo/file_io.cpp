@@ -19,6 +19,7 @@
 #include <utility>
 
 #include "photo/descriptor.h"
+#include "photo/file_size.h"
 #include "photo/photo_error.h"
 #include "photo/stream_io.h"
 
@@ -128,6 +129,31 @@ Descriptor makeTemporary(const fs::path& folder, mode_t mode, std::string& path,
   }
 }
 
+// A new empty file in `folder` that has no name.
+Descriptor nameless(const std::string& folder, mode_t mode) {
+  const std::string place = folder.empty() ? "." : folder;
+  try {
+    return Descriptor(place, O_TMPFILE | O_RDWR, mode);
+  } catch (const std::system_error& error) {
+    // File systems without it, or kernels that take it for something else.
+    constexpr int unknown[] = {EOPNOTSUPP, EISDIR, ENOENT, EINVAL};
+    if (std::ranges::find(unknown, error.code().value()) == std::end(unknown)) throw;
+  }
+  std::string path;
+  RecordedTemporary recorded;
+  Descriptor named = makeTemporary(place, mode, path, recorded);
+  if (::unlink(path.c_str()) != 0) throwSystemError(errno, path);
+  return named;
+}
+
+// What others may do with a new file in `folder`, as the process's mask or the folder's own rules have it.
+mode_t usualPermissions(const std::string& folder) {
+  const Descriptor probe = nameless(folder, 0666);
+  struct stat made = {};
+  if (::fstat(probe.get(), &made) != 0) throwSystemError(errno, folder);
+  return made.st_mode & 0777;
+}
+
 bool isTemporaryName(std::string_view name) {
   if (name.size() <= temporaryStart.size() + temporaryEnd.size()) return false;
   if (!name.starts_with(temporaryStart) || !name.ends_with(temporaryEnd)) return false;
@@ -140,16 +166,6 @@ bool isTemporaryName(std::string_view name) {
 
 }  // namespace
 
-void refuseSize(const ReadOptions& options) {
-  constexpr int bitsOfMiB = 20;
-  const bool wholeMiB = options.largest % (std::uint64_t{1} << bitsOfMiB) == 0;
-  throw PhotoError(PhotoError::Kind::tooLarge,
-                   "is larger than " +
-                       (wholeMiB ? std::to_string(options.largest >> bitsOfMiB) + " MiB"
-                                 : std::to_string(options.largest) + " bytes") +
-                       ", the most that is read of a file");
-}
-
 std::vector<std::uint8_t> readFile(const std::string& path, const ReadOptions& options) {
   return readDescriptor(Descriptor(path, O_RDONLY | O_NONBLOCK).get(), path, options);
 }
@@ -159,7 +175,7 @@ std::vector<std::uint8_t> readDescriptor(int descriptor, const std::string& path
   struct stat status = {};
   if (::fstat(descriptor, &status) != 0) throwSystemError(errno, path);
   if (!S_ISREG(status.st_mode)) return readToEnd(descriptor, path, options);
-  if (std::uint64_t(status.st_size) > options.largest) refuseSize(options);
+  if (std::uint64_t(status.st_size) > options.largest) refuseFileSize(options.largest);
   // One byte more than there is, so that the end shows without growing.
   std::vector<std::uint8_t> bytes(std::size_t(status.st_size) + 1);
   std::size_t used = 0;
@@ -172,7 +188,7 @@ std::vector<std::uint8_t> readDescriptor(int descriptor, const std::string& path
     if (count < 0 && errno != EINTR) throwSystemError(errno, path);
     if (count == 0) break;
     if (count > 0) used += static_cast<std::size_t>(count);
-    if (used > options.largest) refuseSize(options);
+    if (used > options.largest) refuseFileSize(options.largest);
   }
   bytes.resize(used);
   return bytes;
@@ -201,15 +217,20 @@ Replacement::Replacement(const std::string& path, const FileView& bytes,
   const std::string& model = options.like.empty() ? path : options.like;
   if (!options.like.empty() && ::stat(model.c_str(), &old) != 0) throwSystemError(errno, model);
   const bool hasModel = exists || !options.like.empty();
-  Descriptor file =
-      makeTemporary(target.parent_path(), hasModel ? 0600 : 0666, temporary_, recorded_);
-  if (hasModel) takeAfter(old, model, file, temporary_);
+  const mode_t usual = hasModel ? 0 : usualPermissions(folder_);
+  Descriptor file = makeTemporary(target.parent_path(), 0600, temporary_, recorded_);
   writeAll(file, temporary_, bytes.bytes);
   if (bytes.rest != nullptr) {
     forEachBlock(*bytes.rest, [&](std::span<const std::uint8_t> block) {
       if (options.wait.stop.stop_requested()) throw Stopped();
       writeAll(file, temporary_, block);
     });
+  }
+  // Nobody else has it before it is whole.
+  if (hasModel) {
+    takeAfter(old, model, file, temporary_);
+  } else if (::fchmod(file.get(), usual) != 0) {
+    throwSystemError(errno, temporary_);
   }
   if (hasModel && options.keepTimes) takeTimes(old, file, temporary_);
   if (!options.timesOf.empty()) {
@@ -244,19 +265,7 @@ void writeFileAtomically(const std::string& path, const FileView& bytes,
 }
 
 Descriptor unnamedTemporary(const std::string& folder) {
-  const std::string place = folder.empty() ? "." : folder;
-  try {
-    return Descriptor(place, O_TMPFILE | O_RDWR, 0600);
-  } catch (const std::system_error& error) {
-    // File systems without it, or kernels that take it for something else.
-    constexpr int unknown[] = {EOPNOTSUPP, EISDIR, ENOENT, EINVAL};
-    if (std::ranges::find(unknown, error.code().value()) == std::end(unknown)) throw;
-  }
-  std::string path;
-  RecordedTemporary recorded;
-  Descriptor named = makeTemporary(place, 0600, path, recorded);
-  if (::unlink(path.c_str()) != 0) throwSystemError(errno, path);
-  return named;
+  return nameless(folder, 0600);
 }
 
 int renameToNew(const char* from, const char* to) {

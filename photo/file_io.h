@@ -7,6 +7,7 @@
 #include <string>
 #include <vector>
 
+#include "photo/decode_limits.h"
 #include "photo/descriptor.h"
 #include "photo/file_view.h"
 #include "photo/temporaries.h"
@@ -21,7 +22,7 @@ struct Waiting {
 };
 
 struct ReadOptions {
-  std::uint64_t largest = std::uint64_t{1} << 30;  ///< Bytes that are read at most.
+  std::uint64_t largest = DecodeLimits{}.bytes;  ///< Bytes that are read at most.
   Waiting wait = {};
 };
 
@@ -34,9 +35,6 @@ std::vector<std::uint8_t> readFile(const std::string& path, const ReadOptions& o
 /// The same of an open file, such as standard input, which stays open.
 std::vector<std::uint8_t> readDescriptor(int descriptor, const std::string& path,
                                          const ReadOptions& options = {});
-
-/// @throws PhotoError that tells the limit.
-[[noreturn]] void refuseSize(const ReadOptions& options);
 
 /// What becomes of a file that is there already.
 struct ReplaceOptions {

@@ -4,6 +4,7 @@
 #include <bit>
 #include <utility>
 
+#include "photo/file_size.h"
 #include "photo/photo_writer.h"
 #include "photo/reduced_rows.h"
 #include "photo/turned_image.h"
@@ -24,6 +25,7 @@ std::uint32_t divisorOf(int scale) {
 }
 
 std::unique_ptr<RowReader> readerOf(const FileView& file, const OpenOptions& options) {
+  checkFileSize(file.size(), options.limits);
   const Format& format = options.raw ? rawPixels() : formatOf(file.bytes);
   std::unique_ptr<RowReader> reader = format.reader(file, options);
   const std::uint32_t divisor = divisorOf(options.scale);
@@ -42,8 +44,8 @@ std::unique_ptr<RowReader> openRows(const FileView& file, const OpenOptions& opt
   return readerOf(file, options);
 }
 
-PhotoFacts readFacts(std::span<const std::uint8_t> file) {
-  return readerOf(file, {})->facts();
+PhotoFacts readFacts(std::span<const std::uint8_t> file, const DecodeLimits& limits) {
+  return readerOf(file, {.limits = limits})->facts();
 }
 
 Photo open(std::span<const std::uint8_t> file, const OpenOptions& options, SparePixels* spare) {

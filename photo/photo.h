@@ -39,7 +39,7 @@ Photo open(std::span<const std::uint8_t> file, const OpenOptions& options = {},
 
 /// What a file says before its picture data, without decoding.
 /// @throws PhotoError as `open`.
-PhotoFacts readFacts(std::span<const std::uint8_t> file);
+PhotoFacts readFacts(std::span<const std::uint8_t> file, const DecodeLimits& limits = {});
 
 /// The rows of a photo, for what needs no whole picture; scaled as `options` say and as they are
 /// stored, not turned.

@@ -6,6 +6,7 @@
 #include <thread>
 
 #include "photo/descriptor.h"
+#include "photo/file_size.h"
 #include "photo/photo_error.h"
 
 namespace pelorin::photo {
@@ -62,7 +63,7 @@ std::vector<std::uint8_t> readToEnd(int descriptor, const std::string& path,
     const ssize_t count = ::read(descriptor, bytes.data() + used, bytes.size() - used);
     if (count < 0 && !isBusy(errno)) throwSystemError(errno, path);
     if (count > 0) used += static_cast<std::size_t>(count);
-    if (used > options.largest) refuseSize(options);
+    if (used > options.largest) refuseFileSize(options.largest);
     if (count != 0) continue;
     // Nothing to read and nothing to wait for: the end, or that nobody has begun to write.
     if (events != 0 || used > 0) break;

@@ -34,7 +34,9 @@ photo::OpenOptions openOptions(const quenby_open_options* given, const quenby_ca
     refuse("scale", "is not 1, 2, 4 or 8");
   }
   if (open.rotate % 90 != 0) refuse("rotate", "is no multiple of 90");
-  if (options.max_pixels != 0) open.limits.pixels = options.max_pixels;
+  // Who names a number of pixels gets as many, also from a file that is small for them.
+  if (options.max_pixels != 0)
+    open.limits.pixels = open.limits.compressedPixels = options.max_pixels;
   if (options.max_scans < 0) refuse("max_scans", "is negative");
   if (options.max_scans != 0) open.limits.scans = options.max_scans;
   if (options.max_scanned_pixels != 0) open.limits.scannedPixels = options.max_scanned_pixels;
@@ -42,6 +44,7 @@ photo::OpenOptions openOptions(const quenby_open_options* given, const quenby_ca
     open.limits.compressedPixels = options.max_compressed_pixels;
   if (options.max_segments < 0) refuse("max_segments", "is negative");
   if (options.max_segments != 0) open.limits.segments = options.max_segments;
+  if (options.max_bytes != 0) open.limits.bytes = options.max_bytes;
   return open;
 }
 
@@ -134,9 +137,16 @@ quenby_facts factsOf(const photo::PhotoFacts& from) {
 
 int32_t quenby_read_facts(const uint8_t* file, size_t size, quenby_facts* facts,
                           quenby_error* error) {
+  return quenby_read_facts_within(file, size, nullptr, facts, error);
+}
+
+int32_t quenby_read_facts_within(const uint8_t* file, size_t size,
+                                 const quenby_open_options* options, quenby_facts* facts,
+                                 quenby_error* error) {
   return guarded(error, [&] {
     checkStructSize(required(facts, "facts"), "facts");
-    give(facts, factsOf(photo::readFacts(bytesOf(file, size))), "facts");
+    const photo::DecodeLimits limits = openOptions(options, nullptr).limits;
+    give(facts, factsOf(photo::readFacts(bytesOf(file, size), limits)), "facts");
   });
 }
 

@@ -68,11 +68,12 @@ void tellLosses(JNIEnv* env, const std::vector<photo::Loss>& losses, jobjectArra
   jni::throwCppExceptionIf(env->ExceptionCheck() != JNI_FALSE);
 }
 
-photo::DecodeLimits limitsOf(jlong maxPixels, jint maxScans, jint maxSegments) {
-  if (maxPixels < 0 || maxScans < 0 || maxSegments < 0) {
+photo::DecodeLimits limitsOf(jlong maxBytes, jlong maxPixels, jint maxScans, jint maxSegments) {
+  if (maxBytes < 0 || maxPixels < 0 || maxScans < 0 || maxSegments < 0) {
     throw std::invalid_argument("limits: are negative");
   }
   photo::DecodeLimits limits;
+  if (maxBytes != 0) limits.bytes = static_cast<std::uint64_t>(maxBytes);
   // Who names a number of pixels gets as many, also from a file that is small for them.
   if (maxPixels != 0) {
     limits.pixels = limits.compressedPixels = static_cast<std::uint64_t>(maxPixels);
@@ -95,11 +96,11 @@ GreenCDF cdfOf(JNIEnv* env, jfloatArray array) {
 jbyteArray filterBytes(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
                        jint length, jint quality, jint subsampling, jint rotation,
                        jfloatArray faces, jint scale, jstring filter, jstring params, jboolean mark,
-                       jlong cancel, jobjectArray lost, jlong maxPixels, jint maxScans,
-                       jint maxSegments, jboolean png) {
+                       jlong cancel, jobjectArray lost, jlong maxBytes, jlong maxPixels,
+                       jint maxScans, jint maxSegments, jboolean png) {
   const std::stop_token stop = cancellations().token(cancel);
   const std::optional<photo::ChromaSampling> sampling = samplingOf(subsampling);
-  const photo::DecodeLimits limits = limitsOf(maxPixels, maxScans, maxSegments);
+  const photo::DecodeLimits limits = limitsOf(maxBytes, maxPixels, maxScans, maxSegments);
   const photo::FilterRequest request{
       .filter = toString(env, filter),
       .params = toString(env, params),
@@ -115,16 +116,16 @@ jbyteArray filterBytes(JNIEnv* env, jobject, jbyteArray array, jobject buffer, j
 }
 
 jfloat niqe(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset, jint length,
-            jlong cancel, jlong maxPixels, jint maxScans, jint maxSegments) {
-  const photo::DecodeLimits limits = limitsOf(maxPixels, maxScans, maxSegments);
+            jlong cancel, jlong maxBytes, jlong maxPixels, jint maxScans, jint maxSegments) {
+  const photo::DecodeLimits limits = limitsOf(maxBytes, maxPixels, maxScans, maxSegments);
   const FileBytes file(env, array, buffer, offset, length);
   return photo::scoreOf(file.bytes(), cancellations().token(cancel), {}, limits);
 }
 
 jfloatArray niqeMeanFeatures(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
-                             jint length, jlong cancel, jlong maxPixels, jint maxScans,
-                             jint maxSegments) {
-  const photo::DecodeLimits limits = limitsOf(maxPixels, maxScans, maxSegments);
+                             jint length, jlong cancel, jlong maxBytes, jlong maxPixels,
+                             jint maxScans, jint maxSegments) {
+  const photo::DecodeLimits limits = limitsOf(maxBytes, maxPixels, maxScans, maxSegments);
   const FileBytes file(env, array, buffer, offset, length);
   photo::PhotoRows photo(file.bytes(),
                          {.faces = false, .limits = limits, .stop = cancellations().token(cancel)});
@@ -134,18 +135,20 @@ jfloatArray niqeMeanFeatures(JNIEnv* env, jobject, jbyteArray array, jobject buf
 }
 
 jfloatArray greenCdf(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
-                     jint length, jlong cancel, jlong maxPixels, jint maxScans, jint maxSegments) {
-  const photo::DecodeLimits limits = limitsOf(maxPixels, maxScans, maxSegments);
+                     jint length, jlong cancel, jlong maxBytes, jlong maxPixels, jint maxScans,
+                     jint maxSegments) {
+  const photo::DecodeLimits limits = limitsOf(maxBytes, maxPixels, maxScans, maxSegments);
   const FileBytes file(env, array, buffer, offset, length);
   return javaArray(env, photo::readPhotoRecord(file.bytes(), photo::automaticScale,
                                                cancellations().token(cancel), limits)
                             .cdf.unpacked());
 }
 
-jdoubleArray facts(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset,
-                   jint length) {
+jdoubleArray facts(JNIEnv* env, jobject, jbyteArray array, jobject buffer, jint offset, jint length,
+                   jlong maxBytes, jlong maxPixels, jint maxScans, jint maxSegments) {
+  const photo::DecodeLimits limits = limitsOf(maxBytes, maxPixels, maxScans, maxSegments);
   const FileBytes file(env, array, buffer, offset, length);
-  const photo::PhotoFacts facts = photo::readFacts(file.bytes());
+  const photo::PhotoFacts facts = photo::readFacts(file.bytes(), limits);
   constexpr double unknown = std::numeric_limits<double>::quiet_NaN();
   std::array<double, 5> values = {double(facts.width), double(facts.height),
                                   double(facts.orientation), unknown, unknown};
@@ -190,13 +193,13 @@ void registerPhotoNatives() {
   const JNINativeMethod methods[] = {
       nativeMethod(
           "filter",
-          "([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[BJIIZ)[B",
+          "([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[BJJIIZ)[B",
           photoNative<&filterBytes>()),
-      nativeMethod("niqe", "([BLjava/nio/ByteBuffer;IIJJII)F", photoNative<&niqe>()),
-      nativeMethod("niqeFeatures", "([BLjava/nio/ByteBuffer;IIJJII)[F",
+      nativeMethod("niqe", "([BLjava/nio/ByteBuffer;IIJJJII)F", photoNative<&niqe>()),
+      nativeMethod("niqeFeatures", "([BLjava/nio/ByteBuffer;IIJJJII)[F",
                    photoNative<&niqeMeanFeatures>()),
-      nativeMethod("greenCdf", "([BLjava/nio/ByteBuffer;IIJJII)[F", photoNative<&greenCdf>()),
-      nativeMethod("facts", "([BLjava/nio/ByteBuffer;II)[D", photoNative<&facts>()),
+      nativeMethod("greenCdf", "([BLjava/nio/ByteBuffer;IIJJJII)[F", photoNative<&greenCdf>()),
+      nativeMethod("facts", "([BLjava/nio/ByteBuffer;IIJJII)[D", photoNative<&facts>()),
       nativeMethod("distance", "([F[F)F", photoNative<&distance>()),
       nativeMethod("score", "(FDZ)F", photoNative<&score>()),
       nativeMethod("window", "(FZ)D", photoNative<&window>()),

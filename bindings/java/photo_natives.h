@@ -8,8 +8,8 @@ namespace pelorin::quenby {
 // machine knows may call, any number at once.
 //
 // A photo is given as an array or a direct buffer, see FileBytes, and `cancel` is a handle of
-// Cancellations or 0; `maxPixels`, `maxScans` and `maxSegments` are those of photo::DecodeLimits, 0 for
-// what it has. Beside what single natives say: PhotoException for what is no photo, damaged or
+// Cancellations or 0; `maxBytes`, `maxPixels`, `maxScans` and `maxSegments` are those of
+// photo::DecodeLimits, 0 for what it has. Beside what single natives say: PhotoException for what is no photo, damaged or
 // beyond the limits, CancellationException after a cancellation, IllegalArgumentException that names
 // the argument, OutOfMemoryError.
 
@@ -25,26 +25,27 @@ namespace pelorin::quenby {
 jbyteArray filterBytes(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset,
                        jint length, jint quality, jint subsampling, jint rotation,
                        jfloatArray faces, jint scale, jstring filter, jstring params, jboolean mark,
-                       jlong cancel, jobjectArray lost, jlong maxPixels, jint maxScans,
-                       jint maxSegments, jboolean png);
+                       jlong cancel, jobjectArray lost, jlong maxBytes, jlong maxPixels,
+                       jint maxScans, jint maxSegments, jboolean png);
 
 /// The NIQE score of the upright picture; NaN when a side is below 96 pixels.
 jfloat niqe(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset, jint length,
-            jlong cancel, jlong maxPixels, jint maxScans, jint maxSegments);
+            jlong cancel, jlong maxBytes, jlong maxPixels, jint maxScans, jint maxSegments);
 
 /// The 36 mean features behind the score; none when a side is below 96 pixels.
 jfloatArray niqeMeanFeatures(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer,
-                             jint offset, jint length, jlong cancel, jlong maxPixels, jint maxScans,
-                             jint maxSegments);
+                             jint offset, jint length, jlong cancel, jlong maxBytes,
+                             jlong maxPixels, jint maxScans, jint maxSegments);
 
 /// The 256 values of the green CDF, of the picture at the size that `quenby dupes` reads.
 jfloatArray greenCdf(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset,
-                     jint length, jlong cancel, jlong maxPixels, jint maxScans, jint maxSegments);
+                     jint length, jlong cancel, jlong maxBytes, jlong maxPixels, jint maxScans,
+                     jint maxSegments);
 
 /// Width and height as stored, EXIF orientation, capture time in seconds since 1970 by the clock of
 /// its place and in UTC, each NaN when it is not known; from the header alone.
 jdoubleArray facts(JNIEnv* env, jobject caller, jbyteArray array, jobject buffer, jint offset,
-                   jint length);
+                   jint length, jlong maxBytes, jlong maxPixels, jint maxScans, jint maxSegments);
 
 /// How far apart two green CDFs are, 0 ... 1.
 jfloat distance(JNIEnv* env, jobject caller, jfloatArray a, jfloatArray b);

@@ -26,7 +26,7 @@ void writeStream(std::FILE* stream, std::span<const std::uint8_t> bytes) {
 }
 
 photo::ReadOptions readOptions() {
-  return {.largest = limits().bytes, .wait = {.stop = interruptToken()}};
+  return {.largest = limits().decode.bytes, .wait = {.stop = interruptToken()}};
 }
 
 // Of every format that has one.

@@ -23,9 +23,17 @@ void addLimitOptions(Verb verb) {
               "only says to have them")
       .inThousands()
       .group("Limits");
-  verb.option("--max-bytes", limitsOfThisRun.bytes,
+  verb.option("--max-bytes", limitsOfThisRun.decode.bytes,
               "Refuse files of more bytes; 1074M unless given")
       .inThousands()
+      .group("Limits");
+  verb.option("--max-scans", limitsOfThisRun.decode.scans,
+              "Refuse JPEG files of more scans; 100 unless given")
+      .between(1, INT_MAX)
+      .group("Limits");
+  verb.option("--max-segments", limitsOfThisRun.decode.segments,
+              "Refuse JPEG files of more segments before the picture; 4096 unless given")
+      .between(1, INT_MAX)
       .group("Limits");
   verb.option("--timeout", limitsOfThisRun.seconds,
               "Give a photo up after so many seconds; 0, as long as it takes, unless given")

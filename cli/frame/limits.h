@@ -4,7 +4,6 @@
 
 #include "cli/frame/verb.h"
 #include "photo/decode_limits.h"
-#include "photo/file_io.h"
 
 namespace pelorin::cli {
 
@@ -12,14 +11,14 @@ namespace pelorin::cli {
 /// any work, and every thread reads it.
 struct Limits {
   photo::DecodeLimits decode = {};
-  std::uint64_t bytes = photo::ReadOptions{}.largest;  ///< Of a photo's file.
-  std::uint32_t seconds = 0;                           ///< For each photo; 0 for no limit.
+  std::uint32_t seconds = 0;  ///< For each photo; 0 for no limit.
 };
 
 /// Those of this run.
 Limits limits();
 
-/// Adds `--max-pixels`, `--max-bytes` and `--timeout` to a verb that reads photos.
+/// Adds `--max-pixels`, `--max-bytes`, `--max-scans`, `--max-segments` and `--timeout` to a verb that reads
+/// photos.
 void addLimitOptions(Verb verb);
 
 }  // namespace pelorin::cli

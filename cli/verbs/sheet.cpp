@@ -13,6 +13,7 @@
 #include "cli/frame/interrupt.h"
 #include "cli/frame/jobs_option.h"
 #include "cli/frame/json_output.h"
+#include "cli/frame/limits.h"
 #include "cli/frame/lone_files.h"
 #include "cli/frame/memory_option.h"
 #include "cli/frame/photo_files.h"
@@ -71,7 +72,7 @@ photo::PictureSize roomFor(const Input& input, const photo::OpenOptions& options
   if (input.isStandardInput()) return box;
   if (!input.trouble.empty()) return {cell, cell / 4};
   try {
-    const photo::PhotoFacts facts = photo::readFacts(readInput(input));
+    const photo::PhotoFacts facts = photo::readFacts(readInput(input), limits().decode);
     const bool onItsSide = photo::uprightTurn(facts.orientation).quarters % 2 != 0;
     const photo::PictureSize stored{facts.width, facts.height};
     return photo::fitWithin(onItsSide ? photo::PictureSize{stored.height, stored.width} : stored,
@@ -196,7 +197,8 @@ ExitCode runSheet(const SheetOptions& options) {
       inputs, options.jobs, talk,
       {.work =
            [&](std::size_t index) {
-             return makeRow(work, inputs[index], pixels.resources(), painter.thumbnailSize(index),
+             const KeptPixels::Lent lent(pixels);
+             return makeRow(work, inputs[index], lent.resources(), painter.thumbnailSize(index),
                             talk);
            },
        .done =

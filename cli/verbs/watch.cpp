@@ -180,7 +180,9 @@ class Watch {
   // Whoever put another file there since has not had it made by Quenby, as far as one can see.
   static bool isMarked(const std::string& result) {
     try {
-      return !photo::readFacts(photo::readFile(result)).edits.empty();
+      const photo::DecodeLimits most = limits().decode;
+      const auto file = photo::readFile(result, {.largest = most.bytes});
+      return !photo::readFacts(file, most).edits.empty();
     } catch (const std::exception&) {
       return false;
     }

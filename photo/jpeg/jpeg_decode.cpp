@@ -1,6 +1,7 @@
 #include <limits>
 #include <new>
 
+#include "photo/file_size.h"
 #include "photo/jpeg/jpeg_picture_reader.h"
 
 namespace pelorin::photo {
@@ -32,6 +33,7 @@ DecodedPicture decodeJpeg(std::span<const std::uint8_t> file, int scale,
 void decodeJpegInto(
     const std::function<std::uint8_t*(std::uint32_t width, std::uint32_t height)>& makeRoom,
     std::span<const std::uint8_t> file, int scale, const DecodeLimits& limits) {
+  checkFileSize(file.size(), limits);
   JpegPictureReader picture(file, scale, limits, JpegPictureReader::Keep::profile);
   const std::uint32_t height = picture.height();
   picture.read(makeRoom(picture.width(), height), height);

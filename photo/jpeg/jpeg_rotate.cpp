@@ -3,6 +3,7 @@
 #include <numeric>
 #include <string>
 
+#include "photo/file_size.h"
 #include "photo/jpeg/jpeg_codec.h"
 #include "photo/jpeg/jpeg_limits.h"
 #include "photo/jpeg/jpeg_turn_pixels.h"
@@ -121,6 +122,7 @@ void turnBlocks(jpeg_decompress_struct& source, jvirt_barray_ptr before,
 std::vector<std::uint8_t> rotateJpeg(std::span<const std::uint8_t> file, int degrees,
                                      const DecodeLimits& limits) {
   const Turn turn = turnBy(degrees);
+  checkFileSize(file.size(), limits);
   LibjpegReader reader(file);
   reader.keepAllSegments();
   reader.readHeader(limits.segments);

@@ -201,6 +201,35 @@ TEST_F(FileIo, GivesANewFileThePermissionsOfTheUmask) {
   EXPECT_EQ(permissionsOf(path("file")), 0640u);
 }
 
+/// Bytes that look at the only file in a folder while they are written there.
+class Onlooker : public ByteSource {
+ public:
+  explicit Onlooker(std::string folder) : folder_(std::move(folder)) {}
+  std::uint64_t size() const override { return 1000; }
+  void read(std::uint64_t, std::span<std::uint8_t> bytes) override {
+    std::ranges::fill(bytes, std::uint8_t{7});
+    for (const auto& entry : fs::directory_iterator(folder_))
+      if (entry.path().filename().string().starts_with(".quenby-"))
+        seen.push_back(permissionsOf(entry.path()));
+  }
+
+  std::vector<mode_t> seen;
+
+ private:
+  const std::string folder_;
+};
+
+TEST_F(FileIo, WritesForItsUserAloneUntilAFileIsWhole) {
+  const mode_t old = ::umask(0);
+  for (int round = 0; round < 2; ++round) {  // a new file, then one in its place
+    Onlooker rest(folder_);
+    writeFileAtomically(path("file"), FileView(std::span<const std::uint8_t>(), &rest));
+    EXPECT_EQ(rest.seen, std::vector<mode_t>{0600u});
+    EXPECT_EQ(permissionsOf(path("file")), 0666u);
+  }
+  ::umask(old);
+}
+
 TEST_F(FileIo, DoesNotReplaceAProtectedFile) {
   const AsOrdinaryUser user(folder_);
   writeFileAtomically(path("file"), countingBytes(5));

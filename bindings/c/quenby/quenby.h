@@ -225,7 +225,8 @@ typedef struct quenby_open_options {
   size_t struct_size;
   int32_t scale;       /**< 1, 2, 4 or 8: what the sides are divided by, rounded up. */
   int32_t rotate;      /**< Degrees clockwise beyond upright, a multiple of 90. */
-  uint64_t max_pixels; /**< Of the picture as stored: 268435456 unless given. */
+  uint64_t max_pixels; /**< Of the picture as stored: 268435456 unless given; then of compressed
+                            pixels as well, unless those are given. */
   int32_t max_scans;   /**< Of a progressive file: 100 unless given. */
   uint32_t flags;
   const quenby_workers* workers;  /**< Of quenby_filter_file alone; null for none. */
@@ -234,6 +235,7 @@ typedef struct quenby_open_options {
   uint64_t max_compressed_pixels; /**< Pixels, beside 128 for each byte of a PNG or arithmetic coded
                                        JPEG file: 40000000 unless given. */
   int32_t max_segments;           /**< Before a JPEG file's picture data: 4096 unless given. */
+  uint64_t max_bytes;             /**< Of the file: 1073741824 unless given. */
 } quenby_open_options;
 
 /** Bits of quenby_save_options.flags. */
@@ -305,6 +307,12 @@ typedef struct quenby_loss {
 /** What a file says, without decoding it. */
 QUENBY_API int32_t quenby_read_facts(const uint8_t* file, size_t size, quenby_facts* facts,
                                      quenby_error* error);
+
+/** The same within limits.
+ * @param options  its limits count and nothing else of it; may be null. */
+QUENBY_API int32_t quenby_read_facts_within(const uint8_t* file, size_t size,
+                                            const quenby_open_options* options, quenby_facts* facts,
+                                            quenby_error* error);
 
 /** Decodes a JPEG or PNG file and turns the picture upright: all of it or an error, never half.
  * @param options  may be null.

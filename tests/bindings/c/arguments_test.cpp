@@ -186,6 +186,8 @@ std::vector<Choice<T>> inputs() {
     with(&T::max_scanned_pixels, UINT64_MAX, right);
     with(&T::max_compressed_pixels, UINT64_MAX, right);
     with(&T::max_pixels, 1u, either);
+    with(&T::max_bytes, UINT64_MAX, right);
+    with(&T::max_bytes, 1u, either);
     with(&T::workers, &workers, either);
   } else if constexpr (std::is_same_v<T, quenby_save_options>) {
     const std::size_t size = sizeof(T);

@@ -125,6 +125,35 @@ static void files(struct bytes photo) {
   quenby_file_free(made);
 }
 
+/* What a function that reads a file says to limits. */
+static void limited(struct bytes file, quenby_open_options limits, const char* words) {
+  quenby_facts facts = {.struct_size = sizeof(facts)};
+  quenby_photo* photo = NULL;
+  quenby_file* made = NULL;
+  quenby_shot shot;
+  const int kinds[] = {quenby_read_facts_within(file.data, file.size, &limits, &facts, &error),
+                       quenby_photo_open(file.data, file.size, &limits, NULL, &photo, &error),
+                       quenby_read_shot(file.data, file.size, &limits, NULL, &shot, &error),
+                       quenby_filter_file(file.data, file.size, "WinterRGB", NULL, NULL, 0, &limits,
+                                          NULL, NULL, NULL, &made, &error)};
+  for (size_t i = 0; i < sizeof(kinds) / sizeof(*kinds); ++i)
+    CHECK(kinds[i] == (words == NULL ? QUENBY_OK : QUENBY_TOO_LARGE));
+  CHECK(words == NULL ? error.message[0] == 0 : strstr(error.message, words) != NULL);
+  quenby_photo_free(photo);
+  quenby_file_free(made);
+}
+
+static void limits(struct bytes file) {
+  const size_t size = sizeof(quenby_open_options);
+  limited(file, (quenby_open_options){.struct_size = size, .max_bytes = file.size}, NULL);
+  limited(file, (quenby_open_options){.struct_size = size, .max_bytes = file.size - 1},
+          "larger than");
+  limited(file, (quenby_open_options){.struct_size = size, .max_pixels = 30000}, NULL);
+  limited(file, (quenby_open_options){.struct_size = size, .max_pixels = 29999}, "at most 29999");
+  limited(file, (quenby_open_options){.struct_size = size, .max_segments = 1}, "segments");
+  limited(file, (quenby_open_options){.struct_size = size, .max_scans = 1}, NULL);
+}
+
 static void photos(struct bytes file) {
   quenby_facts facts = {.struct_size = sizeof(facts)};
   DONE(quenby_read_facts(file.data, file.size, &facts, &error));
@@ -340,6 +369,7 @@ int main(int argc, char** argv) {
   filters();
   files(photo);
   photos(photo);
+  limits(photo);
   sessions();
   duplicates(photo);
   quality();

@@ -113,7 +113,9 @@ static void open_options_of_every_function(struct bytes photo, quenby_open_optio
   quenby_photo* made = NULL;
   quenby_file* file = NULL;
   quenby_shot shot;
+  quenby_facts facts = {.struct_size = sizeof(facts)};
   INVALID(quenby_photo_open(photo.data, photo.size, &options, NULL, &made, e));
+  INVALID(quenby_read_facts_within(photo.data, photo.size, &options, &facts, e));
   INVALID(quenby_read_shot(photo.data, photo.size, &options, NULL, &shot, e));
   INVALID(quenby_filter_file(photo.data, photo.size, "WinterRGB", NULL, NULL, 0, &options, NULL,
                              NULL, NULL, &file, e));
@@ -139,6 +141,7 @@ static void files(struct bytes photo) {
   INVALID(quenby_read_facts(NULL, 1, &facts, e));
   INVALID(quenby_read_facts(few, SIZE_MAX, &facts, e));
   INVALID(quenby_read_facts(photo.data, photo.size, NULL, e));
+  INVALID(quenby_read_facts_within(photo.data, photo.size, NULL, NULL, e));
   INVALID(quenby_photo_open(NULL, 1, NULL, NULL, &made, e));
   INVALID(quenby_photo_open(few, SIZE_MAX, NULL, NULL, &made, e));
   INVALID(quenby_photo_open(photo.data, photo.size, NULL, NULL, NULL, e));

@@ -24,14 +24,14 @@ class PhotoLibrary : public testing::Test {
   std::string enhanced(const Bytes& file) {
     using Filter = jbyteArray (*)(JNIEnv*, jobject, jbyteArray, jobject, jint, jint, jint, jint,
                                   jint, jfloatArray, jint, jstring, jstring, jboolean, jlong,
-                                  jobjectArray, jlong, jint, jint, jboolean);
+                                  jobjectArray, jlong, jlong, jint, jint, jboolean);
     const auto filter = reinterpret_cast<Filter>(FakeEnvironment::registered().at(
-        "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[BJIIZ)[B"));
+        "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[BJJIIZ)[B"));
     FakeObject array{.bytes = file}, name{.text = "AE0"}, params{.text = "slider=0.4;"};
     const jbyteArray made = filter(
         &env, nullptr, reinterpret_cast<jbyteArray>(&array), nullptr, 0,
         static_cast<jint>(file.size()), 90, 0, 0, nullptr, 1, reinterpret_cast<jstring>(&name),
-        reinterpret_cast<jstring>(&params), JNI_FALSE, 0, nullptr, 0, 0, 0, JNI_FALSE);
+        reinterpret_cast<jstring>(&params), JNI_FALSE, 0, nullptr, 0, 0, 0, 0, JNI_FALSE);
     if (made == nullptr) return "nothing";
     const Bytes bytes = env.resolve(made, "test")->bytes;
     env.DeleteLocalRef(made);

@@ -50,7 +50,7 @@ struct FakeSlot : FakeObject {
 
 /// Limits, 0 for what the natives have.
 struct MaxOf {
-  jlong pixels = 0;
+  jlong bytes = 0, pixels = 0;
   jint scans = 0, segments = 0;
 };
 
@@ -78,32 +78,35 @@ struct PhotoCalls {
                jlong cancel, jint subsampling = 0, jboolean mark = JNI_TRUE,
                jobjectArray lost = nullptr, const MaxOf& most = {}) const {
     const FakeObject* const made = taken(call<jbyteArray>(
-        "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[BJIIZ)[B",
+        "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/String;ZJ[[BJJIIZ)[B",
         array, buffer, offset, length, quality, subsampling, rotation, faces, scale, name, params,
-        mark, cancel, lost, most.pixels, most.scans, most.segments, jboolean{JNI_FALSE}));
+        mark, cancel, lost, most.bytes, most.pixels, most.scans, most.segments,
+        jboolean{JNI_FALSE}));
     return made == nullptr ? Bytes() : made->bytes;
   }
 
   std::vector<float> floats(const char* name, FakeBytes& file, jlong cancel = 0,
                             const MaxOf& most = {}) const {
-    const FakeObject* const made = taken(call<jfloatArray>(
-        (std::string(name) + "([BLjava/nio/ByteBuffer;IIJJII)[F").c_str(),
-        static_cast<jbyteArray>(file), static_cast<jobject>(nullptr), jint{0},
-        static_cast<jint>(file.bytes.size()), cancel, most.pixels, most.scans, most.segments));
+    const FakeObject* const made =
+        taken(call<jfloatArray>((std::string(name) + "([BLjava/nio/ByteBuffer;IIJJJII)[F").c_str(),
+                                static_cast<jbyteArray>(file), static_cast<jobject>(nullptr),
+                                jint{0}, static_cast<jint>(file.bytes.size()), cancel, most.bytes,
+                                most.pixels, most.scans, most.segments));
     return made == nullptr ? std::vector<float>() : made->floatElements;
   }
 
   float niqe(FakeBytes& file, jlong cancel = 0, const MaxOf& most = {}) const {
-    return call<jfloat>("niqe([BLjava/nio/ByteBuffer;IIJJII)F", static_cast<jbyteArray>(file),
+    return call<jfloat>("niqe([BLjava/nio/ByteBuffer;IIJJJII)F", static_cast<jbyteArray>(file),
                         static_cast<jobject>(nullptr), jint{0},
-                        static_cast<jint>(file.bytes.size()), cancel, most.pixels, most.scans,
-                        most.segments);
+                        static_cast<jint>(file.bytes.size()), cancel, most.bytes, most.pixels,
+                        most.scans, most.segments);
   }
 
-  std::vector<double> facts(FakeBytes& file) const {
+  std::vector<double> facts(FakeBytes& file, const MaxOf& most = {}) const {
     const FakeObject* const made = taken(call<jdoubleArray>(
-        "facts([BLjava/nio/ByteBuffer;II)[D", static_cast<jbyteArray>(file),
-        static_cast<jobject>(nullptr), jint{0}, static_cast<jint>(file.bytes.size())));
+        "facts([BLjava/nio/ByteBuffer;IIJJII)[D", static_cast<jbyteArray>(file),
+        static_cast<jobject>(nullptr), jint{0}, static_cast<jint>(file.bytes.size()), most.bytes,
+        most.pixels, most.scans, most.segments));
     return made == nullptr ? std::vector<double>() : made->doubleElements;
   }
 

@@ -16,6 +16,7 @@
 #include "photo/photo.h"
 #include "tests/bindings/java/photo_natives_fixture.h"
 #include "tests/support/allocation_faults.h"
+#include "tests/support/jpeg_files.h"
 
 namespace pelorin::test_support {
 namespace {
@@ -156,12 +157,21 @@ TEST_F(PhotoNatives, RefuseWhatAsksForMoreThanTheLimits) {
     calls.filter(file, nullptr, 0, static_cast<jint>(file.bytes.size()), 90, 0, nullptr, 1, name,
                  params, 0, 0, JNI_TRUE, nullptr, most);
     EXPECT_EQ(env.takeException(), error);
+    calls.facts(file, most);
+    EXPECT_EQ(env.takeException(), error) << "facts";
     return error;
   };
   EXPECT_EQ(errorOf({.pixels = pixels}), "");
   EXPECT_THAT(errorOf({.pixels = pixels - 1}), HasSubstr("too large: "));
   EXPECT_THAT(errorOf({.segments = 1}), HasSubstr("too many segments: at most 1"));
-  for (const MaxOf& negative : {MaxOf{.pixels = -1}, MaxOf{.scans = -1}, MaxOf{.segments = -1}})
+  const auto bytes = static_cast<jlong>(file.bytes.size());
+  EXPECT_EQ(errorOf({.bytes = bytes}), "");
+  EXPECT_THAT(errorOf({.bytes = bytes - 1}), HasSubstr("is larger than "));
+  file.bytes = test_support::makeJpeg({.scans = test_support::progressiveScans(10)});
+  EXPECT_EQ(errorOf({.scans = 10}), "");
+  EXPECT_THAT(errorOf({.scans = 9}), HasSubstr("too many scans: at most 9"));
+  for (const MaxOf& negative :
+       {MaxOf{.bytes = -1}, MaxOf{.pixels = -1}, MaxOf{.scans = -1}, MaxOf{.segments = -1}})
     EXPECT_EQ(errorOf(negative), "java/lang/IllegalArgumentException: limits: are negative");
 }
 
@@ -256,29 +266,31 @@ class PhotoNativesUnderFaults : public PhotoNatives {
     const auto measured = [this](const char* nameAndSignature) {
       return [this, nameAndSignature] {
         env.DeleteLocalRef(calls.call<jobject>(nameAndSignature, array(), jobject{}, jint{0},
-                                               size(), jlong{0}, jlong{0}, jint{0}, jint{0}));
+                                               size(), jlong{0}, jlong{0}, jlong{0}, jint{0},
+                                               jint{0}));
       };
     };
-    return {
-        [this] {
-          env.DeleteLocalRef(calls.call<jobject>(
-              "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/"
-              "String;ZJ[[BJIIZ)[B",
-              array(), jobject{}, jint{0}, size(), jint{90}, jint{0}, jint{90},
-              static_cast<jfloatArray>(faces), jint{1}, static_cast<jstring>(ae),
-              static_cast<jstring>(slider), jboolean{JNI_TRUE}, jlong{0},
-              static_cast<jobjectArray>(lost), jlong{0}, jint{0}, jint{0}, jboolean{JNI_FALSE}));
-        },
-        [this] {
-          calls.call<jfloat>("niqe([BLjava/nio/ByteBuffer;IIJJII)F", array(), jobject{}, jint{0},
-                             size(), jlong{0}, jlong{0}, jint{0}, jint{0});
-        },
-        measured("niqeFeatures([BLjava/nio/ByteBuffer;IIJJII)[F"),
-        measured("greenCdf([BLjava/nio/ByteBuffer;IIJJII)[F"),
-        [this] {
-          env.DeleteLocalRef(calls.call<jobject>("facts([BLjava/nio/ByteBuffer;II)[D", array(),
-                                                 jobject{}, jint{0}, size()));
-        }};
+    return {[this] {
+              env.DeleteLocalRef(calls.call<jobject>(
+                  "filter([BLjava/nio/ByteBuffer;IIIII[FILjava/lang/String;Ljava/lang/"
+                  "String;ZJ[[BJJIIZ)[B",
+                  array(), jobject{}, jint{0}, size(), jint{90}, jint{0}, jint{90},
+                  static_cast<jfloatArray>(faces), jint{1}, static_cast<jstring>(ae),
+                  static_cast<jstring>(slider), jboolean{JNI_TRUE}, jlong{0},
+                  static_cast<jobjectArray>(lost), jlong{0}, jlong{0}, jint{0}, jint{0},
+                  jboolean{JNI_FALSE}));
+            },
+            [this] {
+              calls.call<jfloat>("niqe([BLjava/nio/ByteBuffer;IIJJJII)F", array(), jobject{},
+                                 jint{0}, size(), jlong{0}, jlong{0}, jlong{0}, jint{0}, jint{0});
+            },
+            measured("niqeFeatures([BLjava/nio/ByteBuffer;IIJJJII)[F"),
+            measured("greenCdf([BLjava/nio/ByteBuffer;IIJJJII)[F"),
+            [this] {
+              env.DeleteLocalRef(calls.call<jobject>("facts([BLjava/nio/ByteBuffer;IIJJII)[D",
+                                                     array(), jobject{}, jint{0}, size(), jlong{0},
+                                                     jlong{0}, jint{0}, jint{0}));
+            }};
   }
 
   jbyteArray array() { return small; }
@@ -322,28 +334,46 @@ TEST_F(PhotoNativesUnderFaults, RaiseOutOfMemoryAndLeakNothing) {
 
 TEST_F(PhotoNativesUnderFaults, LeaveTheExceptionOfAFailingCallPending) {
   using Failure = FakeEnvironment::Failure;
-  FakeBytes bad({'t', 'e', 'x', 't'});
+  using Later = FakeEnvironment::Later;
   std::vector<Native> all = natives();
-  all.push_back([&] { calls.niqe(bad); });
-  for (const Native& native : all) {
+  all.push_back([this] { env.DeleteLocalRef(calls.call<jobject>("version()Ljava/lang/String;")); });
+  const std::vector<Native> refusing = natives();
+  const Bytes whole = small.bytes;
+  int faults = 0;
+  const auto failEachCall = [&](const Native& native) {
     env.failCall(0);
     native();
     env.takeException();
     const int fallible = env.fallibleCalls();
     for (int call = 1; call <= fallible; ++call) {
       for (const Failure failure : {Failure::withException, Failure::withoutException}) {
-        env.failCall(call, failure);
-        native();
-        EXPECT_TRUE(env.failed());
-        env.failCall(0);
-        const std::string exception = env.takeException();
-        if (failure == Failure::withException) {
-          EXPECT_THAT(exception, StartsWith("test/Injected: "));
+        for (const Later later : {Later::succeed, Later::fail}) {
+          env.failCall(call, failure, later);
+          native();
+          EXPECT_TRUE(env.failed());
+          env.failCall(0);
+          const std::string exception = env.takeException();
+          if (failure == Failure::withException) {
+            EXPECT_THAT(exception, StartsWith("test/Injected: "));
+          }
+          EXPECT_EQ(env.violations(), "");
+          ++faults;
         }
-        EXPECT_EQ(env.violations(), "");
       }
     }
+  };
+  for (const Native& native : all) failEachCall(native);
+  for (const Bytes& refused : {Bytes{}, Bytes{'t', 'e', 'x', 't'}}) {
+    small.bytes = refused;
+    for (const Native& native : refusing) failEachCall(native);
   }
+  small.bytes = whole;
+  for (const Native& native : all) {
+    native();
+    EXPECT_FALSE(env.pending());
+  }
+  EXPECT_GE(faults, 200);
+  printf("%d failing calls\n", faults);
 }
 
 TEST_F(PhotoNatives, NeedTheirJavaClass) {

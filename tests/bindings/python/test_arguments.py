@@ -31,6 +31,7 @@ RIGHT = {
     "known_faces": True,
     "like": None,
     "mark": True,
+    "max_bytes": None,
     "max_pixels": None,
     "max_scans": None,
     "max_segments": None,

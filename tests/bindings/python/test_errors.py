@@ -1,6 +1,7 @@
 """What is wrong is said, by the right exception."""
 
 import pickle
+import time
 
 import numpy as np
 import pytest
@@ -60,6 +61,46 @@ def test_kinds_of_bad_files():
     quenby.read(whole, max_pixels=600)
     with pytest.raises(quenby.PhotoError, match="segments"):
         quenby.read(whole, max_segments=1)
+
+
+def test_limits(tmp_path):
+    whole = jpeg(SMALL)
+    path = tmp_path / "a.jpg"
+    path.write_bytes(whole)
+    enough = dict(max_bytes=len(whole), max_pixels=600, max_scans=1, max_segments=9)
+    for call in (
+        quenby.read,
+        quenby.facts,
+        quenby.green_cdf,
+        lambda file, **limits: quenby.enhance_file(file, None, **limits),
+    ):
+        for file in (whole, path):
+            call(file, **enough)
+            for limit, words in (
+                (dict(max_bytes=len(whole) - 1), "larger than"),
+                (dict(max_pixels=599), "pixels"),
+                (dict(max_segments=1), "segments"),
+            ):
+                with pytest.raises(quenby.PhotoError, match=words) as caught:
+                    call(file, **limit)
+                assert caught.value.kind == "too large"
+    found = quenby.find_duplicates([path], max_bytes=len(whole) - 1)
+    assert found.failed[str(path)].kind == "too large"
+    assert not quenby.find_duplicates([path], **enough).failed
+    for limit in enough:
+        for call in (quenby.read, quenby.facts, quenby.green_cdf):
+            with pytest.raises(ValueError, match=limit):
+                call(whole, **{limit: 0})
+            call(whole, **{limit: 2**200})
+    late = quenby.Cancel(after=0)
+    deadline = time.monotonic() + 60
+    while time.monotonic() < deadline:  # until its thread has had its turn
+        try:
+            quenby.read(path, cancel=late)
+        except quenby.Cancelled:
+            break
+    else:
+        pytest.fail("is not cancelled by the time")
 
 
 @pytest.mark.parametrize(

@@ -86,6 +86,28 @@ def test_png_pixels_come_back(tmp_path):
     assert [loss.what for loss in quenby.write(tmp_path / "a.jpg", rgba)] == ["transparency"]
 
 
+def test_files_are_their_users_alone_until_they_are_whole(photo, tmp_path, monkeypatch):
+    seen, opened = [], os.fdopen
+
+    def look(descriptor, mode):
+        seen.append(stat.S_IMODE(os.fstat(descriptor).st_mode))
+        return opened(descriptor, mode)
+
+    monkeypatch.setattr(os, "fdopen", look)
+    plain = tmp_path / "plain"
+    plain.touch()
+    target = tmp_path / "out.jpg"
+    quenby.enhance_file(photo, target)
+    assert seen == [0o600]
+    assert target.stat().st_mode == plain.stat().st_mode
+    monkeypatch.delattr(os, "O_TMPFILE", raising=False)
+    quenby.write(tmp_path / "other.png", picture(10, 10))
+    assert (tmp_path / "other.png").stat().st_mode == plain.stat().st_mode
+    assert sorted(os.listdir(tmp_path)) == sorted(
+        {photo.name if photo.parent == tmp_path else "plain", "plain", "out.jpg", "other.png"}
+    )
+
+
 def test_nothing_is_overwritten_unasked(photo, tmp_path):
     target = tmp_path / "there.jpg"
     target.write_bytes(b"old")

@@ -47,7 +47,25 @@ TEST_P(LimitsOf, RefusesWhatAsksForMore) {
   EXPECT_EQ(bytes.exitCode, 1);
   EXPECT_THAT(bytes.errors, HasSubstr("a.jpg: is larger than 100 bytes"));
 
-  const Finished enough = shell(run + " --max-pixels 9600 --max-bytes 1G --timeout 3600");
+  const Finished segments = shell(run + " --max-segments 1");
+  EXPECT_EQ(segments.exitCode, 1);
+  EXPECT_THAT(segments.errors, HasSubstr("a.jpg: too many segments: at most 1 can be read"));
+
+  const Finished enough = shell(run +
+                                " --max-pixels 9600 --max-bytes 1G --max-segments 9 "
+                                "--max-scans 1 --timeout 3600");
+  EXPECT_EQ(enough.exitCode, 0) << enough.errors;
+}
+
+TEST_P(LimitsOf, RefusesMoreScans) {
+  const TemporaryFolder folder;
+  folder.makeFolder("in");
+  folder.write("in/a.jpg", makeJpeg({.width = 128, .height = 104, .scans = progressiveScans(10)}));
+  const std::string run = "cd '" + (folder / "") + "' && $QUENBY " + GetParam();
+  const Finished scans = shell(run + " --max-scans 9");
+  EXPECT_EQ(scans.exitCode, 1);
+  EXPECT_THAT(scans.errors, HasSubstr("a.jpg: too many scans: at most 9 can be read"));
+  const Finished enough = shell(run + " --max-scans 10");
   EXPECT_EQ(enough.exitCode, 0) << enough.errors;
 }
 
@@ -95,7 +113,8 @@ TEST(Limits, AreNumbersAboveNought) {
     EXPECT_EQ(run.exitCode, 2);
     EXPECT_THAT(run.errors, StartsWith("quenby info: --max-pixels: "));
   }
-  EXPECT_EQ(quenby({"info", "a.jpg", "--timeout=-1"}).exitCode, 2);
+  for (const char* option : {"--timeout=-1", "--max-scans=0", "--max-segments=-1"})
+    EXPECT_EQ(quenby({"info", "a.jpg", option}).exitCode, 2) << option;
 }
 
 // Takes the second that it is about: nobody writes into the pipe.

@@ -12,7 +12,8 @@ from typing import Any, Optional
 import numpy as np
 import numpy.typing as npt
 
-from ._library import Cancel, Cancelled, CPair, CPairs, CShot, call, plain, pointer_of
+from ._library import Cancel, Cancelled, COpenOptions, CPair, CPairs, CShot
+from ._library import call, plain, pointer_of
 from ._photos import Photo, open_options, opened
 from ._pixels import AnyPhoto, Path, file_bytes, floats, pixels_of, rgba_of
 
@@ -22,18 +23,28 @@ Cdf = npt.NDArray[np.float32]
 _least_untimed_score = 3.5
 
 
-def _shot_of(file: bytes, cancel: Optional[Cancel] = None) -> CShot:
-    shot, options = CShot(), open_options()
+def _shot_of(file: bytes, options: COpenOptions, cancel: Optional[Cancel] = None) -> CShot:
+    shot = CShot()
     call("read_shot", file, len(file), byref(options), pointer_of(cancel), byref(shot))
     return shot
 
 
-def green_cdf(photo: AnyPhoto) -> Cdf:
+def green_cdf(
+    photo: AnyPhoto,
+    *,
+    max_bytes: Optional[int] = None,
+    max_pixels: Optional[int] = None,
+    max_scans: Optional[int] = None,
+    max_segments: Optional[int] = None,
+) -> Cdf:
     """The share of pixels whose green byte is at most i: 256 floats up to 1. Files are decoded at the size
-    that find_duplicates reads."""
-    file = file_bytes(photo)
+    that find_duplicates reads, within limits that are those of read()."""
+    options = open_options(
+        max_bytes=max_bytes, max_pixels=max_pixels, max_scans=max_scans, max_segments=max_segments
+    )
+    file = file_bytes(photo, max_bytes)
     if file is not None:
-        return np.array(_shot_of(file).green_cdf, np.float32)
+        return np.array(_shot_of(file, options).green_cdf, np.float32)
     pixels = opened(photo)
     rgba = pixels.rgba if isinstance(pixels, Photo) else rgba_of(pixels)
     given, cdf = pixels_of(rgba), np.empty(256, np.float32)
@@ -138,6 +149,10 @@ def find_duplicates(
     threshold: float = 1.5,
     *,
     workers: Optional[int] = None,
+    max_bytes: Optional[int] = None,
+    max_pixels: Optional[int] = None,
+    max_scans: Optional[int] = None,
+    max_segments: Optional[int] = None,
     cancel: Optional[Cancel] = None,
 ) -> Duplicates:
     """The near-duplicates among files, as `quenby dupes` finds them: shots of one scene a moment apart.
@@ -145,14 +160,17 @@ def find_duplicates(
 
     threshold:  the smallest score of a pair.
     workers:    how many files are read at once; as many as there are processors unless given.
+    max_bytes, max_pixels, max_scans, max_segments:  limits for each file, as those of read().
     """
+    options = open_options(
+        max_bytes=max_bytes, max_pixels=max_pixels, max_scans=max_scans, max_segments=max_segments
+    )
     names = list(dict.fromkeys(os.fspath(path) for path in paths))
     failed: dict[str, Exception] = {}
 
     def shot(name: str) -> Optional[CShot]:
         try:
-            with open(name, "rb") as file:
-                return _shot_of(file.read(), cancel)
+            return _shot_of(file_bytes(name, max_bytes) or b"", options, cancel)
         except Cancelled:
             raise
         except (ValueError, OSError, MemoryError) as error:

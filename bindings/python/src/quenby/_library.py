@@ -110,6 +110,7 @@ class COpenOptions(Growing):
         ("max_scanned_pixels", c_uint64),
         ("max_compressed_pixels", c_uint64),
         ("max_segments", c_int32),
+        ("max_bytes", c_uint64),
     ]
 
 
@@ -222,7 +223,7 @@ _fallible: dict[str, tuple[Any, ...]] = {
     "filter_named": (c_char_p, POINTER(CFilter)),
     "parameter_at": (c_char_p, c_size_t, POINTER(CParameter)),
     "check_parameters": (c_char_p, c_char_p, POINTER(CFault), c_size_t, POINTER(c_size_t)),
-    "read_facts": (*_file, POINTER(CFacts)),
+    "read_facts_within": (*_file, _open, POINTER(CFacts)),
     "photo_open": (*_file, _open, c_void_p, _object),
     "photo_pixels": (c_void_p, _pixels),
     "photo_facts": (c_void_p, POINTER(CFacts)),

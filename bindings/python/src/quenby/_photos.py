@@ -79,16 +79,26 @@ def _facts(given: CFacts) -> Facts:
     )
 
 
-def facts(photo: Union[Path, bytes]) -> Facts:
-    """What a file says, without decoding it."""
-    data = _required_bytes(photo)
+def facts(
+    photo: Union[Path, bytes],
+    *,
+    max_bytes: Optional[int] = None,
+    max_pixels: Optional[int] = None,
+    max_scans: Optional[int] = None,
+    max_segments: Optional[int] = None,
+) -> Facts:
+    """What a file says, without decoding it; limits are those of read()."""
+    options = open_options(
+        max_bytes=max_bytes, max_pixels=max_pixels, max_scans=max_scans, max_segments=max_segments
+    )
+    data = _required_bytes(photo, max_bytes)
     given = CFacts()
-    call("read_facts", data, len(data), byref(given))
+    call("read_facts_within", data, len(data), byref(options), byref(given))
     return _facts(given)
 
 
-def _required_bytes(photo: Union[Path, bytes]) -> bytes:
-    data = file_bytes(photo)
+def _required_bytes(photo: Union[Path, bytes], max_bytes: Optional[int]) -> bytes:
+    data = file_bytes(photo, max_bytes)
     if data is None:
         raise TypeError(f"a file is a path or bytes, not {type(photo).__name__}")
     return data
@@ -99,11 +109,13 @@ def open_options(
     rotate: int = 0,
     upright: bool = True,
     known_faces: bool = True,
+    max_bytes: Optional[int] = None,
     max_pixels: Optional[int] = None,
     max_scans: Optional[int] = None,
     max_segments: Optional[int] = None,
 ) -> COpenOptions:
     for name, value in (
+        ("max_bytes", max_bytes),
         ("max_pixels", max_pixels),
         ("max_scans", max_scans),
         ("max_segments", max_segments),
@@ -122,6 +134,7 @@ def open_options(
         max_scans=min(max_scans or 0, 2**31 - 1),
         flags=flags,
         max_segments=min(max_segments or 0, 2**31 - 1),
+        max_bytes=min(max_bytes or 0, 2**64 - 1),
     )
 
 
@@ -223,6 +236,7 @@ def read(
     rotate: int = 0,
     upright: bool = True,
     known_faces: bool = True,
+    max_bytes: Optional[int] = None,
     max_pixels: Optional[int] = None,
     max_scans: Optional[int] = None,
     max_segments: Optional[int] = None,
@@ -233,19 +247,21 @@ def read(
     scale:       1, 2, 4 or 8: what the sides are divided by, rounded up.
     rotate:      degrees clockwise beyond upright, a multiple of 90.
     upright:     else the picture is as it is stored.
-    max_pixels:  the largest picture to decode, 268435456 unless given; likewise max_scans, 100, and
-                 max_segments, 4096, of a JPEG file.
+    max_pixels:  the largest picture to decode, 268435456 unless given; likewise max_bytes, 2**30, of the
+                 file, max_scans, 100, and max_segments, 4096, of a JPEG file.
+    cancel:      Cancel(after=5) limits the time.
     """
     options = dict(
         scale=scale,
         rotate=rotate,
         upright=upright,
         known_faces=known_faces,
+        max_bytes=max_bytes,
         max_pixels=max_pixels,
         max_scans=max_scans,
         max_segments=max_segments,
     )
-    return Photo(_required_bytes(photo), options, cancel)
+    return Photo(_required_bytes(photo, max_bytes), options, cancel)
 
 
 def opened(photo: AnyPhoto) -> Union[Photo, Bytes]:
@@ -322,6 +338,19 @@ def _format_for(path: Path) -> str:
     return _formats[extension]
 
 
+def _usual_permissions(folder: str, unused_name: str) -> int:
+    """What others may do with a new file in a folder, as the process's mask or its own rules have it."""
+    try:
+        probe = os.open(folder or ".", os.O_TMPFILE | os.O_RDWR | os.O_CLOEXEC, 0o666)
+    except (OSError, AttributeError):  # file systems and systems without nameless files
+        probe = os.open(unused_name, os.O_RDWR | os.O_CREAT | os.O_EXCL | os.O_CLOEXEC, 0o666)
+        os.unlink(unused_name)
+    try:
+        return os.fstat(probe).st_mode & 0o777
+    finally:
+        os.close(probe)
+
+
 def _put(path: Path, data: bytes, overwrite: bool) -> None:
     """Whole or not at all."""
     target = os.path.realpath(os.fspath(path))
@@ -331,13 +360,16 @@ def _put(path: Path, data: bytes, overwrite: bool) -> None:
         return
     if not overwrite and os.path.lexists(target):
         raise FileExistsError(17, "exists already; overwrite=True replaces it", os.fspath(path))
-    temporary = os.path.join(os.path.dirname(target), f".quenby-{secrets.token_hex(8)}")
-    descriptor = os.open(temporary, os.O_WRONLY | os.O_CREAT | os.O_EXCL | os.O_CLOEXEC, 0o666)
+    folder = os.path.dirname(target)
+    temporary = os.path.join(folder, f".quenby-{secrets.token_hex(8)}")
+    exists = os.path.exists(target)
+    mode = os.stat(target).st_mode & 0o7777 if exists else _usual_permissions(folder, temporary)
+    # Nobody else has it before it is whole.
+    descriptor = os.open(temporary, os.O_WRONLY | os.O_CREAT | os.O_EXCL | os.O_CLOEXEC, 0o600)
     try:
         with os.fdopen(descriptor, "wb") as file:
             file.write(data)
-        if os.path.exists(target):
-            os.chmod(temporary, os.stat(target).st_mode & 0o7777)
+        os.chmod(temporary, mode)
         if overwrite:
             os.replace(temporary, target)
         else:
@@ -384,6 +416,7 @@ def filter_file(
     known_faces: bool = True,
     strip: Iterable[str] = (),
     keep: Iterable[str] = (),
+    max_bytes: Optional[int] = None,
     max_pixels: Optional[int] = None,
     max_scans: Optional[int] = None,
     max_segments: Optional[int] = None,
@@ -401,6 +434,7 @@ def filter_file(
     threads:     how many share the work, 0 for as many as there are cores; the file is the same.
     mark:        whether the file tells of the edit. A photo that tells of one is edited all the
                  same; see Facts.last_edit.
+    max_bytes, max_pixels, max_scans, max_segments:  limits, as those of read().
 
     Returns the losses of metadata, a list; without a target the bytes and that list.
     """
@@ -410,8 +444,10 @@ def filter_file(
         raise TypeError("params or keywords, not both: " + ", ".join(parameters))
     if target is not None:
         format = _format_for(target)
-    data = _required_bytes(source)
-    open = open_options(scale, rotate, True, known_faces, max_pixels, max_scans, max_segments)
+    data = _required_bytes(source, max_bytes)
+    open = open_options(
+        scale, rotate, True, known_faces, max_bytes, max_pixels, max_scans, max_segments
+    )
     save, pointer = _save_options(quality, strip, keep, subsampling, mark), c_void_p()
     arguments = (data, len(data), utf8(filter), utf8(params), *faces_of(faces), byref(open))
     rest = (None if format is None else utf8(format), byref(save), pointer_of(cancel))

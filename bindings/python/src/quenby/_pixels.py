@@ -22,11 +22,26 @@ Face = Sequence[float]
 _largest_fraction = 2.0
 
 
-def file_bytes(photo: AnyPhoto) -> Optional[bytes]:
-    """What stands in a file: of a path, or bytes as they are; None for what is no file."""
+# As C has it.
+_usual_max_bytes = 2**30
+
+
+def _first_bytes(path: Path, most: int) -> bytes:
+    with open(path, "rb") as file:
+        # One byte more than there is, so that the end shows; a pipe has no size.
+        parts = [file.read(min(os.fstat(file.fileno()).st_size + 1, most))]
+        left = most - len(parts[0])
+        while left > 0 and (part := file.read(min(2**20, left))):
+            parts.append(part)
+            left -= len(part)
+    return b"".join(parts)
+
+
+def file_bytes(photo: AnyPhoto, max_bytes: Optional[int] = None) -> Optional[bytes]:
+    """What stands in a file: of a path, or bytes as they are; None for what is no file. Of a larger file
+    as much as shows that it is one."""
     if isinstance(photo, (str, os.PathLike)):
-        with open(photo, "rb") as file:
-            return file.read()
+        return _first_bytes(photo, max(1, max_bytes or _usual_max_bytes) + 1)
     if isinstance(photo, (bytes, bytearray, memoryview)):
         return bytes(photo)
     return None

@@ -1,25 +1,54 @@
 package com.pelorin.photos.quenby.autoenhance;
 
-import java.util.HashSet;
-import java.util.Set;
+import java.time.Duration;
+import java.util.HashMap;
+import java.util.Map;
 import java.util.concurrent.CancellationException;
+import java.util.concurrent.Future;
+import java.util.concurrent.ScheduledThreadPoolExecutor;
+import java.util.concurrent.TimeUnit;
 
 /**
- * A way to give work up from another thread. Work that was given one throws
+ * A way to give work up from another thread, or when its time is over. Work that was given one throws
  * {@link CancellationException} soon after {@link #cancel}, and at once when that came before it;
  * how soon, its methods say. One may serve any number of calls; any thread may call.
  */
 public final class Cancellation {
-    private final Set<Long> atWork = new HashSet<>();
+    /** For each call its alarm, null without a time. */
+    private final Map<Long, Future<?>> atWork = new HashMap<>();
+    private final boolean isTimed;
+    private final long end; // by System.nanoTime
     private boolean cancelled;
 
     /** Makes one that is not cancelled. */
-    public Cancellation() {}
+    public Cancellation() {
+        isTimed = false;
+        end = 0;
+    }
+
+    private Cancellation(long nanoseconds) {
+        isTimed = true;
+        end = System.nanoTime() + nanoseconds;
+    }
+
+    /**
+     * Makes one that is cancelled by itself when a time has gone by, whatever is at work then.
+     *
+     * @param time from this call on; none, or less than none, for at once
+     * @return the cancellation
+     */
+    public static Cancellation after(Duration time) {
+        // Half of what a long holds, so that times can be subtracted: 146 years.
+        Duration most = Duration.ofNanos(Long.MAX_VALUE / 2);
+        Duration least = Duration.ZERO;
+        return new Cancellation((time.compareTo(most) > 0 ? most
+                : time.compareTo(least) < 0 ? least : time).toNanos());
+    }
 
     /** Gives all work up that was given this, now and later. Again does nothing. */
     public synchronized void cancel() {
         cancelled = true;
-        for (long handle : atWork) {
+        for (long handle : atWork.keySet()) {
             PhotoBytes.cancel(handle);
         }
     }
@@ -27,10 +56,10 @@ public final class Cancellation {
     /**
      * Tells whether work is given up.
      *
-     * @return true after {@link #cancel}
+     * @return true after {@link #cancel}, and when the time is over
      */
     public synchronized boolean isCancelled() {
-        return cancelled;
+        return cancelled || (isTimed && end - System.nanoTime() <= 0);
     }
 
     static void checkBefore(Cancellation cancellation) {
@@ -56,8 +85,13 @@ public final class Cancellation {
         synchronized (cancellation) {
             checkBefore(cancellation);
             long handle = PhotoBytes.newCancel();
-            cancellation.atWork.add(handle);
-            return handle;
+            try {
+                cancellation.atWork.put(handle, cancellation.alarm(handle));
+                return handle;
+            } catch (Throwable error) {
+                PhotoBytes.freeCancel(handle);
+                throw error;
+            }
         }
     }
 
@@ -65,9 +99,34 @@ public final class Cancellation {
         if (cancellation == null) {
             return;
         }
+        Future<?> alarm;
         synchronized (cancellation) {
-            cancellation.atWork.remove(handle);
+            alarm = cancellation.atWork.remove(handle);
+        }
+        if (alarm != null) {
+            alarm.cancel(false);
         }
         PhotoBytes.freeCancel(handle);
+    }
+
+    private Future<?> alarm(long handle) {
+        return isTimed ? Clock.ALARMS.schedule(() -> PhotoBytes.cancel(handle),
+                end - System.nanoTime(), TimeUnit.NANOSECONDS) : null;
+    }
+
+    /** A thread for all alarms, which ends when there has been none for a while. */
+    private static final class Clock {
+        static final ScheduledThreadPoolExecutor ALARMS =
+                new ScheduledThreadPoolExecutor(1, work -> {
+                    Thread thread = new Thread(work, "quenby time limits");
+                    thread.setDaemon(true);
+                    return thread;
+                });
+
+        static {
+            ALARMS.setKeepAliveTime(1, TimeUnit.SECONDS);
+            ALARMS.allowCoreThreadTimeOut(true);
+            ALARMS.setRemoveOnCancelPolicy(true);
+        }
     }
 }

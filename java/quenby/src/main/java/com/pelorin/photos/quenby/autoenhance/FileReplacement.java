@@ -12,6 +12,7 @@ import java.nio.file.StandardOpenOption;
 import java.nio.file.attribute.FileAttribute;
 import java.nio.file.attribute.PosixFileAttributeView;
 import java.nio.file.attribute.PosixFileAttributes;
+import java.nio.file.attribute.PosixFilePermission;
 import java.nio.file.attribute.PosixFilePermissions;
 import java.util.EnumSet;
 import java.util.Set;
@@ -48,13 +49,16 @@ final class FileReplacement {
         PosixFileAttributeView old = exists
                 ? Files.getFileAttributeView(target, PosixFileAttributeView.class) : null;
         try {
-            try (FileChannel channel = old == null ? FileChannel.open(beside, NEW)
-                    : FileChannel.open(beside, NEW, PRIVATE)) {
-                if (old != null) {
-                    takeAfter(old.readAttributes(), beside);
-                }
+            Set<PosixFilePermission> usual = old == null ? usualPermissions(beside) : null;
+            try (FileChannel channel = FileChannel.open(beside, NEW, PRIVATE)) {
                 for (ByteBuffer rest = ByteBuffer.wrap(content); rest.hasRemaining();) {
                     channel.write(rest);
+                }
+                // Nobody else has it before it is whole.
+                if (old != null) {
+                    takeAfter(old.readAttributes(), beside);
+                } else {
+                    Files.setPosixFilePermissions(beside, usual);
                 }
                 channel.force(true);
             }
@@ -63,6 +67,16 @@ final class FileReplacement {
             Files.deleteIfExists(beside);
         }
         sync(target.toAbsolutePath().getParent());
+    }
+
+    /** Of a new file with this name, as the process's mask or the folder's own rules have it. */
+    private static Set<PosixFilePermission> usualPermissions(Path name) throws IOException {
+        FileChannel.open(name, NEW).close();
+        try {
+            return Files.getPosixFilePermissions(name);
+        } finally {
+            Files.delete(name);
+        }
     }
 
     /** A name that is not on the disk yet means the old file after a power cut, which is whole. */

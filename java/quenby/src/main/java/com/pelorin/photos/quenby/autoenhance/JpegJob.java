@@ -6,8 +6,6 @@ import java.nio.file.AccessDeniedException;
 import java.nio.file.Files;
 import java.nio.file.NoSuchFileException;
 import java.nio.file.Path;
-import java.util.Arrays;
-import java.util.Collections;
 import java.util.List;
 
 /**
@@ -23,23 +21,20 @@ import java.util.List;
 public final class JpegJob {
     private final Path input;
     private final Path output;
-    private final int rotation;
-    private final int scale;
-    private final List<RectF> faces;
     private final Filter filter;
     private final String params;
-    private final Cancellation cancellation;
+    private final PhotoBytes settings; // of a file that is not read yet
 
-    private JpegJob(Path input, Path output, int rotation, int scale, List<RectF> faces,
-            Filter filter, String params, Cancellation cancellation) {
+    private JpegJob(Path input, Path output, Filter filter, String params, PhotoBytes settings) {
         this.input = input;
         this.output = output;
-        this.rotation = rotation;
-        this.scale = scale;
-        this.faces = faces;
         this.filter = filter;
         this.params = params;
-        this.cancellation = cancellation;
+        this.settings = settings;
+    }
+
+    private JpegJob with(PhotoBytes changed) {
+        return new JpegJob(input, output, filter, params, changed);
     }
 
     /**
@@ -51,8 +46,8 @@ public final class JpegJob {
      * @return the job
      */
     public static JpegJob of(Path input, Path output) {
-        return new JpegJob(input, output, 0, 1, Collections.emptyList(), Filter.AUTO,
-                "slider=0.4;", null);
+        return new JpegJob(
+                input, output, Filter.AUTO, "slider=0.4;", PhotoBytes.of(new byte[0]));
     }
 
     /**
@@ -63,11 +58,7 @@ public final class JpegJob {
      * @throws IllegalArgumentException for another angle
      */
     public JpegJob rotation(int degrees) {
-        if (degrees % 90 != 0) {
-            throw new IllegalArgumentException("no multiple of 90 degrees: " + degrees);
-        }
-        return new JpegJob(
-                input, output, degrees % 360, scale, faces, filter, params, cancellation);
+        return with(settings.rotation(degrees));
     }
 
     /**
@@ -78,10 +69,7 @@ public final class JpegJob {
      * @throws IllegalArgumentException for another divisor
      */
     public JpegJob scale(int divisor) {
-        if (!Arrays.asList(1, 2, 4, 8).contains(divisor)) {
-            throw new IllegalArgumentException("neither 1, 2, 4 nor 8: " + divisor);
-        }
-        return new JpegJob(input, output, rotation, divisor, faces, filter, params, cancellation);
+        return with(settings.scale(divisor));
     }
 
     /**
@@ -92,8 +80,51 @@ public final class JpegJob {
      * @throws IllegalArgumentException when a face is null or not finite
      */
     public JpegJob faces(List<RectF> faces) {
-        List<RectF> own = Arrays.asList(Faces.check(faces));
-        return new JpegJob(input, output, rotation, scale, own, filter, params, cancellation);
+        return with(settings.faces(faces));
+    }
+
+    /**
+     * Refuses larger files, as too large, before they are read.
+     *
+     * @param bytes at least 1; 1073741824 unless given
+     * @return a job that does
+     * @throws IllegalArgumentException for less
+     */
+    public JpegJob maxBytes(long bytes) {
+        return with(settings.maxBytes(bytes));
+    }
+
+    /**
+     * Refuses larger pictures, as too large; see {@link PhotoBytes#maxPixels}.
+     *
+     * @param pixels at least 1, of the picture as stored
+     * @return a job that does
+     * @throws IllegalArgumentException for less
+     */
+    public JpegJob maxPixels(long pixels) {
+        return with(settings.maxPixels(pixels));
+    }
+
+    /**
+     * Refuses JPEG files of more scans, as too large.
+     *
+     * @param scans at least 1; 100 unless given
+     * @return a job that does
+     * @throws IllegalArgumentException for less
+     */
+    public JpegJob maxScans(int scans) {
+        return with(settings.maxScans(scans));
+    }
+
+    /**
+     * Refuses JPEG files of more segments before the picture data, as too large.
+     *
+     * @param segments at least 1; 4096 unless given
+     * @return a job that does
+     * @throws IllegalArgumentException for less
+     */
+    public JpegJob maxSegments(int segments) {
+        return with(settings.maxSegments(segments));
     }
 
     /**
@@ -107,25 +138,25 @@ public final class JpegJob {
         if (filter == null) {
             throw new UnknownFilterException(null);
         }
-        return new JpegJob(input, output, rotation, scale, faces, filter, params, cancellation);
+        return new JpegJob(input, output, filter, params, settings);
     }
 
     /**
-     * Lets another thread give the job up.
+     * Lets another thread, or the time, give the job up.
      *
-     * @param cancellation by which it does; null for nobody
+     * @param cancellation by which it does, such as {@link Cancellation#after}; null for nobody
      * @return a job that can be given up
      */
     public JpegJob cancellation(Cancellation cancellation) {
-        return new JpegJob(input, output, rotation, scale, faces, filter, params, cancellation);
+        return with(settings.cancellation(cancellation));
     }
 
     /**
      * Does it.
      *
      * @throws NoSuchFileException      when there is no input file
-     * @throws JpegException            when the input is empty, no photo, truncated or damaged; the
-     *                                  kind says which, the message why
+     * @throws JpegException            when the input is empty, no photo, truncated, damaged or
+     *                                  beyond a limit; the kind says which, the message why
      * @throws IOException              when a file cannot be read or written
      * @throws IllegalArgumentException when a parameter is unknown, missing or unreadable; the
      *                                  message says what the filter wants
@@ -138,8 +169,11 @@ public final class JpegJob {
         }
         byte[] made;
         try {
-            made = PhotoBytes.of(Files.readAllBytes(input)).rotation(rotation).scale(scale)
-                    .faces(faces).cancellation(cancellation).filter(filter, params);
+            if (settings.isTooLarge(Files.size(input))) {
+                throw new PhotoException(PhotoException.Kind.TOO_LARGE,
+                        "is larger than the most that is read of a file", null);
+            }
+            made = settings.inFile(Files.readAllBytes(input)).filter(filter, params);
         } catch (PhotoException error) {
             throw new JpegException(input.toString(), error);
         }

@@ -37,6 +37,7 @@ public final class PhotoBytes {
         boolean mark = true;
         Consumer<? super Loss> losses;
         Cancellation cancellation;
+        long maxBytes;
         long maxPixels;
         int maxScans;
         int maxSegments;
@@ -241,6 +242,19 @@ public final class PhotoBytes {
     }
 
     /**
+     * Refuses larger files, as too large.
+     *
+     * @param bytes at least 1; 1073741824 unless given
+     * @return a photo that does
+     * @throws IllegalArgumentException for less
+     */
+    public PhotoBytes maxBytes(long bytes) {
+        Settings changed = settings.copy();
+        changed.maxBytes = atLeastOne("maxBytes", bytes);
+        return with(changed);
+    }
+
+    /**
      * Refuses larger pictures, as too large.
      *
      * @param pixels at least 1, of the picture as stored; unless given 268435456, or
@@ -280,6 +294,16 @@ public final class PhotoBytes {
         return with(changed);
     }
 
+    /** The same settings on another file. */
+    PhotoBytes inFile(byte[] file) {
+        return new PhotoBytes(file, null, 0, file.length, settings);
+    }
+
+    /** The size of a file that is known to be refused, before it is read. */
+    boolean isTooLarge(long bytes) {
+        return settings.maxBytes != 0 && bytes > settings.maxBytes;
+    }
+
     private static long atLeastOne(String name, long number) {
         if (number < 1) {
             throw new IllegalArgumentException(name + ": is below 1: " + number);
@@ -288,9 +312,9 @@ public final class PhotoBytes {
     }
 
     /**
-     * Lets another thread give up what is asked of the photo.
+     * Lets another thread, or the time, give up what is asked of the photo.
      *
-     * @param cancellation by which it does; null for nobody
+     * @param cancellation by which it does, such as {@link Cancellation#after}; null for nobody
      * @return a photo that can be given up
      */
     public PhotoBytes cancellation(Cancellation cancellation) {
@@ -334,7 +358,8 @@ public final class PhotoBytes {
         byte[] made = call(cancel -> filter(array, buffer, offset, length, settings.quality,
                 settings.subsampling, settings.rotation, settings.faces, settings.scale,
                 filter.key(), params == null ? "" : params, settings.mark, cancel, lost,
-                settings.maxPixels, settings.maxScans, settings.maxSegments, settings.png));
+                settings.maxBytes, settings.maxPixels, settings.maxScans, settings.maxSegments,
+                settings.png));
         if (lost != null) {
             Loss.all(lost[0]).forEach(settings.losses);
         }
@@ -348,7 +373,8 @@ public final class PhotoBytes {
      * @throws PhotoException when the bytes are no photo or damaged; the kind says which
      */
     public PhotoFacts facts() throws PhotoException {
-        return call(cancel -> new PhotoFacts(facts(array, buffer, offset, length)));
+        return call(cancel -> new PhotoFacts(facts(array, buffer, offset, length,
+                settings.maxBytes, settings.maxPixels, settings.maxScans, settings.maxSegments)));
     }
 
     /**
@@ -359,7 +385,7 @@ public final class PhotoBytes {
      */
     public float niqe() throws PhotoException {
         return call(cancel -> niqe(array, buffer, offset, length, cancel,
-                settings.maxPixels, settings.maxScans, settings.maxSegments));
+                settings.maxBytes, settings.maxPixels, settings.maxScans, settings.maxSegments));
     }
 
     /**
@@ -370,7 +396,7 @@ public final class PhotoBytes {
      */
     public float[] niqeFeatures() throws PhotoException {
         return call(cancel -> niqeFeatures(array, buffer, offset, length, cancel,
-                settings.maxPixels, settings.maxScans, settings.maxSegments));
+                settings.maxBytes, settings.maxPixels, settings.maxScans, settings.maxSegments));
     }
 
     /**
@@ -381,7 +407,7 @@ public final class PhotoBytes {
      */
     public GreenCdf greenCdf() throws PhotoException {
         return call(cancel -> new GreenCdf(greenCdf(array, buffer, offset, length, cancel,
-                settings.maxPixels, settings.maxScans, settings.maxSegments)));
+                settings.maxBytes, settings.maxPixels, settings.maxScans, settings.maxSegments)));
     }
 
     private interface Work<T> {
@@ -401,21 +427,23 @@ public final class PhotoBytes {
     // libquenby_photo.so registers these.
     static native byte[] filter(byte[] array, ByteBuffer buffer, int offset, int length,
             int quality, int subsampling, int rotation, float[] faces, int scale, String filter,
-            String params, boolean mark, long cancel, byte[][] lost, long maxPixels, int maxScans,
-            int maxSegments, boolean png) throws PhotoException;
+            String params, boolean mark, long cancel, byte[][] lost, long maxBytes, long maxPixels,
+            int maxScans, int maxSegments, boolean png) throws PhotoException;
 
     private static native float niqe(byte[] array, ByteBuffer buffer, int offset, int length,
-            long cancel, long maxPixels, int maxScans, int maxSegments) throws PhotoException;
+            long cancel, long maxBytes, long maxPixels, int maxScans, int maxSegments)
+            throws PhotoException;
 
     private static native float[] niqeFeatures(byte[] array, ByteBuffer buffer, int offset,
-            int length, long cancel, long maxPixels, int maxScans, int maxSegments)
+            int length, long cancel, long maxBytes, long maxPixels, int maxScans, int maxSegments)
             throws PhotoException;
 
     private static native float[] greenCdf(byte[] array, ByteBuffer buffer, int offset, int length,
-            long cancel, long maxPixels, int maxScans, int maxSegments) throws PhotoException;
-
-    private static native double[] facts(byte[] array, ByteBuffer buffer, int offset, int length)
+            long cancel, long maxBytes, long maxPixels, int maxScans, int maxSegments)
             throws PhotoException;
+
+    private static native double[] facts(byte[] array, ByteBuffer buffer, int offset, int length,
+            long maxBytes, long maxPixels, int maxScans, int maxSegments) throws PhotoException;
 
     static native float distance(float[] cdf1, float[] cdf2);
 

@@ -82,7 +82,7 @@ class FilterTest {
                 String ours = faultOf(filter, params);
                 String what = filter + " with \"" + params + '"';
                 Executable filtered = () -> PhotoBytes.filter(photo, null, 0, photo.length, 90, 0,
-                        0, null, 1, filter.key(), params, true, 0, null, 0, 0, 0, false);
+                        0, null, 1, filter.key(), params, true, 0, null, 0, 0, 0, 0, false);
                 if (ours.equals("none")) {
                     assertDoesNotThrow(filtered, what);
                 } else {

@@ -17,6 +17,7 @@ import java.nio.file.Path;
 import java.nio.file.attribute.FileTime;
 import java.nio.file.attribute.PosixFilePermission;
 import java.nio.file.attribute.PosixFilePermissions;
+import java.time.Duration;
 import java.util.Arrays;
 import java.util.List;
 import java.util.Set;
@@ -257,6 +258,23 @@ class JpegFileTest {
         assertThrows(CancellationException.class,
                 () -> JpegJob.of(input, output).cancellation(cancellation).run());
         assertEquals(List.of("in.jpg"), names());
+    }
+
+    @Test
+    void aJobKeepsToItsLimits() throws IOException {
+        long bytes = Files.size(input);
+        JpegJob job = JpegJob.of(input, output);
+        for (JpegJob limited : List.of(job.maxBytes(bytes - 1), job.maxPixels(64 * 48 - 1),
+                job.maxSegments(1))) {
+            assertEquals(PhotoException.Kind.TOO_LARGE,
+                    assertThrows(JpegException.class, limited::run).kind());
+        }
+        assertThrows(CancellationException.class,
+                () -> job.cancellation(Cancellation.after(Duration.ZERO)).run());
+        assertEquals(List.of("in.jpg"), names());
+        job.maxBytes(bytes).maxPixels(64 * 48).maxScans(1).maxSegments(9)
+                .cancellation(Cancellation.after(Duration.ofHours(1))).run();
+        assertEquals(List.of("in.jpg", "out.jpg"), names());
     }
 
     @Test

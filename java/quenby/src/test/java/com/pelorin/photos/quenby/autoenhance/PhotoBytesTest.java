@@ -21,6 +21,7 @@ import java.nio.ByteBuffer;
 import java.nio.charset.StandardCharsets;
 import java.nio.file.Files;
 import java.nio.file.Path;
+import java.time.Duration;
 import java.util.ArrayList;
 import java.util.Arrays;
 import java.util.Collections;
@@ -268,6 +269,58 @@ class PhotoBytesTest {
         assertThrows(CancellationException.class, () -> photo.enhance(0.4f));
         assertThrows(CancellationException.class, photo::niqe);
         assertThrows(CancellationException.class, photo::greenCdf);
+    }
+
+    @Test
+    void whatTakesTooLongThrows() throws IOException {
+        PhotoBytes photo = PhotoBytes.of(plain);
+        Cancellation weeks = Cancellation.after(Duration.ofSeconds(Long.MAX_VALUE));
+        assertArrayEquals(photo.enhance(0.4f), photo.cancellation(weeks).enhance(0.4f));
+        assertFalse(weeks.isCancelled());
+        weeks.cancel();
+        assertTrue(weeks.isCancelled());
+        for (long seconds : new long[] {0, -1, Long.MIN_VALUE}) {
+            PhotoBytes late = photo.cancellation(Cancellation.after(Duration.ofSeconds(seconds)));
+            assertThrows(CancellationException.class, () -> late.enhance(0.4f));
+            assertThrows(CancellationException.class, late::facts);
+        }
+    }
+
+    /** Enough work that the time is over in the middle of it, unless that comes too early or too late. */
+    @Test
+    void workInProgressEndsWithItsTime() throws Exception {
+        byte[] large = Files.readAllBytes(
+                Pictures.jpeg(folder.resolve("large.jpg"), 4000, 400, 3));
+        String message = "";
+        for (int round = 0; round < 200 && !message.equals("interrupted"); ++round) {
+            PhotoBytes late = PhotoBytes.of(large)
+                    .cancellation(Cancellation.after(Duration.ofMillis(round % 40)));
+            try {
+                assertTrue(late.enhance(0.4f).length > 0);
+            } catch (CancellationException error) {
+                message = error.getMessage();
+            }
+        }
+        assertEquals("interrupted", message);
+    }
+
+    @Test
+    void limitsAreThoseThatAreNamed() throws IOException {
+        PhotoBytes photo = PhotoBytes.of(plain);
+        long pixels = (long) photo.facts().width() * photo.facts().height();
+        assertNotNull(photo.maxBytes(plain.length).maxPixels(pixels).maxScans(1).maxSegments(9)
+                .enhance(0.4f));
+        for (PhotoBytes limited : List.of(photo.maxBytes(plain.length - 1),
+                photo.maxPixels(pixels - 1), photo.maxSegments(1))) {
+            assertEquals(PhotoException.Kind.TOO_LARGE, assertThrows(PhotoException.class,
+                    () -> limited.enhance(0.4f)).kind());
+            assertEquals(PhotoException.Kind.TOO_LARGE,
+                    assertThrows(PhotoException.class, limited::facts).kind());
+        }
+        assertThrows(IllegalArgumentException.class, () -> photo.maxBytes(0));
+        assertThrows(IllegalArgumentException.class, () -> photo.maxPixels(0));
+        assertThrows(IllegalArgumentException.class, () -> photo.maxScans(0));
+        assertThrows(IllegalArgumentException.class, () -> photo.maxSegments(0));
     }
 
     /** Enough work that the other thread comes in the middle of it. */
