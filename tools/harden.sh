@@ -51,12 +51,18 @@ summed() { awk -v words="$1" 'index($0, words) { sum += $1 } END { print sum + 0
 start=$SECONDS
 quietly "$release/tests/jni/jni_tests" --gtest_filter='FailingCalls.*'
 calls=$(summed 'failing calls')
-at_least "the natives' calls into Java" "$calls" 60
+quietly "$release/tests/jni/jni_machine_tests" --gtest_filter='Registration.*'
+calls=$((calls + $(summed 'failing calls')))
+quietly "$release/tests/bindings/java/photo_natives_test" --gtest_filter='*UnderFaults.*'
+calls=$((calls + $(summed 'failing calls')))
+at_least "the natives' calls into Java" "$calls" 300
 row "calls of the natives into Java that fail" "$calls" $((SECONDS - start)) nothing
 start=$SECONDS
 quietly "$release/tests/jni/jni_machine_tests" --gtest_filter='OutOfMemory.*'
 memory=$(summed 'injected faults')
 quietly "$release/tests/jni/out_of_memory_with_jpeg_test" --gtest_filter='OutOfMemory.*JpegFile*'
+memory=$((memory + $(summed 'injected faults')))
+quietly "$release/tests/bindings/java/photo_natives_test" --gtest_filter='*UnderFaults.*'
 memory=$((memory + $(summed 'injected faults')))
 at_least "the natives' allocations" "$memory" 1000
 row "their allocations" "$memory" $((SECONDS - start)) nothing
@@ -65,6 +71,11 @@ quietly "$release/tests/bindings/c/c_memory_test"
 memory=$(summed 'injected faults')
 at_least "the C library's allocations" "$memory" 1000
 row "allocations of the C library" "$memory" $((SECONDS - start)) nothing
+start=$SECONDS
+quietly "$release/tests/photo/sqlite_faults_test"
+calls=$(summed 'failing calls of SQLite')
+at_least "SQLite's calls" "$calls" 1300
+row "calls of SQLite that fail under a cache or a ledger" "$calls" $((SECONDS - start)) nothing
 
 # Sessions by the million, threads for as long as a fault of theirs may take to show, libraries that come and go.
 # Virtual machines do it in the release's tests.

@@ -24,13 +24,12 @@ Database::Database(const std::string& file, int millisecondsToWait, Fail fail)
   const int code =
       sqlite3_open_v2(file.c_str(), &database, SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE, nullptr);
   database_.reset(database);
-  if (code != SQLITE_OK) fail_(code);
-  sqlite3_busy_timeout(database, millisecondsToWait);
+  check(code);
+  check(sqlite3_busy_timeout(database, millisecondsToWait));
 }
 
 void Database::execute(const char* sql) {
-  const int code = sqlite3_exec(database_.get(), sql, nullptr, nullptr, nullptr);
-  if (code != SQLITE_OK) fail_(code);
+  check(sqlite3_exec(database_.get(), sql, nullptr, nullptr, nullptr));
 }
 
 bool Database::succeeds(const char* sql) {
@@ -44,9 +43,12 @@ std::int64_t Database::number(const char* sql) {
 
 Database::Statement Database::prepare(const char* sql) {
   sqlite3_stmt* statement = nullptr;
-  const int code = sqlite3_prepare_v2(database_.get(), sql, -1, &statement, nullptr);
-  if (code != SQLITE_OK) fail_(code);
+  check(sqlite3_prepare_v2(database_.get(), sql, -1, &statement, nullptr));
   return Statement(statement);
+}
+
+void Database::check(int code) {
+  if (code != SQLITE_OK) fail_(code);
 }
 
 bool Database::step(sqlite3_stmt* statement) {

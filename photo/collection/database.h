@@ -31,6 +31,8 @@ class Database {
   /// The number that a statement gives first; 0 where it gives none.
   std::int64_t number(const char* sql);
   Statement prepare(const char* sql);
+  /// For what SQLite's other functions return, such as those that bind values.
+  void check(int code);
   /// @returns whether there is a row.
   bool step(sqlite3_stmt* statement);
 

@@ -33,11 +33,12 @@ struct Unusable {
 std::string blob(sqlite3_stmt* statement, int column) {
   const void* const bytes = sqlite3_column_blob(statement, column);
   const int size = sqlite3_column_bytes(statement, column);
+  if (bytes == nullptr && size > 0) throw Unusable{SQLITE_NOMEM};
   return {static_cast<const char*>(bytes), bytes == nullptr ? 0 : static_cast<std::size_t>(size)};
 }
 
-void bind(sqlite3_stmt* statement, int column, const std::string& bytes) {
-  sqlite3_bind_blob64(statement, column, bytes.data(), bytes.size(), SQLITE_TRANSIENT);
+int bind(sqlite3_stmt* statement, int column, const std::string& bytes) {
+  return sqlite3_bind_blob64(statement, column, bytes.data(), bytes.size(), SQLITE_TRANSIENT);
 }
 
 }  // namespace
@@ -166,15 +167,16 @@ void Ledger::put(const std::map<std::string, LedgerEntry>& entries) {
 
 void Ledger::write(const std::string& photo, const LedgerEntry& entry) {
   const StatementUse use(put_.get());
-  bind(put_.get(), 1, photo);
-  sqlite3_bind_int64(put_.get(), 2, static_cast<std::int64_t>(entry.photo.bytes));
-  sqlite3_bind_int64(put_.get(), 3, entry.photo.modified);
-  bind(put_.get(), 4, entry.result);
+  database_->check(bind(put_.get(), 1, photo));
+  database_->check(sqlite3_bind_int64(put_.get(), 2, static_cast<std::int64_t>(entry.photo.bytes)));
+  database_->check(sqlite3_bind_int64(put_.get(), 3, entry.photo.modified));
+  database_->check(bind(put_.get(), 4, entry.result));
   if (entry.stamp) {
-    sqlite3_bind_int64(put_.get(), 5, static_cast<std::int64_t>(entry.stamp->bytes));
-    sqlite3_bind_int64(put_.get(), 6, entry.stamp->modified);
+    database_->check(
+        sqlite3_bind_int64(put_.get(), 5, static_cast<std::int64_t>(entry.stamp->bytes)));
+    database_->check(sqlite3_bind_int64(put_.get(), 6, entry.stamp->modified));
   }
-  sqlite3_bind_int(put_.get(), 7, entry.begun ? 1 : 0);
+  database_->check(sqlite3_bind_int(put_.get(), 7, entry.begun ? 1 : 0));
   database_->step(put_.get());
 }
 

@@ -88,35 +88,40 @@ std::int64_t checksum(const Key& key, float score) {
   return checksum(key, fmt::format("{} {}", niqeModelId, text));
 }
 
-void bindKey(sqlite3_stmt* statement, const Key& key) {
-  sqlite3_bind_blob64(statement, 1, key.path.data(), key.path.size(), SQLITE_TRANSIENT);
-  sqlite3_bind_int64(statement, 2, static_cast<std::int64_t>(key.stamp.bytes));
-  sqlite3_bind_int64(statement, 3, key.stamp.modified);
-  sqlite3_bind_text(statement, 4, PELORIN_VERSION, -1, SQLITE_STATIC);
+void bindKey(Database& database, sqlite3_stmt* statement, const Key& key) {
+  database.check(
+      sqlite3_bind_blob64(statement, 1, key.path.data(), key.path.size(), SQLITE_TRANSIENT));
+  database.check(sqlite3_bind_int64(statement, 2, static_cast<std::int64_t>(key.stamp.bytes)));
+  database.check(sqlite3_bind_int64(statement, 3, key.stamp.modified));
+  database.check(sqlite3_bind_text(statement, 4, PELORIN_VERSION, -1, SQLITE_STATIC));
 }
 
-void bindRecord(sqlite3_stmt* statement, const Key& key, int scale, const PhotoRecord& record) {
-  sqlite3_bind_int64(statement, 6, record.width);
-  sqlite3_bind_int64(statement, 7, record.height);
-  sqlite3_bind_int(statement, 8, record.orientation);
+void bindRecord(Database& database, sqlite3_stmt* statement, const Key& key, int scale,
+                const PhotoRecord& record) {
+  database.check(sqlite3_bind_int64(statement, 6, record.width));
+  database.check(sqlite3_bind_int64(statement, 7, record.height));
+  database.check(sqlite3_bind_int(statement, 8, record.orientation));
   if (record.captureTime) {  // a value not bound is null
     const CaptureTime& time = *record.captureTime;
-    sqlite3_bind_text(statement, 9, time.text.c_str(), -1, SQLITE_TRANSIENT);
-    sqlite3_bind_double(statement, 10, time.seconds);
-    if (time.hasZone) sqlite3_bind_int(statement, 11, time.zoneSeconds);
+    database.check(sqlite3_bind_text(statement, 9, time.text.c_str(), -1, SQLITE_TRANSIENT));
+    database.check(sqlite3_bind_double(statement, 10, time.seconds));
+    if (time.hasZone) database.check(sqlite3_bind_int(statement, 11, time.zoneSeconds));
   }
   const GreenCDF cdf = record.cdf.unpacked();
-  sqlite3_bind_blob(statement, 12, cdf.data(), sizeof cdf, SQLITE_TRANSIENT);
-  sqlite3_bind_int64(statement, 13, checksum(key, scale, record, cdf));
+  database.check(sqlite3_bind_blob(statement, 12, cdf.data(), sizeof cdf, SQLITE_TRANSIENT));
+  database.check(sqlite3_bind_int64(statement, 13, checksum(key, scale, record, cdf)));
 }
 
 // Empty when the row is not what was stored.
-std::optional<PhotoRecord> readRecord(sqlite3_stmt* statement, const Key& key, int scale) {
+std::optional<PhotoRecord> readRecord(Database& database, sqlite3_stmt* statement, const Key& key,
+                                      int scale) {
   PhotoRecord record{};
   record.width = static_cast<std::uint32_t>(sqlite3_column_int64(statement, 0));
   record.height = static_cast<std::uint32_t>(sqlite3_column_int64(statement, 1));
   record.orientation = sqlite3_column_int(statement, 2);
-  if (const auto* text = sqlite3_column_text(statement, 3); text != nullptr) {
+  if (sqlite3_column_type(statement, 3) != SQLITE_NULL) {
+    const auto* const text = sqlite3_column_text(statement, 3);
+    if (text == nullptr) database.check(SQLITE_NOMEM);
     CaptureTime& time = record.captureTime.emplace();
     time.text = reinterpret_cast<const char*>(text);
     time.seconds = sqlite3_column_double(statement, 4);
@@ -126,6 +131,7 @@ std::optional<PhotoRecord> readRecord(sqlite3_stmt* statement, const Key& key, i
   const void* stored = sqlite3_column_blob(statement, 6);
   GreenCDF cdf;
   if (sqlite3_column_bytes(statement, 6) != sizeof cdf) return std::nullopt;
+  if (stored == nullptr) database.check(SQLITE_NOMEM);
   std::memcpy(cdf.data(), stored, sizeof cdf);
   if (checksum(key, scale, record, cdf) != sqlite3_column_int64(statement, 7)) return std::nullopt;
   record.cdf = {cdf, countedPixels(record.width, record.height, scale)};
@@ -172,10 +178,10 @@ std::optional<PhotoRecord> PhotoCache::find(const std::string& photo, const File
                                             int scale) {
   const StatementUse use(find_.get());
   const Key key = keyOf(photo, stamp);
-  bindKey(find_.get(), key);
-  sqlite3_bind_int(find_.get(), 5, scale);
+  bindKey(database_, find_.get(), key);
+  database_.check(sqlite3_bind_int(find_.get(), 5, scale));
   if (!database_.step(find_.get())) return std::nullopt;
-  std::optional<PhotoRecord> record = readRecord(find_.get(), key, scale);
+  std::optional<PhotoRecord> record = readRecord(database_, find_.get(), key, scale);
   if (!record) refuse("is damaged");
   return record;
 }
@@ -184,9 +190,9 @@ void PhotoCache::store(const std::string& photo, const FileStamp& stamp, int sca
                        const PhotoRecord& record) {
   const StatementUse use(store_.get());
   const Key key = keyOf(photo, stamp);
-  bindKey(store_.get(), key);
-  sqlite3_bind_int(store_.get(), 5, scale);
-  bindRecord(store_.get(), key, scale, record);
+  bindKey(database_, store_.get(), key);
+  database_.check(sqlite3_bind_int(store_.get(), 5, scale));
+  bindRecord(database_, store_.get(), key, scale, record);
   database_.step(store_.get());
 }
 
@@ -194,8 +200,8 @@ std::optional<float> PhotoCache::findScore(const std::string& photo, const FileS
   sqlite3_stmt* const statement = findScore_.get();
   const StatementUse use(statement);
   const Key key = keyOf(photo, stamp);
-  bindKey(statement, key);
-  sqlite3_bind_text(statement, 5, niqeModelId, -1, SQLITE_STATIC);
+  bindKey(database_, statement, key);
+  database_.check(sqlite3_bind_text(statement, 5, niqeModelId, -1, SQLITE_STATIC));
   if (!database_.step(statement)) return std::nullopt;
   const bool tooSmall = sqlite3_column_type(statement, 0) == SQLITE_NULL;
   const float score = tooSmall ? std::numeric_limits<float>::quiet_NaN()
@@ -208,10 +214,10 @@ void PhotoCache::storeScore(const std::string& photo, const FileStamp& stamp, fl
   sqlite3_stmt* const statement = storeScore_.get();
   const StatementUse use(statement);
   const Key key = keyOf(photo, stamp);
-  bindKey(statement, key);
-  sqlite3_bind_text(statement, 5, niqeModelId, -1, SQLITE_STATIC);
-  if (!std::isnan(score)) sqlite3_bind_double(statement, 6, score);
-  sqlite3_bind_int64(statement, 7, checksum(key, score));
+  bindKey(database_, statement, key);
+  database_.check(sqlite3_bind_text(statement, 5, niqeModelId, -1, SQLITE_STATIC));
+  if (!std::isnan(score)) database_.check(sqlite3_bind_double(statement, 6, score));
+  database_.check(sqlite3_bind_int64(statement, 7, checksum(key, score)));
   database_.step(statement);
 }
 

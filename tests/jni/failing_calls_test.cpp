@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include <functional>
+#include <utility>
 
 #include "jni/session_table.h"
 #include "tests/jni/support/natives_fixture.h"
@@ -10,7 +11,7 @@ namespace pelorin::test_support {
 namespace {
 
 // Every call into Java or the bitmap library that can fail does so once in each native, with and
-// without an exception. The fixture checks that nobody calls on while one is pending, and that
+// without an exception, alone and with all later ones. The fixture checks that nobody calls on while one is pending, and that
 // references, characters and locks are given back.
 class FailingCalls : public NativesTest {
  protected:
@@ -22,15 +23,14 @@ class FailingCalls : public NativesTest {
 
   /// Runs `native` once for each of its calls and way of failing, with `check` after each.
   void failEachCall(const std::function<void()>& native, int expectedCalls) {
-    using Failure = FakeEnvironment::Failure;
     env.failCall(0);
     native();
     const int calls = env.fallibleCalls();
     EXPECT_EQ(calls, expectedCalls);
     for (int call = 1; call <= calls; ++call) {
-      for (const Failure failure : {Failure::withException, Failure::withoutException}) {
+      for (const auto& [failure, later] : waysToFail) {
         const std::size_t sessions = quenby::openSessions().size();
-        env.failCall(call, failure);
+        env.failCall(call, failure, later);
         native();
         EXPECT_TRUE(env.failed());
         env.failCall(0);
@@ -49,7 +49,16 @@ class FailingCalls : public NativesTest {
     printf("%d failing calls\n", faults);
   }
 
+  using Failure = FakeEnvironment::Failure;
+  using Later = FakeEnvironment::Later;
+  static constexpr std::pair<Failure, Later> waysToFail[] = {
+      {Failure::withException, Later::succeed},
+      {Failure::withoutException, Later::succeed},
+      {Failure::withException, Later::fail},
+      {Failure::withoutException, Later::fail}};
+
   WholeRun run{natives};
+  FakeFaces noFaces{};
   const std::vector<std::uint8_t> before = run.results();
   jlong handle = 0;
   int faults = 0;
@@ -66,7 +75,11 @@ TEST_F(FailingCalls, OfInit) {
 }
 
 TEST_F(FailingCalls, OfPreprocess) {
-  failEachCall([&] { natives.preprocess(run.faces, handle); }, 2);
+  failEachCall([&] { natives.preprocess(run.faces, handle); }, 3);
+}
+
+TEST_F(FailingCalls, OfPreprocessWithoutFaces) {
+  failEachCall([&] { natives.preprocess(noFaces, handle); }, 0);
 }
 
 TEST_F(FailingCalls, OfApplyAutoEnhanceFilter) {
@@ -76,9 +89,15 @@ TEST_F(FailingCalls, OfApplyAutoEnhanceFilter) {
 TEST_F(FailingCalls, OfApplyAutoEnhanceFilterToJpegFile) {
   failEachCall(
       [&] { natives.applyToFile(run.input, run.file, 90, run.faces, 1, run.filter, run.params); },
-      // The copy's path, the input's for messages, both for the rotation, two names, two faces, the
+      // The copy's path, the input's for messages, both for the rotation, two names, three faces, the
       // output's path.
-      1 + 1 + 2 + 2 + 2 + 1);
+      1 + 1 + 2 + 2 + 3 + 1);
+}
+
+TEST_F(FailingCalls, OfApplyAutoEnhanceFilterToJpegFileWithoutFaces) {
+  failEachCall(
+      [&] { natives.applyToFile(run.input, run.file, 90, noFaces, 1, run.filter, run.params); },
+      1 + 1 + 2 + 2 + 1);
 }
 
 TEST_F(FailingCalls, OfApplyAutoEnhanceFilterToJpegFileTurnedInMemory) {
@@ -86,7 +105,7 @@ TEST_F(FailingCalls, OfApplyAutoEnhanceFilterToJpegFileTurnedInMemory) {
   failEachCall(
       [&] { natives.applyToFile(run.input, nowhere, 90, run.faces, 1, run.filter, run.params); },
       // And the memory's path.
-      9 + 1);
+      10 + 1);
 }
 
 TEST_F(FailingCalls, OfSimilarityScore) {
@@ -100,16 +119,17 @@ TEST_F(FailingCalls, OfSimilarityScore) {
 }
 
 TEST_F(FailingCalls, OfTheExceptionItself) {
-  using Failure = FakeEnvironment::Failure;
   FakeString none("");
   for (int call = 3; call <= 4; ++call) {  // after the two names: find the class, throw
-    for (const Failure failure : {Failure::withException, Failure::withoutException}) {
-      env.failCall(call, failure);
+    for (const auto& [failure, later] : waysToFail) {
+      env.failCall(call, failure, later);
       natives.apply(handle, run.output.reference(), run.filter, none);
       EXPECT_TRUE(env.failed());
       EXPECT_EQ(env.takeException().empty(), failure == Failure::withoutException);
+      ++faults;
     }
   }
+  printf("%d failing calls\n", faults);
 }
 
 }  // namespace

@@ -133,20 +133,27 @@ TEST_F(Registration, LetsTheErrorOfALookUpThrough) {
 
 TEST_F(Registration, FailsWithWhateverCallFails) {
   using Failure = FakeEnvironment::Failure;
+  using Later = FakeEnvironment::Later;
   env.failCall(0);
   ASSERT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_VERSION_1_6);
   const int calls = env.fallibleCalls();
   // RectF and its fields, a weak reference, then find and register twice, then find and look up.
   EXPECT_EQ(calls, 6 + 2 + 2 + 2);
+  int faults = 0;
   for (int call = 1; call <= calls; ++call) {
     for (const Failure failure : {Failure::withException, Failure::withoutException}) {
-      const int references = env.weakReferences;
-      env.failCall(call, failure);
-      EXPECT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_ERR) << call;
-      EXPECT_NE(env.takeException(), "") << call;
-      EXPECT_EQ(env.weakReferences, references) << call;
+      for (const Later later : {Later::succeed, Later::fail}) {
+        const int references = env.weakReferences;
+        env.failCall(call, failure, later);
+        EXPECT_EQ(JNI_OnLoad(FakeEnvironment::machine(), nullptr), JNI_ERR) << call;
+        const bool told = failure == Failure::withException || later == Later::succeed;
+        EXPECT_EQ(env.takeException() != "", told) << call;
+        EXPECT_EQ(env.weakReferences, references) << call;
+        ++faults;
+      }
     }
   }
+  printf("%d failing calls\n", faults);
 }
 
 }  // namespace

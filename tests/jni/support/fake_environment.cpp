@@ -399,15 +399,18 @@ JavaVM* FakeEnvironment::machine() {
   return &vm;
 }
 
-void FakeEnvironment::failCall(int call, Failure failure) {
+void FakeEnvironment::failCall(int call, Failure failure, Later later) {
   failing_ = call;
   failure_ = failure;
+  later_ = later;
   fallibleCalls_ = 0;
   failed_ = false;
 }
 
 bool FakeEnvironment::shouldFail(const char* function) {
-  if (++fallibleCalls_ != failing_) return false;
+  ++fallibleCalls_;
+  const bool isLater = failing_ > 0 && fallibleCalls_ > failing_ && later_ == Later::fail;
+  if (fallibleCalls_ != failing_ && !isLater) return false;
   failed_ = true;
   if (failure_ == Failure::withException) raise("test/Injected", function);
   return true;

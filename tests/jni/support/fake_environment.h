@@ -44,8 +44,11 @@ class FakeEnvironment : public JNIEnv {
   /// as the two in turn for a function that raises no exception.
   enum class Failure { withoutException, withException };
 
-  /// Lets the call of number `call` (from 1, of those that can fail) fail; 0 ends that.
-  void failCall(int call, Failure failure = Failure::withException);
+  enum class Later { succeed, fail };
+
+  /// Lets the call of number `call` (from 1, of those that can fail) fail, and later ones as `later` says;
+  /// 0 ends that.
+  void failCall(int call, Failure failure = Failure::withException, Later later = Later::succeed);
   /// Calls that can fail, since `failCall`.
   int fallibleCalls() const { return fallibleCalls_; }
   /// Whether the call that `failCall` means has come.
@@ -94,6 +97,7 @@ class FakeEnvironment : public JNIEnv {
 
   int failing_ = 0, fallibleCalls_ = 0;
   Failure failure_ = Failure::withException;
+  Later later_ = Later::succeed;
   bool failed_ = false;
   std::array<FakeObject*, 64> locals_{};
   char pendingClass_[128] = "", pendingMessage_[1100] = "";

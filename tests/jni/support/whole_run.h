@@ -17,7 +17,7 @@ struct WholeRun {
   const Natives& natives;
   const Image<RGBA8Pixel> picture = photoLikePicture(40, 30, 5);
   FakeBitmap photo{picture}, output{40, 30}, padded{picture, 4};
-  FakeFaces faces{{0.2f, 0.2f, 0.6f, 0.7f}, {0.1f, 0.5f, 0.3f, 0.9f}};
+  FakeFaces faces{{0.2f, 0.2f, 0.6f, 0.7f}, {0.1f, 0.5f, 0.3f, 0.9f}, {0.7f, 0.1f, 0.9f, 0.4f}};
   FakeString filter{"AE0"}, params{"slider=0.4;gtmOnly=false;gtmExtraMemory=false;"};
   TemporaryFolder folder;
   FakeString input{folder / "in.jpg"}, file{folder / "out.jpg"};
