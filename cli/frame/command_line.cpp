@@ -8,6 +8,7 @@
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
+#include <sstream>
 #include <string_view>
 #include <utility>
 
@@ -62,6 +63,12 @@ void keepStandardDescriptors() {
       std::_Exit(static_cast<int>(ExitCode::someFailed));
     }
   }
+}
+
+CommandLine::Reading refused(const std::string& message, const CLI::App* verb) {
+  const std::string of = verb == nullptr ? "" : " " + verb->get_name();
+  return {.refusal =
+              "quenby" + of + ": " + shownText(message) + " (see quenby" + of + " --help)\n"};
 }
 
 bool asksForBuildFacts(const std::vector<std::string>& arguments) {
@@ -145,11 +152,52 @@ CommandText CommandLine::text() const {
   return text;
 }
 
-ExitCode CommandLine::refuse(const std::string& message, const CLI::App* verb) const {
-  const std::string of = verb == nullptr ? "" : " " + verb->get_name();
-  std::fprintf(stderr, "quenby%s: %s (see quenby%s --help)\n", of.c_str(),
-               shownText(message).c_str(), of.c_str());
-  return ExitCode::usage;
+const CommandLine::Work* CommandLine::chosen() const {
+  const auto named = std::ranges::find_if(verbs_, [](const Work& w) { return w.verb->parsed(); });
+  return named == verbs_.end() ? nullptr : &*named;
+}
+
+CommandLine::Reading CommandLine::read(std::vector<std::string> arguments) {
+  if (arguments.empty()) return {.refusal = app_->help()};
+  if (arguments[0] == "help") {
+    arguments.erase(arguments.begin());
+    arguments.push_back("--help");
+  }
+  const auto isCalled = [&](const Work& work) { return work.verb->get_name() == arguments[0]; };
+  if (!arguments[0].starts_with('-') && std::ranges::none_of(verbs_, isCalled)) {
+    return refused(unknownName("verb", arguments[0], verbNames()), nullptr);
+  }
+  if (asksForBuildFacts(arguments)) {
+    return {.code = ExitCode::allDone, .answer = buildFacts().dump(2) + "\n"};
+  }
+  for (std::string& argument : arguments) {
+    // CLI11 takes [a,b] for a list; here it can only be a file's name.
+    if (argument.starts_with('[')) argument.insert(0, "./");
+  }
+  const auto verbOfError = [this] { return chosen() == nullptr ? nullptr : chosen()->verb; };
+  try {
+    std::ranges::reverse(arguments);
+    app_->parse(std::move(arguments));
+  } catch (const CLI::Success& asked) {  // --help, --version
+    std::ostringstream text;
+    app_->exit(asked, text, text);
+    return {.code = ExitCode::allDone, .answer = std::move(text).str()};
+  } catch (const CLI::ExtrasError& error) {
+    const CLI::App* verb = verbOfError();
+    for (const CLI::App* app : {verb, static_cast<const CLI::App*>(app_.get())}) {
+      if (app == nullptr) continue;
+      for (const std::string& extra : app->remaining()) {
+        if (extra.size() < 2 || extra[0] != '-') continue;
+        return refused(unknownName("option", extra, optionNames(verb ? *verb : *app_)), verb);
+      }
+    }
+    return refused(error.what(), verb);
+  } catch (const CLI::ParseError& error) {
+    return refused(error.what(), verbOfError());
+  }
+  if (chosen() == nullptr) return refused("no verb given", nullptr);
+  if (app_->count("--json") > 0) return refused("--json goes behind the verb", nullptr);
+  return {.runs = true};
 }
 
 ExitCode CommandLine::run(int argc, char** argv) {
@@ -159,61 +207,20 @@ ExitCode CommandLine::run(int argc, char** argv) {
   std::signal(SIGXFSZ, SIG_IGN);
   installInterruptHandler();
 
-  std::vector<std::string> arguments(argv + 1, argv + argc);
-  if (arguments.empty()) {
-    std::fputs(app_->help().c_str(), stderr);
-    return ExitCode::usage;
+  const Reading reading = read({argv + 1, argv + argc});
+  if (!reading.runs) {
+    std::fputs(reading.refusal.c_str(), stderr);
+    std::fputs(reading.answer.c_str(), stdout);
+    return reading.code;
   }
-  if (arguments[0] == "help") {
-    arguments.erase(arguments.begin());
-    arguments.push_back("--help");
-  }
-  const auto isCalled = [&](const Work& work) { return work.verb->get_name() == arguments[0]; };
-  if (!arguments[0].starts_with('-') && std::ranges::none_of(verbs_, isCalled)) {
-    return refuse(unknownName("verb", arguments[0], verbNames()), nullptr);
-  }
-  if (asksForBuildFacts(arguments)) {
-    std::puts(buildFacts().dump(2).c_str());
-    return ExitCode::allDone;
-  }
-  for (std::string& argument : arguments) {
-    // CLI11 takes [a,b] for a list; here it can only be a file's name.
-    if (argument.starts_with('[')) argument.insert(0, "./");
-  }
-
-  const auto chosen = [this]() -> const Work* {
-    const auto named = std::ranges::find_if(verbs_, [](const Work& w) { return w.verb->parsed(); });
-    return named == verbs_.end() ? nullptr : &*named;
-  };
-  try {
-    std::vector<std::string> reversed(arguments.rbegin(), arguments.rend());
-    app_->parse(std::move(reversed));
-  } catch (const CLI::Success& asked) {  // --help, --version
-    app_->exit(asked);
-    return ExitCode::allDone;
-  } catch (const CLI::ExtrasError& error) {
-    const CLI::App* verb = chosen() == nullptr ? nullptr : chosen()->verb;
-    for (const CLI::App* app : {verb, static_cast<const CLI::App*>(app_.get())}) {
-      if (app == nullptr) continue;
-      for (const std::string& extra : app->remaining()) {
-        if (extra.size() < 2 || extra[0] != '-') continue;
-        return refuse(unknownName("option", extra, optionNames(verb ? *verb : *app_)), verb);
-      }
-    }
-    return refuse(error.what(), verb);
-  } catch (const CLI::ParseError& error) {
-    return refuse(error.what(), chosen() == nullptr ? nullptr : chosen()->verb);
-  }
-
-  const Work* work = chosen();
-  if (work == nullptr) return refuse("no verb given", nullptr);
-  if (app_->count("--json") > 0) return refuse("--json goes behind the verb", nullptr);
+  const Work* const work = chosen();
   const std::string name = work->verb->get_name();
   ExitCode code;
   try {
     code = work->run();
   } catch (const UsageError& error) {
-    return refuse(error.what(), work->verb);
+    std::fputs(refused(error.what(), work->verb).refusal.c_str(), stderr);
+    return ExitCode::usage;
   } catch (const Interrupted&) {
     return ExitCode::interrupted;
   } catch (const std::exception& error) {

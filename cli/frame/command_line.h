@@ -40,6 +40,18 @@ class CommandLine {
   /// The help of everything added so far that is not hidden.
   CommandText text() const;
 
+  /// What arguments come to before anything is done.
+  struct Reading {
+    bool runs = false;  ///< A verb is to run. Else:
+    ExitCode code = ExitCode::usage;
+    std::string answer = {};   ///< What was asked for, such as the help.
+    std::string refusal = {};  ///< What is said of arguments that mean nothing: a line.
+  };
+
+  /// Reads arguments, into what the options of verbs refer to.
+  /// @param arguments  without the name of the command.
+  Reading read(std::vector<std::string> arguments);
+
   /// Reads the arguments and runs the verb they name.
   ExitCode run(int argc, char** argv);
 
@@ -51,7 +63,7 @@ class CommandLine {
     bool hidden = false;
   };
 
-  ExitCode refuse(const std::string& message, const CLI::App* verb) const;
+  const Work* chosen() const;
   std::vector<std::string> verbNames() const;
 
   std::unique_ptr<CLI::App> app_;

@@ -1,8 +1,14 @@
 #pragma once
 
+#include <string_view>
+
 #include "cli/frame/command_line.h"
 
 namespace pelorin::cli {
+
+/// Adds every verb; or only `wanted`, where it is one: making the options of all takes longer than what
+/// many a run is for.
+void addVerbs(CommandLine& commandLine, std::string_view wanted = "");
 
 // Each is defined in the file of its verb.
 void addCompare(CommandLine& commandLine);
