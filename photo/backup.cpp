@@ -46,9 +46,14 @@ bool isMarkName(const fs::path& name) {
   return name == replacedMark.name || name == movedMark.name || name == resultsName;
 }
 
-std::string recordOf(const std::string& path, std::span<const std::uint8_t> file) {
+std::string recordOf(const std::string& path, const FileView& file) {
   const std::string nul(1, '\0');
-  return nul + md5Hex({reinterpret_cast<const char*>(file.data()), file.size()}) + " " + path + nul;
+  Md5 sum;
+  sum.add(file.bytes);
+  if (file.rest != nullptr) {
+    forEachBlock(*file.rest, [&](std::span<const std::uint8_t> block) { sum.add(block); });
+  }
+  return nul + sum.hex() + " " + path + nul;
 }
 
 bool wasRecorded(const std::vector<std::uint8_t>& list, const std::string& path) {
@@ -131,8 +136,7 @@ void keepBackup(const std::string& folder, const std::string& path) {
   }
 }
 
-void recordResult(const std::string& folder, const std::string& path,
-                  std::span<const std::uint8_t> file) {
+void recordResult(const std::string& folder, const std::string& path, const FileView& file) {
   const std::string record = recordOf(fs::canonical(path).string(), file);
   const std::string results = (fs::path(folder) / resultsName).string();
   const Descriptor list(results, O_WRONLY | O_APPEND | O_CREAT, 0600);

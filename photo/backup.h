@@ -1,9 +1,9 @@
 #pragma once
 
-#include <cstdint>
-#include <span>
 #include <string>
 #include <vector>
+
+#include "photo/file_view.h"
 
 namespace pelorin::photo {
 
@@ -34,9 +34,8 @@ void keepBackup(const std::string& folder, const std::string& path);
 void moveToBackups(const std::string& folder, const std::string& path);
 
 /// Notes in `folder`, on the disk before this returns, what the file at `path` that it keeps is about to
-/// become. @throws std::system_error.
-void recordResult(const std::string& folder, const std::string& path,
-                  std::span<const std::uint8_t> file);
+/// become. @throws std::system_error; what reading the rest of `file` throws.
+void recordResult(const std::string& folder, const std::string& path, const FileView& file);
 
 /// Whether putting back the file that was at `path` would destroy what another program has made of
 /// it: it has neither the content that `folder` keeps nor one that was recorded.

@@ -17,6 +17,7 @@
 #include "image_processing/filters/default_filter_factory.h"
 #include "image_processing/filters/filtered_image.h"
 #include "photo/area_average.h"
+#include "photo/photo_rows.h"
 #include "photo/turned_image.h"
 
 namespace pelorin::cli {
@@ -28,14 +29,15 @@ namespace {
 using Picture = std::shared_ptr<Image<RGBA8Pixel>>;
 
 // Reads it at a scale of its own, beside the one that `options` have.
-photo::Photo openFor(std::uint32_t side, std::span<const std::uint8_t> file,
-                     photo::OpenOptions options) {
+photo::Photo openFor(std::uint32_t side, const photo::FileView& file, photo::OpenOptions options) {
   options = limited(std::move(options));
   if (!options.raw) {
     const photo::PhotoFacts facts = photo::openRows(file, options)->facts();
     options.scale = std::max(options.scale, scaleForSide({facts.width, facts.height}, side));
   }
-  return photo::open(file, options);
+  photo::PhotoRows rows(file, options);
+  return {std::make_shared<Image<RGBA8Pixel>>(rows.picture()), rows.facts(), rows.metadata(),
+          rows.faces()};
 }
 
 Picture reduced(const Picture& picture, photo::PictureSize size) {
@@ -115,7 +117,7 @@ ComparisonSize comparisonSize(std::size_t photos) {
 
 Comparison compareFiles(const ComparedFiles& files, const ComparisonSize& size) {
   constexpr int quality = 85;
-  const bool changed = !files.after.empty();
+  const bool changed = files.after.size() > 0;
   Comparison result = {};
   const photo::Photo before = openFor(size.side, files.before, files.open);
   photo::PictureSize whole{before.image->width, before.image->height};

@@ -2,11 +2,11 @@
 
 #include <cstdint>
 #include <optional>
-#include <span>
 #include <string>
 #include <vector>
 
 #include "cli/frame/faces.h"
+#include "photo/file_view.h"
 #include "photo/photo.h"
 
 namespace pelorin::cli {
@@ -25,10 +25,10 @@ ComparisonSize comparisonSize(std::size_t photos);
 
 /// What was made of a photo.
 struct ComparedFiles {
-  std::span<const std::uint8_t> before;
-  std::span<const std::uint8_t> after;  ///< Empty where there is none.
-  photo::OpenOptions open;              ///< How `before` was read.
-  std::vector<Face> faces;              ///< That the user told.
+  photo::FileView before;
+  photo::FileView after;    ///< Empty where there is none.
+  photo::OpenOptions open;  ///< How `before` was read.
+  std::vector<Face> faces;  ///< That the user told.
   std::string filter, params;
 };
 

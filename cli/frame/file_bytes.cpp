@@ -63,7 +63,7 @@ void writeOutput(const std::string& path, const photo::FileView& bytes,
     photo::Replacement replacement(path, bytes, replace);
     if (!backup.empty()) {
       photo::keepBackup(backup, path);
-      photo::recordResult(backup, path, photo::wholeOf(bytes));
+      photo::recordResult(backup, path, bytes);
     }
     replacement.replace();
   } catch (const Interrupted&) {

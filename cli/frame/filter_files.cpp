@@ -77,15 +77,18 @@ Work readOptions(const FilterFilesOptions& options, const FilterToApply& filter)
 
 // What is shown of a photo; what goes wrong there is said in its place, for the result stands.
 std::string sectionOf(const Work& work, const PlannedFile& file, const Done& done,
-                      std::span<const std::uint8_t> before, std::span<const std::uint8_t> after) {
+                      const photo::FileView& before, const photo::FileView& after) {
   if (!work.shown) return "";
   ComparedPhoto photo = {.input = file.input.path, .lost = done.lost};
-  if (!after.empty() && !work.inPlace) photo.output = file.output;
+  if (after.size() > 0 && !work.inPlace) photo.output = file.output;
   if (done.existed) photo.remark = "was there already";
   if (!done.earlier.empty()) photo.remark = work.filter.doneAlready + " (" + done.earlier + ")";
   try {
+    std::vector<std::uint8_t> whole;  // of a result of several scans, which is not read in parts
+    if (after.rest != nullptr && !photo::formatOf(after.bytes).mayBePart(after.bytes))
+      whole = photo::wholeOf(after);
     const Comparison pictures = compareFiles({.before = before,
-                                              .after = after,
+                                              .after = whole.empty() ? after : whole,
                                               .open = work.photo,
                                               .faces = work.faces.of(file.input),
                                               .filter = work.filter.filter.name,
@@ -108,7 +111,8 @@ Done existing(const Work& work, const PlannedFile& file) {
   try {
     Input before = file.input;
     if (work.inPlace) before.path = photo::backupPath(work.save.backup, before.path);
-    done.section = sectionOf(work, file, done, readInput(before), readInput({file.output, {}}));
+    done.section = sectionOf(work, file, done, openInput(before, work.photo).view(),
+                             openInput({file.output, {}}, work.photo).view());
   } catch (const Interrupted&) {
     throw;
   } catch (const std::exception& error) {
@@ -147,21 +151,18 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
   const KeptPixels::Lent lent(*work.pixels);
   photo::RowResources resources = lent.resources();
   resources.workers = work.workers.get();
-  // What is shown on a page or put on record is needed as a whole.
-  const bool mayBeParted = !work.shown && work.save.backup.empty() && file.output != "-";
-  const photo::OpenedFile input =
-      mayBeParted ? openInput(file.input, work.photo) : photo::OpenedFile{readInput(file.input)};
-  const std::vector<std::uint8_t>& bytes = input.bytes;
+  const photo::OpenedFile input = openInput(file.input, work.photo);
   if (std::string earlier = earlierEdit(work, input.view()); !earlier.empty()) {
     Done done = {.earlier = std::move(earlier)};
-    done.section = sectionOf(work, file, done, bytes, {});
+    done.section = sectionOf(work, file, done, input.view(), {});
     return done;
   }
   photo::TemporaryStore overflow(std::filesystem::path(file.output).parent_path());
   photo::SaveOptions coding = saveOptions(work.save);
   std::error_code ignored;
   // The folder of a device or a pipe is no place for temporaries.
-  if (mayBeParted && !std::filesystem::is_other(file.output, ignored)) coding.overflow = &overflow;
+  if (file.output != "-" && !std::filesystem::is_other(file.output, ignored))
+    coding.overflow = &overflow;
   const photo::FilteredPhoto filtered =
       photo::filterPhoto(input.view(),
                          {.filter = work.filter.filter.name,
@@ -173,21 +174,22 @@ Done process(const Work& work, const PlannedFile& file, Talk& talk) {
                          // A name may lie; what stands in place of a photo is of its kind.
                          work.inPlace ? nullptr : &outputFormat(file.output, work.save), resources);
   tellNotices(file.input, filtered.facts, talk);
+  const photo::FileView result = {filtered.file, overflow.size() > 0 ? &overflow : nullptr};
   SaveChoice save = work.save;
   if (!work.inPlace && work.keepsTimes && !file.input.isStandardInput()) {
     save.replace.timesOf = file.input.path;
   }
   if (file.skipped) {  // done again: the backup has the first one, to which undo leads back
     refuseLosses(filtered.lost, save.strict);
-    photo::recordResult(save.backup, file.output, filtered.file);
+    photo::recordResult(save.backup, file.output, result);
     save.backup.clear();
   }
-  writePhoto(file.output, {filtered.file, &overflow}, filtered.lost, save);
+  writePhoto(file.output, result, filtered.lost, save);
   Done done = {.width = filtered.size.width,
                .height = filtered.size.height,
                .lost = filtered.lost,
                .notices = filtered.facts.notices};
-  done.section = sectionOf(work, file, done, bytes, filtered.file);
+  done.section = sectionOf(work, file, done, input.view(), result);
   return done;
 }
 

@@ -1,10 +1,8 @@
 #include "photo/metadata/md5.h"
 
-#include <array>
+#include <algorithm>
 #include <bit>
 #include <cmath>
-#include <cstdint>
-#include <cstring>
 
 namespace pelorin::photo {
 namespace {
@@ -56,24 +54,31 @@ void addBlock(Words& state, const unsigned char* block) {
 
 }  // namespace
 
-std::string md5Hex(std::string_view bytes) {
-  Words state = {0x67452301, 0xefcdab89, 0x98badcfe, 0x10325476};
-  const auto* data = reinterpret_cast<const unsigned char*>(bytes.data());
-  std::size_t done = 0;
-  for (; bytes.size() - done >= 64; done += 64) addBlock(state, data + done);
-  // The rest, a one bit, zeros, and the length in bits: one block or two.
-  std::array<unsigned char, 128> last = {};
-  const std::size_t rest = bytes.size() - done;
-  if (rest > 0) std::memcpy(last.data(), data + done, rest);
-  last[rest] = 0x80;
-  const std::size_t blocks = rest < 56 ? 1 : 2;
-  const std::uint64_t bits = std::uint64_t{bytes.size()} * 8;
-  for (unsigned i = 0; i < 8; ++i)
-    last[64 * blocks - 8 + i] = static_cast<unsigned char>(bits >> 8 * i);
-  for (std::size_t i = 0; i < blocks; ++i) addBlock(state, last.data() + 64 * i);
+void Md5::add(std::span<const std::uint8_t> bytes) {
+  while (!bytes.empty()) {
+    const auto before = static_cast<std::size_t>(size_ % begun_.size());
+    const std::size_t count = std::min(begun_.size() - before, bytes.size());
+    std::copy_n(bytes.begin(), count, begun_.begin() + static_cast<std::ptrdiff_t>(before));
+    if (before + count == begun_.size()) addBlock(state_, begun_.data());
+    size_ += count;
+    bytes = bytes.subspan(count);
+  }
+}
+
+std::string Md5::hex() {
+  // A one bit, zeros up to the end of a block, of which the length in bits is the last.
+  const std::uint64_t bits = size_ * 8;
+  std::array<std::uint8_t, 64> zeros = {};
+  constexpr std::size_t lengthPlace = 56;
+  zeros[0] = 0x80;
+  const auto rest = static_cast<std::size_t>(size_ % zeros.size());
+  add({zeros.data(), (rest < lengthPlace ? lengthPlace : lengthPlace + zeros.size()) - rest});
+  std::array<std::uint8_t, 8> length;
+  for (unsigned i = 0; i < 8; ++i) length[i] = static_cast<std::uint8_t>(bits >> 8 * i);
+  add(length);
 
   std::string hex;
-  for (const std::uint32_t word : state) {
+  for (const std::uint32_t word : state_) {
     for (unsigned i = 0; i < 4; ++i) {
       const unsigned byte = word >> 8 * i & 255;
       hex += "0123456789ABCDEF"[byte >> 4];
@@ -81,6 +86,12 @@ std::string md5Hex(std::string_view bytes) {
     }
   }
   return hex;
+}
+
+std::string md5Hex(std::string_view bytes) {
+  Md5 sum;
+  sum.add({reinterpret_cast<const std::uint8_t*>(bytes.data()), bytes.size()});
+  return sum.hex();
 }
 
 }  // namespace pelorin::photo

@@ -2,10 +2,14 @@
 #include <gmock/gmock.h>
 #include <sys/stat.h>
 
+#include <algorithm>
 #include <cstdlib>
 
+#include "photo/file_io.h"
+#include "photo/jpeg/jpeg_codec.h"
 #include "tests/cli/quenby_process.h"
 #include "tests/support/jpeg_files.h"
+#include "tests/support/pictures.h"
 
 namespace pelorin::test_support {
 namespace {
@@ -62,6 +66,38 @@ TEST(InPlace, ReplacesPhotosAndUndoRestoresAllOfThem) {
   EXPECT_EQ(restored.st_mtim.tv_nsec, 7);
   EXPECT_TRUE(fs::is_empty(photos.folder / "kept"));
   EXPECT_EQ(quenby({"undo", photos.folder / "kept"}).exitCode, 3);
+}
+
+// Above 8 MiB a part of a photo and of its result is in memory, unless they come and go by pipes.
+TEST(InPlace, ReplacesAndShowsALongPhotoAsAnyOther) {
+  const TemporaryFolder folder;
+  const Image<RGBA8Pixel> noise = noisePicture(1700, 50, 1), picture(1700, 1700);
+  for (std::uint32_t y = 0; y < picture.height; ++y)
+    std::copy_n(noise.row(y % noise.height), noise.width, picture.row(y));
+  const std::string in = folder / "a.jpg";
+  photo::writeFileAtomically(
+      in, photo::encodeJpeg(&picture.data.get()->r, 1700, 1700, 100, {}, photo::Chroma::whole));
+  const Bytes old = photo::readFile(in);
+  ASSERT_GT(old.size(), std::size_t{8} << 20);
+  const std::string look = "\"$QUENBY\" look fall --quality auto - -o - < '" + in + "' > '";
+  ASSERT_EQ(shell(look + (folder / "expected.jpg") + "'").exitCode, 0);
+  const Bytes expected = photo::readFile(folder / "expected.jpg");
+  ASSERT_GT(expected.size(), std::size_t{8} << 20);
+
+  const std::string backup = folder / "kept", page = folder / "page.html";
+  ASSERT_EQ(quenby({"look", "fall", in, "--in-place", "--backup", backup}).exitCode, 0);
+  EXPECT_TRUE(photo::readFile(in) == expected);
+  // The record of what it became is that of all of it.
+  ASSERT_EQ(quenby({"undo", backup}).exitCode, 0);
+  EXPECT_TRUE(photo::readFile(in) == old);
+
+  ASSERT_EQ(quenby({"look", "fall", in, "--in-place", "--no-backup", "--report", page}).exitCode,
+            0);
+  EXPECT_TRUE(photo::readFile(in) == expected);
+  const Bytes shown = photo::readFile(page);
+  const std::string text(shown.begin(), shown.end());
+  EXPECT_NE(text.find("data:image/jpeg"), std::string::npos);
+  EXPECT_EQ(text.find("no picture"), std::string::npos);
 }
 
 TEST(InPlace, UndoTakesNoOtherFolderForBackups) {

@@ -2,6 +2,9 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <vector>
+
 namespace pelorin::photo {
 namespace {
 
@@ -16,6 +19,21 @@ TEST(Md5, OfTheSuiteInRfc1321) {
   EXPECT_EQ(md5Hex("1234567890123456789012345678901234567890123456789012345678901234567890123456789"
                    "0"),
             "57EDF4A22BE3C955AC49DA2E2107B67A");
+}
+
+TEST(Md5, IsTheSameInWhateverPiecesTheBytesCome) {
+  std::vector<std::uint8_t> bytes;
+  for (int i = 0; i < 200; ++i) bytes.push_back(static_cast<std::uint8_t>(7 * i));
+  for (std::size_t size = 0; size <= bytes.size(); ++size) {
+    const std::span<const std::uint8_t> all(bytes.data(), size);
+    const std::string whole = md5Hex({reinterpret_cast<const char*>(all.data()), size});
+    for (const std::size_t piece : {1, 3, 63, 64, 65}) {
+      Md5 sum;
+      for (std::size_t at = 0; at < size; at += piece)
+        sum.add(all.subspan(at, std::min(piece, size - at)));
+      EXPECT_EQ(sum.hex(), whole) << size << " bytes in pieces of " << piece;
+    }
+  }
 }
 
 }  // namespace
