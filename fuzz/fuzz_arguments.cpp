@@ -38,7 +38,8 @@ std::vector<std::string> argumentsOf(const std::vector<std::string>& words,
     if (ended) arguments.emplace_back();
     ended = data[i] == 0;
     if (data[i] >= 128) {
-      const std::size_t index = (data[i] - 128u) * 256u + (++i < size ? data[i] : 0u);
+      const std::size_t first = data[i] - 128u;
+      const std::size_t index = first * 256 + (++i < size ? data[i] : 0u);
       arguments.back() += words[index % words.size()];
       ended = index / words.size() % 2 == 0;
     } else if (!ended) {
