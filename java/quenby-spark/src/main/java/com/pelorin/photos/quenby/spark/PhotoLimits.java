@@ -4,12 +4,10 @@ import com.pelorin.photos.quenby.autoenhance.Cancellation;
 import com.pelorin.photos.quenby.autoenhance.PhotoBytes;
 import java.io.IOException;
 import java.io.Serializable;
+import java.time.Duration;
 import java.util.Map;
+import java.util.Set;
 import java.util.concurrent.CancellationException;
-import java.util.concurrent.Executors;
-import java.util.concurrent.Future;
-import java.util.concurrent.ScheduledExecutorService;
-import java.util.concurrent.TimeUnit;
 
 /** What a photo of a job may cost at most: the command's limits, with its options and defaults. */
 final class PhotoLimits implements Serializable {
@@ -18,14 +16,22 @@ final class PhotoLimits implements Serializable {
             Map.of("", 1L, "k", 1_000L, "M", 1_000_000L, "G", 1_000_000_000L);
     private static final long USUAL_BYTES = 1L << 30;
 
-    private final long pixels; // 0: what the natives have
+    /** Options that jobs of every verb have. */
+    static final Set<String> OPTIONS = Set.of(
+            "--max-bytes", "--max-pixels", "--max-scans", "--max-segments", "--timeout");
+
     private final long bytes;
+    private final long pixels; // 0: what the natives have, here and below
+    private final int scans;
+    private final int segments;
     private final long seconds; // 0: as long as it takes
 
-    private PhotoLimits(long pixels, long bytes, long seconds) {
-        this.pixels = pixels;
-        this.bytes = bytes;
-        this.seconds = seconds;
+    private PhotoLimits(Map<String, String> options) {
+        bytes = number(options, "--max-bytes", 1, USUAL_BYTES);
+        pixels = number(options, "--max-pixels", 1, 0);
+        scans = count(options, "--max-scans");
+        segments = count(options, "--max-segments");
+        seconds = number(options, "--timeout", 0, 0);
     }
 
     /**
@@ -34,9 +40,11 @@ final class PhotoLimits implements Serializable {
      * @throws IllegalArgumentException when one is no number
      */
     static PhotoLimits of(Map<String, String> options) {
-        return new PhotoLimits(number(options, "--max-pixels", 1, 0),
-                number(options, "--max-bytes", 1, USUAL_BYTES),
-                number(options, "--timeout", 0, 0));
+        return new PhotoLimits(options);
+    }
+
+    private static int count(Map<String, String> options, String option) {
+        return (int) Math.min(number(options, option, 1, 0), Integer.MAX_VALUE);
     }
 
     private static long number(Map<String, String> options, String option, long least,
@@ -75,31 +83,23 @@ final class PhotoLimits implements Serializable {
      * @throws IOException what the work throws; and when the photo is beyond a limit
      */
     <T> T apply(byte[] content, Work<T> work) throws IOException {
-        PhotoBytes photo = PhotoBytes.of(content);
+        PhotoBytes photo = PhotoBytes.of(content).maxBytes(bytes);
         if (pixels > 0) {
             photo = photo.maxPixels(pixels);
         }
-        if (seconds == 0) {
-            return work.run(photo);
+        if (scans > 0) {
+            photo = photo.maxScans(scans);
         }
-        Cancellation late = new Cancellation();
-        Future<?> alarm = Clock.ALARMS.schedule(late::cancel, seconds, TimeUnit.SECONDS);
+        if (segments > 0) {
+            photo = photo.maxSegments(segments);
+        }
+        if (seconds > 0) {
+            photo = photo.cancellation(Cancellation.after(Duration.ofSeconds(seconds)));
+        }
         try {
-            return work.run(photo.cancellation(late));
+            return work.run(photo);
         } catch (CancellationException error) {
             throw new IOException("takes longer than " + seconds + " s; raise --timeout", error);
-        } finally {
-            alarm.cancel(false);
         }
-    }
-
-    /** A thread for each process that has limited times. */
-    private static final class Clock {
-        static final ScheduledExecutorService ALARMS =
-                Executors.newSingleThreadScheduledExecutor(work -> {
-                    Thread thread = new Thread(work, "quenby time limits");
-                    thread.setDaemon(true);
-                    return thread;
-                });
     }
 }

@@ -3,6 +3,7 @@ package com.pelorin.photos.quenby.spark;
 import com.pelorin.photos.quenby.autoenhance.Filter;
 import com.pelorin.photos.quenby.autoenhance.GreenCdf;
 import com.pelorin.photos.quenby.autoenhance.PhotoBytes;
+import java.util.Map;
 import org.apache.spark.sql.Row;
 import org.apache.spark.sql.SparkSession;
 import org.apache.spark.sql.UDFRegistration;
@@ -34,60 +35,59 @@ public final class Quenby {
     private Quenby() {}
 
     /**
-     * Registers the functions in a session.
+     * Registers the functions in a session, with the limits that the command has unless given.
      *
      * @param spark the session
      */
     public static void register(SparkSession spark) {
+        register(spark, Map.of());
+    }
+
+    /**
+     * Registers the functions in a session.
+     *
+     * @param spark  the session
+     * @param limits what a photo may cost at most, as the job's options say it: of "--max-bytes",
+     *               "--max-pixels", "--max-scans", "--max-segments" and "--timeout" those that are
+     *               not the usual ones
+     * @throws IllegalArgumentException when there is another option, or one is no number
+     */
+    public static void register(SparkSession spark, Map<String, String> limits) {
+        for (String option : limits.keySet()) {
+            if (!PhotoLimits.OPTIONS.contains(option)) {
+                throw new IllegalArgumentException("there is no limit " + option);
+            }
+        }
+        PhotoLimits most = PhotoLimits.of(limits);
         UDFRegistration functions = spark.udf();
-        functions.register("quenby_enhance", (UDF2<byte[], String, Row>) Quenby::enhance,
+        functions.register("quenby_enhance", (UDF2<byte[], String, Row>) (content, params) ->
+                of(most, content, it -> FilterCall.of(Filter.AUTO, params).apply(it)),
                 Outcome.type(DataTypes.BinaryType));
-        functions.register("quenby_look", (UDF3<byte[], String, String, Row>) Quenby::look,
+        functions.register("quenby_look", (UDF3<byte[], String, String, Row>)
+                (content, look, params) -> of(most, content,
+                        it -> FilterCall.of(FilterCall.look(look), params).apply(it)),
                 Outcome.type(DataTypes.BinaryType));
-        functions.register("quenby_score", (UDF1<byte[], Row>) Quenby::score,
-                Outcome.type(DataTypes.FloatType));
-        functions.register("quenby_info", (UDF1<byte[], Row>) Quenby::info,
+        functions.register("quenby_score", (UDF1<byte[], Row>) content ->
+                of(most, content, PhotoBytes::niqe), Outcome.type(DataTypes.FloatType));
+        functions.register("quenby_info", (UDF1<byte[], Row>) content ->
+                of(most, content, it -> PhotoRows.info(it.facts())),
                 Outcome.type(PhotoRows.INFO));
-        functions.register("quenby_green_cdf", (UDF1<byte[], Row>) Quenby::greenCdf,
+        functions.register("quenby_green_cdf", (UDF1<byte[], Row>) content ->
+                of(most, content, it -> it.greenCdf().toBytes()),
                 Outcome.type(DataTypes.BinaryType));
         functions.register("quenby_cdf_distance", (UDF2<byte[], byte[], Row>) Quenby::distance,
                 Outcome.type(DataTypes.FloatType));
-        functions.register("quenby_fingerprint", (UDF1<byte[], Row>) Quenby::fingerprint,
+        functions.register("quenby_fingerprint", (UDF1<byte[], Row>) content ->
+                of(most, content, PhotoRows::fingerprint),
                 Outcome.type(PhotoRows.FINGERPRINT));
     }
 
-    private static Row enhance(byte[] content, String params) {
-        return content == null ? null
-                : Outcome.of(() -> FilterCall.of(Filter.AUTO, params).apply(PhotoBytes.of(content)));
-    }
-
-    private static Row look(byte[] content, String look, String params) {
-        return content == null ? null
-                : Outcome.of(() -> FilterCall.of(FilterCall.look(look), params)
-                        .apply(PhotoBytes.of(content)));
-    }
-
-    private static Row score(byte[] content) {
-        return content == null ? null : Outcome.of(() -> PhotoBytes.of(content).niqe());
-    }
-
-    private static Row info(byte[] content) {
-        return content == null ? null
-                : Outcome.of(() -> PhotoRows.info(PhotoBytes.of(content).facts()));
-    }
-
-    private static Row greenCdf(byte[] content) {
-        return content == null ? null
-                : Outcome.of(() -> PhotoBytes.of(content).greenCdf().toBytes());
+    private static Row of(PhotoLimits limits, byte[] content, PhotoLimits.Work<Object> work) {
+        return content == null ? null : Outcome.of(() -> limits.apply(content, work));
     }
 
     private static Row distance(byte[] a, byte[] b) {
         return a == null || b == null ? null
                 : Outcome.of(() -> GreenCdf.fromBytes(a).distanceTo(GreenCdf.fromBytes(b)));
-    }
-
-    private static Row fingerprint(byte[] content) {
-        return content == null ? null
-                : Outcome.of(() -> PhotoRows.fingerprint(PhotoBytes.of(content)));
     }
 }

@@ -23,7 +23,8 @@ public final class QuenbyJob {
             "  look --look NAME [--params \"maskAlpha=0.5;\"] [--overwrite]",
             "  score",
             "  dupes [--threshold 1.5] [--assume-mtime] [--keep best]",
-            "each: [--max-pixels 268M] [--max-bytes 1074M] [--timeout SECONDS], of a photo",
+            "each, of a photo: [--max-bytes 1074M] [--max-pixels 268M] [--max-scans 100]",
+            "  [--max-segments 4096] [--timeout SECONDS]",
             "--in is a folder, a text file with a path a line, or NAME.parquet with a column path;",
             "enhance and look write files below --out and OUT/_manifest, score writes OUT/scores,",
             "dupes OUT/fingerprints, OUT/pairs, OUT/groups and, of the best, OUT/ranking.",
@@ -61,8 +62,7 @@ public final class QuenbyJob {
                 "look", Set.of("--look", "--params", "--overwrite"),
                 "score", Set.of(),
                 "dupes", Set.of("--threshold", "--assume-mtime", "--keep"));
-        private static final Set<String> OF_ALL =
-                Set.of("--in", "--out", "--max-pixels", "--max-bytes", "--timeout");
+        private static final Set<String> OF_ALL = Set.of("--in", "--out");
         private static final Set<String> FLAGS = Set.of("--overwrite", "--assume-mtime");
 
         final String verb;
@@ -83,7 +83,8 @@ public final class QuenbyJob {
             Map<String, String> values = new HashMap<>();
             for (int i = 1; i < arguments.length; ++i) {
                 String option = arguments[i];
-                if (!OF_ALL.contains(option) && !OPTIONS.get(verb).contains(option)) {
+                if (!OF_ALL.contains(option) && !PhotoLimits.OPTIONS.contains(option)
+                        && !OPTIONS.get(verb).contains(option)) {
                     throw new IllegalArgumentException(verb + " has no option " + option);
                 }
                 boolean isFlag = FLAGS.contains(option);

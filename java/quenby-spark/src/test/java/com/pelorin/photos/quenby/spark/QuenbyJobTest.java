@@ -267,8 +267,14 @@ class QuenbyJobTest {
         limited[5] = "--max-bytes";
         limited[6] = "1k";
         assertTrue(run(limited).contains("0 done, 30 failed"));
-        assertEquals(2, spark.read().parquet(out + "/scores").select("error").distinct()
-                .where("error LIKE '%larger than 1000 bytes%' OR error LIKE '%pixels%'").count());
+        limited[5] = "--max-segments";
+        limited[6] = "1";
+        assertTrue(run(limited).contains("0 done, 30 failed"));
+        assertEquals(3, spark.read().parquet(out + "/scores").select("error").distinct()
+                .where("error LIKE '%larger than 1000 bytes%' OR error LIKE '%pixels%'"
+                        + " OR error LIKE '%too many segments%'").count());
+        limited[5] = "--max-scans";
+        assertTrue(run(limited).contains("30 done, 0 failed"));
     }
 
     @Test
@@ -325,6 +331,8 @@ class QuenbyJobTest {
             {"score", "--in", "a", "--out", "b", "--max-pixels", "0"},
             {"score", "--in", "a", "--out", "b", "--max-pixels", "40m"},
             {"score", "--in", "a", "--out", "b", "--max-bytes", "99999999999999999999"},
+            {"score", "--in", "a", "--out", "b", "--max-scans", "0"},
+            {"score", "--in", "a", "--out", "b", "--max-segments", "many"},
             {"score", "--in", "a", "--out", "b", "--timeout", "-1"}};
         for (String[] arguments : wrong) {
             assertThrows(IllegalArgumentException.class,

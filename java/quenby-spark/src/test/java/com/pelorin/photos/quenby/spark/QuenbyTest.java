@@ -13,6 +13,7 @@ import java.nio.file.Files;
 import java.nio.file.Path;
 import java.time.LocalDateTime;
 import java.util.Arrays;
+import java.util.Map;
 import org.apache.spark.sql.Row;
 import org.apache.spark.sql.SparkSession;
 import org.junit.jupiter.api.BeforeEach;
@@ -96,6 +97,21 @@ class QuenbyTest {
         assertTrue(error("quenby_enhance(content, 'slider=1;quality=0;')").contains("quality"));
         assertTrue(error("quenby_enhance(content, 'slider=1;quality=x;')").contains("quality"));
         assertTrue(error("quenby_cdf_distance(content, content)").contains("1024"));
+    }
+
+    @Test
+    void limitsAreThoseThatAreNamed() {
+        Quenby.register(spark, Map.of("--max-pixels", "11999"));
+        for (String call : new String[] {"enhance(content, 'slider=0.4;')",
+            "look(content, 'winter', '')", "score(content)", "info(content)",
+            "green_cdf(content)", "fingerprint(content)"}) {
+            assertTrue(error("quenby_" + call).contains("120 x 100 pixels"), call);
+        }
+        assertThrows(IllegalArgumentException.class,
+                () -> Quenby.register(spark, Map.of("--max-pixels", "few")));
+        assertThrows(IllegalArgumentException.class,
+                () -> Quenby.register(spark, Map.of("--quality", "9")));
+        Quenby.register(spark);
     }
 
     @Test
