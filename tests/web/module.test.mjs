@@ -121,6 +121,24 @@ test("filters tell what they take", () => {
   assert.deepEqual([slider.kind, slider.required, slider.lowest, slider.highest], ["number", true, 0, 1]);
 });
 
+test("limits are those that are named", () => {
+  const { simd } = builds;
+  const file = photo("twenty/plain.jpg");
+  const { width, height } = simd.facts(file);
+  const enough = { maxBytes: file.length, maxPixels: width * height, maxScans: 1, maxSegments: 99 };
+  for (const call of [
+    (limits) => simd.facts(file, limits), (limits) => simd.shot(file, limits),
+    (limits) => simd.open(file, limits).close(),
+    (limits) => simd.filterFile(file, "WinterRGB", {}, { open: limits }),
+  ]) {
+    call(enough);
+    const less = { maxBytes: file.length - 1, maxPixels: width * height - 1, maxSegments: 1 };
+    for (const [limit, value] of Object.entries(less)) {
+      assert.throws(() => call({ [limit]: value }), { kind: "too-large" }, limit);
+    }
+  }
+});
+
 test("what cannot be done is an error with a sentence, and the module lives on", () => {
   const expected = {
     "hostile/empty.jpg": "empty-file", "hostile/cut.jpg": "truncated", "hostile/bomb.jpg": "too-large",

@@ -77,7 +77,8 @@ export const Parameter = struct({
 });
 export const OpenOptions = struct({
   struct_size: "u32", scale: "i32", rotate: "i32", max_pixels: "u64", max_scans: "i32", flags: "u32",
-  workers: "u32",
+  workers: "u32", max_scanned_pixels: "u64", max_compressed_pixels: "u64", max_segments: "i32",
+  max_bytes: "u64",
 });
 export const SaveOptions = struct({ struct_size: "u32", quality: "i32", flags: "u32", keep: "u32" });
 export const Facts = struct({

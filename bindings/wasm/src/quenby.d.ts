@@ -76,13 +76,23 @@ export interface Timed {
   timeout?: number;
 }
 
-export interface OpenOptions {
+/** How much work a file may ask for; more of it is "too-large". */
+export interface Limits {
+  /** Of the file: 1073741824 unless given. */
+  maxBytes?: number;
+  /** Of the picture as stored: 268435456 unless given, and 40000000 of a file of a few kB. */
+  maxPixels?: number;
+  /** Of a JPEG file: 100 unless given. */
+  maxScans?: number;
+  /** Before a JPEG file's picture data: 4096 unless given. */
+  maxSegments?: number;
+}
+
+export interface OpenOptions extends Limits {
   /** 1, 2, 4 or 8: what the sides are divided by, rounded up. */
   scale?: 1 | 2 | 4 | 8;
   /** Degrees clockwise beyond upright, a multiple of 90. */
   rotate?: number;
-  maxPixels?: number;
-  maxScans?: number;
   asStored?: boolean;
   ignoreKnownFaces?: boolean;
 }
@@ -155,7 +165,7 @@ export class Quenby {
   readonly build: "simd" | "scalar";
   filters(): Filter[];
   /** What a file says, without decoding it. */
-  facts(file: Uint8Array): Facts;
+  facts(file: Uint8Array, limits?: Limits): Facts;
   /** Decodes a JPEG or PNG file and turns the picture upright. */
   open(file: Uint8Array, options?: OpenOptions & Timed): Photo;
   /** A session on pixels, which are copied. */
@@ -169,7 +179,7 @@ export class Quenby {
   write(picture: Picture, format?: "JPEG" | "PNG", save?: SaveOptions & Timed): SavedFile;
   /** NIQE: lower is better; null below 96 pixels a side. */
   score(picture: Picture): number | null;
-  shot(file: Uint8Array, options?: Timed): Shot;
+  shot(file: Uint8Array, options?: Limits & Timed): Shot;
   /** For each shot the place of the first of its group, its own where it is in none. */
   duplicates(shots: Shot[], threshold?: number, options?: Timed): number[];
   /** The table of `quenby selftest`. */

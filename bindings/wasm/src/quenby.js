@@ -97,8 +97,9 @@ function flagsOf(bits, options) {
 
 function openValues(options = {}) {
   return {
-    scale: options.scale, rotate: options.rotate, max_pixels: options.maxPixels,
-    max_scans: options.maxScans, flags: flagsOf(openFlags, options),
+    scale: options.scale, rotate: options.rotate, max_bytes: options.maxBytes,
+    max_pixels: options.maxPixels, max_scans: options.maxScans, max_segments: options.maxSegments,
+    flags: flagsOf(openFlags, options),
   };
 }
 
@@ -228,9 +229,9 @@ export class Quenby {
     });
   }
 
-  facts(file) {
-    return this.scoped((scope) => factsOf(
-      this.receiveStruct(layout.Facts, "quenby_read_facts", scope.bytes(file), file.length)));
+  facts(file, limits) {
+    return this.scoped((scope) => factsOf(this.receiveStruct(layout.Facts, "quenby_read_facts_within",
+      scope.bytes(file), file.length, scope.struct(layout.OpenOptions, openValues(limits)))));
   }
 
   open(file, options = {}) {
@@ -296,9 +297,10 @@ export class Quenby {
     });
   }
 
-  shot(file, { timeout } = {}) {
-    return this.scoped((scope) => this.timed(timeout, (cancel) => this.receiveStruct(layout.Shot,
-      "quenby_read_shot", scope.bytes(file), file.length, 0, cancel)));
+  shot(file, options = {}) {
+    return this.scoped((scope) => this.timed(options.timeout, (cancel) => this.receiveStruct(layout.Shot,
+      "quenby_read_shot", scope.bytes(file), file.length,
+      scope.struct(layout.OpenOptions, openValues(options)), cancel)));
   }
 
   /** @returns for each shot the index of the first of its group, its own where it is in none. */
