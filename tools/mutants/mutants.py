@@ -1,26 +1,34 @@
 #!/usr/bin/env python3
-"""Changes one line of the library at a time and looks whether a test fails: what survives is what no test
-asks. The tree stays as it is; the changed file is compiled beside it and linked before the libraries.
+"""Changes the libraries one place at a time and looks whether a test fails: what survives is what no test asks.
 
-    tools/mutants/mutants.py image_processing/core photo/files.cpp      # every mutant of these
-    tools/mutants/mutants.py --seconds 600 --seed 2 photo               # as many as time allows, any
-    tools/mutants/mutants.py --again photo                              # those that survived, once more
+    tools/mutants/mutants.py                              # 1,000 mutants of engine, photo and jni, any
+    tools/mutants/mutants.py --count 50 photo/metadata    # 50 of a folder or file; --count 0: all
+    tools/mutants/mutants.py --again                      # those that survived, once more
+    tools/mutants/mutants.py --show                       # what is known
 
-Needs a build with the tests (./quenby test release, or targets of it): programs that are not built are
-left out, and said so. What was found stays in build/mutants/results.jsonl, so that the next run goes on.
-survivors.txt has those that survive for a reason: a line of tools/mutants/survivors.txt is the path, the
-line as it was, as it is changed, and why that is no fault, parted by " | ".
+All mutants are one program: each edit stands in a copy of the sources (build/mutants) behind a switch that
+is read as the program starts (edits.py, switch.h), and the tests are built of that copy once. Every test
+runs alone and tells which switches it asks; then every mutant runs those tests that ask for its own, in
+the folder of the same name first, up to the first that fails. One that takes four times as long as ever,
+or memory without end, has failed. Edits that do not compile are left out, and so is what is computed while
+compiling: no test asks for its switch.
+
+What was found is kept in build/mutants/results.jsonl, so that the next run goes on. survivors.txt has those
+that survive for a reason: the path, the line as it was, as it is changed, and why that is no fault, parted
+by " | "; path and lines may have * in them.
 """
 
 import argparse
 import collections
-import hashlib
+import concurrent.futures
+import fnmatch
+import glob
 import json
 import os
 import pathlib
 import random
+import re
 import resource
-import shlex
 import shutil
 import subprocess
 import sys
@@ -30,313 +38,358 @@ import time
 import edits
 
 ROOT = pathlib.Path(__file__).resolve().parents[2]
-KNOWN = ROOT / "tools/mutants/survivors.txt"
-MEMORY = 4 << 30  # of a test: a mutant may want any
-
-
-def limited() -> None:
-    resource.setrlimit(resource.RLIMIT_AS, (MEMORY, MEMORY))
-    resource.setrlimit(resource.RLIMIT_CORE, (0, 0))
-    resource.setrlimit(resource.RLIMIT_FSIZE, (1 << 28, 1 << 28))
-
-
-class Build:
-    """What a build folder knows: how a file is compiled and a program linked."""
-
-    def __init__(self, folder: pathlib.Path, scratch: pathlib.Path, longest: float) -> None:
-        self.folder, self.scratch, self.longest = folder, scratch, longest
-        self.compiles = {}
-        for entry in json.loads((folder / "compile_commands.json").read_text()):
-            source = os.path.relpath(os.path.join(entry["directory"], entry["file"]), ROOT)
-            words = shlex.split(entry["command"])
-            self.compiles.setdefault(source, []).append(words)
-        listed = self._ninja("-t", "targets", "all")
-        names = [line.split(": ")[0] for line in listed.splitlines() if "EXECUTABLE_LINKER" in line]
-        programs = [name for name in names if name.startswith("tests/") and name.endswith(("_test", "_tests"))]
-        self.programs = [name for name in programs if (folder / name).exists()]
-        self.missing = len(programs) - len(self.programs)
-        self._inputs, self._seconds, self._links, self._readers = {}, {}, {}, None
-
-    def _ninja(self, *arguments: str) -> str:
-        command = ["ninja", "-C", str(self.folder), *arguments]
-        return subprocess.run(command, check=True, capture_output=True, text=True).stdout
-
-    def inputs(self, program: str) -> set[str]:
-        if program not in self._inputs:
-            self._inputs[program] = set(self._ninja("-t", "inputs", program).splitlines())
-        return self._inputs[program]
-
-    def object_of(self, words: list[str]) -> str:
-        return words[words.index("-o") + 1]
-
-    def compile(self, words: list[str], source: pathlib.Path, overlay: pathlib.Path = None) -> pathlib.Path:
-        """The object of another source in place of the command's; None where it does not compile."""
-        made = self.scratch / "mutant.o"
-        words = [word for word in words if word not in ("ccache",) and not word.endswith("/ccache")]
-        words = ["-O1" if word in ("-O2", "-O3") else word for word in words]
-        words[words.index("-o") + 1] = str(made)
-        words[words.index("-c") + 1] = str(source)
-        # Kernels for one instruction set: the others are the same lines.
-        words[1:1] = (["-I", str(overlay)] if overlay else []) + ["-w", "-DHWY_COMPILE_ONLY_STATIC"]
-        try:
-            done = subprocess.run(words, cwd=self.folder, capture_output=True, timeout=180)
-        except subprocess.TimeoutExpired:
-            return None
-        return made if done.returncode == 0 else None
-
-    def link(self, program: str, place: str, made: pathlib.Path) -> pathlib.Path:
-        """The program with an object in place of its own at `place`, or before its libraries."""
-        if program not in self._links:
-            commands = self._ninja("-t", "commands", "-s", program).strip().splitlines()[-1]
-            command = commands.split(" && ")
-            self._links[program] = shlex.split(max(command, key=len))
-        words = list(self._links[program])
-        if place in words:
-            words[words.index(place)] = str(made)
-        else:
-            first = next(i for i, word in enumerate(words) if word.endswith(".a"))
-            words.insert(first, str(made))
-        out = self.scratch / "program"
-        words[words.index("-o") + 1] = str(out)
-        done = subprocess.run(words, cwd=self.folder, capture_output=True)
-        return out if done.returncode == 0 else None
-
-    def run(self, program: pathlib.Path, seconds: float) -> bool:
-        """Whether all its tests pass."""
-        folder = self.scratch / "files"
-        shutil.rmtree(folder, ignore_errors=True)
-        folder.mkdir()
-        environment = {**os.environ, "TMPDIR": str(folder), "GTEST_FAIL_FAST": "1", "GTEST_BRIEF": "1"}
-        process = subprocess.Popen(
-            [str(program)],
-            cwd=folder,
-            env=environment,
-            stdin=subprocess.DEVNULL,
-            stdout=subprocess.DEVNULL,
-            stderr=subprocess.DEVNULL,
-            preexec_fn=limited,
-            start_new_session=True,
-        )
-        try:
-            return process.wait(seconds) == 0
-        except subprocess.TimeoutExpired:
-            os.killpg(process.pid, 9)
-            process.wait()
-            return False
-
-    def seconds(self, program: str) -> float:
-        """How long it takes as it is; more than it may where it fails."""
-        if program not in self._seconds:
-            start = time.monotonic()
-            passes = self.run(self.folder / program, self.longest)
-            self._seconds[program] = time.monotonic() - start if passes else 2 * self.longest
-        return self._seconds[program]
-
-    def readers(self) -> dict[str, dict[str, str]]:
-        """Of each header the programs whose own files read it, with the object of the first such file."""
-        if self._readers is None:
-            self._readers = collections.defaultdict(dict)
-            program_of = {os.path.basename(program): program for program in self.programs}
-            prefix = os.path.relpath(ROOT, self.folder) + "/"
-            program = target = None
-            for line in self._ninja("-t", "deps").splitlines():
-                if ": #deps" in line:
-                    target = line.split(": #deps")[0]
-                    folder = next((word for word in target.split("/") if word.endswith(".dir")), "")
-                    program = program_of.get(folder.removesuffix(".dir"))
-                elif program:
-                    header = line.strip().removeprefix(prefix).removeprefix(str(ROOT) + "/")
-                    self._readers[header].setdefault(program, target)
-        return self._readers
-
-    def tests_of(self, source: str, place: str) -> list[str]:
-        """Programs that hold an object or header, those whose name or folder is the source's first."""
-        stem = pathlib.Path(source).stem.replace("_simd", "").replace("_tables", "")
-        mirrored = "tests/" + os.path.dirname(source).removeprefix("image_processing/")
-
-        def distance(program: str) -> tuple:
-            folder, name = os.path.split(program)
-            return (not name.startswith(stem), folder != mirrored, self._seconds.get(program, 0), name)
-
-        return sorted((program for program in self.programs if place in self.inputs(program)), key=distance)
+WORK = ROOT / "build/mutants"
+COPY = WORK / "source"
+BUILD = WORK / "build"
+FOLDERS = ["image_processing", "photo", "jni"]
+KINDS = ["killed", "survived", "with a reason"]
+JOBS = os.cpu_count() or 1
+MEMORY = 6 << 30  # of a test: a mutant may want any
+# Kernels for one instruction set: the others are the same lines.
+FLAGS = "-O1 -DNDEBUG -w -Wno-narrowing"
+MACHINE = "-DHWY_COMPILE_ONLY_STATIC -mavx2 -mfma -mf16c -mbmi -mbmi2 -mlzcnt -mpclmul -maes"
 
 
 class Mutant:
-    def __init__(self, path: str, edit: edits.Edit, nth: int) -> None:
-        self.path, self.edit = path, edit
-        key = "\0".join([path, edit.before.strip(), edit.after.strip(), str(nth)])
-        self.key = hashlib.sha256(key.encode()).hexdigest()[:16]
-
-    def shown(self) -> str:
-        return f"{self.path} | {self.edit.before.strip()} | {self.edit.after.strip() or ';'}"
+    def __init__(self, path: str, edit: edits.Edit, text: str, nth: int) -> None:
+        self.path, self.edit, self.line = path, edit, edit.line(text)
+        self.before, self.after = edit.shown(text)
+        self.key = " | ".join([path, self.before, self.after, str(nth)])
 
 
-def mutants_of(path: str) -> list[Mutant]:
-    seen = collections.Counter()
-    made = []
-    for edit in edits.edits((ROOT / path).read_text()):
-        place = (edit.before.strip(), edit.after.strip())
-        made.append(Mutant(path, edit, seen[place]))
-        seen[place] += 1
-    return made
+def read_tree() -> dict[str, bytes]:
+    """The files of the tree as they are now; whoever works on them meanwhile does not disturb."""
+    command = ["git", "ls-files", "-coz", "--exclude-standard"]
+    listed = subprocess.run(command, cwd=ROOT, check=True, capture_output=True, text=True).stdout
+    return {path: (ROOT / path).read_bytes() for path in sorted(listed.split("\0")) if (ROOT / path).is_file()}
 
 
-def outcome(build: Build, mutant: Mutant, original: dict) -> str:
-    lines = (ROOT / mutant.path).read_text().split("\n")
-    lines[mutant.edit.line] = mutant.edit.after
-    changed = build.scratch / "overlay" / mutant.path
-    shutil.rmtree(build.scratch / "overlay", ignore_errors=True)
-    changed.parent.mkdir(parents=True)
-    changed.write_text("\n".join(lines))
-    if mutant.path.endswith(".h"):
-        return header_outcome(build, mutant)
-    words = build.compiles[mutant.path][0]
-    place = build.object_of(words)
-    if mutant.path not in original:
-        # Compiled from the same place: so that names of files in the object are the same.
-        changed.write_text((ROOT / mutant.path).read_text())
-        made = build.compile(words, changed)
-        if made is None:
-            raise SystemExit(f"{mutant.path} does not compile as it is")
-        original[mutant.path] = made.read_bytes()
-        changed.write_text("\n".join(lines))
-    made = build.compile(words, changed)
-    if made is None:
-        return "not built"
-    if made.read_bytes() == original[mutant.path]:
-        return "same code"
-    linked = False
-    for program in build.tests_of(mutant.path, place):
-        usual = build.seconds(program)
-        if usual > build.longest:
-            continue
-        out = build.link(program, place, made)
-        if out is None:  # which has the file through a shared library
-            continue
-        linked = True
-        if not build.run(out, 4 * usual + 3):
-            return "killed"
-    return "survived" if linked else "no test"
-
-
-def header_outcome(build: Build, mutant: Mutant) -> str:
-    users = build.readers()[mutant.path]
-    stem = pathlib.Path(mutant.path).stem
-    ordered = sorted(users, key=lambda name: (not os.path.basename(name).startswith(stem), name))
-    built = False
-    for program in ordered[:4]:
-        usual = build.seconds(program)
-        if usual > build.longest:
-            continue
-        source, words = next(
-            (source, words)
-            for source, all_words in build.compiles.items()
-            for words in all_words
-            if build.object_of(words) == users[program]
-        )
-        made = build.compile(words, ROOT / source, build.scratch / "overlay")
-        if made is None:
-            return "not built"
-        out = build.link(program, users[program], made)
-        if out is None:
-            return "not built"
-        built = True
-        if not build.run(out, 4 * usual + 3):
-            return "killed"
-    return "survived" if built else "no test"
-
-
-def sources(paths: list[str]) -> list[str]:
+def all_mutants(tree: dict[str, bytes]) -> list[Mutant]:
     found = []
-    for path in paths:
-        whole = ROOT / path
-        files = [whole] if whole.is_file() else sorted([*whole.rglob("*.cpp"), *whole.rglob("*.h")])
-        found += [os.path.relpath(file, ROOT) for file in files]
+    for path, content in tree.items():
+        if not path.startswith(tuple(folder + "/" for folder in FOLDERS)) or not path.endswith((".cpp", ".h")):
+            continue
+        text, seen = content.decode(), collections.Counter()
+        for edit in edits.edits(text):
+            shown = edit.shown(text)
+            found.append(Mutant(path, edit, text, seen[shown]))
+            seen[shown] += 1
     return found
 
 
-def known_reasons() -> dict[str, str]:
-    reasons = {}
-    for line in KNOWN.read_text().splitlines() if KNOWN.exists() else []:
+def numbered(mutants: list[Mutant]) -> dict[int, Mutant]:
+    """Mutants by the number of their switch: the one it ever had, so that files that did not change are not compiled."""
+    file = WORK / "numbers.json"
+    numbers = json.loads(file.read_text()) if file.exists() else {}
+    for mutant in mutants:
+        numbers.setdefault(mutant.key, len(numbers))
+    file.write_text(json.dumps(numbers))
+    return {numbers[mutant.key]: mutant for mutant in mutants}
+
+
+def write(path: pathlib.Path, content: bytes) -> None:
+    """What stays as it was keeps its time, and is not compiled again."""
+    if not path.exists() or path.read_bytes() != content:
+        path.parent.mkdir(parents=True, exist_ok=True)
+        path.write_bytes(content)
+
+
+class Programs:
+    """The tests, built of all mutants at once."""
+
+    def __init__(self, tree: dict[str, bytes], mutants: dict[int, Mutant]) -> None:
+        self.tree, self.mutants = tree, mutants
+        self.refused_file = WORK / "refused.json"
+        self.refused = set(json.loads(self.refused_file.read_text())) if self.refused_file.exists() else set()
+        self.programs: list[str] = []
+
+    def write_sources(self) -> None:
+        numbered = collections.defaultdict(list)
+        for number, mutant in self.mutants.items():
+            if mutant.key not in self.refused:
+                numbered[mutant.path].append((number, mutant.edit))
+        for path, content in self.tree.items():
+            if path in numbered:
+                # One line more: `refuse` counts on it.
+                text = '#include "tools/mutants/switch.h"\n' + edits.switched(content.decode(), numbered[path])
+                content = text.encode()
+            write(COPY / path, content)
+            if content.startswith(b"#!"):
+                os.chmod(COPY / path, 0o755)
+
+    def configure(self) -> None:
+        command = ["cmake", "-S", str(COPY), "-B", str(BUILD), "-G", "Ninja", "-DCMAKE_BUILD_TYPE=Release"]
+        for option in [
+            f"CMAKE_CXX_FLAGS_RELEASE={FLAGS}",
+            f"CMAKE_CXX_FLAGS={MACHINE} -I{COPY}",
+            "PELORIN_UNITY=ON",
+            "PELORIN_INSTALL=OFF",
+            "PELORIN_COMMAND_TESTS=OFF",
+            "PELORIN_JAVA_TESTS=OFF",
+        ]:
+            command.append("-D" + option)
+        subprocess.run(command, check=True, stdout=subprocess.DEVNULL)
+        listed = subprocess.run(
+            ["ninja", "-C", str(BUILD), "-t", "targets", "all"], check=True, capture_output=True, text=True
+        ).stdout
+        names = [line.split(": ")[0] for line in listed.splitlines() if "EXECUTABLE_LINKER" in line]
+        self.programs = [
+            name
+            for name in names
+            if name.startswith("tests/")
+            and name.endswith(("_test", "_tests"))
+            and not name.startswith(("tests/cli/", "tests/browser/"))
+            and "command" not in name  # which would build the command, too
+        ]
+
+    def refuse(self, log: str) -> int:
+        """Leaves out the edits at which the compiler found errors; how many they are."""
+        before = len(self.refused)
+        place = re.compile(re.escape(str(COPY)) + r"/((?:" + "|".join(FOLDERS) + r")/[^:\s]+):(\d+):(\d+)")
+        for block in re.split(r"\n(?=[^\n]*\berror: )", log):
+            if "error: " not in block.split("\n", 1)[0]:
+                continue
+            for path, line, column in place.findall(block):
+                text = (COPY / path).read_text().split("\n")[int(line) - 1]
+                numbers = [int(n) for n in re.findall(r"quenbyMutant\((\d+)\)", text.encode()[: int(column)].decode(errors="ignore"))]
+                live = [n for n in numbers if n in self.mutants and self.mutants[n].key not in self.refused]
+                if not live:  # of all that begin on the line
+                    every = [int(n) for n in re.findall(r"quenbyMutant\((\d+)\)", text)]
+                    live = [n for n in every if self.mutants[n].key not in self.refused]
+                    self.refused.update(self.mutants[n].key for n in live)
+                else:
+                    self.refused.add(self.mutants[live[-1]].key)
+                if live:
+                    break
+        return len(self.refused) - before
+
+    def build(self) -> None:
+        rounds = 0
+        while True:
+            self.write_sources()
+            if not self.programs:
+                self.configure()
+            done = subprocess.run(
+                ["ninja", "-C", str(BUILD), "-k", "0", "-j", str(JOBS), *self.programs],
+                capture_output=True,
+                text=True,
+                errors="replace",
+            )
+            (WORK / "build.log").write_text(done.stdout)
+            if done.returncode == 0:
+                return
+            rounds += 1
+            refused = self.refuse(done.stdout)
+            print(f"round {rounds}: {refused} edits do not compile", file=sys.stderr, flush=True)
+            self.refused_file.write_text(json.dumps(sorted(self.refused)))
+            if refused == 0:  # errors that have no edit beside them, but come of one: all of the file's
+                files = set(re.findall(re.escape(str(COPY)) + r"/(\S+?):\d+:\d+: error: ", done.stdout))
+                whole = {mutant.key for mutant in self.mutants.values() if mutant.path in files} - self.refused
+                self.refused |= whole
+                refused = len(whole)
+                self.refused_file.write_text(json.dumps(sorted(self.refused)))
+            if refused == 0:
+                sys.exit(f"the copy does not compile; see {WORK / 'build.log'}")
+
+
+class Test:
+    def __init__(self, program: str, name: str) -> None:
+        self.program, self.name = program, name
+        self.seconds, self.reached = 0.0, frozenset()
+
+
+def limits(seconds: int):
+    def apply() -> None:
+        resource.setrlimit(resource.RLIMIT_CPU, (seconds, seconds + 1))
+        resource.setrlimit(resource.RLIMIT_AS, (MEMORY, MEMORY))
+        resource.setrlimit(resource.RLIMIT_CORE, (0, 0))
+        resource.setrlimit(resource.RLIMIT_FSIZE, (1 << 30, 1 << 30))
+
+    return apply
+
+
+def run(program: str, tests: list[str], cpu_seconds: float, **environment: str) -> bool:
+    """Whether the tests of a program pass, in a folder of their own."""
+    with tempfile.TemporaryDirectory(prefix="mutants-", dir="/dev/shm") as folder:
+        process = subprocess.Popen(
+            [str(BUILD / program), "--gtest_filter=" + ":".join(tests), "--gtest_brief=1", "--gtest_fail_fast"],
+            cwd=folder,
+            env={**os.environ, "TMPDIR": folder, **environment},
+            stdin=subprocess.DEVNULL,
+            stdout=subprocess.DEVNULL,
+            stderr=subprocess.DEVNULL,
+            preexec_fn=limits(int(cpu_seconds) + 1),
+            start_new_session=True,
+        )
+        try:
+            passed = process.wait(10 * cpu_seconds + 20) == 0
+        except subprocess.TimeoutExpired:
+            passed = False
+        try:
+            os.killpg(process.pid, 9)
+        except ProcessLookupError:
+            pass
+        process.wait()
+        return passed
+
+
+def find_tests(programs: list[str], longest: float) -> list[Test]:
+    """Every test that passes as things are within so many seconds, with how long it takes and which switches it asks."""
+    store = WORK / "tests.jsonl"
+    lines = store.read_text().splitlines() if store.exists() else []
+    recorded = {(entry["program"], entry["built"], entry["name"]): entry for entry in map(json.loads, lines)}
+    tests = []
+    for program in programs:
+        listed = subprocess.run([str(BUILD / program), "--gtest_list_tests"], capture_output=True, text=True).stdout
+        suite = ""
+        for line in listed.splitlines():
+            name = line.split("#")[0].rstrip()
+            if name and not name.startswith(" "):
+                suite = name
+            elif name and "DISABLED_" not in suite + name:
+                tests.append(Test(program, suite + name.strip()))
+
+    def record(test: Test) -> bool:
+        built = os.stat(BUILD / test.program).st_mtime
+        entry = recorded.get((test.program, built, test.name))
+        if entry is None:
+            with tempfile.TemporaryDirectory(prefix="mutants-reached-", dir="/dev/shm") as folder:
+                start = time.monotonic()
+                passed = run(test.program, [test.name], longest, QUENBY_MUTANTS_REACHED=folder + "/")
+                seconds = time.monotonic() - start
+                files = [pathlib.Path(file).read_text().split() for file in glob.glob(folder + "/*")]
+            entry = {"program": test.program, "built": built, "name": test.name, "passed": passed}
+            entry |= {"seconds": seconds, "reached": sorted({int(number) for file in files for number in file})}
+            with store.open("a") as log:
+                log.write(json.dumps(entry) + "\n")
+        test.seconds, test.reached = entry["seconds"], frozenset(entry["reached"])
+        return entry["passed"]
+
+    with concurrent.futures.ThreadPoolExecutor(JOBS) as pool:
+        passed = list(pool.map(record, tests))
+    failing = [test.name for test, ok in zip(tests, passed) if not ok]
+    if failing:
+        print(f"left out, since they fail as things are or take long: {', '.join(failing)}", file=sys.stderr)
+    return [test for test, ok in zip(tests, passed) if ok]
+
+
+def outcome(number: int, path: str, tests: list[Test], longest: float) -> tuple[str, str]:
+    """What became of a mutant, and the program that noticed it."""
+    mirrored = "tests/" + os.path.dirname(path).removeprefix("image_processing/")
+    by_program = collections.defaultdict(list)
+    for test in tests:
+        by_program[test.program].append(test)
+
+    def order(program: str) -> tuple:
+        near = os.path.commonprefix([os.path.dirname(program), mirrored]).count("/")
+        return (-near, sum(test.seconds for test in by_program[program]))
+
+    left = longest
+    for program in sorted(by_program, key=order):
+        some = []
+        for test in sorted(by_program[program], key=lambda test: test.seconds):
+            if some and test.seconds > left:
+                break
+            some.append(test)
+            left -= test.seconds
+        seconds = sum(test.seconds for test in some)
+        if not run(program, [test.name for test in some], 4 * seconds + 3, QUENBY_MUTANT=str(number)):
+            return "killed", program
+        if left <= 0:
+            break
+    return "survived", ""
+
+
+def known_reasons() -> list[tuple[str, str]]:
+    reasons = []
+    for line in (ROOT / "tools/mutants/survivors.txt").read_text().splitlines():
         if line and not line.startswith("#"):
-            mutant, reason = line.rsplit(" | ", 1)
-            reasons[mutant] = reason
+            pattern, reason = line.rsplit(" | ", 1)
+            # Only * is special: lines are full of brackets.
+            reasons.append((re.sub(r"[\[?]", lambda sign: f"[{sign[0]}]", pattern), reason))
     return reasons
 
 
-def table(mutants: list[Mutant], results: dict[str, str], reasons: dict[str, str]) -> None:
+def show(mutants: list[Mutant], results: dict[str, str]) -> None:
+    reasons = known_reasons()
     rows = collections.defaultdict(collections.Counter)
     for mutant in mutants:
         result = results.get(mutant.key)
         if result is None:
             continue
-        if result in ("survived", "no test") and mutant.shown() in reasons:
+        shown = " | ".join([mutant.path, mutant.before, mutant.after])
+        if result == "survived" and any(fnmatch.fnmatchcase(shown, pattern) for pattern, _ in reasons):
             result = "with a reason"
+        if result == "survived":
+            print(f"{mutant.path}:{mutant.line} {mutant.edit.kind}\n  - {mutant.before}\n  + {mutant.after}")
         rows[os.path.dirname(mutant.path)][result] += 1
-    kinds = ["killed", "survived", "with a reason", "no test", "same code", "not built"]
-    print("| Folder | " + " | ".join(kinds) + " |")
-    print("|---" * (len(kinds) + 1) + "|")
+    print("| Folder | " + " | ".join(KINDS) + " |")
+    print("|---" * (len(KINDS) + 1) + "|")
     total = collections.Counter()
     for folder, counts in sorted(rows.items()):
-        print(f"| `{folder}` | " + " | ".join(str(counts[kind]) for kind in kinds) + " |")
+        print(f"| `{folder}` | " + " | ".join(str(counts[kind]) for kind in KINDS) + " |")
         total.update(counts)
-    print("| all | " + " | ".join(str(total[kind]) for kind in kinds) + " |")
-    tried = total["killed"] + total["survived"] + total["no test"] + total["with a reason"]
-    if tried:
+    print("| all | " + " | ".join(str(total[kind]) for kind in KINDS) + " |")
+    if tried := sum(total.values()):
         print(f"\n{tried} mutants, {100 * total['killed'] / tried:.1f} % of them killed")
 
 
 def main() -> None:
     parser = argparse.ArgumentParser(description=__doc__, formatter_class=argparse.RawTextHelpFormatter)
-    parser.add_argument("paths", nargs="+", help="files and folders of the tree")
-    parser.add_argument("--build", default="build/release", help="the build to take (build/release)")
+    parser.add_argument("paths", nargs="*", default=FOLDERS, help="files and folders (engine, photo and jni)")
+    parser.add_argument("--count", type=int, default=1000, help="how many, with those known already (1000)")
     parser.add_argument("--seconds", type=float, default=float("inf"), help="when to stop")
-    parser.add_argument("--seed", type=int, help="in an order of its own; else from top to bottom")
-    parser.add_argument("--longest", type=float, default=5, help="seconds; longer tests are left out (5)")
+    parser.add_argument("--longest", type=float, default=15, help="seconds of tests a mutant (15)")
+    parser.add_argument("--seed", type=int, default=1, help="of the choice")
     parser.add_argument("--again", action="store_true", help="try those again that survived")
     parser.add_argument("--show", action="store_true", help="only tell what is known")
     arguments = parser.parse_args()
-
-    store = ROOT / "build/mutants/results.jsonl"
-    store.parent.mkdir(parents=True, exist_ok=True)
-    results = {}
-    if store.exists():
-        for line in store.read_text().splitlines():
-            entry = json.loads(line)
-            results[entry["key"]] = entry["result"]
-    mutants = [mutant for path in sources(arguments.paths) for mutant in mutants_of(path)]
-    reasons = known_reasons()
-    survivors = lambda mutant: results.get(mutant.key) in ("survived", "no test")
-    if arguments.again:
-        todo = [mutant for mutant in mutants if survivors(mutant)]
-    else:
-        todo = [mutant for mutant in mutants if mutant.key not in results]
-    if arguments.seed is not None:
-        random.Random(arguments.seed).shuffle(todo)
-    if arguments.show:
-        todo = []
-
     end = time.monotonic() + arguments.seconds
-    with tempfile.TemporaryDirectory(prefix="mutants-") as scratch, store.open("a") as log:
-        build = Build(ROOT / arguments.build, pathlib.Path(scratch), arguments.longest)
-        if build.missing and todo:
-            print(f"{build.missing} test programs are not built and left out", file=sys.stderr)
-        original = {}
-        for number, mutant in enumerate(todo):
-            if time.monotonic() > end:
-                print(f"{len(todo) - number} mutants are left", file=sys.stderr)
-                break
-            if not mutant.path.endswith(".h") and mutant.path not in build.compiles:
-                continue
-            result = outcome(build, mutant, original)
-            results[mutant.key] = result
-            log.write(json.dumps({"key": mutant.key, "result": result, "mutant": mutant.shown()}) + "\n")
-            log.flush()
-    for mutant in mutants:
-        if survivors(mutant) and mutant.shown() not in reasons:
-            print(f"{results[mutant.key]}: {mutant.path}:{mutant.edit.line + 1}")
-            print(f"  - {mutant.edit.before.strip()}\n  + {mutant.edit.after.strip() or ';'}")
-    table(mutants, results, reasons)
+
+    WORK.mkdir(parents=True, exist_ok=True)
+    store = WORK / "results.jsonl"
+    lines = store.read_text().splitlines() if store.exists() else []
+    results = {entry["key"]: entry["result"] for entry in map(json.loads, lines)}
+    tree = read_tree()
+    mutants = numbered(all_mutants(tree))
+    prefixes = tuple(arguments.paths)
+    chosen = [number for number, mutant in mutants.items() if mutant.path.startswith(prefixes)]
+    if arguments.show:
+        show([mutants[number] for number in chosen], results)
+        return
+
+    programs = Programs(tree, mutants)
+    programs.build()
+    tests = find_tests(programs.programs, arguments.longest / 2)
+    reaching = collections.defaultdict(list)
+    for test in tests:
+        for number in test.reached:
+            reaching[number].append(test)
+    print(f"{len(mutants)} edits, {len(programs.refused)} of them do not compile, tests reach {len(reaching)}", flush=True)
+
+    chosen = [number for number in chosen if number in reaching]
+    random.Random(arguments.seed).shuffle(chosen)
+    known = [number for number in chosen if mutants[number].key in results]
+    if arguments.again:
+        todo = [number for number in known if results[mutants[number].key] == "survived"]
+    else:
+        todo = [number for number in chosen if mutants[number].key not in results]
+        if arguments.count:
+            todo = todo[: max(0, arguments.count - len(known))]
+
+    def attempt(number: int) -> None:
+        if time.monotonic() > end:
+            return
+        mutant = mutants[number]
+        result, by = outcome(number, mutant.path, reaching[number], arguments.longest)
+        results[mutant.key] = result
+        with store.open("a") as log:
+            log.write(json.dumps({"key": mutant.key, "result": result, "by": by}) + "\n")
+
+    with concurrent.futures.ThreadPoolExecutor(JOBS) as pool:
+        for _ in pool.map(attempt, todo):
+            pass
+    show([mutants[number] for number in chosen], results)
 
 
 if __name__ == "__main__":
