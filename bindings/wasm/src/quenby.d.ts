@@ -154,8 +154,8 @@ export interface Filter {
 export interface Shot {
   green_cdf: number[];
   orientation: number;
-  /** How many pixels the distribution is of. */
-  pixel_count: number;
+  /** How many pixels the distribution is of; shots of before this was told do without. */
+  pixel_count?: number;
   wall_clock: number;
   utc: number;
 }
