@@ -22,11 +22,15 @@ std::vector<LookTable> tablesByDirectLook(const Look& look) {
   for (std::size_t sample = 0; sample < tables.size(); ++sample) {
     squares.fill((static_cast<float>(sample) + 0.5f) / last);
     applyDirectLook(direct, {squares.data(), 0.0f, last}, greys.data(), pixels.data(), values);
-    for (std::size_t value = 0; value < values; ++value) {
-      const RGBA8Pixel& p = pixels[value];
-      tables[sample][0][value] = p.r;
-      tables[sample][1][value] = p.g;
-      tables[sample][2][value] = p.b;
+    // Pointers, for compilers that are asked for small code and call every operator otherwise.
+    std::uint8_t* const red = tables[sample][0].data();
+    std::uint8_t* const green = tables[sample][1].data();
+    std::uint8_t* const blue = tables[sample][2].data();
+    const RGBA8Pixel* pixel = pixels.data();
+    for (std::size_t value = 0; value < values; ++value, ++pixel) {
+      red[value] = pixel->r;
+      green[value] = pixel->g;
+      blue[value] = pixel->b;
     }
   }
   return tables;
