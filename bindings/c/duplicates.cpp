@@ -120,6 +120,7 @@ int32_t quenby_find_pairs(const quenby_shot* shots, size_t count, float threshol
     }
     sortPairs(found);
     std::vector<quenby_pair> given;
+    given.reserve(found.size());
     for (const photo::ShotPair& pair : found) given.push_back(pairOf(pair));
     *pairs = {givenArray<quenby_pair>(given), given.size()};
   });

@@ -16,7 +16,8 @@ constexpr Integer truncateTo(Float value) {
   using Limits = std::numeric_limits<Integer>;
   // The largest integer may not be a Float, one more always is: a power of two.
   constexpr Float lowest = static_cast<Float>(Limits::min());
-  constexpr Float beyondLargest = static_cast<Float>(Limits::max() / 2 + 1) * Float(2);
+  constexpr Integer halfOfIt = Limits::max() / 2 + 1;
+  constexpr Float beyondLargest = static_cast<Float>(halfOfIt) * Float(2);
   if (!(value > lowest)) return value <= lowest ? Limits::min() : Integer(0);
   if (value >= beyondLargest) return Limits::max();
   return static_cast<Integer>(value);

@@ -28,7 +28,7 @@ struct FilterConfig {
 
   friend bool operator==(const FilterConfig&, const FilterConfig&) = default;
 };
-static_assert(sizeof(FilterConfig) == 16 * 4);
+static_assert(sizeof(FilterConfig) == 64);
 
 /// What an application without wishes of its own passes: every field as above. There before any
 /// code runs.
