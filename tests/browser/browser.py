@@ -92,7 +92,8 @@ class Browser:
         self.command("Emulation.setEmulatedMedia", {"features": [scheme]})
 
     def command(self, name, parameters):
-        self._post("/goog/cdp/execute", {"cmd": name, "params": parameters})
+        """What the browser answers to a command of its own."""
+        return self._post("/goog/cdp/execute", {"cmd": name, "params": parameters})
 
     def choose(self, selector, *paths):
         """Gives files to an input of files."""
@@ -102,6 +103,10 @@ class Browser:
     def run(self, script, *arguments):
         """What a script returns."""
         return self._post("/execute/sync", {"script": script, "args": list(arguments)})
+
+    def run_async(self, script, *arguments):
+        """What a script hands to its last argument, a function."""
+        return self._post("/execute/async", {"script": script, "args": list(arguments)})
 
     def find(self, selector):
         return self._post("/element", {"using": "css selector", "value": selector})[ELEMENT]

@@ -7,6 +7,7 @@ import hashlib
 import json
 import os
 import pathlib
+import re
 import subprocess
 import sys
 import tempfile
@@ -100,25 +101,75 @@ def test_saves_the_commands_bytes(page, place):
     page.run("document.querySelector('#looks input[value=ZebraBW]').click()")
     page.click("#save")
     assert page.saved("large_ZebraBW.jpg") == command("look", "ZebraBW", photo, place=place)
-    # Another format loses what it cannot hold, and says so.
     page.run("document.querySelector('#file-panel').open = true; document.querySelector('#format').value = 'PNG'")
     page.click("#save")
     page.saved("large_ZebraBW.png")
+    page.wait_until("return document.querySelector('#status').textContent.startsWith('Saved large_ZebraBW.png')")
     page.run("document.querySelector('#format').value = ''")
 
 
 def test_fits_narrow_pages(page):
     page.emulate(360, 740)
     assert page.run("return document.documentElement.scrollWidth") <= 360
+    # The chosen look is in the row's sight, whatever the width was before.
+    page.run("[...document.querySelectorAll('#looks input')].at(-1).click()")
+    for size in ((1280, 900), (360, 740)):
+        page.emulate(*size)
+        page.wait_until("const row = document.querySelector('#looks').getBoundingClientRect();"
+                        "const look = document.querySelector('.look:has(input:checked)').getBoundingClientRect();"
+                        "return row.left <= look.left && look.right <= row.right + 1")
+    page.run("document.querySelector('#looks input[value=AE0]').click()")
+    # What is said in passing covers nothing that a finger moves.
+    page.click("#save")
+    page.wait_until("return document.querySelector('#status').textContent !== ''")
+    page.saved("large_AE0.jpg")
+    assert page.run("const box = (e) => e.getBoundingClientRect(), told = box(document.querySelector('#status'));"
+                    "return [...document.querySelectorAll('header button, aside button, aside input')].map(box)"
+                    ".every(b => b.bottom <= told.top || b.top >= told.bottom || b.width === 0)")
     page.emulate(1280, 900)
 
 
-def test_shows_one_to_one(page):
-    page.press("1")
-    page.wait_until("return document.querySelector('#seen').textContent === 'Full size, 100 %'")
-    assert page.run("return !document.querySelector('#detail-after').hidden")
-    page.press("0")
-    assert page.text("#seen").startswith("Preview, "), page.text("#seen")
+def test_shows_one_to_one(page, place):
+    """What is seen at 1:1 are the pixels that the command would save, here without coding them."""
+    out = place / "large.png"
+    page.run("document.querySelector('#looks input[value=AE0]').click()")
+    slider = page.run("return document.querySelector('#setting-slider').value")
+    subprocess.run([QUENBY, "enhance", PHOTOS / "large.jpg", "--slider", slider, "-o", out, "--quiet"], check=True)
+    for width in (1280, 1281):  # also where the photo's middle is between two pixels
+        page.emulate(width, 900)
+        page.press("1")
+        page.wait_until("return document.querySelector('#seen').textContent === 'Full size, 100 %'")
+        assert page.run("return !document.querySelector('#detail-after').hidden")
+        page.click("#compare")
+        page.run("document.querySelector('#status').textContent = ''")  # which lies over it
+        seen, others = page.run_async(
+            """const [saved, shown, done] = arguments;
+            const pixels = async (data) => {
+              const bytes = Uint8Array.from(atob(data), c => c.charCodeAt(0));
+              const picture = await createImageBitmap(new Blob([bytes]), { colorSpaceConversion: 'none' });
+              const context = new OffscreenCanvas(picture.width, picture.height).getContext('2d');
+              context.drawImage(picture, 0, 0);
+              return context.getImageData(0, 0, picture.width, picture.height);
+            };
+            const box = (id) => document.querySelector(id).getBoundingClientRect();
+            Promise.all([pixels(saved), pixels(shown)]).then(([file, screen]) => {
+              const stage = box('#stage'), photo = box('#after'), told = box('#seen');
+              let seen = 0, others = 0;
+              for (let y = Math.ceil(stage.top); y < Math.floor(told.top); ++y) {
+                for (let x = Math.ceil(stage.left); x < Math.floor(stage.right); ++x) {
+                  const from = 4 * ((y - Math.round(photo.top)) * file.width + x - Math.round(photo.left));
+                  const at = 4 * (y * screen.width + x);
+                  ++seen;
+                  for (let i = 0; i < 3; ++i) if (file.data[from + i] !== screen.data[at + i]) { ++others; break; }
+                }
+              }
+              done([seen, others]);
+            });""", base64.b64encode(out.read_bytes()).decode(), page.window._send("GET", "/screenshot"))
+        assert seen > 500_000 and others == 0, f"{others} of {seen} pixels are others at a width of {width}"
+        page.click("#compare")
+        page.press("0")
+        assert page.text("#seen").startswith("Preview, "), page.text("#seen")
+    page.emulate(1280, 900)
 
 
 def test_compares(page):
@@ -159,7 +210,10 @@ def test_faces(page, place):
 def test_measures(page):
     page.run("document.querySelector('#file-panel').open = true")
     page.click("#score")
-    page.wait_until("return document.querySelector('#scores').value.includes('after')")
+    told = page.wait_until("const told = document.querySelector('#scores').value; return told.includes('after') && told")
+    score = json.loads(subprocess.run([QUENBY, "score", "--json", PHOTOS / "twenty/faces.jpg"], capture_output=True,
+                                      check=True).stdout)["score"]
+    assert abs(float(re.search(r"[0-9.]+", told)[0]) - score) < 0.006, (told, score)
     blank = "const c = document.querySelector(arguments[0]); return c.getContext('2d').getImageData(0, 0, c.width, c.height).data.some(x => x !== 0)"
     page.wait_until(blank, "#histogram")
     page.wait_until(blank, "#curve")
@@ -171,6 +225,21 @@ def test_many(page, place):
     group = ", near-duplicate, group 1"
     page.wait_until("return [...document.querySelectorAll('.shot')].map(s => s.title).join() === arguments[0]",
                     f"large.jpg,faces.jpg,a.jpg{group},b.jpg{group},c.jpg")
+    # Each has its own edit, and its own undo.
+    page.click(".shot:nth-of-type(5)")
+    page.wait_until("return document.title.startsWith('c.jpg')")
+    page.shown()
+    assert page.run("return document.querySelector('#undo').disabled")
+    slide(page, 0.9)
+    page.press("[")
+    page.wait_until("return document.title.startsWith('b.jpg')")
+    page.shown()
+    assert page.run("return document.querySelector('#undo').disabled")
+    assert page.run("return document.querySelector('#setting-slider').value") == "0.4"
+    page.press("]")
+    page.wait_until("return document.title.startsWith('c.jpg')")
+    page.shown()
+    page.click("#undo")
     page.click("#save-all")
     archive = place / "photos.zip"
     archive.write_bytes(page.saved("photos.zip"))
@@ -242,6 +311,16 @@ def test_keyboard_alone(page, url, place):
     tab_to("save")
     page.press(browser.ENTER)
     assert page.saved("orientation6_AE0.jpg") == command("enhance", photo, "--slider", after, place=place)
+
+
+def test_names_what_is_lost(page):
+    """Another format has no place for everything."""
+    page.open_photos(PHOTOS / "twenty/phone.jpg")
+    page.run("document.querySelector('#format').value = 'PNG'")
+    page.click("#save")
+    page.wait_until("return document.querySelector('#status').textContent.includes('Not in it:')")
+    assert page.run("return document.querySelectorAll('#status li').length") > 0
+    assert page.saved("phone_AE0.png").startswith(b"\x89PNG")
 
 
 def test_touch(page):
@@ -354,16 +433,22 @@ def test_accessible(page):
         return
     script = pathlib.Path(os.environ["AXE"]).read_text()
     page.run(script + "\nwindow.axe = axe;")
-    for about in (False, True):
+    for about, dark in ((False, False), (False, True), (True, False)):
+        page.emulate(1280, 900, dark)
         if about:
             page.press("?")
-        found = page.window._post("/execute/async", {
-            "script": "const done = arguments[0]; axe.run().then(r => done(r.violations.map("
-                      "v => [v.impact, v.id, v.nodes.map(n => n.html.slice(0, 120))])), e => done(String(e)))",
-            "args": []})
+        found = page.run_async("const done = arguments[0]; axe.run().then(r => done(r.violations.map("
+                               "v => [v.impact, v.id, v.nodes.map(n => n.html.slice(0, 120))])), e => done(String(e)))")
         serious = [one for one in found if one[0] in ("serious", "critical")]
         assert not serious, json.dumps(serious, indent=1)
     page.run("document.querySelector('#about-box').close()")
+
+
+def test_installable(page):
+    told = page.command("Page.getInstallabilityErrors", {})["installabilityErrors"]
+    assert told == [], told
+    manifest = json.loads(page.command("Page.getAppManifest", {})["data"])
+    assert manifest["display"] == "standalone", manifest
 
 
 def test_offline(page, server, url):
@@ -422,7 +507,7 @@ def main(dist):
                 test_saves_the_commands_bytes(page, place)
                 screenshots(page)
                 test_fits_narrow_pages(page)
-                test_shows_one_to_one(page)
+                test_shows_one_to_one(page, place)
                 test_compares(page)
                 test_faces(page, place)
                 test_measures(page)
@@ -435,8 +520,10 @@ def main(dist):
                 test_selftest(page)
                 test_a_hundred_megapixels(page)
                 test_keyboard_alone(page, url, place)
+                test_names_what_is_lost(page)
                 assert page.complaints() == [], page.complaints()
                 test_without_vectors(url, place)
+                test_installable(page)
                 test_offline(page, server, url)
             strangers = {found for found in requests_of(url.rstrip("/"), log) if not found.startswith(url)}
             assert not strangers, strangers

@@ -21,10 +21,12 @@ export function makeLooks(chosen) {
     });
     return label;
   }));
+  // Another width is another row.
+  new ResizeObserver(() => markLook($("looks").querySelector("input:checked")?.value)).observe($("looks"));
 }
 
 export function markLook(name) {
-  for (const radio of document.querySelectorAll("#looks input")) {
+  for (const radio of $("looks").querySelectorAll("input")) {
     radio.checked = radio.value === name;
     if (radio.checked) intoView(radio.parentElement);
   }

@@ -71,7 +71,9 @@ export class Viewer extends EventTarget {
     const width = this.width * this.zoom;
     const height = this.height * this.zoom;
     // Smaller than the stage it stands in the middle, larger it has no gap.
-    const within = (at, size, room) => size <= room ? (room - size) / 2 : clamp(at, room - size, 0);
+    // On whole pixels of the screen, since others would be mixed of two of the photo's.
+    const whole = (at) => Math.round(at * this.ratio) / this.ratio;
+    const within = (at, size, room) => whole(size <= room ? (room - size) / 2 : clamp(at, room - size, 0));
     this.x = within(this.x, width, clientWidth);
     this.y = within(this.y, height, clientHeight);
     for (const canvas of [this.before, this.after]) {
