@@ -107,7 +107,9 @@ function(pelorin_library name)
   set(target pelorin_${name})
   set(smallest "")
   if(EMSCRIPTEN)
-    set(smallest -Oz)
+    # All that is linked is optimised as a whole, but for kernels and for libraries in C: their functions would
+    # count as such that nothing is thrown through, and our handlers of their errors throw.
+    set(smallest -Oz -flto)
     set(kernels ${arg_SOURCES})
     list(FILTER kernels INCLUDE REGEX "_simd\\.cpp$")
     list(FILTER arg_SOURCES EXCLUDE REGEX "_simd\\.cpp$")

@@ -2,32 +2,30 @@
 import { execFileSync } from "node:child_process";
 import { createHash } from "node:crypto";
 import { cp, mkdir, readdir, readFile, rm, writeFile } from "node:fs/promises";
-import { dirname, join, relative } from "node:path";
+import { basename, dirname, join, relative } from "node:path";
 import { fileURLToPath, pathToFileURL } from "node:url";
 
 const [packageFolder, licences, out] = process.argv.slice(2);
 const here = dirname(fileURLToPath(import.meta.url));
 
 await rm(out, { recursive: true, force: true });
-await mkdir(join(out, "quenby"), { recursive: true });
-const sources = join(here, "src");
-for (const name of await readdir(sources)) {
-  if (!name.endsWith(".js") || name === "sw.js") await cp(join(sources, name), join(out, name));
-}
+await cp(join(here, "src"), out, { recursive: true });
+await mkdir(join(out, "quenby"));
 for (const name of await readdir(packageFolder)) {
   if (/\.(js|wasm)$/.test(name)) await cp(join(packageFolder, name), join(out, "quenby", name));
 }
 
-// The page's parts in one file, and all without comments and long names; what the service worker is filled
-// with stays to be found.
+// The page in one file and its worker in another, and all without comments and long names; what the service
+// worker is filled with stays to be found.
 const minify = (...options) =>
-  execFileSync("esbuild", ["--minify", "--target=es2022", "--log-level=warning", ...options], { stdio: "inherit" });
-minify("--bundle", "--format=esm", "--external:./quenby/*", `--outfile=${join(out, "app.js")}`, join(sources, "app.js"));
-const written = [join(out, "style.css")];
-for (const name of await readdir(join(out, "quenby"))) {
-  if (name.endsWith(".js")) written.push(join(out, "quenby", name));
+  execFileSync("esbuild", ["--minify", "--target=es2022", "--log-level=warning", "--allow-overwrite",
+    `--outbase=${out}`, `--outdir=${out}`, ...options], { stdio: "inherit" });
+const whole = ["app.js", "quenby/worker.js"].map((name) => join(out, name));
+minify("--bundle", "--format=esm", "--external:node:fs/promises", ...whole);
+for (const path of await filesBelow(out)) {
+  if (path.endsWith(".js") && !whole.includes(path) && basename(path) !== "sw.js") await rm(path);
 }
-minify("--allow-overwrite", `--outbase=${out}`, `--outdir=${out}`, ...written);
+minify(join(out, "style.css"));
 
 const texts = [];
 for (const name of (await readdir(licences)).sort()) {

@@ -11,7 +11,6 @@ mkdir -p "$out/licences"
 cp "$here"/src/* "$here/README.md" "$out/"
 sed "s/@VERSION@/$version/" "$here/package.json" >"$out/package.json"
 for build in simd scalar; do
-  cp "$root/build/wasm/bindings/wasm/quenby-$build.mjs" "$out/quenby-$build.js"
   cp "$root/build/wasm/bindings/wasm/quenby-$build.wasm" "$out/"
 done
 cp "$root"/build/static/wasm/share/licences/* "$out/licences/"

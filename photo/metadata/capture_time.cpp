@@ -3,8 +3,8 @@
 #include <algorithm>
 #include <array>
 #include <chrono>
-#include <cstdio>
 #include <cstdlib>
+#include <string_view>
 
 #include "image_processing/core/number_text.h"
 #include "image_processing/core/parameter_strings.h"
@@ -40,23 +40,67 @@ std::string textOf(std::span<const std::uint8_t> bytes, const TiffDirectory& dir
   return text;
 }
 
+// Goes along a text as scanf does.
+class Reader {
+ public:
+  explicit Reader(std::string_view text) : left_(text) {}
+
+  bool isAtEnd() const { return left_.empty(); }
+  void skipSpace() {
+    left_.remove_prefix(std::min(left_.find_first_not_of(" \t\n\v\f\r"), left_.size()));
+  }
+  bool skip(char letter) {
+    if (!left_.starts_with(letter)) return false;
+    left_.remove_prefix(1);
+    return true;
+  }
+  // After white space, of at most so many letters, the first of which may be a sign.
+  std::optional<int> number(std::size_t letters) {
+    skipSpace();
+    const std::string_view field = left_.substr(0, letters);
+    const std::size_t start = field.starts_with('+') || field.starts_with('-') ? 1 : 0;
+    std::size_t end = start;
+    int value = 0;
+    for (; end < field.size() && field[end] >= '0' && field[end] <= '9'; ++end) {
+      value = 10 * value + (field[end] - '0');
+    }
+    if (end == start) return std::nullopt;
+    left_.remove_prefix(end);
+    return field.starts_with('-') ? -value : value;
+  }
+
+ private:
+  std::string_view left_;
+};
+
 // "+02:00" in seconds.
 std::optional<int> readOffset(const std::string& text) {
-  char sign = 0, end = 0;
-  int hours = 0, minutes = 0;
-  const int fields = std::sscanf(text.c_str(), "%c%2d:%2d%c", &sign, &hours, &minutes, &end);
-  const bool inRange = hours >= 0 && hours <= 14 && minutes >= 0 && minutes < 60;
-  if (fields != 3 || (sign != '+' && sign != '-') || !inRange) return std::nullopt;
-  return (sign == '-' ? -1 : 1) * (hours * 60 + minutes) * 60;
+  Reader reader(text);
+  const bool west = reader.skip('-');
+  if (!west && !reader.skip('+')) return std::nullopt;
+  const std::optional<int> hours = reader.number(2);
+  if (!hours || !reader.skip(':')) return std::nullopt;
+  const std::optional<int> minutes = reader.number(2);
+  if (!minutes || !reader.isAtEnd()) return std::nullopt;
+  if (*hours < 0 || *hours > 14 || *minutes < 0 || *minutes >= 60) return std::nullopt;
+  return (west ? -1 : 1) * (*hours * 60 + *minutes) * 60;
 }
 
 std::optional<CaptureTime> readTime(const std::string& text, const std::string& fraction,
                                     const std::string& offsetText) {
-  int year = 0, month = 0, day = 0, hour = 0, minute = 0, second = 0;
-  if (std::sscanf(text.c_str(), "%4d:%2d:%2d %2d:%2d:%2d", &year, &month, &day, &hour, &minute,
-                  &second) != 6) {
-    return std::nullopt;
+  Reader reader(text);
+  std::array<int, 6> fields{};  // "2024:05:01 12:30:45"
+  for (std::size_t i = 0; i < fields.size(); ++i) {
+    if (i == 3) {
+      reader.skipSpace();
+    } else if (i > 0 && !reader.skip(':')) {
+      return std::nullopt;
+    }
+    const std::optional<int> number = reader.number(i == 0 ? 4 : 2);
+    if (!number) return std::nullopt;
+    fields[i] = *number;
   }
+  const auto [year, month, day, hour, minute, second] = fields;
   const std::chrono::year_month_day date(std::chrono::year(year),
                                          std::chrono::month(static_cast<unsigned>(month)),
                                          std::chrono::day(static_cast<unsigned>(day)));

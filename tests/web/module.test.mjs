@@ -2,7 +2,7 @@
 //   QUENBY=... PHOTOS=... PACKAGE=... TABLE=... node --test module.test.mjs
 import assert from "node:assert/strict";
 import { execFileSync, spawnSync } from "node:child_process";
-import { mkdtempSync, readdirSync, readFileSync, rmSync } from "node:fs";
+import { mkdtempSync, readdirSync, readFileSync, rmSync, writeFileSync } from "node:fs";
 import { tmpdir } from "node:os";
 import { join } from "node:path";
 import { after, test } from "node:test";
@@ -160,6 +160,32 @@ test("what cannot be done is an error with a sentence, and the module lives on",
   }
 });
 
+test("of damaged files comes the command's result or its sentence", () => {
+  const { simd } = builds;
+  const path = join(scratch, "damaged.jpg");
+  const sentences = new Set();
+  for (const name of ["progressive", "profile2", "restarts", "faces"]) {
+    const whole = photo(`twenty/${name}.jpg`);
+    for (let step = 1; step < 12; ++step) {
+      const damaged = whole.slice();
+      damaged.fill(step * 23, Math.floor((step / 14) ** 2 * whole.length), Math.floor((step / 14) ** 2 * whole.length) + 3);
+      writeFileSync(path, damaged);
+      const out = join(scratch, "out.jpg");
+      const native = spawnSync(QUENBY, ["enhance", path, "--slider", "0.4", "-o", out, "--overwrite"], { encoding: "utf8" });
+      try {
+        const { bytes } = simd.filterFile(damaged, "AE0", { slider: 0.4 });
+        assert.equal(native.status, 0, native.stderr);
+        assert.ok(Buffer.compare(bytes, readFileSync(out)) === 0, `${name}, ${step}`);
+      } catch (error) {
+        if (!(error instanceof QuenbyError)) throw error;
+        sentences.add(error.message);
+        assert.ok(native.stderr.includes(error.message), `${error.message}: ${native.stderr}`);
+      }
+    }
+  }
+  assert.ok(sentences.size > 2, [...sentences].join());
+});
+
 test("too little memory is an error, and the next photo works", () => {
   const { simd } = builds;
   // Nearly all that 32 bits address, which costs nothing until it is written.
@@ -174,7 +200,7 @@ test("too little memory is an error, and the next photo works", () => {
   const message = "not enough memory";
   assert.throws(() => simd.session(picture), { kind: "out-of-memory", message });
   assert.throws(() => simd.filterFile(photo("large.jpg"), "AE0", { slider: 1 }), { kind: "out-of-memory", message });
-  for (const address of taken) simd.module._free(address);
+  for (const address of taken) simd.module.free(address);
   simd.session(picture).close();
   assert.equal(simd.open(photo("twenty/plain.jpg")).width, 203);
 });
@@ -208,7 +234,7 @@ test("what takes too long is given up, and the module lives on", () => {
 test("a package is what npm packs", () => {
   const packed = spawnSync("npm", ["pack", "--dry-run", "--json"], { cwd: PACKAGE, encoding: "utf8" });
   const files = JSON.parse(packed.stdout)[0].files.map(({ path }) => path);
-  for (const name of ["quenby.js", "quenby.d.ts", "quenby-simd.wasm", "quenby-scalar.js", "README.md",
+  for (const name of ["quenby.js", "quenby.d.ts", "quenby-simd.wasm", "quenby-scalar.wasm", "README.md",
     "licences/libjpeg-turbo.txt"]) {
     assert.ok(files.includes(name), name);
   }

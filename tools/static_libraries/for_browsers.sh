@@ -38,6 +38,7 @@ types='Text|TextDescription|ColorantOrder|U16Fixed16Array|DateTime|ProfileSequen
 types+='|UcrBg|CrdInfo|Screening|ViewingConditions|ProfileSequenceId|Dict|cicp|Vcgt'
 edit lcms2/src/cmstypes.c 's/^#define WRITE_FN(x) .*/#define WRITE_FN(x) NULL/' \
   's/TYPE_HANDLER(cmsSig\('"${types//|/\\|}"'\)Type, *[A-Za-z0-9_]*)/{ (cmsTagTypeSignature) 0, NULL, NULL, NULL, NULL, NULL, 0 }/'
+edit lcms2/src/cmsio0.c 's/if (Icc *->IsWrite) {/if (0) {/'
 # From bytes of four inks to bytes of red, green, blue and one more; no intents but those of the standard.
 rows='Unroll4Bytes}|Unroll4BytesReverse}|Pack3BytesAndSkip1}|UnrollLabFloatToFloat}|PackLabFloatFromFloat}'
 edit lcms2/src/cmspack.c '/^static const cmsFormatters.*\[\] = {$/,/^};/{/^static\|^};/!{/'"${rows//|/\\|}"'/!d}}'

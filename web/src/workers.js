@@ -1,6 +1,7 @@
 // The worker that has the photo shown, and those that help with many.
 import { QuenbyWorker } from "./quenby/client.js";
 
+const script = new URL("./quenby/worker.js", import.meta.url);
 let main = null;
 let helpers = [];
 let viewer, broken, restarted;
@@ -17,7 +18,7 @@ export function start(shown, events) {
 
 // A canvas goes to a worker for good: another worker needs others.
 async function startMain() {
-  main = new QuenbyWorker();
+  main = new QuenbyWorker(script);
   const canvases = {};
   for (const name of ["before", "after", "detailBefore", "detailAfter"]) {
     let canvas = viewer[name];
@@ -59,6 +60,6 @@ export function helper() {
   helpers = helpers.filter((one) => !one.error);
   const idle = helpers.find((one) => one.current === null);
   if (idle) return idle;
-  if (helpers.length < most) helpers.push(new QuenbyWorker());
+  if (helpers.length < most) helpers.push(new QuenbyWorker(script));
   return helpers.reduce((best, one) => one.waiting.length < best.waiting.length ? one : best, helpers.at(-1));
 }

@@ -13,32 +13,35 @@ export const kinds = Object.freeze([
 
 const isNode = typeof process !== "undefined" && process.versions?.node !== undefined;
 
+// The exports of a module, whose C++ has been made ready.
 async function moduleOf(build, wasm) {
-  const simd = build === "simd";
-  if (!simd && build !== "scalar") throw new TypeError(`there is no build "${build}"`);
-  const { default: make } = simd ? await import("./quenby-simd.js") : await import("./quenby-scalar.js");
-  const url = simd
+  if (build !== "simd" && build !== "scalar") throw new TypeError(`there is no build "${build}"`);
+  const url = build === "simd" // each by its whole name, so that bundlers find it
     ? new URL("./quenby-simd.wasm", import.meta.url)
     : new URL("./quenby-scalar.wasm", import.meta.url);
   if (wasm === undefined && isNode) {
     wasm = await (await import(/* webpackIgnore: true */ "node:fs/promises")).readFile(url);
   }
-  // Errors of instantiation would be lost in the loader otherwise.
-  return new Promise((resolve, reject) => {
-    const instantiate = async (imports) => {
-      if (wasm instanceof WebAssembly.Module) {
-        return { instance: await WebAssembly.instantiate(wasm, imports), module: wasm };
-      }
-      if (wasm !== undefined) return WebAssembly.instantiate(wasm, imports);
-      return WebAssembly.instantiateStreaming(fetch(url), imports);
-    };
-    make({
-      instantiateWasm: (imports, done) => {
-        instantiate(imports).then(({ instance, module }) => done(instance, module), reject);
-        return {};
+  let made;
+  // All that it asks of its host.
+  const imports = {
+    env: { emscripten_notify_memory_growth() {} },
+    wasi_snapshot_preview1: {
+      clock_time_get(_clock, _precision, place) {
+        new DataView(made.memory.buffer).setBigUint64(place >>> 0, BigInt(Math.round(performance.now() * 1e6)), true);
+        return 0;
       },
-    }).then(resolve, reject);
-  });
+      proc_exit() {
+        throw new Error("the engine cannot go on");
+      },
+    },
+  };
+  const done = wasm === undefined
+    ? await WebAssembly.instantiateStreaming(fetch(url), imports)
+    : await WebAssembly.instantiate(wasm, imports);
+  made = (done.instance ?? done).exports; // an instance alone where a compiled module was given
+  made._initialize();
+  return made;
 }
 
 /** Loads the module: once a worker or program. */
@@ -80,7 +83,7 @@ class Scope {
     return address;
   }
   free() {
-    for (const address of this.taken) this.quenby.module._free(address);
+    for (const address of this.taken) this.quenby.module.free(address);
   }
 }
 
@@ -135,12 +138,14 @@ export class Quenby {
   constructor(module, build) {
     this.module = module;
     this.build = build;
-    this.version = this.textAt(module._quenby_version());
+    this.version = this.textAt(module.quenby_version());
   }
 
   /** All of the module's memory as it is now; another array after it has grown. */
   get bytes() {
-    return this.module.HEAPU8;
+    const { buffer } = this.module.memory;
+    if (this.view?.buffer !== buffer) this.view = new Uint8Array(buffer);
+    return this.view;
   }
 
   textAt(address) {
@@ -149,7 +154,7 @@ export class Quenby {
 
   // Addresses above 2 GiB come out of the module as negative numbers.
   malloc(size) {
-    return this.module._malloc(size) >>> 0;
+    return this.module.malloc(size) >>> 0;
   }
 
   scoped(body) {
@@ -165,7 +170,7 @@ export class Quenby {
   call(name, ...given) {
     return this.scoped((scope) => {
       const error = scope.struct(layout.QuenbyError);
-      if (this.module[`_${name}`](...given, error) === 0) return;
+      if (this.module[name](...given, error) === 0) return;
       const { kind, message } = layout.QuenbyError.read(this.bytes, error);
       throw new QuenbyError(kinds[kind] ?? "failed", message);
     });
@@ -203,7 +208,7 @@ export class Quenby {
       if (error.kind !== "cancelled") throw error;
       throw new QuenbyError(error.kind, `was given up after ${timeout} ms`);
     } finally {
-      this.module._quenby_cancel_free(cancel);
+      this.module.quenby_cancel_free(cancel);
     }
   }
 
@@ -274,14 +279,14 @@ export class Quenby {
   // The bytes of a quenby_file, which is freed.
   takeFile(file) {
     try {
-      const at = this.module._quenby_file_data(file) >>> 0;
-      const losses = Array.from({ length: this.module._quenby_file_loss_count(file) }, (_, i) => {
+      const at = this.module.quenby_file_data(file) >>> 0;
+      const losses = Array.from({ length: this.module.quenby_file_loss_count(file) }, (_, i) => {
         const { what, why } = this.receiveStruct(layout.Loss, "quenby_file_loss", file, i);
         return { what: this.textAt(what), why: this.textAt(why) };
       });
-      return { bytes: this.bytes.slice(at, at + (this.module._quenby_file_size(file) >>> 0)), losses };
+      return { bytes: this.bytes.slice(at, at + (this.module.quenby_file_size(file) >>> 0)), losses };
     } finally {
-      this.module._quenby_file_free(file);
+      this.module.quenby_file_free(file);
     }
   }
 
@@ -316,13 +321,13 @@ export class Quenby {
         const view = new DataView(this.bytes.buffer);
         return shots.map((_, i) => Number(view.getBigUint64(firstOf + 8 * i, true)));
       } finally {
-        this.module._quenby_pairs_free(list);
+        this.module.quenby_pairs_free(list);
       }
     });
   }
 
   selftest() {
-    const table = this.textAt(this.module._quenby_wasm_selftest());
+    const table = this.textAt(this.module.quenby_wasm_selftest());
     if (table === "") throw new QuenbyError("out-of-memory", "not enough memory");
     return `quenby ${this.version}\n${table}`;
   }
@@ -340,7 +345,7 @@ class Held {
     return this.held;
   }
   close() {
-    if (this.held !== 0) this.quenby.module[`_${this.free}`](this.held);
+    if (this.held !== 0) this.quenby.module[this.free](this.held);
     this.held = 0;
   }
 }
@@ -352,7 +357,7 @@ export class Photo extends Held {
     const { rgba, width, height } = quenby.receiveStruct(layout.Pixels, "quenby_photo_pixels", handle);
     Object.assign(this, { address: rgba, width, height });
     this.notices = [];
-    for (let i = 0, at; (at = quenby.module._quenby_photo_notice(handle, i)) !== 0; ++i) {
+    for (let i = 0, at; (at = quenby.module.quenby_photo_notice(handle, i)) !== 0; ++i) {
       this.notices.push(quenby.textAt(at));
     }
     this.faces = quenby.scoped((scope) => {
@@ -430,7 +435,7 @@ export class Session extends Held {
   }
 
   close() {
-    if (this.held !== 0 && this.output !== 0) this.quenby.module._free(this.output);
+    if (this.held !== 0 && this.output !== 0) this.quenby.module.free(this.output);
     this.output = 0;
     super.close();
   }

@@ -45,6 +45,26 @@ TEST(CaptureTime, IsInUtcWhenTheOffsetIsStated) {
   EXPECT_FALSE(timeOf("2024:05:01 12:30:45", "", "CEST")->hasZone);
 }
 
+TEST(CaptureTime, MayHaveSpacesAndSignsInPlaceOfZeros) {
+  for (const char* text : {"2024: 5: 1 12:30: 5", " 2024:05:01  12:30:05", "2024:+5:+1 12:30:+5",
+                           "2024:05:0112:30:05", "2024:05:01 12:30:05Z"}) {
+    const auto time = timeOf(text);
+    ASSERT_TRUE(time) << text;
+    EXPECT_EQ(time->text, "2024-05-01T12:30:05") << text;
+  }
+  for (const char* text :
+       {"2024 :05:01 12:30:05", "2024:05:01T12:30:05", "2024:-5:01 12:30:05", "2024:05:01 12:30",
+        "2024:05:01 12:30:", "20245:05:01 12:30:05", "2024:+:01 12:30:05"}) {
+    EXPECT_FALSE(timeOf(text)) << text;
+  }
+  for (const char* offset : {"+2:00", "+ 2: 0", "+02:0"}) {
+    EXPECT_EQ(timeOf("2024:05:01 12:30:45", "", offset)->zoneSeconds, 7200) << offset;
+  }
+  for (const char* offset : {"02:00", "+02", "+02:", "+15:00", "+02:60", "+-2:00", "Z"}) {
+    EXPECT_FALSE(timeOf("2024:05:01 12:30:45", "", offset)->hasZone) << offset;
+  }
+}
+
 TEST(CaptureTime, IsAbsentWhenTheTextIsNoDate) {
   for (const char* text : {"    :  :     :  :  ", "0000:00:00 00:00:00", "2023:02:29 10:00:00",
                            "2023:13:01 10:00:00", "2023:01:01 24:00:00", "yesterday, at noon"}) {
