@@ -89,7 +89,8 @@ class Browser:
         self.command("Emulation.setDeviceMetricsOverride",
                       {"width": width, "height": height, "deviceScaleFactor": 1, "mobile": False})
         scheme = {"name": "prefers-color-scheme", "value": "dark" if dark else "light"}
-        self.command("Emulation.setEmulatedMedia", {"features": [scheme]})
+        still = {"name": "prefers-reduced-motion", "value": "reduce"}  # colours are there at once
+        self.command("Emulation.setEmulatedMedia", {"features": [scheme, still]})
 
     def command(self, name, parameters):
         """What the browser answers to a command of its own."""
