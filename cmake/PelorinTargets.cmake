@@ -109,7 +109,8 @@ function(pelorin_library name)
   if(EMSCRIPTEN)
     # All that is linked is optimised as a whole, but for kernels and for libraries in C: their functions would
     # count as such that nothing is thrown through, and our handlers of their errors throw.
-    set(smallest -Oz -flto)
+    # Emscripten leaves inlining to what comes after the compiler when all is to be small; before it saves more.
+    set(smallest -Oz -flto -finline-functions)
     set(kernels ${arg_SOURCES})
     list(FILTER kernels INCLUDE REGEX "_simd\\.cpp$")
     list(FILTER arg_SOURCES EXCLUDE REGEX "_simd\\.cpp$")

@@ -1,6 +1,5 @@
 #include "image_processing/core/stages.h"
 
-#include <algorithm>
 #include <vector>
 
 namespace pelorin::image_processing {
@@ -23,16 +22,15 @@ bool runStages(std::int64_t bands, std::initializer_list<Stage> stages, Workers*
   for (std::int64_t step = 0; bands > 0 && step < bands + last * lag; ++step) {
     if (stop && stop()) return false;
     now.clear();
-    std::int64_t band = step;
-    for (const Stage& stage : stages) {
-      if (band >= 0 && band < bands) {
-        for (std::size_t i = 0; i < stage.tasks; ++i) now.push_back({&stage, band, i});
+    // At once, those that cannot be shared begin first; else in their order.
+    for (const bool alone : {true, false}) {
+      std::int64_t band = step;
+      for (const Stage& stage : stages) {
+        if (band >= 0 && band < bands && (lag > 0 && stage.tasks == 1) == alone) {
+          for (std::size_t i = 0; i < stage.tasks; ++i) now.push_back({&stage, band, i});
+        }
+        band -= lag;
       }
-      band -= lag;
-    }
-    if (lag > 0) {
-      std::stable_partition(now.begin(), now.end(),
-                            [](const StageTask& task) { return task.stage->tasks == 1; });
     }
     runTasks(lag > 0 ? workers : nullptr, now.size(),
              [&](std::size_t i) { now[i].stage->work(now[i].band, now[i].task); });

@@ -39,8 +39,9 @@ std::vector<DupeGroup> groupWholly(std::size_t photoCount, const std::vector<Sho
   for (std::vector<std::size_t>& photos : partners) std::sort(photos.begin(), photos.end());
   std::vector<const ShotPair*> byScore;
   for (const ShotPair& pair : pairs) byScore.push_back(&pair);
-  std::stable_sort(byScore.begin(), byScore.end(),
-                   [](const ShotPair* a, const ShotPair* b) { return a->score > b->score; });
+  std::sort(byScore.begin(), byScore.end(), [](const ShotPair* a, const ShotPair* b) {
+    return a->score != b->score ? a->score > b->score : a < b;
+  });
 
   std::vector<std::size_t> groupOf(photoCount);
   std::iota(groupOf.begin(), groupOf.end(), std::size_t{0});

@@ -45,8 +45,8 @@ std::uint64_t sizeOf(const std::vector<Entry>& entries, bool withPointer) {
 
 // Values stand behind their directory, whose tags go up.
 void putDirectory(std::vector<std::uint8_t>& tiff, std::vector<Entry> entries) {
-  std::stable_sort(entries.begin(), entries.end(),
-                   [](const Entry& a, const Entry& b) { return a.tag < b.tag; });
+  std::sort(entries.begin(), entries.end(),
+            [](const Entry& a, const Entry& b) { return a.tag < b.tag; });
   std::uint64_t place = tiff.size() + 2 + 12 * entries.size() + 4;
   put(tiff, entries.size(), 2);
   for (const Entry& entry : entries) {

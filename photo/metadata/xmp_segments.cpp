@@ -150,20 +150,22 @@ class PacketOfSegments {
       extension_.emplace();
       nameExtension(std::string(nameSize, '0'));  // takes its place from the start
     }
-    std::vector<std::pair<std::size_t, XmpProperty>> largest;
-    for (const XmpProperty& property : packet_.properties()) {
-      const std::size_t size = property.size();
+    const std::vector<XmpProperty> properties = packet_.properties();
+    std::vector<std::pair<std::size_t, std::size_t>> largest;  // sizes and places
+    for (std::size_t i = 0; i < properties.size(); ++i) {
+      const std::size_t size = properties[i].size();
       // The name of the extension takes less, and must stay.
-      if (size > 100) largest.emplace_back(size, property);
+      if (size > 100) largest.emplace_back(size, i);
     }
-    std::stable_sort(largest.begin(), largest.end(),
-                     [](const auto& a, const auto& b) { return a.first > b.first; });
+    std::sort(largest.begin(), largest.end(), [](const auto& a, const auto& b) {
+      return a.first != b.first ? a.first > b.first : a.second < b.second;
+    });
     std::size_t moved = 0;
-    for (const auto& [size, property] : largest) {
+    for (const auto& [size, place] : largest) {
       if (moved >= excess || mayMove_ == 0) break;
       moved += size;
       --mayMove_;
-      extension_->take(property);
+      extension_->take(properties[place]);
     }
     if (moved == 0) throw XmpError("too large for its segment");
   }

@@ -33,8 +33,10 @@ FaceBlendRows::FaceBlendRows(const ImageMetadata& metadata, std::uint32_t width,
   }
   starts_.resize(regions_.size());
   std::iota(starts_.begin(), starts_.end(), std::uint32_t{0});
-  std::stable_sort(starts_.begin(), starts_.end(), [&](std::uint32_t a, std::uint32_t b) {
-    return regions_[a].region.rows->first < regions_[b].region.rows->first;
+  std::sort(starts_.begin(), starts_.end(), [&](std::uint32_t a, std::uint32_t b) {
+    const std::int64_t first = regions_[a].region.rows->first,
+                       other = regions_[b].region.rows->first;
+    return first != other ? first < other : a < b;
   });
 }
 
