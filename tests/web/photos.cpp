@@ -77,7 +77,10 @@ int main(int, char** argv) {
   for (const double version : {2.1, 4.2}) {
     JpegRecipe printed = recipe(JCS_CMYK, JCS_YCCK);
     printed.profile = profileOfSwappedInks(version);
-    write("twenty/profile" + std::to_string(static_cast<int>(version)) + ".jpg", makeJpeg(printed));
+    const std::string name = "twenty/profile" + std::to_string(static_cast<int>(version));
+    write(name + ".jpg", makeJpeg(printed));
+    printed.profile = profileOfSwappedInks(version, 0.2);
+    write(name + "_pale_black.jpg", makeJpeg(printed));
   }
   const auto portrait = photoLikePicture(640, 480, 8);
   write("twenty/faces.jpg", jpegOf(portrait, {taken(1), xmpSegment(xmpPacket(faces))}));

@@ -100,8 +100,8 @@ if [ "$name" = wasm ]; then
   jpeg=(-DWITH_ARITH_ENC=OFF -DCMAKE_C_FLAGS_RELEASE=-DNDEBUG
     -DCMAKE_PROJECT_libjpeg-turbo_INCLUDE="$here/jpeg_for_browsers.cmake")
   png=(-DDFA_XTRA="$here/png_for_browsers.dfa")
-  # Tables are computed, and profiles have no numbers of 16 bits with a point.
-  CFLAGS+=" -DDYNAMIC_CRC_TABLE -DCMS_NO_HALF_SUPPORT"
+  # Tables are computed, nothing is gzip's, and profiles have no numbers of 16 bits with a point.
+  CFLAGS+=" -DDYNAMIC_CRC_TABLE -DBUILDFIXED -DNO_GZIP -DCMS_NO_HALF_SUPPORT"
 fi
 # All at once: configuring, which is half of it, takes one core.
 together=()
