@@ -234,7 +234,8 @@ class PngRowWriter : public RowWriter {
                        "a PNG file cannot be " + std::to_string(size.width) + " x " +
                            std::to_string(size.height) + " pixels");
     }
-    file_.reserve(std::min(std::uint64_t{size.width} * size.height, mostReserved));
+    file_.reserve(
+        static_cast<std::size_t>(std::min(std::uint64_t{size.width} * size.height, mostReserved)));
     png_ = png_create_write_struct(PNG_LIBPNG_VER_STRING, &errors_, PngErrors::fail,
                                    PngErrors::ignore);
     if (png_ != nullptr) info_ = png_create_info_struct(png_);

@@ -201,6 +201,26 @@ def test_faces(page, place):
     assert abs(sides[0] - 31) < 1e-6, sides
     face = "0.31000000000000005,0.2,0.51,0.5"
     assert moved == command("enhance", photo, "--slider", slider, "--faces", "none", "--face", face, place=place)
+
+    def dragged(selector, *places):
+        """The sides of the box after its part was dragged, and that the saved file has them."""
+        page.drag(selector, *places)
+        page.click("#save")
+        saved = page.saved("faces_AE0.jpg")
+        left, top, width, height = (side / 100 for side in page.run(
+            "const s = document.querySelector('.face').style;"
+            "return [s.left, s.top, s.width, s.height].map(parseFloat)"))
+        face = f"{left},{top},{left + width},{top + height}"
+        assert saved == command("enhance", photo, "--slider", slider, "--faces", "none", "--face", face, place=place)
+        return left, top, width, height
+
+    before = [side / 100 for side in sides]
+    moved = dragged(".face", (0.5, 0.5), (0.7, 0.6), (0.9, 0.8))
+    assert moved[0] > before[0] + 0.05 and moved[1] > before[1] + 0.05, (before, moved)
+    assert abs(moved[2] - before[2]) < 1e-4 and abs(moved[3] - before[3]) < 1e-4, (before, moved)
+    sized = dragged(".face i", (0.5, 0.5), (-1.5, -1.5))
+    assert sized[:2] == moved[:2] and sized[2] < moved[2] and sized[3] < moved[3], (moved, sized)
+
     page.click("#add-face")
     assert page.text("#face-count") == "2"
     page.press("\ue017")
