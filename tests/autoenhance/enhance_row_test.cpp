@@ -54,6 +54,28 @@ void expectTheDefinition(const TonePass& pass, const std::vector<RGBA8Pixel>& in
   }
 }
 
+TEST(TonePass, IsOrdinaryOnlyWhenAllItsNumbersAre) {
+  const float infinity = std::numeric_limits<float>::infinity();
+  const auto isOrdinary = [](std::size_t samples, float scale, float vibrance, float ltmBlend,
+                             float detailGain) {
+    return TonePass(wavyCurve(samples), scale, vibrance, ltmBlend, detailGain).ordinary;
+  };
+  EXPECT_TRUE(isOrdinary(51, 100.0f, 1.5f, 0.6f, 0.5f));
+  EXPECT_TRUE(isOrdinary(63, 100.0f, 0.0f, -3.0f, -2.0f));
+  EXPECT_FALSE(isOrdinary(64, 100.0f, 1.5f, 0.6f, 0.5f));
+  EXPECT_FALSE(isOrdinary(51, 99.0f, 1.5f, 0.6f, 0.5f));
+  for (const float vibrance : {-0.5f, 1e6f, infinity, std::nanf("")}) {
+    EXPECT_FALSE(isOrdinary(51, 100.0f, vibrance, 0.6f, 0.5f)) << vibrance;
+  }
+  for (const float odd : {1e6f, -1e6f, infinity, std::nanf("")}) {
+    EXPECT_FALSE(isOrdinary(51, 100.0f, 1.5f, odd, 0.5f)) << odd;
+    EXPECT_FALSE(isOrdinary(51, 100.0f, 1.5f, 0.6f, odd)) << odd;
+    std::vector<float> curve = wavyCurve(51);
+    curve[7] = odd;
+    EXPECT_FALSE(TonePass(curve, 100.0f, 1.5f, 0.6f, 0.5f).ordinary) << odd;
+  }
+}
+
 template <typename Mask>
 class EnhanceRow : public testing::Test {};
 TYPED_TEST_SUITE(EnhanceRow, test_support::MaskTypes);

@@ -86,6 +86,19 @@ TEST(RunStages, GivesUpBetweenBands) {
   }
 }
 
+TEST(RunStages, AsksWhetherToGiveUpOnceAStepAndNotWhenAllIsDone) {
+  photo::ThreadWorkers workers(2);
+  const Stage stage = {1, [](std::int64_t, std::size_t) {}};
+  for (const std::int64_t bands : {0, 1, 7}) {
+    for (Workers* const some : {static_cast<Workers*>(nullptr), static_cast<Workers*>(&workers)}) {
+      int asked = 0;
+      EXPECT_TRUE(runStages(bands, {stage, stage, stage}, some, [&] { return ++asked < 0; }));
+      // The last stages have the last bands later.
+      EXPECT_EQ(asked, bands == 0 ? 0 : bands + bandsUnderWay(3, some) - 1);
+    }
+  }
+}
+
 TEST(RunStages, LetsErrorsThrough) {
   photo::ThreadWorkers workers(3);
   for (Workers* const some : {static_cast<Workers*>(nullptr), static_cast<Workers*>(&workers)}) {

@@ -51,6 +51,11 @@ TEST(SliderMapping, TakesTheHighRampAtThreeTenths) {
   EXPECT_EQ(config.vibrance, 1.3f);
   EXPECT_EQ(config.detailGain, config.detailGainLow);
   EXPECT_EQ(config.ltmBlend, config.ltmBlendLow);
+  // The low ramp ends at the same numbers, but asks for none of the high ones.
+  FilterConfig endless = defaultFilterConfigValue;
+  endless.detailGainHigh = std::numeric_limits<float>::infinity();
+  updateFilterConfigForSliderValue(0.3f, &endless);
+  EXPECT_TRUE(std::isnan(endless.detailGain));
 }
 
 TEST(SliderMapping, ReachesTheHighValuesAtOne) {

@@ -21,6 +21,18 @@ TEST(BuildToneCurve, IsTheIdentityAtSliderZeroAndStaysItThroughTheMassage) {
   for (int i = 0; i < 51; ++i) EXPECT_NEAR(curve[i], i / 50.0f, 2e-6f) << i;
 }
 
+TEST(BuildToneCurve, LiftsDarkFacesToTheirTarget) {
+  ImageStatistics statistics;
+  for (int i = 0; i < 51; ++i) statistics.cdf.push_back(static_cast<float>(i) / 50.0f);
+  FilterConfig config = defaultFilterConfigValue;
+  config.faceTarget = 0.15f;
+  EXPECT_NEAR(buildToneCurve(statistics, config)[2], 0.04f, 1e-5f);
+  statistics.faceMedianBin = 2;
+  EXPECT_NEAR(buildToneCurve(statistics, config)[2], 0.15f, 0.02f);
+  config.faceTarget = 0.0f;
+  EXPECT_NEAR(buildToneCurve(statistics, config)[2], 0.04f, 1e-5f);
+}
+
 TEST(BuildToneCurve, NeverDecreasesAndRunsFromZeroToOne) {
   for (int seed = 0; seed < 4; ++seed) {
     ImageStatistics statistics;

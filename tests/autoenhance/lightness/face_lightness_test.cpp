@@ -73,5 +73,13 @@ TEST(FaceLightness, CountsBoxesThatTouchOrReachOut) {
   }
 }
 
+TEST(FaceLightness, CountsManyBoxesOfOneFace) {
+  const auto photo = photoLikePicture(20, 15, 9);
+  ImageMetadata metadata = withFaces({{2, 18, 9, 1}});
+  metadata.faces.resize(50, metadata.faces.front());
+  metadata.faces.push_back(std::make_shared<BoundingBox>(BoundingBox{0, 19, 14, 0}));
+  EXPECT_EQ(medianByRows(photo, metadata, 2000), medianByPixels(photo, metadata, 2000));
+}
+
 }  // namespace
 }  // namespace pelorin::image_processing

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "image_processing/autoenhance/colour/lab.h"
+#include "image_processing/autoenhance/photo_analysis.h"
 #include "tests/support/faces.h"
 #include "tests/support/pictures.h"
 
@@ -24,6 +25,7 @@ ImageStatistics statisticsOf(const Image<RGBA8Pixel>& image, const ImageMetadata
 }
 
 TEST(ImageStatistics, HaveNoFaceMedianWithoutFacePixels) {
+  EXPECT_EQ(ImageStatistics().faceMedianBin, -1);
   const auto photo = photoLikePicture(40, 30, 1);
   EXPECT_EQ(statisticsOf(photo).faceMedianBin, -1);
   EXPECT_EQ(statisticsOf(photo, withFaces({{100, 120, 90, 80}})).faceMedianBin, -1);  // outside
@@ -34,6 +36,30 @@ TEST(ImageStatistics, HaveNoFaceMedianWithoutFacePixels) {
   EXPECT_EQ(
       statisticsOf(flatPicture(40, 30, {0, 0, 0, 255}), withFaces({{7, 7, 9, 9}})).faceMedianBin,
       1);
+}
+
+TEST(ImageStatistics, AreGivenUpBetweenTheBandsOfEveryPart) {
+  struct OneByOne : Workers {
+    std::size_t count() const override { return 3; }
+    void run(std::size_t tasks, const Task& task) override {
+      for (std::size_t i = 0; i < tasks; ++i) task(i);
+    }
+  } workers;
+  const auto photo = photoLikePicture(8, 50, 1);
+  const ImageMetadata none;
+  int asked = 0, last = -1;
+  const auto analysed = [&] {
+    asked = 0;
+    return analysePhoto({8, 50, none}, photo.data.get(), &workers, 10,
+                        [&] { return ++asked == last; });
+  };
+  ASSERT_TRUE(analysed());
+  EXPECT_EQ(analysed()->cdf, statisticsOf(photo).cdf);
+  EXPECT_EQ(asked, 6);  // 16 rows and twice 17
+  for (last = 1; last <= 6; ++last) {
+    EXPECT_FALSE(analysed());
+    EXPECT_EQ(asked, last);
+  }
 }
 
 TEST(ImageStatistics, OfAnAllBlackImageFillTheFirstBin) {
