@@ -4,8 +4,10 @@
 #include <gtest/gtest.h>
 
 #include <map>
+#include <optional>
 #include <set>
 #include <string>
+#include <tuple>
 
 #include "image_processing/core/parameter_strings.h"
 #include "image_processing/filters/default_filter_factory.h"
@@ -49,6 +51,25 @@ TEST(FilterParameters, AreTheKeysThatTheFiltersRead) {
        {"ZebraBW", "SummerRGB", "SpringRGB", "FallRGB", "VintageRGB", "WinterRGB"}) {
     EXPECT_EQ(keys[name], look);
   }
+}
+
+TEST(FilterParameters, HaveTheirRangesAndStandards) {
+  const auto valuesOf = [](const std::string& filter, const std::string& key) {
+    const FilterParameters parameters = filters().at(filter)->parameters();
+    const FilterParameter& row = *parameters.find(key);
+    return std::tuple(row.lowest, row.highest, row.standard);
+  };
+  const auto unit = [](float standard) { return std::tuple(0.0f, 1.0f, std::optional(standard)); };
+  for (const char* name : {"AE0", "AE08bit"}) {
+    EXPECT_EQ(valuesOf(name, "slider"), unit(0.4f));
+    for (const char* key : {"gtmOnly", "gtmExtraMemory"}) {
+      EXPECT_EQ(std::get<2>(valuesOf(name, key)), 0.0f) << key;
+    }
+  }
+  for (const char* key : {"s1", "s2", "s3", "s4"}) {
+    EXPECT_EQ(valuesOf("LowDimRGBCurve", key), unit(0.5f)) << key;
+  }
+  EXPECT_EQ(valuesOf("WinterRGB", "maskAlpha"), unit(0.3f));
 }
 
 TEST(FilterParameters, SayWhatCountsWithoutThem) {

@@ -123,6 +123,15 @@ TEST_F(FilteredImageTest, LetsPassThroughCopyWhatFitsAnOutputOfAnotherSize) {
 }
 
 TEST_F(FilteredImageTest, LetsPassThroughCopyIntoAnOverlappingOutput) {
+  // Each part would overwrite what another one still has to read.
+  struct InOrder : Workers {
+    explicit InOrder(bool last) : lastFirst(last) {}
+    std::size_t count() const override { return 4; }
+    void run(std::size_t tasks, const Task& task) override {
+      for (std::size_t i = 0; i < tasks; ++i) task(lastFirst ? tasks - 1 - i : i);
+    }
+    bool lastFirst;
+  } forwards(false), backwards(true);
   const std::vector<RGBA8Pixel> pixels = test_support::randomPixels(60, 3);
   const std::shared_ptr<RGBA8Pixel> memory(new RGBA8Pixel[60], std::default_delete<RGBA8Pixel[]>());
   for (const int shift : {-5, 5}) {
@@ -133,7 +142,8 @@ TEST_F(FilteredImageTest, LetsPassThroughCopyIntoAnOverlappingOutput) {
     auto source = std::make_shared<Image<RGBA8Pixel>>(8, 6, at(6));
     Image<RGBA8Pixel> output(8, 6, at(6 + shift));
     FilteredImage session(source, {}, "", defaultFilterConfigValue,
-                          DefaultFilterFactory::filterFactory());
+                          DefaultFilterFactory::filterFactory(),
+                          shift > 0 ? &forwards : &backwards);
     EXPECT_TRUE(session.applyFilterWithParams("PassThrough", "", {}, output));
     EXPECT_EQ(std::memcmp(output.data.get(), pixels.data() + 6, output.byteSize()), 0);
   }

@@ -85,6 +85,8 @@ TEST(ParameterCheck, FindsWhatReadsOtherwiseThanItLooks) {
       {look, "applyMask=true;", "applyMask of LowDimRGBCurve wants 0 or 1; 'true' counts as 0"},
       {look, "maskAlpha=0.4abc;",
        "maskAlpha of LowDimRGBCurve wants a number from 0 to 1; '0.4abc' counts as 0.4"},
+      {look, "maskAlpha=0.12345678x;",
+       "maskAlpha of LowDimRGBCurve wants a number from 0 to 1; '0.12345678x' counts as 0.123457"},
       {look, "maskRadius=0;", "maskRadius of LowDimRGBCurve wants a number above 0; 0 is outside"},
       {look, "maskAlpha;",
        "maskAlpha of LowDimRGBCurve wants a number from 0 to 1; '' counts as 0"},

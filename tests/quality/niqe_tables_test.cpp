@@ -138,6 +138,8 @@ TEST(NiqeTables, LookUpsReachBothEnds) {
   EXPECT_EQ(scaleFactor(smallestShape), 0.0f);
   EXPECT_NEAR(scaleFactor(largestShape), 1.7822794f, 1e-6f);
   EXPECT_NEAR(meanFactor(largestShape), -0.31577307f, 1e-6f);
+  EXPECT_TRUE(isTabulatedShape(smallestShape));
+  EXPECT_TRUE(isTabulatedShape(largestShape));
   EXPECT_FALSE(isTabulatedShape(0.0999f));
   EXPECT_FALSE(isTabulatedShape(11.001f));
   EXPECT_FALSE(isTabulatedShape(NAN));

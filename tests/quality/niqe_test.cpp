@@ -77,6 +77,8 @@ TEST(Niqe, OfATooSmallPictureIsNanAndReadsNothing) {
     EXPECT_TRUE(std::isnan(analysis.score));
     EXPECT_EQ(analysis.blockColumns, 0u);
     EXPECT_EQ(analysis.blockRows, 0u);
+    EXPECT_EQ(analysis.blockFeatures.width, 0u);
+    EXPECT_EQ(analysis.blockFeatures.height, 0u);
     EXPECT_TRUE(analysis.meanFeatures.empty());
     EXPECT_TRUE(analysis.blockDistances.empty());
   }

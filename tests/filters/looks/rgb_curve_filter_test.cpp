@@ -67,6 +67,21 @@ TEST(RGBCurveFilter, LeavesChannelsAloneAtMaskAlphaZero) {
   EXPECT_FALSE(samePixels(applied<StraightFilter>(picture, "applyMask=1;maskAlpha=1;"), picture));
 }
 
+TEST(RGBCurveFilter, HasItsOwnVignetteAgainAfterAnotherInit) {
+  StraightFilter filter(stateOf(flatPicture(3, 2, {50, 100, 150, 255})));
+  filter.init("");
+  filter.lookFor("maskRadius=3;maskAlpha=0.5;applyMask=1;");
+  const Look kept = filter.lookFor("");
+  EXPECT_EQ(kept.maskRadius, 3.0f);
+  EXPECT_EQ(kept.maskAlpha, 0.5f);
+  EXPECT_NE(kept.vignette, nullptr);
+  filter.init("");
+  const Look own = filter.lookFor("");
+  EXPECT_EQ(own.maskRadius, StraightFilter::maskRadius);
+  EXPECT_EQ(own.maskAlpha, StraightFilter::maskAlpha);
+  EXPECT_EQ(own.vignette, nullptr);
+}
+
 TEST(RGBCurveFilter, ReplacesACurveByTwoSamplesButNotByOne) {
   const Image<RGBA8Pixel> picture = flatPicture(3, 2, {100, 100, 100, 1});
   const std::string off = "applyMask=0;";
